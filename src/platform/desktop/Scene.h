@@ -1,0 +1,83 @@
+// A picture of the windows as plain data: what a screen has to draw. Made by WindowSystem, drawn by the drawing
+// module into a file or onto a display.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <variant>
+#include <vector>
+
+#include "platform/Desktop.h"
+
+namespace panelglow::platform::desktop {
+
+struct FillOperation {
+  Rectangle area;
+  Color color = 0;
+};
+
+struct TextOperation {
+  Rectangle area;  // only the top left corner counts for a single line
+  bool boxed = false;
+  TextLayout layout;
+  std::u16string text;
+  Font font;
+  Color color = 0;
+  std::optional<Color> background;
+};
+
+struct ImageOperation {
+  int x = 0;
+  int y = 0;
+  std::u16string path;
+  Rectangle clip;
+};
+
+using DrawOperation = std::variant<FillOperation, TextOperation, ImageOperation>;
+
+enum class WindowKind { kPlain, kStatic, kIcon, kImageArea, kButton, kEdit, kScrollBar };
+
+/// One visible window, bottom-most first in Scene::windows.
+struct SceneWindow {
+  WindowKind kind = WindowKind::kPlain;
+  Rectangle frame;   // screen pixels
+  Rectangle client;  // screen pixels
+  Rectangle clip;    // screen pixels: the part that its parents leave of the frame
+  bool border = false;
+  bool raisedFrame = false;
+  Color background = kButtonFaceColor;
+  std::u16string text;
+  std::u16string iconPath;
+  Font font;
+  bool enabled = true;
+  bool focused = false;
+  bool defaultButton = false;
+  bool pressed = false;
+  bool vertical = false;  // scroll bar
+  ScrollState scroll;
+  std::vector<DrawOperation> operations;  // in client coordinates
+};
+
+struct Scene {
+  int width = 0;
+  int height = 0;
+  Color background = 0x00604838;
+  std::vector<SceneWindow> windows;
+};
+
+/// Implemented by the drawing module.
+class SceneDrawing {
+ public:
+  virtual ~SceneDrawing() = default;
+
+  /// Draws the scene into a PNG file. False when the file cannot be written.
+  virtual bool WritePng(const Scene& scene, const std::string& path) = 0;
+
+  /// Size of an image or icon file; nothing when it does not decode.
+  virtual std::optional<std::pair<int, int>> ImageSize(const std::string& path) = 0;
+
+  /// Width and height of `text` broken to `width` pixels.
+  virtual std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font) = 0;
+};
+
+}  // namespace panelglow::platform::desktop

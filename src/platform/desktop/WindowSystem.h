@@ -1,0 +1,162 @@
+// The window logic of every backend: classes, windows, message queues, timers, controls, focus, dialog keys. It draws
+// nothing itself: a window keeps the operations of its last painting, and MakeScene() gives the whole picture.
+#pragma once
+
+#include <cstdint>
+#include <deque>
+#include <functional>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "platform/Desktop.h"
+#include "platform/desktop/Scene.h"
+#include "platform/desktop/WindowHost.h"
+
+namespace panelglow::platform::desktop {
+
+class WindowSystem : public Desktop {
+ public:
+  WindowSystem(WindowHost& host, int screenWidth, int screenHeight);
+  ~WindowSystem() override;
+
+  // ---- Desktop
+  int ScreenWidth() override { return screenWidth_; }
+  int ScreenHeight() override { return screenHeight_; }
+  bool RegisterWindowClass(const WindowClass& windowClass) override;
+  void UnregisterWindowClass(std::string_view name) override;
+  WindowHandle CreateWindow(const WindowRequest& request) override;
+  void DestroyWindow(WindowHandle window) override;
+  bool IsWindow(WindowHandle window) override { return Find(window) != nullptr; }
+  void SetWindowPosition(WindowHandle window, ZOrder order, int x, int y, int width, int height,
+                         std::uint32_t flags) override;
+  void MoveWindow(WindowHandle window, int x, int y, int width, int height) override;
+  void ShowWindow(WindowHandle window, bool visible) override;
+  void EnableWindow(WindowHandle window, bool enabled) override;
+  bool IsWindowEnabled(WindowHandle window) override;
+  bool IsWindowVisible(WindowHandle window) override;
+  Rectangle WindowRectangle(WindowHandle window) override;
+  Rectangle ClientRectangle(WindowHandle window) override;
+  wstring WindowText(WindowHandle window) override;
+  void SetWindowText(WindowHandle window, std::u16string_view text) override;
+  void SetFont(WindowHandle window, const Font& font) override;
+  void SetIcon(WindowHandle window, std::u16string_view path) override;
+  void SetControlId(WindowHandle window, int id) override;
+  int ControlId(WindowHandle window) override;
+  void SetExtraWord(WindowHandle window, std::size_t index, std::intptr_t value) override;
+  std::intptr_t ExtraWord(WindowHandle window, std::size_t index) override;
+  WindowProcedure SetProcedure(WindowHandle window, WindowProcedure procedure) override;
+  WindowHandle Parent(WindowHandle window) override;
+  std::vector<WindowHandle> Children(WindowHandle window) override;
+  WindowHandle FindControl(WindowHandle parent, int id) override;
+  void SetFocus(WindowHandle window) override;
+  WindowHandle Focus() override;
+  bool SetForegroundWindow(WindowHandle window) override;
+  WindowHandle ForegroundWindow() override { return foreground_; }
+  void SetActiveWindow(WindowHandle window) override;
+  void AttachInput(WindowHandle other, bool attach) override;
+  std::uint32_t SetTimer(WindowHandle window, std::uint32_t timer, std::uint32_t period_ms,
+                         TimerProcedure procedure) override;
+  void KillTimer(WindowHandle window, std::uint32_t timer) override;
+  std::intptr_t Send(const Message& message) override;
+  void Post(const Message& message) override;
+  bool GetMessage(Message& message) override;
+  bool IsDialogMessage(WindowHandle dialog, const Message& message) override;
+  void Translate(const Message& message) override;
+  void Dispatch(const Message& message) override;
+  std::intptr_t DefaultProcedure(const Message& message) override;
+  void PostQuit() override;
+  std::unique_ptr<Canvas> BeginPaint(WindowHandle window) override;
+  void Invalidate(WindowHandle window) override;
+  Rectangle MeasureText(std::u16string_view text, int width, const Font& font) override;
+  void SetScroll(WindowHandle bar, const ScrollState& state) override;
+  ScrollState Scroll(WindowHandle bar) override;
+
+  // ---- the screen's side: what comes in from mouse and keyboard, and what is to be seen
+
+  /// A press and release of the left mouse button at a point of the screen. It reaches the window that is there when
+  /// its thread takes the message, not the one that is there now.
+  void Click(int x, int y);
+
+  /// A key press and release by virtual-key code; `character` is what it types, 0 for none. `alt`: with the Alt key.
+  void Key(std::uint32_t virtualKey, char16_t character, bool alt);
+
+  /// Visible top-level windows, topmost last.
+  [[nodiscard]] std::vector<WindowHandle> TopLevelWindows() const;
+
+  /// The window's frame on the screen.
+  [[nodiscard]] Rectangle ScreenRectangle(WindowHandle window) const;
+
+  [[nodiscard]] Scene MakeScene() const;
+
+  /// Destroys the windows that the calling thread, which is about to end, still owns.
+  void EndThread();
+
+  /// Supplies text measuring and image sizes; null until something needs it.
+  void SetDrawing(std::function<SceneDrawing*()> drawing) { drawing_ = std::move(drawing); }
+
+ private:
+  struct Window;
+  struct Queue;
+  struct Timer {
+    WindowHandle window = 0;
+    std::uint32_t id = 0;
+    std::uint32_t period_ms = 0;
+    std::uint64_t due_ms = 0;
+    TimerProcedure procedure;
+  };
+  struct Input {
+    bool mouse = false;
+    int x = 0;
+    int y = 0;
+    std::uint32_t virtualKey = 0;
+    char16_t character = 0;
+    bool alt = false;
+  };
+  struct SentMessage {
+    Message message;
+    std::intptr_t result = 0;
+    bool done = false;
+  };
+  class PaintCanvas;
+
+  [[nodiscard]] Window* Find(WindowHandle window) const;
+  Queue& QueueOf(std::uint32_t thread);
+  Queue& OwnQueue() { return QueueOf(host_.CurrentThread()); }
+  std::intptr_t Call(const Message& message);
+  void HandleSentMessages(Queue& queue);
+  bool TakeInput(Queue& queue, Message& message);
+  bool TakeTimer(Queue& queue, Message& message);
+  bool TakePaint(std::uint32_t thread, Message& message);
+  void Activate(WindowHandle window);
+  void Raise(WindowHandle window, ZOrder order);
+  void SetTopmost(Window& window, bool topmost);
+  [[nodiscard]] WindowHandle TopLevelOf(WindowHandle window) const;
+  [[nodiscard]] bool IsDescendant(WindowHandle ancestor, WindowHandle window) const;
+  [[nodiscard]] WindowHandle WindowAt(int x, int y) const;
+  [[nodiscard]] bool IsShown(const Window& window) const;
+  std::intptr_t ControlProcedure(const Message& message);
+  void PressButton(WindowHandle button);
+  void FocusNext(WindowHandle dialog, bool backwards);
+  void FocusInGroup(WindowHandle dialog, bool backwards);
+  bool PressMnemonic(WindowHandle dialog, char16_t letter);
+  [[nodiscard]] WindowHandle DefaultButton(WindowHandle dialog) const;
+  void SendSize(WindowHandle window);
+  [[nodiscard]] Rectangle ClientOnScreen(const Window& window) const;
+  void AddToScene(Scene& scene, const Window& window, const Rectangle& clip) const;
+
+  WindowHost& host_;
+  int screenWidth_;
+  int screenHeight_;
+  std::map<std::string, std::shared_ptr<const WindowClass>, std::less<>> classes_;
+  std::map<WindowHandle, std::unique_ptr<Window>> windows_;
+  std::vector<WindowHandle> order_;  // top-level windows, bottom-most first
+  std::map<std::uint32_t, std::unique_ptr<Queue>> queues_;
+  WindowHandle nextWindow_ = 1;
+  WindowHandle foreground_ = 0;
+  std::function<SceneDrawing*()> drawing_;
+};
+
+}  // namespace panelglow::platform::desktop

@@ -1,0 +1,44 @@
+// A piece of simulated silicon on the machine's buses.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace panelglow::platform::sim {
+
+/// A range of addresses on one of the buses.
+struct AddressRange {
+  std::uint64_t first = 0;
+  std::uint64_t size = 0;
+
+  [[nodiscard]] bool Contains(std::uint64_t address) const { return address >= first && address - first < size; }
+};
+
+/// Accesses come byte by byte in bus order (a word access is two bytes at rising addresses).
+class Device {
+ public:
+  virtual ~Device() = default;
+
+  [[nodiscard]] virtual std::vector<AddressRange> PortRanges() const { return {}; }
+  [[nodiscard]] virtual std::vector<AddressRange> MemoryRanges() const { return {}; }
+
+  virtual std::uint8_t ReadPort(std::uint16_t /*port*/) { return 0xFF; }
+  virtual void WritePort(std::uint16_t /*port*/, std::uint8_t /*value*/) {}
+  virtual std::uint8_t ReadMemory(std::uint64_t /*address*/) { return 0xFF; }
+  virtual void WriteMemory(std::uint64_t /*address*/, std::uint8_t /*value*/) {}
+
+  /// Level of one of the device's output pins, by its name in the machine's file; nothing when it has no such pin.
+  [[nodiscard]] virtual std::optional<bool> Signal(std::string_view pin) const = 0;
+
+  /// The address (port or memory) whose writes move a pin, for the fault "a write that lies".
+  [[nodiscard]] virtual std::optional<std::uint64_t> RegisterOf(std::string_view /*pin*/) const { return {}; }
+
+  /// All register contents as text, one per line: what a run must leave as it found it.
+  [[nodiscard]] virtual std::string State() const = 0;
+};
+
+}  // namespace panelglow::platform::sim

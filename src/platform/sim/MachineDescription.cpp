@@ -1,0 +1,304 @@
+#include "platform/sim/MachineDescription.h"
+
+#include <toml++/toml.h>
+
+#include <algorithm>
+#include <charconv>
+#include <set>
+#include <sstream>
+
+#include "platform/Text.h"
+
+namespace panelglow::platform::sim {
+
+namespace {
+
+// A table of the file that knows which of its keys were asked for, so that a misspelt key is an error and not silence.
+class Section {
+ public:
+  Section(const toml::table& table, std::string_view source, std::string path)
+      : table_(table), source_(source), path_(std::move(path)) {}
+
+  [[noreturn]] void Fail(const toml::node& at, const std::string& problem) const {
+    std::ostringstream text;
+    text << source_ << ":" << at.source().begin.line << ": " << problem;
+    throw MachineError(text.str());
+  }
+
+  template <class T>
+  T Get(std::string_view key, T fallback) {
+    const toml::node* node = Node(key);
+    if (node == nullptr) {
+      return fallback;
+    }
+    const std::optional<T> value = node->value<T>();
+    if (!value) {
+      Fail(*node, "\"" + path_ + std::string(key) + "\" has the wrong type or is out of range");
+    }
+    return *value;
+  }
+
+  std::string Required(std::string_view key) {
+    if (Node(key) == nullptr) {
+      Fail(table_, "\"" + path_ + std::string(key) + "\" is missing");
+    }
+    return Get<std::string>(key, {});
+  }
+
+  std::vector<std::uint8_t> Bytes(std::string_view key) {
+    std::vector<std::uint8_t> bytes;
+    if (const toml::node* node = Node(key)) {
+      const toml::array* array = node->as_array();
+      if (array == nullptr) {
+        Fail(*node, "\"" + path_ + std::string(key) + "\" must be a list of bytes");
+      }
+      for (const toml::node& element : *array) {
+        const std::optional<std::uint8_t> byte = element.value<std::uint8_t>();
+        if (!byte) {
+          Fail(element, "\"" + path_ + std::string(key) + "\" holds a value that is no byte");
+        }
+        bytes.push_back(*byte);
+      }
+    }
+    return bytes;
+  }
+
+  // Calls `use` with each table of a list of tables, or with the one table under `key`.
+  template <class Use>
+  void Each(std::string_view key, Use use) {
+    const toml::node* node = Node(key);
+    if (node == nullptr) {
+      return;
+    }
+    if (const toml::table* single = node->as_table()) {
+      Open(*single, key, use);
+      return;
+    }
+    const toml::array* array = node->as_array();
+    if (array == nullptr) {
+      Fail(*node, "\"" + path_ + std::string(key) + "\" must be a table");
+    }
+    for (const toml::node& element : *array) {
+      const toml::table* entry = element.as_table();
+      if (entry == nullptr) {
+        Fail(element, "\"" + path_ + std::string(key) + "\" must hold tables");
+      }
+      Open(*entry, key, use);
+    }
+  }
+
+  [[nodiscard]] const toml::table& Raw() {
+    for (const auto& [key, node] : table_) {
+      used_.emplace(key.str());
+    }
+    return table_;
+  }
+
+  void RefuseUnknownKeys() const {
+    for (const auto& [key, node] : table_) {
+      if (used_.find(key.str()) == used_.end()) {
+        Fail(node, "\"" + path_ + std::string(key.str()) + "\" is not a key of a machine's file");
+      }
+    }
+  }
+
+ private:
+  const toml::node* Node(std::string_view key) {
+    used_.emplace(key);
+    return table_.get(key);
+  }
+
+  template <class Use>
+  void Open(const toml::table& entry, std::string_view key, Use use) {
+    Section section(entry, source_, path_ + std::string(key) + ".");
+    use(section);
+    section.RefuseUnknownKeys();
+  }
+
+  const toml::table& table_;
+  std::string source_;
+  std::string path_;
+  std::set<std::string, std::less<>> used_;
+};
+
+Microseconds Milliseconds(Section& section, std::string_view key) {
+  return Microseconds{section.Get<std::uint32_t>(key, 0)} * 1000;
+}
+
+ManagementScalar ScalarOf(const toml::node& node) {
+  if (const auto text = node.value_exact<std::string>()) {
+    return WideFromUtf8(*text);
+  }
+  if (const auto flag = node.value_exact<bool>()) {
+    return *flag;
+  }
+  if (const auto number = node.value_exact<std::int64_t>()) {
+    return *number < 0 ? ManagementScalar(static_cast<std::int32_t>(*number))
+                       : ManagementScalar(static_cast<std::uint32_t>(*number));
+  }
+  return node.value<double>().value_or(0.0);
+}
+
+void ReadFirmware(Section& section, FirmwareDescription& firmware) {
+  firmware.boardProduct = section.Get<std::string>("board_product", firmware.boardProduct);
+  firmware.boardManufacturer = section.Get<std::string>("board_manufacturer", firmware.boardManufacturer);
+  firmware.boardSerial = section.Get<std::string>("board_serial", firmware.boardSerial);
+  firmware.systemProduct = section.Get<std::string>("system_product", firmware.systemProduct);
+  firmware.inManagement = section.Get("in_management", firmware.inManagement);
+  firmware.entryPoint = section.Get("entry_point", firmware.entryPoint);
+  bool first = true;
+  section.Each("processor", [&](Section& processor) {
+    if (std::exchange(first, false)) {
+      firmware.processors.clear();
+    }
+    ProcessorDescription description;
+    description.manufacturer = processor.Get<std::string>("manufacturer", description.manufacturer);
+    description.family = processor.Get("family", description.family);
+    firmware.processors.push_back(description);
+  });
+  const std::vector<std::uint8_t> raw = section.Bytes("raw_table");
+  if (!raw.empty()) {
+    firmware.rawTable = raw;
+  }
+}
+
+void ReadDriver(Section& section, DriverDescription& driver) {
+  driver.present = section.Get("present", driver.present);
+  driver.olderSet = section.Get("older_set", driver.olderSet);
+  driver.link = section.Get("link", driver.link);
+  driver.managerError = section.Get("manager_error", driver.managerError);
+  driver.createError = section.Get("create_error", driver.createError);
+  driver.startError = section.Get("start_error", driver.startError);
+  driver.version = section.Get("version", driver.version);
+  section.Each("service", [&](Section& service) {
+    driver.services.push_back({service.Required("name"), service.Get("running", false),
+                               service.Get<std::uint32_t>("start_error", 0)});
+  });
+}
+
+void ReadPci(Section& section, MachineDescription& machine) {
+  PciFunction function;
+  function.location = static_cast<std::uint16_t>(section.Get<std::uint8_t>("bus", 0) << 8U |
+                                                 (section.Get<std::uint8_t>("device", 0) & 31U) << 3U |
+                                                 (section.Get<std::uint8_t>("function", 0) & 7U));
+  section.Each("registers", [&](Section& registers) {
+    for (const auto& [key, node] : registers.Raw()) {
+      std::uint16_t offset = 0;
+      const std::string_view digits = key.str();
+      const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), offset, 16);
+      const std::optional<std::uint32_t> value = node.value<std::uint32_t>();
+      if (error != std::errc() || end != digits.data() + digits.size() || !value || offset % 4 != 0) {
+        registers.Fail(node, "a PCI register is a hexadecimal dword offset with a 32-bit value");
+      }
+      function.registers[offset] = *value;
+    }
+  });
+  machine.pci.push_back(function);
+}
+
+void ReadEvent(Section& section, MachineDescription& machine) {
+  ScriptedEvent event;
+  event.at = Milliseconds(section, "at_ms");
+  const std::string write = section.Get<std::string>("write_file", "");
+  const std::string remove = section.Get<std::string>("delete_file", "");
+  event.content = section.Get<std::string>("content", "");
+  if (!write.empty()) {
+    event.kind = ScriptedEvent::Kind::kWriteFile;
+    event.path = write;
+  } else if (!remove.empty()) {
+    event.kind = ScriptedEvent::Kind::kDeleteFile;
+    event.path = remove;
+  } else if (section.Get("fill_disk", false)) {
+    event.kind = ScriptedEvent::Kind::kFillDisk;
+  } else {
+    event.console = section.Get<std::uint32_t>("console", 0);
+  }
+  machine.events.push_back(event);
+}
+
+void ReadLed(Section& section, MachineDescription& machine) {
+  Led led;
+  led.name = section.Required("name");
+  led.symbol = section.Required("symbol");
+  led.color = section.Required("color");
+  led.device = section.Required("device");
+  led.pin = section.Required("pin");
+  led.activeLow = section.Get("active_low", false);
+  machine.leds.push_back(led);
+}
+
+void ReadManagement(Section& section, MachineDescription& machine) {
+  ManagementTable table;
+  table.nameSpace = section.Get<std::string>("namespace", "ROOT\\CIMV2");
+  table.className = section.Required("class");
+  section.Each("row", [&](Section& row) {
+    ManagementRow properties;
+    for (const auto& [key, node] : row.Raw()) {
+      ManagementValue value;
+      if (const toml::array* array = node.as_array()) {
+        ManagementArray elements;
+        for (const toml::node& element : *array) {
+          elements.push_back(ScalarOf(element));
+        }
+        value.content = std::move(elements);
+      } else {
+        value.content = ScalarOf(node);
+      }
+      properties.Set(WideFromUtf8(key.str()), std::move(value));
+    }
+    table.rows.push_back(std::move(properties));
+  });
+  machine.management.push_back(std::move(table));
+}
+
+}  // namespace
+
+MachineDescription ParseMachine(std::string_view text, std::string_view source) {
+  toml::table document;
+  try {
+    document = toml::parse(text, source);
+  } catch (const toml::parse_error& error) {
+    std::ostringstream problem;
+    problem << source << ":" << error.source().begin.line << ": " << error.description();
+    throw MachineError(problem.str());
+  }
+  MachineDescription machine;
+  Section root(document, source, "");
+  machine.name = root.Get<std::string>("name", std::string(source));
+  machine.is64Bit = root.Get("is_64_bit", machine.is64Bit);
+  machine.touchpad = root.Get("touchpad", machine.touchpad);
+  machine.startTime = static_cast<std::time_t>(root.Get<std::int64_t>("start_time", machine.startTime));
+  root.Each("screen", [&](Section& section) {
+    machine.screenWidth = section.Get("width", machine.screenWidth);
+    machine.screenHeight = section.Get("height", machine.screenHeight);
+  });
+  root.Each("environment", [&](Section& section) {
+    for (const auto& [key, node] : section.Raw()) {
+      machine.environment[std::string(key.str())] = node.value_or(std::string());
+    }
+  });
+  root.Each("firmware", [&](Section& section) { ReadFirmware(section, machine.firmware); });
+  root.Each("driver", [&](Section& section) { ReadDriver(section, machine.driver); });
+  root.Each("pci", [&](Section& section) { ReadPci(section, machine); });
+  root.Each("chip", [&](Section& section) {
+    ChipDescription chip;
+    chip.name = section.Required("name");
+    chip.kind = section.Required("kind");
+    chip.base = section.Get("base", chip.base);
+    chip.outputs = section.Get("outputs", chip.outputs);
+    chip.inputs = section.Get("inputs", chip.inputs);
+    chip.initial = section.Bytes("initial");
+    machine.chips.push_back(std::move(chip));
+  });
+  root.Each("led", [&](Section& section) { ReadLed(section, machine); });
+  root.Each("event", [&](Section& section) { ReadEvent(section, machine); });
+  root.Each("peer", [&](Section& section) {
+    machine.peers.push_back({section.Required("mutex"), Milliseconds(section, "from_ms"),
+                             Milliseconds(section, "until_ms"), section.Get("killed", false)});
+  });
+  root.Each("management", [&](Section& section) { ReadManagement(section, machine); });
+  root.RefuseUnknownKeys();
+  return machine;
+}
+
+}  // namespace panelglow::platform::sim

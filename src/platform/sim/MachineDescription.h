@@ -1,0 +1,116 @@
+// A simulated machine as its file describes it. machines/README.md holds the format.
+#pragma once
+
+#include <cstdint>
+#include <ctime>
+#include <map>
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/Management.h"
+#include "platform/sim/FrontPanel.h"
+
+namespace panelglow::platform::sim {
+
+/// A machine's file that cannot be used; the text names file, line and what to do.
+class MachineError : public std::runtime_error {
+ public:
+  using std::runtime_error::runtime_error;
+};
+
+struct ChipDescription {
+  std::string name;
+  std::string kind;  // "gpio-block", "memory-registers", "legacy-panel"
+  std::uint64_t base = 0;
+  std::uint8_t outputs = 0xFF;
+  std::uint8_t inputs = 0;
+  std::vector<std::uint8_t> initial;
+};
+
+struct ServiceDescription {
+  std::string name;
+  bool running = false;
+  std::uint32_t startError = 0;
+};
+
+struct DriverDescription {
+  bool present = true;                       // the driver's binary is installed
+  bool olderSet = false;                     // ... under the older names instead
+  bool link = true;                          // its device link opens once the service runs
+  std::uint32_t managerError = 0;            // error of opening the service manager
+  std::uint32_t createError = 0;             // error of creating a service
+  std::uint32_t startError = 0;              // error of every start, 0: by what is installed
+  std::uint32_t version = 0x04010305;        // answer to the version request
+  std::vector<ServiceDescription> services;  // registered before the run
+};
+
+struct PciFunction {
+  std::uint16_t location = 0;
+  std::map<std::uint16_t, std::uint32_t> registers;  // dword offset to value
+};
+
+struct ProcessorDescription {
+  std::string manufacturer = "Intel";
+  std::uint8_t family = 0xCD;
+};
+
+struct FirmwareDescription {
+  std::string boardProduct;
+  std::string boardManufacturer = "Panelglow";
+  std::string boardSerial = "PG0001";
+  std::string systemProduct = "Simulated machine";
+  std::vector<ProcessorDescription> processors{{}};
+  std::optional<std::vector<std::uint8_t>> rawTable;  // instead of all the above
+  bool inManagement = true;                           // the management service knows the table
+  bool entryPoint = true;                             // the firmware segment holds the table
+};
+
+/// Something that happens at a moment of the run.
+struct ScriptedEvent {
+  enum class Kind { kWriteFile, kDeleteFile, kConsole, kFillDisk };
+  Microseconds at = 0;
+  Kind kind = Kind::kConsole;
+  std::string path;
+  std::string content;
+  std::uint32_t console = 0;
+};
+
+/// Another process of the machine that holds a named mutex for a while. A killed one never releases it.
+struct Peer {
+  std::string mutex;
+  Microseconds from = 0;
+  Microseconds until = 0;
+  bool killed = false;
+};
+
+struct ManagementTable {
+  std::string nameSpace;
+  std::string className;
+  std::vector<ManagementRow> rows;
+};
+
+struct MachineDescription {
+  std::string name = "bare machine";
+  int screenWidth = 1280;
+  int screenHeight = 1024;
+  bool is64Bit = true;
+  std::time_t startTime = 1'709'294'400;  // 2024-03-01 12:00 UTC
+  bool touchpad = false;
+  std::map<std::string, std::string> environment{{"ProgramData", "C:\\ProgramData"}};
+  FirmwareDescription firmware;
+  DriverDescription driver;
+  std::vector<PciFunction> pci;
+  std::vector<ChipDescription> chips;
+  std::vector<Led> leds;
+  std::vector<ScriptedEvent> events;
+  std::vector<Peer> peers;
+  std::vector<ManagementTable> management;
+};
+
+/// Reads a machine's file. `source` names it in errors. Throws MachineError.
+MachineDescription ParseMachine(std::string_view toml, std::string_view source);
+
+}  // namespace panelglow::platform::sim

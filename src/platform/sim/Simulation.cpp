@@ -1,0 +1,464 @@
+#include "platform/sim/Simulation.h"
+
+#include <unistd.h>
+
+#include <algorithm>
+#include <cctype>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <ctime>
+#include <map>
+
+#include "platform/desktop/Scene.h"
+#include "platform/posix/LazyDrawing.h"
+#include "platform/posix/LazyXmlDocuments.h"
+#include "platform/posix/PosixFiles.h"
+#include "platform/profile/ProfileFilesOnFiles.h"
+#include "platform/sim/FirmwareTable.h"
+#include "platform/sim/GpioBlock.h"
+#include "platform/sim/KeyboardDevice.h"
+#include "platform/sim/LegacyPanelBlock.h"
+#include "platform/sim/MemoryRegisters.h"
+#include "platform/sim/Operator.h"
+#include "platform/sim/SimDriver.h"
+#include "platform/sim/SimHost.h"
+#include "platform/sim/SimManagement.h"
+#include "platform/sim/SimMutexes.h"
+
+namespace panelglow::platform::sim {
+
+namespace {
+
+constexpr const char* kKeyboard = "keyboard";
+
+class SimClock : public Clock {
+ public:
+  SimClock(Scheduler& scheduler, std::time_t start) : scheduler_(scheduler), start_(start) {}
+  std::uint32_t TickCount() override {
+    scheduler_.Spend(1);  // so that a loop that only reads the clock comes to its end
+    return static_cast<std::uint32_t>(scheduler_.Now() / 1000 + kBootTicks);
+  }
+  std::time_t WallTime() override { return start_ + static_cast<std::time_t>(scheduler_.Now() / 1'000'000); }
+  std::tm LocalTime(std::time_t seconds) override {
+    std::tm parts{};
+    gmtime_r(&seconds, &parts);  // a simulated machine stands at Greenwich
+    return parts;
+  }
+  void Sleep(std::uint32_t milliseconds) override { scheduler_.SleepFor(Microseconds{milliseconds} * 1000); }
+
+ private:
+  static constexpr std::uint64_t kBootTicks = 0xFFFFD8F0;  // 10 s before the counter wraps
+  Scheduler& scheduler_;
+  std::time_t start_;
+};
+
+class SimThreads : public Threads {
+ public:
+  explicit SimThreads(Scheduler& scheduler) : scheduler_(scheduler) {}
+  ThreadHandle Start(const std::string& name, std::function<void()> body) override {
+    const ThreadHandle thread = scheduler_.Start(name, std::move(body));
+    scheduler_.Spend(10);
+    return thread;
+  }
+  bool Wait(ThreadHandle thread, std::uint32_t limit_ms) override {
+    if (limit_ms == kNoLimit) {
+      return scheduler_.WaitForEnd(thread, std::nullopt);
+    }
+    return scheduler_.WaitForEnd(thread, scheduler_.Now() + Microseconds{limit_ms} * 1000);
+  }
+  void Close(ThreadHandle /*thread*/) override {}
+  void Terminate(ThreadHandle thread) override { scheduler_.Terminate(thread); }
+
+ private:
+  Scheduler& scheduler_;
+};
+
+class SimConsole : public Console {
+ public:
+  SimConsole(Scheduler& scheduler, bool capture) : scheduler_(scheduler), capture_(capture) {}
+  void Write(std::string_view bytes) override {
+    scheduler_.Spend(1);
+    if (capture_) {
+      output_ += bytes;
+      return;
+    }
+    while (!bytes.empty()) {
+      const ssize_t written = ::write(STDOUT_FILENO, bytes.data(), bytes.size());
+      if (written < 0 && errno == EINTR) {
+        continue;
+      }
+      if (written <= 0) {
+        return;
+      }
+      bytes.remove_prefix(static_cast<std::size_t>(written));
+    }
+  }
+  void WriteError(std::string_view bytes) override { std::fwrite(bytes.data(), 1, bytes.size(), stderr); }
+  void SetControlHandler(std::function<bool(std::uint32_t)> handler) override { handler_ = std::move(handler); }
+
+  void Raise(std::uint32_t type) {
+    if (handler_) {
+      scheduler_.Start("console control", [this, type] { handler_(type); });
+    }
+  }
+  [[nodiscard]] const std::string& Output() const { return output_; }
+  void Clear() { output_.clear(); }
+
+ private:
+  Scheduler& scheduler_;
+  bool capture_;
+  std::string output_;
+  std::function<bool(std::uint32_t)> handler_;
+};
+
+class SimEnvironment : public Environment {
+ public:
+  explicit SimEnvironment(const std::map<std::string, std::string>& variables) : variables_(variables) {}
+  std::optional<std::string> Variable(std::string_view name) override {
+    const auto found = variables_.find(std::string(name));
+    return found == variables_.end() ? std::nullopt : std::optional<std::string>(found->second);
+  }
+
+ private:
+  const std::map<std::string, std::string>& variables_;
+};
+
+class SimCpu : public Cpu {
+ public:
+  explicit SimCpu(const MachineDescription& machine) : machine_(machine) {}
+  CpuidRegisters Cpuid(std::uint32_t leaf) override {
+    const bool amd = !machine_.firmware.processors.empty() &&
+                     machine_.firmware.processors.front().manufacturer.find("AMD") != std::string::npos;
+    if (leaf == 0) {
+      return amd ? CpuidRegisters{13, 0x68747541, 0x444D4163, 0x69746E65}
+                 : CpuidRegisters{13, 0x756E6547, 0x6C65746E, 0x49656E69};
+    }
+    return leaf == 1 ? CpuidRegisters{0x000306A9, 0, 0, 0} : CpuidRegisters{};
+  }
+  bool Is64BitSystem() override { return machine_.is64Bit; }
+
+ private:
+  const MachineDescription& machine_;
+};
+
+class SimKeyboard : public Keyboard {
+ public:
+  SimKeyboard(Scheduler& scheduler, Buses& buses, KeyboardDevice& device, std::function<void()> moved)
+      : scheduler_(scheduler), buses_(buses), device_(device), moved_(std::move(moved)) {}
+  void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) override {
+    scheduler_.Spend(20);
+    if (!buses_.IsRemoved(kKeyboard) && !buses_.IsIgnored(kKeyboard, virtualKey)) {
+      device_.Event(virtualKey, scanCode, flags);
+    }
+    moved_();
+  }
+
+ private:
+  Scheduler& scheduler_;
+  Buses& buses_;
+  KeyboardDevice& device_;
+  std::function<void()> moved_;
+};
+
+// The vendor's touchpad interface: one touchpad with one LED property.
+class SimTouchpad : public Touchpad {
+ public:
+  SimTouchpad(bool present, Scheduler& scheduler, KeyboardDevice& device, std::function<void()> moved)
+      : present_(present), scheduler_(scheduler), device_(device), moved_(std::move(moved)) {}
+
+  std::unique_ptr<TouchpadApi> Create() override {
+    return present_ ? std::make_unique<Api>(*this) : nullptr;
+  }
+
+ private:
+  static constexpr std::int32_t kDevice = 3;
+  static constexpr std::int32_t kTypeTouchpad = 2;
+  static constexpr std::uint32_t kLedProperty = 0x10000171;
+
+  class Pad : public TouchpadDevice {
+   public:
+    explicit Pad(SimTouchpad& owner) : owner_(owner) {}
+    bool SetProperty(std::uint32_t property, std::int32_t value) override {
+      owner_.scheduler_.Spend(50);
+      if (property != kLedProperty) {
+        return false;
+      }
+      owner_.device_.SetTouchpadLed(value != 0);
+      owner_.moved_();
+      return true;
+    }
+
+   private:
+    SimTouchpad& owner_;
+  };
+
+  class Api : public TouchpadApi {
+   public:
+    explicit Api(SimTouchpad& owner) : owner_(owner) {}
+    bool FindDevice(std::int32_t connection, std::int32_t type, std::int32_t& handle) override {
+      if (connection != 0 || type != kTypeTouchpad || handle != -1) {
+        return false;
+      }
+      handle = kDevice;
+      return true;
+    }
+    std::unique_ptr<TouchpadDevice> OpenDevice(std::int32_t handle) override {
+      return handle == kDevice ? std::make_unique<Pad>(owner_) : nullptr;
+    }
+
+   private:
+    SimTouchpad& owner_;
+  };
+
+  bool present_;
+  Scheduler& scheduler_;
+  KeyboardDevice& device_;
+  std::function<void()> moved_;
+};
+
+class SimWindowHost : public desktop::WindowHost {
+ public:
+  explicit SimWindowHost(Scheduler& scheduler) : scheduler_(scheduler) {}
+  std::uint32_t CurrentThread() override { return scheduler_.Current(); }
+  std::uint64_t Now_ms() override { return scheduler_.Now() / 1000; }
+  void Block(const void* key, const std::string& what, std::optional<std::uint64_t> deadline_ms) override {
+    scheduler_.Block(key, what, deadline_ms ? std::optional<Microseconds>(*deadline_ms * 1000) : std::nullopt);
+  }
+  void Wake(const void* key) override { scheduler_.Wake(key); }
+  void Spend() override { scheduler_.Spend(1); }
+
+ private:
+  Scheduler& scheduler_;
+};
+
+std::unique_ptr<Device> MakeDevice(const ChipDescription& chip) {
+  if (chip.kind == "gpio-block") {
+    return std::make_unique<GpioBlock>(static_cast<std::uint16_t>(chip.base), chip.outputs, chip.inputs,
+                                       chip.initial.empty() ? std::uint8_t{0} : chip.initial.front());
+  }
+  if (chip.kind == "memory-registers") {
+    return std::make_unique<MemoryRegisters>(chip.base, chip.initial);
+  }
+  if (chip.kind == "legacy-panel") {
+    return std::make_unique<LegacyPanelBlock>(static_cast<std::uint16_t>(chip.base));
+  }
+  throw MachineError("chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
+                     "\" (gpio-block, memory-registers, legacy-panel)");
+}
+
+Simulation* g_current = nullptr;
+
+volatile std::sig_atomic_t g_pendingSignals[2] = {0, 0};
+
+extern "C" void NoteSignal(int number) { g_pendingSignals[number == SIGINT ? 0 : 1] = 1; }
+
+}  // namespace
+
+struct Simulation::Parts {
+  Parts(MachineDescription machine, const SimulationOptions& simulationOptions)
+      : options(simulationOptions),
+        description(std::move(machine)),
+        scheduler({simulationOptions.seed, simulationOptions.realTime, simulationOptions.timeLimit_us}),
+        buses(description.pci),
+        keyboardDevice(AttachAll(buses, description)),
+        panel(description.leds,
+              [this](const std::string& device, const std::string& pin) {
+                const Device* found = buses.Find(device);
+                return found == nullptr ? std::optional<bool>() : found->Signal(pin);
+              }),
+        driver(description.driver, buses, scheduler, trace, [this] { panel.Update(scheduler.Now()); }),
+        management(description),
+        mutexes(scheduler, description.peers),
+        clock(scheduler, description.startTime + static_cast<std::time_t>(simulationOptions.seed * 7919 % 86400)),
+        threads(scheduler),
+        console(scheduler, simulationOptions.captureOutput),
+        environment(description.environment),
+        cpu(description),
+        keyboard(scheduler, buses, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
+        touchpad(description.touchpad, scheduler, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
+        files(simulationOptions.realFiles ? &posixFiles : nullptr, scheduler),
+        profiles(files),
+        windowHost(scheduler),
+        windows(windowHost, description.screenWidth, description.screenHeight),
+        images(drawing),
+        host{clock, console, cpu, windows, driver, environment, files, images, keyboard, management, mutexes, profiles,
+             driver, threads, touchpad, xmlDocuments} {}
+
+  static KeyboardDevice& AttachAll(Buses& buses, const MachineDescription& machine) {
+    auto keyboard = std::make_unique<KeyboardDevice>();
+    KeyboardDevice& device = *keyboard;
+    buses.Attach(kKeyboard, std::move(keyboard));
+    for (const ChipDescription& chip : machine.chips) {
+      buses.Attach(chip.name, MakeDevice(chip));
+    }
+    return device;
+  }
+
+  SimulationOptions options;
+  MachineDescription description;
+  Scheduler scheduler;
+  Buses buses;
+  KeyboardDevice& keyboardDevice;
+  DriverTrace trace;
+  FrontPanel panel;
+  SimDriver driver;
+  SimManagement management;
+  SimMutexes mutexes;
+  SimClock clock;
+  SimThreads threads;
+  SimConsole console;
+  SimEnvironment environment;
+  SimCpu cpu;
+  SimKeyboard keyboard;
+  SimTouchpad touchpad;
+  posix::PosixFiles posixFiles;
+  SimFiles files;
+  profile::ProfileFilesOnFiles profiles;
+  SimWindowHost windowHost;
+  desktop::WindowSystem windows;
+  posix::LazyDrawing drawing;
+  posix::DrawnImages images;
+  posix::LazyXmlDocuments xmlDocuments;
+  Host host;
+  std::unique_ptr<Operator> person;
+  std::string initialState;
+  unsigned pictures = 0;
+  Simulation* former = nullptr;
+};
+
+Simulation::Simulation(std::string_view toml, const SimulationOptions& options)
+    : Simulation(ParseMachine(toml, "machine"), options) {}
+
+Simulation::Simulation(MachineDescription description, const SimulationOptions& options)
+    : parts_(std::make_unique<Parts>(std::move(description), options)) {
+  Parts& p = *parts_;
+  for (const Led& led : p.description.leds) {
+    const Device* device = p.buses.Find(led.device);
+    if (device == nullptr || !device->Signal(led.pin)) {
+      throw MachineError("led \"" + led.name + "\": there is no pin \"" + led.pin + "\" on a device \"" + led.device +
+                         "\"");
+    }
+  }
+  if (p.description.firmware.entryPoint) {
+    const std::vector<std::uint8_t> segment = BuildFirmwareSegment(p.description.firmware);
+    p.buses.LoadMemory(kFirmwareSegment, segment);
+  }
+  p.scheduler.OnThreadEnd([this](ThreadId thread) {
+    parts_->windows.EndThread();
+    parts_->mutexes.Abandon(thread);
+  });
+  p.windows.SetDrawing([this] { return parts_->drawing.Get(); });
+  for (const ScriptedEvent& event : p.description.events) {
+    p.scheduler.At(event.at, [this, event] {
+      switch (event.kind) {
+        case ScriptedEvent::Kind::kWriteFile:
+          parts_->files.Put(event.path, event.content);
+          break;
+        case ScriptedEvent::Kind::kDeleteFile:
+          parts_->files.Hide(event.path);
+          break;
+        case ScriptedEvent::Kind::kFillDisk:
+          parts_->files.FillDisk();
+          break;
+        case ScriptedEvent::Kind::kConsole:
+          RaiseConsole(event.console);
+          break;
+      }
+    });
+  }
+  if (!options.captureOutput) {
+    // The simulated console is the real one: an interrupt from outside is a control event of the machine.
+    std::signal(SIGINT, NoteSignal);
+    std::signal(SIGTERM, NoteSignal);
+    std::signal(SIGPIPE, SIG_IGN);
+    p.scheduler.OnHandOver([this] {
+      for (std::uint32_t type = 0; type < 2; ++type) {
+        if (g_pendingSignals[type] != 0) {
+          g_pendingSignals[type] = 0;
+          RaiseConsole(type);
+        }
+      }
+    });
+  }
+  p.panel.Update(0);
+  p.initialState = p.buses.State();
+  if (!options.operatorPolicy.empty()) {
+    p.person = std::make_unique<Operator>(*this, options.operatorPolicy);
+  }
+  p.former = g_current;
+  g_current = this;
+}
+
+Simulation::~Simulation() { g_current = parts_->former; }
+
+platform::Host& Simulation::TheMachine() { return parts_->host; }
+Scheduler& Simulation::Time() { return parts_->scheduler; }
+FrontPanel& Simulation::Panel() { return parts_->panel; }
+Buses& Simulation::Hardware() { return parts_->buses; }
+DriverTrace& Simulation::Trace() { return parts_->trace; }
+SimFiles& Simulation::DiskFiles() { return parts_->files; }
+desktop::WindowSystem& Simulation::Windows() { return parts_->windows; }
+Operator* Simulation::Person() { return parts_->person.get(); }
+const MachineDescription& Simulation::Description() const { return parts_->description; }
+const std::string& Simulation::Output() const { return parts_->console.Output(); }
+void Simulation::ClearOutput() { parts_->console.Clear(); }
+void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
+std::string Simulation::HardwareState() { return parts_->buses.State(); }
+const std::string& Simulation::InitialState() const { return parts_->initialState; }
+bool Simulation::IsMutexOwned(std::string_view name) const { return parts_->mutexes.IsOwned(name); }
+
+void Simulation::Break(std::string_view led, std::string_view fault) {
+  const std::size_t colon = fault.find(':');
+  const std::string_view kindName = fault.substr(0, colon);
+  const std::string_view partner = colon == std::string_view::npos ? std::string_view() : fault.substr(colon + 1);
+  const std::optional<LedFault> kind = LedFaultByName(kindName);
+  if (!kind) {
+    throw MachineError("there is no fault \"" + std::string(kindName) + "\" (" + LedFaultNames() + ")");
+  }
+  if (!parts_->panel.Break(led, *kind, partner)) {
+    throw MachineError("the fault \"" + std::string(fault) + "\" cannot be put on \"" + std::string(led) +
+                       "\": no such LED, or no such partner (swapped:OTHER, shorted:OTHER)");
+  }
+  const Led& broken = parts_->panel.Leds()[*parts_->panel.Find(led)];
+  if (kind == LedFault::kAbsentChip) {
+    parts_->buses.Remove(broken.device);
+  }
+  if (kind == LedFault::kLyingWrite) {
+    const Device* device = parts_->buses.Find(broken.device);
+    if (const std::optional<std::uint64_t> address = device->RegisterOf(broken.pin)) {
+      parts_->buses.IgnoreWrites(broken.device, *address);
+    }
+  }
+  parts_->panel.Update(parts_->scheduler.Now());
+}
+
+void Simulation::Screenshot(std::string_view what) {
+  if (parts_->options.screenshots.empty()) {
+    return;
+  }
+  desktop::SceneDrawing* drawing = parts_->drawing.Get();
+  char number[16];
+  std::snprintf(number, sizeof number, "%02u", ++parts_->pictures);
+  const std::string path = parts_->options.screenshots + "/" + number + "-" + std::string(what) + ".png";
+  if (drawing == nullptr || !drawing->WritePng(parts_->windows.MakeScene(), path)) {
+    std::fprintf(stderr, "simulation: the picture %s could not be written\n", path.c_str());
+  }
+}
+
+Simulation& CurrentSimulation() {
+  if (g_current == nullptr) {
+    // Kept to the end of the process: threads that a stuck run leaves behind may still refer to it.
+    static Simulation* const fromEnvironment = MakeSimulationFromEnvironment().release();
+    g_current = fromEnvironment;
+  }
+  return *g_current;
+}
+
+}  // namespace panelglow::platform::sim
+
+namespace panelglow::platform {
+
+Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
+
+}  // namespace panelglow::platform
