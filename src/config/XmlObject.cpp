@@ -1,0 +1,574 @@
+#include "config/XmlObject.h"
+
+#include <algorithm>
+#include <array>
+#include <ostream>
+#include <stdexcept>
+#include <utility>
+
+#include "config/XmlParser.h"
+#include "harness/base/CDMUtil.h"
+#include "platform/Host.h"
+
+namespace panelglow {
+
+namespace {
+
+constexpr std::string_view kWrapperName = "xmlIndex";
+constexpr std::string_view kProperty = "property";
+
+// The fixed key of the scrambled form.
+constexpr std::string_view kScramblingKey = "panel lamps blink; a person looks, presses and the verdict is known";
+static_assert(kScramblingKey.size() == 67);
+
+// Adds (or, with `sign` -1, takes away) the repeating key, up to the first byte that is zero.
+void ApplyKey(std::string& text, int sign) {
+  for (std::size_t i = 0; i < text.size() && text[i] != '\0'; ++i) {
+    const int key = static_cast<unsigned char>(kScramblingKey[i % kScramblingKey.size()]);
+    text[i] = static_cast<char>(static_cast<unsigned char>(static_cast<unsigned char>(text[i]) + sign * key));
+  }
+}
+
+// The escaped form of one character, empty when it stands for itself.
+std::string_view Escape(char c, bool inAttribute) {
+  switch (c) {
+    case '<':
+      return "&lt;";
+    case '>':
+      return "&gt;";
+    case '&':
+      return "&amp;";
+    case '\t':
+      return "&#09;";
+    case '\n':
+      return "&#10;";
+    case '\r':
+      return "&#13;";
+    case '"':
+      return inAttribute ? "&quot;" : "";
+    default:
+      return "";
+  }
+}
+
+void AppendEscaped(std::string& out, std::string_view text, bool inAttribute) {
+  for (const char c : text) {
+    const std::string_view escaped = Escape(c, inAttribute);
+    if (escaped.empty()) {
+      out += c;
+    } else {
+      out += escaped;
+    }
+  }
+}
+
+void AppendAttribute(std::string& out, const XmlAttribute& attribute) {
+  out += ' ';
+  out += attribute.name;
+  out += "=\"";
+  AppendEscaped(out, attribute.value, true);
+  out += '"';
+}
+
+template <class Attributes>
+auto FindIn(Attributes& attributes, std::string_view name) {
+  return std::find_if(attributes.begin(), attributes.end(),
+                      [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, name); });
+}
+
+XmlAttribute* SetIn(std::vector<XmlAttribute>& attributes, std::string_view name, std::string_view value) {
+  const std::string_view stored = XmlCharactersOf(value);
+  const auto found = FindIn(attributes, name);
+  if (found != attributes.end()) {
+    found->value = stored;
+    return &*found;
+  }
+  return &attributes.emplace_back(std::string(name), std::string(stored));
+}
+
+bool ContainsIgnoringCase(std::string_view text, std::string_view part) {
+  return CDMUtil::ToLower(text).find(CDMUtil::ToLower(part)) != std::string::npos;
+}
+
+template <class Number>
+std::string Streamed(Number number) {
+  std::ostringstream text;
+  text << number;
+  return text.str();
+}
+
+}  // namespace
+
+XmlObject::XmlObject(const std::string& text) { XmlParser(text).ParseElement(*this); }
+
+XmlObject::XmlObject(const XmlObject& other)
+    : Persistent(other),
+      name(other.name),
+      value(other.value),
+      attributes(other.attributes),
+      declaration(other.declaration),
+      instructions(other.instructions),
+      children(other.children) {
+  Relink();
+}
+
+XmlObject& XmlObject::operator=(const XmlObject& other) {
+  if (this != &other) {
+    *this = XmlObject(other);
+  }
+  return *this;
+}
+
+XmlObject::XmlObject(XmlObject&& other) noexcept
+    : Persistent(std::move(other)),
+      name(std::move(other.name)),
+      value(std::move(other.value)),
+      depth(other.depth),
+      attributes(std::move(other.attributes)),
+      declaration(std::move(other.declaration)),
+      instructions(std::move(other.instructions)),
+      children(std::move(other.children)) {
+  // The children stay where they are; only their way up has changed.
+  for (XmlObject& child : children) {
+    child.parent = this;
+  }
+}
+
+XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
+  if (this != &other) {
+    name = std::move(other.name);
+    value = std::move(other.value);
+    attributes = std::move(other.attributes);
+    declaration = std::move(other.declaration);
+    instructions = std::move(other.instructions);
+    // `other` may be a descendant of this object: take its children before the old ones go.
+    std::vector<XmlObject> taken = std::move(other.children);
+    children = std::move(taken);
+    Relink();
+  }
+  return *this;
+}
+
+void XmlObject::ReadAndWrite(ptstream& /*stream*/, Direction /*direction*/, unsigned int /*version*/) {
+  throw std::logic_error("object streams are not available yet");
+}
+
+void XmlObject::CopyFrom(const Persistent* other) {
+  const auto* source = dynamic_cast<const XmlObject*>(other);
+  if (source != nullptr && source != this) {
+    *this = *source;
+  }
+}
+
+void XmlObject::Clear() {
+  name.clear();
+  value.clear();
+  attributes.clear();
+  declaration.clear();
+  instructions.clear();
+  children.clear();
+}
+
+// Sets parent pointers and depths again through the whole subtree.
+void XmlObject::Relink() {
+  for (XmlObject& child : children) {
+    child.parent = this;
+    child.depth = depth + 1;
+    child.Relink();
+  }
+}
+
+// ---- file and text
+
+bool XmlObject::LoadFromFile(const std::string& path, bool scrambled, bool wrap, int index) {
+  std::optional<std::string> content = platform::TheHost().files.ReadLocked(path);
+  if (!content || content->empty() || content->front() == '\0') {
+    return false;
+  }
+  Clear();
+  parent = nullptr;
+  depth = 0;
+  if (scrambled) {
+    ApplyKey(*content, -1);
+  }
+  std::string_view text = *content;
+  text = text.substr(0, text.find('\0'));
+  while (!text.empty() && IsXmlSpace(text.back())) {
+    text.remove_suffix(1);
+  }
+  XmlParser parser(text);
+  if (!wrap && index < 0) {
+    parser.ParseElement(*this);
+    return true;
+  }
+  if (!wrap) {
+    for (int i = 0; i < index; ++i) {
+      if (!parser.SkipElement()) {
+        return false;
+      }
+    }
+    return parser.ParseElement(*this);
+  }
+  name = kWrapperName;
+  bool added = false;
+  for (int i = 0;; ++i) {
+    if (index >= 0 && i != index) {
+      if (i > index || !parser.SkipElement()) {
+        return added;
+      }
+      continue;
+    }
+    XmlObject element;
+    if (!parser.ParseElement(element)) {
+      return added;
+    }
+    AddChild(std::move(element));
+    added = true;
+  }
+}
+
+bool XmlObject::SaveToFile(const std::string& path, bool scrambled, bool compact) const {
+  TrySaveToFile(path, scrambled, compact);
+  return true;
+}
+
+bool XmlObject::TrySaveToFile(const std::string& path, bool scrambled, bool compact) const {
+  std::string text = ToString(compact);
+  if (scrambled) {
+    ApplyKey(text, 1);
+  }
+  return platform::TheHost().files.WriteLocked(path, text);
+}
+
+std::string XmlObject::ToString(bool compact) const {
+  std::string text;
+  Write(text, compact);
+  return text;
+}
+
+void XmlObject::Write(std::string& out, bool compact) const {
+  if (parent == nullptr && !declaration.empty()) {
+    // The version comes first, whatever order the pairs were set in.
+    out += "<?xml";
+    const bool versionFirst = CDMUtil::EqualIgnoreCase(declaration.front().name, "version");
+    if (!versionFirst) {
+      AppendAttribute(out, {"version", GetDeclarationValue("version", "1.0")});
+    }
+    for (const XmlAttribute& pair : declaration) {
+      if (versionFirst || !CDMUtil::EqualIgnoreCase(pair.name, "version")) {
+        AppendAttribute(out, pair);
+      }
+    }
+    out += "?>\n";
+  }
+  const std::string indentation = compact ? std::string() : std::string(2 * static_cast<std::size_t>(depth), ' ');
+  const std::string_view lineEnd = compact ? "" : "\n";
+  for (const std::string& instruction : instructions) {
+    if (!instruction.empty()) {
+      out += indentation + instruction + "\n";
+    }
+  }
+  if (!name.empty()) {
+    out += indentation;
+    out += '<';
+    out += name;
+    for (const XmlAttribute& attribute : attributes) {
+      if (!attribute.name.empty()) {
+        AppendAttribute(out, attribute);
+      }
+    }
+    if (children.empty() && value.empty()) {
+      out += "/>";
+      out += lineEnd;
+      return;
+    }
+    out += '>';
+  }
+  AppendEscaped(out, value, false);
+  if (!children.empty() && value.empty()) {
+    out += lineEnd;
+  }
+  for (const XmlObject& child : children) {
+    child.Write(out, compact);
+  }
+  if (!name.empty()) {
+    if (!children.empty()) {
+      out += indentation;
+    }
+    out += "</";
+    out += name;
+    out += '>';
+    out += lineEnd;
+  }
+}
+
+std::ostream& operator<<(std::ostream& stream, const XmlObject& object) { return stream << object.ToString(false); }
+
+// ---- attributes
+
+std::string XmlObject::GetAttributeValue(std::string_view attribute, std::string_view defaultValue) const {
+  const XmlAttribute* found = FindAttribute(attribute);
+  return found == nullptr ? std::string(defaultValue) : found->value;
+}
+
+XmlAttribute* XmlObject::FindAttribute(std::string_view attribute) {
+  const auto found = FindIn(attributes, attribute);
+  return found == attributes.end() ? nullptr : &*found;
+}
+
+const XmlAttribute* XmlObject::FindAttribute(std::string_view attribute) const {
+  const auto found = FindIn(attributes, attribute);
+  return found == attributes.end() ? nullptr : &*found;
+}
+
+XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, const char* newValue) {
+  return SetIn(attributes, attribute, newValue == nullptr ? "" : newValue);
+}
+
+XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, const std::string& newValue) {
+  return SetIn(attributes, attribute, newValue);
+}
+
+XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, int newValue) {
+  return SetIn(attributes, attribute, Streamed(newValue));
+}
+
+XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, double newValue) {
+  return SetIn(attributes, attribute, Streamed(newValue));
+}
+
+void XmlObject::RemoveAttribute(std::string_view attribute) {
+  std::erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+}
+
+std::string XmlObject::GetDeclarationValue(std::string_view attribute, std::string_view defaultValue) const {
+  const auto found = FindIn(declaration, attribute);
+  return found == declaration.end() ? std::string(defaultValue) : found->value;
+}
+
+XmlAttribute* XmlObject::FindDeclaration(std::string_view attribute) {
+  const auto found = FindIn(declaration, attribute);
+  return found == declaration.end() ? nullptr : &*found;
+}
+
+XmlAttribute* XmlObject::SetDeclaration(std::string_view attribute, const std::string& newValue) {
+  return SetIn(declaration, attribute, newValue);
+}
+
+void XmlObject::RemoveDeclaration(std::string_view attribute) {
+  std::erase_if(declaration, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+}
+
+// ---- children
+
+XmlObject* XmlObject::AddChild(const XmlObject& child) { return AddChild(XmlObject(child)); }
+
+XmlObject* XmlObject::AddChild(XmlObject&& child) {
+  // Sisters that move take the links of their own subtree along but lose the one to this object.
+  const bool sistersMove = children.size() == children.capacity();
+  XmlObject& added = children.emplace_back(std::move(child));
+  added.parent = this;
+  added.depth = depth + 1;
+  added.Relink();
+  if (sistersMove) {
+    for (XmlObject& sister : children) {
+      sister.parent = this;
+    }
+  }
+  return &added;
+}
+
+void XmlObject::RemoveChildren(std::string_view childName) {
+  std::erase_if(children, [&](const XmlObject& child) { return child.name == childName; });
+  Relink();
+}
+
+std::list<XmlObject*> XmlObject::FindChildren(std::string_view childName) {
+  std::list<XmlObject*> found;
+  for (XmlObject& child : children) {
+    if (child.name == childName) {
+      found.push_back(&child);
+    }
+  }
+  return found;
+}
+
+// ---- queries
+
+std::list<XmlObject*> XmlObject::FindAll(const std::string& path, const std::string& filter) {
+  const std::size_t slash = path.find('/');
+  const std::string head = path.substr(0, slash);
+  std::list<XmlObject*> found;
+  const std::size_t open = head.find('[');
+  const std::size_t close = open == std::string::npos ? open : head.find(']', open);
+  if (head == ".") {
+    found.push_back(this);
+  } else if (head == "..") {
+    if (parent != nullptr) {
+      found.push_back(parent);
+    }
+  } else if (close != std::string::npos) {
+    found = FindAll(head.substr(0, open), head.substr(open + 1, close - open - 1));
+  } else {
+    found = FindChildren(head);
+  }
+  if (slash == std::string::npos) {
+    std::erase_if(found, [&](XmlObject* element) { return !element->Matches(filter); });
+    return found;
+  }
+  const std::string rest = path.substr(slash + 1);
+  std::list<XmlObject*> all;
+  for (XmlObject* element : found) {
+    all.splice(all.end(), element->FindAll(rest, filter));
+  }
+  return all;
+}
+
+XmlObject* XmlObject::FindFirstMatch(const std::string& path, const std::string& filter) {
+  const std::list<XmlObject*> found = FindAll(path, filter);
+  return found.empty() ? nullptr : found.front();
+}
+
+bool XmlObject::Matches(const std::string& filter) {
+  if (filter.empty()) {
+    return true;
+  }
+  if (filter.find('=') == std::string::npos) {
+    return filter == value;
+  }
+  const std::string text = "<filter " + filter + "/>";
+  XmlObject pairs;
+  XmlParser(text, true).ParseElement(pairs);
+  bool passed = true;
+  for (const XmlAttribute& pair : pairs.attributes) {
+    passed = PassesPair(pair.name, pair.value) && passed;
+  }
+  return passed;
+}
+
+bool XmlObject::PassesPair(std::string_view key, std::string_view wanted) const {
+  const char kind = key.empty() ? '\0' : key.front();
+  if (kind == '@' || kind == '$') {
+    key.remove_prefix(1);
+  }
+  constexpr std::string_view kForms = "#!*";
+  const char form = !key.empty() && kForms.find(key.front()) != std::string_view::npos ? key.front() : '=';
+  key.remove_prefix(form == '=' ? 0 : 1);
+  switch (kind) {
+    case '@':
+      return PassesAttribute(form, key, wanted);
+    case '$':
+      return PassesProperty(form, key, wanted);
+    default:
+      return PassesChild(form, key, wanted);
+  }
+}
+
+bool XmlObject::PassesAttribute(char form, std::string_view attribute, std::string_view wanted) const {
+  const XmlAttribute* found = FindAttribute(attribute);
+  const std::string_view actual = found == nullptr ? std::string_view() : std::string_view(found->value);
+  switch (form) {
+    case '#':
+      return ContainsIgnoringCase(actual, wanted);
+    case '!':
+      return !CDMUtil::EqualIgnoreCase(actual, wanted);
+    case '*':
+      return found != nullptr;
+    default:
+      return CDMUtil::EqualIgnoreCase(actual, wanted);
+  }
+}
+
+bool XmlObject::PassesProperty(char form, std::string_view property, std::string_view wanted) const {
+  return std::any_of(children.begin(), children.end(), [&](const XmlObject& child) {
+    return child.name == kProperty && child.PassesAttribute('=', "name", property) &&
+           (form == '*' || child.PassesAttribute(form, "value", wanted));
+  });
+}
+
+bool XmlObject::PassesChild(char form, std::string_view child, std::string_view wanted) const {
+  bool exists = false;
+  bool passes = false;
+  for (const XmlObject& candidate : children) {
+    if (candidate.name != child) {
+      continue;
+    }
+    exists = true;
+    const bool contains = candidate.value.find(wanted) != std::string::npos;
+    switch (form) {
+      case '#':
+        passes = passes || contains;
+        break;
+      case '!':
+        passes = passes || !contains;
+        break;
+      case '*':
+        passes = true;
+        break;
+      default:
+        passes = passes || CDMUtil::EqualIgnoreCase(candidate.value, wanted);
+        break;
+    }
+  }
+  return passes || (form == '!' && !exists);
+}
+
+std::string XmlObject::GetValue(const std::string& path, const std::string& defaultValue) {
+  const std::size_t slash = path.rfind('/');
+  XmlObject* element = slash == std::string::npos ? this : FindFirstMatch(path.substr(0, slash), "");
+  const std::string last = slash == std::string::npos ? path : path.substr(slash + 1);
+  if (element == nullptr) {
+    return defaultValue;
+  }
+  if (last.starts_with('@')) {
+    return element->GetAttributeValue(last.substr(1), defaultValue);
+  }
+  const std::list<XmlObject*> found = element->FindChildren(last);
+  return found.empty() ? defaultValue : found.front()->value;
+}
+
+std::string XmlObject::GetValueFromFile(const std::string& path, const std::string& outerName,
+                                        const std::string& innerName) {
+  XmlObject tree;
+  if (!tree.LoadFromFile(path, false, false, -1)) {
+    return {};
+  }
+  for (const XmlObject& outer : tree.children) {
+    if (!CDMUtil::EqualIgnoreCase(outer.name, outerName)) {
+      continue;
+    }
+    for (const XmlObject& inner : outer.children) {
+      if (CDMUtil::EqualIgnoreCase(inner.name, innerName)) {
+        return inner.value;
+      }
+    }
+  }
+  return {};
+}
+
+// ---- properties
+
+XmlObject* XmlObject::AddProperty(const std::string& property, const std::string& caption,
+                                  const std::string& propertyValue, int kind) {
+  XmlObject element;
+  element.name = kProperty;
+  element.SetAttribute("name", property);
+  element.SetAttribute("caption", caption);
+  element.SetAttribute("value", propertyValue);
+  switch (kind) {
+    case 1:
+      element.SetAttribute("logical", "1");
+      break;
+    case 3:
+      element.SetAttribute("techDetail", "1");
+      break;
+    case 4:
+      element.SetAttribute("hexData", "1");
+      break;
+    default:
+      break;
+  }
+  return AddChild(std::move(element));
+}
+
+}  // namespace panelglow

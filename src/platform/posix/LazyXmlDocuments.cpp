@@ -1,0 +1,23 @@
+#include "platform/posix/LazyXmlDocuments.h"
+
+#include <cstdio>
+#include <string>
+
+#include "platform/posix/ModuleLoader.h"
+
+namespace panelglow::platform::posix {
+
+std::unique_ptr<XmlDocument> LazyXmlDocuments::Create() {
+  std::call_once(once_, [this] {
+    using Getter = XmlDocuments* (*)();
+    std::string error;
+    if (const auto get = reinterpret_cast<Getter>(LoadSymbol("panelglow-xml", "PanelglowXmlDocuments", error))) {
+      documents_ = get();
+    } else {
+      std::fprintf(stderr, "structured documents are not available: %s\n", error.c_str());
+    }
+  });
+  return documents_ == nullptr ? nullptr : documents_->Create();
+}
+
+}  // namespace panelglow::platform::posix

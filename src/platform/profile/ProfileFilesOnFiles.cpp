@@ -1,0 +1,103 @@
+#include "platform/profile/ProfileFilesOnFiles.h"
+
+#include <string>
+
+#include "platform/Text.h"
+#include "platform/profile/ProfileText.h"
+
+namespace panelglow::platform::profile {
+
+namespace {
+
+constexpr std::string_view kWideMark = "\xFF\xFE";
+
+bool IsWide(std::string_view bytes) { return bytes.starts_with(kWideMark); }
+
+wstring WideOf(std::string_view bytes) {
+  if (!IsWide(bytes)) {
+    return WideFromCodePage(bytes);
+  }
+  wstring text;
+  text.reserve(bytes.size() / 2);
+  for (std::size_t i = kWideMark.size(); i + 1 < bytes.size(); i += 2) {
+    text.push_back(static_cast<char16_t>(static_cast<unsigned char>(bytes[i]) |
+                                         static_cast<unsigned char>(bytes[i + 1]) << 8U));
+  }
+  return text;
+}
+
+std::string WideBytes(std::u16string_view text) {
+  std::string bytes(kWideMark);
+  for (const char16_t c : text) {
+    bytes.push_back(static_cast<char>(static_cast<unsigned char>(c & 0xFF)));
+    bytes.push_back(static_cast<char>(static_cast<unsigned char>(c >> 8U)));
+  }
+  return bytes;
+}
+
+std::string NarrowOf(std::string bytes) { return IsWide(bytes) ? CodePageFromWide(WideOf(bytes)) : bytes; }
+
+// The three kinds of answer that one look-up can give.
+template <class Char>
+std::size_t Answer(std::basic_string_view<Char> text, std::optional<std::basic_string_view<Char>> section,
+                   std::optional<std::basic_string_view<Char>> key, std::basic_string_view<Char> fallback,
+                   std::span<Char> buffer) {
+  if (!section) {
+    const auto names = SectionNames<Char>(text);
+    return CopyList<Char>(names, buffer);
+  }
+  if (!key) {
+    const auto names = KeyNames<Char>(text, *section);
+    return names.empty() ? CopyText<Char>(fallback, buffer) : CopyList<Char>(names, buffer);
+  }
+  if (const auto value = FindValue<Char>(text, *section, *key)) {
+    return CopyText<Char>(*value, buffer);
+  }
+  while (!fallback.empty() && fallback.back() == Char(' ')) {
+    fallback.remove_suffix(1);
+  }
+  return CopyText<Char>(fallback, buffer);
+}
+
+}  // namespace
+
+std::size_t ProfileFilesOnFiles::GetValue(std::optional<std::string_view> section, std::optional<std::string_view> key,
+                                          std::string_view fallback, std::span<char> buffer, std::string_view path) {
+  const std::string text = NarrowOf(files_.Read(path).value_or(std::string()));
+  return Answer<char>(text, section, key, fallback, buffer);
+}
+
+std::size_t ProfileFilesOnFiles::GetValue(std::optional<std::u16string_view> section,
+                                          std::optional<std::u16string_view> key, std::u16string_view fallback,
+                                          std::span<char16_t> buffer, std::u16string_view path) {
+  const wstring text = WideOf(files_.Read(Utf8FromWide(path)).value_or(std::string()));
+  return Answer<char16_t>(text, section, key, fallback, buffer);
+}
+
+std::size_t ProfileFilesOnFiles::GetSection(std::string_view section, std::span<char> buffer, std::string_view path) {
+  const std::string text = NarrowOf(files_.Read(path).value_or(std::string()));
+  return CopyList<char>(SectionLines<char>(text, section), buffer);
+}
+
+bool ProfileFilesOnFiles::SetValue(std::string_view section, std::optional<std::string_view> key,
+                                   std::optional<std::string_view> value, std::string_view path) {
+  const std::string bytes = files_.ReadLocked(path).value_or(std::string());
+  if (!IsWide(bytes)) {
+    return files_.WriteLocked(path, WithValue<char>(bytes, section, key, value));
+  }
+  const auto widen = [](std::string_view text) { return WideFromCodePage(text); };
+  const wstring wideKey = widen(key.value_or(""));
+  const wstring wideValue = widen(value.value_or(""));
+  return SetValue(widen(section), key ? std::optional<std::u16string_view>(wideKey) : std::nullopt,
+                  value ? std::optional<std::u16string_view>(wideValue) : std::nullopt, WideFromUtf8(path));
+}
+
+bool ProfileFilesOnFiles::SetValue(std::u16string_view section, std::optional<std::u16string_view> key,
+                                   std::optional<std::u16string_view> value, std::u16string_view path) {
+  const std::string file = Utf8FromWide(path);
+  const std::string bytes = files_.ReadLocked(file).value_or(std::string());
+  const wstring edited = WithValue<char16_t>(WideOf(bytes), section, key, value);
+  return files_.WriteLocked(file, IsWide(bytes) ? WideBytes(edited) : CodePageFromWide(edited));
+}
+
+}  // namespace panelglow::platform::profile

@@ -1,0 +1,313 @@
+#include "platform/profile/ProfileText.h"
+
+#include <algorithm>
+
+namespace panelglow::platform::profile {
+
+namespace {
+
+template <class Char>
+using View = std::basic_string_view<Char>;
+
+template <class Char>
+constexpr bool IsBlank(Char c) {
+  return c == Char(' ') || c == Char('\t');
+}
+
+template <class Char>
+constexpr bool IsLineEnd(Char c) {
+  return c == Char('\n') || c == Char('\r');
+}
+
+template <class Char>
+constexpr Char Lower(Char c) {
+  return c >= Char('A') && c <= Char('Z') ? static_cast<Char>(c + 32) : c;
+}
+
+template <class Char>
+bool SameName(View<Char> a, View<Char> b) {
+  return a.size() == b.size() &&
+         std::equal(a.begin(), a.end(), b.begin(), [](Char x, Char y) { return Lower(x) == Lower(y); });
+}
+
+template <class Char>
+View<Char> TrimBlanks(View<Char> text) {
+  while (!text.empty() && IsBlank(text.front())) {
+    text.remove_prefix(1);
+  }
+  while (!text.empty() && IsBlank(text.back())) {
+    text.remove_suffix(1);
+  }
+  return text;
+}
+
+// What stands before the first NUL.
+template <class Char>
+View<Char> BeforeNul(View<Char> text) {
+  return text.substr(0, text.find(Char(0)));
+}
+
+// End of the line that contains `at`: the position of its line end, or the text's end.
+template <class Char>
+std::size_t LineEnd(View<Char> text, std::size_t at) {
+  const std::size_t feed = std::min(text.find(Char('\n'), at), text.size());
+  const std::size_t carriage = text.substr(at, feed - at).find(Char('\r'));
+  return carriage == View<Char>::npos ? feed : at + carriage;
+}
+
+// Begin of the line behind the line end at `end`; CR LF is one line end.
+template <class Char>
+std::size_t NextLine(View<Char> text, std::size_t end) {
+  if (end < text.size() && text[end] == Char('\r') && end + 1 < text.size() && text[end + 1] == Char('\n')) {
+    return end + 2;
+  }
+  return std::min(end + 1, text.size());
+}
+
+template <class Char>
+struct Header {
+  std::size_t line = 0;  // where the header's line begins
+  std::size_t body = 0;  // where the line behind it begins
+  View<Char> name;
+};
+
+// The first section header at or behind `from`, which is the begin of a line.
+template <class Char>
+std::optional<Header<Char>> NextHeader(View<Char> text, std::size_t from) {
+  for (std::size_t bracket = text.find(Char('['), from); bracket != View<Char>::npos;
+       bracket = text.find(Char('['), bracket + 1)) {
+    std::size_t line = bracket;
+    while (line > from && IsBlank(text[line - 1])) {
+      --line;
+    }
+    if (line > from && !IsLineEnd(text[line - 1])) {
+      continue;  // not the first character of its line
+    }
+    const std::size_t end = LineEnd(text, bracket);
+    const std::size_t close = text.substr(0, end).find(Char(']'), bracket);
+    if (close != View<Char>::npos) {
+      return Header<Char>{line, NextLine(text, end), TrimBlanks(text.substr(bracket + 1, close - bracket - 1))};
+    }
+  }
+  return std::nullopt;
+}
+
+template <class Char>
+struct Section {
+  std::size_t header = 0;
+  std::size_t body = 0;
+  std::size_t end = 0;  // begin of the next header's line, or the text's end
+};
+
+template <class Char>
+std::optional<Section<Char>> FindSection(View<Char> text, View<Char> name) {
+  const View<Char> wanted = TrimBlanks(name);
+  for (std::optional<Header<Char>> header = NextHeader(text, 0); header; header = NextHeader(text, header->body)) {
+    if (SameName(header->name, wanted)) {
+      const std::optional<Header<Char>> next = NextHeader(text, header->body);
+      return Section<Char>{header->line, header->body, next ? next->line : text.size()};
+    }
+  }
+  return std::nullopt;
+}
+
+template <class Char>
+struct Line {
+  std::size_t begin = 0;
+  std::size_t end = 0;   // position of the line end
+  std::size_t next = 0;  // begin of the next line
+  View<Char> content;    // without blanks around it
+  std::size_t equals = View<Char>::npos;  // in content
+
+  [[nodiscard]] View<Char> Key() const { return TrimBlanks(content.substr(0, equals)); }
+  [[nodiscard]] View<Char> Value() const { return TrimBlanks(BeforeNul(content.substr(equals + 1))); }
+  [[nodiscard]] bool IsEntry() const { return equals != View<Char>::npos; }
+};
+
+// Calls `use` with each line of [begin, end) that is neither blank nor a comment, until it returns true.
+template <class Char, class Use>
+void EachLine(View<Char> text, std::size_t begin, std::size_t end, Use use) {
+  for (std::size_t at = begin; at < end;) {
+    Line<Char> line;
+    line.begin = at;
+    line.end = std::min(LineEnd(text, at), end);
+    line.next = NextLine(text, line.end);
+    line.content = TrimBlanks(text.substr(at, line.end - at));
+    at = line.next;
+    if (line.content.empty() || line.content.front() == Char(';')) {
+      continue;
+    }
+    line.equals = line.content.find(Char('='));
+    if (use(line)) {
+      return;
+    }
+  }
+}
+
+template <class Char>
+View<Char> WithoutQuotes(View<Char> value) {
+  const bool quoted = value.size() >= 2 && value.front() == value.back() &&
+                      (value.front() == Char('"') || value.front() == Char('\''));
+  return quoted ? value.substr(1, value.size() - 2) : value;
+}
+
+template <class Char>
+std::basic_string<Char> LineBreakOf(View<Char> text) {
+  const std::size_t end = LineEnd(text, 0);
+  if (end < text.size() && text[end] == Char('\n')) {
+    return {Char('\n')};
+  }
+  return {Char('\r'), Char('\n')};
+}
+
+}  // namespace
+
+template <class Char>
+std::optional<View<Char>> FindValue(View<Char> text, View<Char> section, View<Char> key) {
+  const std::optional<Section<Char>> found = FindSection(text, section);
+  std::optional<View<Char>> value;
+  if (found) {
+    const View<Char> wanted = TrimBlanks(key);
+    EachLine(text, found->body, found->end, [&](const Line<Char>& line) {
+      if (line.IsEntry() && SameName(line.Key(), wanted)) {
+        value = WithoutQuotes(line.Value());
+      }
+      return value.has_value();
+    });
+  }
+  return value;
+}
+
+template <class Char>
+std::basic_string<Char> SectionNames(View<Char> text) {
+  std::basic_string<Char> names;
+  for (std::optional<Header<Char>> header = NextHeader(text, 0); header; header = NextHeader(text, header->body)) {
+    names.append(header->name).push_back(Char(0));
+  }
+  return names;
+}
+
+template <class Char>
+std::basic_string<Char> KeyNames(View<Char> text, View<Char> section) {
+  std::basic_string<Char> names;
+  if (const std::optional<Section<Char>> found = FindSection(text, section)) {
+    EachLine(text, found->body, found->end, [&](const Line<Char>& line) {
+      if (line.IsEntry()) {
+        names.append(line.Key()).push_back(Char(0));
+      }
+      return false;
+    });
+  }
+  return names;
+}
+
+template <class Char>
+std::basic_string<Char> SectionLines(View<Char> text, View<Char> section) {
+  std::basic_string<Char> lines;
+  if (const std::optional<Section<Char>> found = FindSection(text, section)) {
+    EachLine(text, found->body, found->end, [&](const Line<Char>& line) {
+      if (line.IsEntry()) {
+        lines.append(line.Key());
+        lines.push_back(Char('='));
+        lines.append(line.Value());
+      } else {
+        lines.append(BeforeNul(line.content));
+      }
+      lines.push_back(Char(0));
+      return false;
+    });
+  }
+  return lines;
+}
+
+template <class Char>
+std::basic_string<Char> WithValue(View<Char> text, View<Char> section, std::optional<View<Char>> key,
+                                  std::optional<View<Char>> value) {
+  std::basic_string<Char> result(text);
+  const std::basic_string<Char> lineBreak = LineBreakOf(text);
+  const std::optional<Section<Char>> found = FindSection(text, section);
+  if (!key) {
+    return found ? result.erase(found->header, found->end - found->header) : result;
+  }
+  std::basic_string<Char> entry;
+  if (value) {
+    entry.append(TrimBlanks(*key));
+    entry.push_back(Char('='));
+    entry.append(*value);
+  }
+  if (!found) {
+    if (value) {
+      if (!result.empty() && !IsLineEnd(result.back())) {
+        result += lineBreak;
+      }
+      result.push_back(Char('['));
+      result.append(TrimBlanks(section));
+      result.push_back(Char(']'));
+      result += lineBreak + entry + lineBreak;
+    }
+    return result;
+  }
+  std::optional<Line<Char>> old;
+  std::size_t behindLast = found->body;
+  EachLine(text, found->body, found->end, [&](const Line<Char>& line) {
+    behindLast = line.next;
+    if (line.IsEntry() && SameName(line.Key(), TrimBlanks(*key))) {
+      old = line;
+    }
+    return old.has_value();
+  });
+  if (old) {
+    return value ? result.replace(old->begin, old->end - old->begin, entry)
+                 : result.erase(old->begin, old->next - old->begin);
+  }
+  if (value) {
+    if (behindLast > 0 && !IsLineEnd(result[behindLast - 1])) {
+      entry = lineBreak + entry;
+    }
+    result.insert(behindLast, entry + lineBreak);
+  }
+  return result;
+}
+
+template <class Char>
+std::size_t CopyText(View<Char> text, std::span<Char> buffer) {
+  if (buffer.empty()) {
+    return 0;
+  }
+  const std::size_t length = std::min(text.size(), buffer.size() - 1);
+  std::copy_n(text.begin(), length, buffer.begin());
+  buffer[length] = Char(0);
+  return length;
+}
+
+template <class Char>
+std::size_t CopyList(View<Char> list, std::span<Char> buffer) {
+  if (buffer.size() < 2) {
+    return CopyText(View<Char>(), buffer);
+  }
+  const std::size_t length = list.size() + 1 >= buffer.size() ? buffer.size() - 2 : list.size();
+  std::copy_n(list.begin(), length, buffer.begin());
+  buffer[length] = Char(0);
+  if (length + 1 < buffer.size()) {
+    buffer[length + 1] = Char(0);
+  }
+  return length;
+}
+
+template std::optional<View<char>> FindValue(View<char>, View<char>, View<char>);
+template std::optional<View<char16_t>> FindValue(View<char16_t>, View<char16_t>, View<char16_t>);
+template std::string SectionNames(View<char>);
+template std::u16string SectionNames(View<char16_t>);
+template std::string KeyNames(View<char>, View<char>);
+template std::u16string KeyNames(View<char16_t>, View<char16_t>);
+template std::string SectionLines(View<char>, View<char>);
+template std::u16string SectionLines(View<char16_t>, View<char16_t>);
+template std::string WithValue(View<char>, View<char>, std::optional<View<char>>, std::optional<View<char>>);
+template std::u16string WithValue(View<char16_t>, View<char16_t>, std::optional<View<char16_t>>,
+                                  std::optional<View<char16_t>>);
+template std::size_t CopyText(View<char>, std::span<char>);
+template std::size_t CopyText(View<char16_t>, std::span<char16_t>);
+template std::size_t CopyList(View<char>, std::span<char>);
+template std::size_t CopyList(View<char16_t>, std::span<char16_t>);
+
+}  // namespace panelglow::platform::profile

@@ -1,0 +1,253 @@
+// Structured XML documents by libxml2. A module of its own: it is loaded when the first document is made, so that a
+// run without one does not pay for it.
+#include <libxml/parser.h>
+#include <libxml/tree.h>
+#include <libxml/xmlschemas.h>
+
+#include <algorithm>
+#include <fstream>
+#include <iterator>
+#include <limits>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "platform/XmlDocuments.h"
+
+namespace panelglow::platform {
+
+namespace {
+
+template <auto Free>
+struct Deleter {
+  template <class T>
+  void operator()(T* object) const {
+    Free(object);
+  }
+};
+using Document = std::unique_ptr<xmlDoc, Deleter<xmlFreeDoc>>;
+using ParserContext = std::unique_ptr<xmlParserCtxt, Deleter<xmlFreeParserCtxt>>;
+using SchemaParser = std::unique_ptr<xmlSchemaParserCtxt, Deleter<xmlSchemaFreeParserCtxt>>;
+using Schema = std::unique_ptr<xmlSchema, Deleter<xmlSchemaFree>>;
+using Validator = std::unique_ptr<xmlSchemaValidCtxt, Deleter<xmlSchemaFreeValidCtxt>>;
+
+constexpr const char* kSchemaInstance = "http://www.w3.org/2001/XMLSchema-instance";
+constexpr std::size_t kLargestFile_bytes = std::size_t{64} << 20U;
+
+const xmlChar* Xml(const std::string& text) { return reinterpret_cast<const xmlChar*>(text.c_str()); }
+
+std::string Plain(const xmlChar* text) { return text == nullptr ? "" : reinterpret_cast<const char*>(text); }
+
+std::string PathOf(const xmlNode* node) {
+  if (node == nullptr) {
+    return {};
+  }
+  xmlChar* path = xmlGetNodePath(const_cast<xmlNode*>(node));
+  std::string text = Plain(path);
+  xmlFree(path);
+  return text;
+}
+
+std::optional<std::string> ReadFile(std::string_view path) {
+  std::string native(path);
+  std::replace(native.begin(), native.end(), '\\', '/');
+  std::ifstream file(native, std::ios::binary | std::ios::ate);
+  const auto size = file ? static_cast<std::streamoff>(file.tellg()) : std::streamoff{-1};
+  if (size < 0 || static_cast<std::size_t>(size) > kLargestFile_bytes) {
+    return std::nullopt;
+  }
+  file.seekg(0);
+  std::string bytes(static_cast<std::size_t>(size), '\0');
+  file.read(bytes.data(), size);
+  return file.bad() || file.gcount() != size ? std::nullopt : std::optional<std::string>(std::move(bytes));
+}
+
+// What callbacks of one operation report.
+struct Findings {
+  std::vector<XmlProblem> problems;
+
+  void Add(const xmlError* error, const xmlNode* node) {
+    XmlProblem problem;
+    problem.code = error->code;
+    problem.reason = error->message == nullptr ? "unknown problem\n" : error->message;
+    if (error->line > 0) {
+      problem.reason = "line " + std::to_string(error->line) + ": " + problem.reason;
+    }
+    if (!problem.reason.ends_with('\n')) {
+      problem.reason += '\n';
+    }
+    problem.location = PathOf(node);
+    problems.push_back(std::move(problem));
+  }
+};
+
+#if LIBXML_VERSION >= 21200
+using ErrorRecord = const xmlError*;
+#else
+using ErrorRecord = xmlError*;
+#endif
+
+void NoteParseError(void* userData, ErrorRecord error) {
+  auto* context = static_cast<xmlParserCtxt*>(userData);
+  static_cast<Findings*>(context->_private)->Add(error, context->node);
+}
+
+void NoteSchemaError(void* userData, ErrorRecord error) {
+  static_cast<Findings*>(userData)->Add(error, static_cast<const xmlNode*>(error->node));
+}
+
+// A document type declaration can declare entities that grow without bound or name files: none is let in.
+void RefuseDocumentType(void* userData, const xmlChar* name, const xmlChar*, const xmlChar*) {
+  auto* context = static_cast<xmlParserCtxt*>(userData);
+  static_cast<Findings*>(context->_private)
+      ->problems.push_back({XML_ERR_DOCTYPE_NOT_FINISHED,
+                            "a document type declaration (" + Plain(name) + ") is not allowed here\n", ""});
+  context->wellFormed = 0;
+  xmlStopParser(context);
+}
+
+xmlParserInputPtr RefuseEntity(const char*, const char*, xmlParserCtxtPtr) { return nullptr; }
+
+Document Parse(const std::string& bytes, Findings& findings) {
+  const ParserContext context(xmlNewParserCtxt());
+  if (!context || bytes.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
+    throw XmlComponentError("the XML component has no memory left");
+  }
+  context->_private = &findings;
+  context->sax->internalSubset = RefuseDocumentType;
+  context->sax->serror = NoteParseError;
+  Document document(xmlCtxtReadMemory(context.get(), bytes.data(), static_cast<int>(bytes.size()), nullptr, nullptr,
+                                      XML_PARSE_NONET | XML_PARSE_COMPACT));
+  if (context->wellFormed == 0 || !findings.problems.empty()) {
+    document.reset();
+  }
+  return document;
+}
+
+class LibXmlDocument : public XmlDocument {
+ public:
+  bool Load(std::string_view path, XmlProblem& problem) override {
+    Findings findings;
+    document_ = LoadFile(path, findings);
+    if (!document_) {
+      problem = findings.problems.empty() ? XmlProblem{XML_ERR_DOCUMENT_EMPTY, "the file is no XML document\n", ""}
+                                          : findings.problems.front();
+    }
+    return document_ != nullptr;
+  }
+
+  void SetRootAttribute(std::string_view name, std::string_view value) override {
+    xmlNode* root = document_ ? xmlDocGetRootElement(document_.get()) : nullptr;
+    if (root == nullptr) {
+      throw XmlComponentError("the document has no root element");
+    }
+    const std::string text(value);
+    if (name.starts_with("xmlns:")) {
+      const std::string prefix(name.substr(6));
+      if (xmlSearchNs(document_.get(), root, Xml(prefix)) == nullptr) {
+        xmlNewNs(root, Xml(text), Xml(prefix));
+      }
+      return;
+    }
+    const std::size_t colon = name.find(':');
+    if (colon == std::string_view::npos) {
+      xmlSetProp(root, Xml(std::string(name)), Xml(text));
+      return;
+    }
+    const std::string prefix(name.substr(0, colon));
+    xmlNs* space = xmlSearchNs(document_.get(), root, Xml(prefix));
+    if (space == nullptr) {
+      throw XmlComponentError("the name space prefix \"" + prefix + "\" is not declared");
+    }
+    xmlSetNsProp(root, space, Xml(std::string(name.substr(colon + 1))), Xml(text));
+  }
+
+  std::string Text() override {
+    if (!document_) {
+      throw XmlComponentError("no document is loaded");
+    }
+    xmlChar* bytes = nullptr;
+    int size = 0;
+    xmlDocDumpMemory(document_.get(), &bytes, &size);
+    std::string text = bytes == nullptr ? std::string() : std::string(reinterpret_cast<char*>(bytes), static_cast<std::size_t>(size));
+    xmlFree(bytes);
+    return text;
+  }
+
+  std::vector<XmlProblem> LoadAndValidate(std::string_view path) override {
+    Findings findings;
+    document_ = LoadFile(path, findings);
+    if (!document_) {
+      if (findings.problems.empty()) {
+        findings.problems.push_back({XML_ERR_DOCUMENT_EMPTY, "the file is no XML document\n", ""});
+      }
+      return findings.problems;
+    }
+    const xmlNode* root = xmlDocGetRootElement(document_.get());
+    xmlChar* named = xmlGetNsProp(const_cast<xmlNode*>(root), Xml("noNamespaceSchemaLocation"), Xml(kSchemaInstance));
+    const std::string schemaPath = Plain(named);
+    xmlFree(named);
+    const Schema schema = LoadSchema(schemaPath, findings);
+    if (!schema) {
+      findings.problems.insert(findings.problems.begin(),
+                               {XML_SCHEMAP_FAILED_LOAD, "the schema file \"" + schemaPath + "\" cannot be used\n", "/"});
+      return findings.problems;
+    }
+    const Validator validator(xmlSchemaNewValidCtxt(schema.get()));
+    if (!validator) {
+      throw XmlComponentError("the XML component has no memory left");
+    }
+    xmlSchemaSetValidStructuredErrors(validator.get(), NoteSchemaError, &findings);
+    const int result = xmlSchemaValidateDoc(validator.get(), document_.get());
+    if (result != 0 && findings.problems.empty()) {
+      findings.problems.push_back({result, "the document does not fit its schema\n", "/"});
+    }
+    return findings.problems;
+  }
+
+ private:
+  static Document LoadFile(std::string_view path, Findings& findings) {
+    const std::optional<std::string> bytes = ReadFile(path);
+    if (!bytes) {
+      findings.problems.push_back({XML_IO_LOAD_ERROR, "the file cannot be read\n", ""});
+      return nullptr;
+    }
+    return Parse(*bytes, findings);
+  }
+
+  static Schema LoadSchema(const std::string& path, Findings& findings) {
+    const std::optional<std::string> bytes = path.empty() ? std::nullopt : ReadFile(path);
+    if (!bytes) {
+      return nullptr;
+    }
+    if (!Parse(*bytes, findings)) {
+      return nullptr;  // not well formed, or with a document type declaration
+    }
+    const SchemaParser parser(xmlSchemaNewMemParserCtxt(bytes->data(), static_cast<int>(bytes->size())));
+    if (!parser) {
+      throw XmlComponentError("the XML component has no memory left");
+    }
+    xmlSchemaSetParserStructuredErrors(parser.get(), NoteSchemaError, &findings);
+    return Schema(xmlSchemaParse(parser.get()));
+  }
+
+  Document document_;
+};
+
+class LibXmlDocuments : public XmlDocuments {
+ public:
+  LibXmlDocuments() {
+    xmlInitParser();
+    xmlSetExternalEntityLoader(RefuseEntity);
+  }
+  std::unique_ptr<XmlDocument> Create() override { return std::make_unique<LibXmlDocument>(); }
+};
+
+}  // namespace
+
+}  // namespace panelglow::platform
+
+extern "C" panelglow::platform::XmlDocuments* PanelglowXmlDocuments() {
+  static panelglow::platform::LibXmlDocuments documents;
+  return &documents;
+}
