@@ -1,0 +1,134 @@
+// The only road to the machine's hardware: I/O ports, PCI configuration space, physical memory, model-specific
+// registers, the firmware segment. Each operation is one request record to the privileged driver; nothing is
+// interpreted here.
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <span>
+#include <string>
+
+#include "platform/DriverDevice.h"
+
+namespace panelglow {
+
+/// Legal on an object without a driver as well: reads give 0, writes false, PCI operations 0x81. No operation throws.
+/// Two threads may use one object: each request is a single call. Requests that belong together are guarded by the
+/// board library's mutex.
+class CDevio {
+ public:
+  /// How the last load of the driver's service ended.
+  enum class LoadState : std::uint32_t {
+    kNotStarted = 0,   // nothing tried yet, or stopped before the start
+    kRunning = 1,      // started now, or ran already
+    kStartFailed = 2,  // for another reason than a missing file
+    kNoBinary = 3,     // the driver's file is missing; the service was deleted again
+  };
+
+  /// The answer of a mapping request: the five words of the 32-bit record.
+  using MappingRecord = std::array<std::uint32_t, 5>;
+
+  /// Loads the driver under its present names, and when its file is missing under its older ones.
+  CDevio();
+  CDevio(std::string service, std::string display, std::string deviceLink, std::string image);
+
+  /// The image path is "system32\drivers\" with the service's name and ".sys".
+  CDevio(const std::string& service, const std::string& display, const std::string& deviceLink);
+
+  /// Closes the device. The service stays running.
+  virtual ~CDevio() = default;
+  CDevio(const CDevio&) = delete;
+  CDevio& operator=(const CDevio&) = delete;
+
+  [[nodiscard]] bool IsDriverLoaded() const { return device != nullptr; }
+  [[nodiscard]] LoadState GetLoadState() const { return loadState; }
+
+  /// Registers the service if it is new, starts it and opens the device. True when the device is open.
+  bool LoadDriver();
+
+  /// One debug line with the driver's name and version.
+  void LogDriverVersion();
+
+  // ---- I/O ports
+  std::uint8_t InportByte(std::uint16_t port);
+  std::uint16_t InportWord(std::uint16_t port);
+  std::uint32_t InportDword(std::uint16_t port);
+
+  /// True when the request succeeded.
+  bool OutportByte(std::uint16_t port, std::uint8_t value);
+  bool OutportWord(std::uint16_t port, std::uint16_t value);
+  void OutportDword(std::uint16_t port, std::uint32_t value);
+
+  // ---- PCI; a location holds the bus in its high byte, device in bits 7 to 3, function in bits 2 to 0. Results are
+  // the driver's status: 0 is success, and only then the out value is set to anything but 0.
+  std::uint8_t ReadPciConfigByte(std::uint16_t location, std::uint16_t reg, std::uint8_t& value);
+  std::uint8_t ReadPciConfigWord(std::uint16_t location, std::uint16_t reg, std::uint16_t& value);
+  std::uint8_t ReadPciConfigDword(std::uint16_t location, std::uint16_t reg, std::uint32_t& value);
+  std::uint8_t WritePciConfigByte(std::uint16_t location, std::uint16_t reg, std::uint8_t value);
+  std::uint8_t WritePciConfigWord(std::uint16_t location, std::uint16_t reg, std::uint16_t value);
+  std::uint8_t WritePciConfigDword(std::uint16_t location, std::uint16_t reg, std::uint32_t value);
+
+  /// The `index`-th (from 0) device of these ids, or of a class code.
+  std::uint8_t FindPciDevice(std::uint16_t vendor, std::uint16_t deviceId, std::uint16_t index,
+                             std::uint16_t& location);
+  std::uint8_t FindPciClass(std::uint32_t classCode, std::uint16_t index, std::uint16_t& location);
+
+  /// A base address register without its flag bits, with the next register as high half when it is a 64-bit one.
+  std::uint8_t ReadPciBar(std::uint16_t location, std::uint16_t reg, std::uint64_t& base);
+
+  /// The first function of the class whose four ids equal the arguments.
+  bool FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
+                          std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location);
+
+  // ---- physical memory; results are the bytes copied: `length`, or 0 on failure. `length` is limited to the buffer.
+  std::uint32_t ReadPhysicalMemory(std::uint32_t address, std::uint32_t length, std::span<std::byte> buffer);
+  std::uint32_t ReadPhysicalMemory64(std::uint32_t low, std::uint32_t high, std::uint32_t length,
+                                     std::span<std::byte> buffer);
+  std::uint32_t WritePhysicalMemory(std::uint32_t address, std::uint32_t length, std::span<const std::byte> buffer);
+  std::uint32_t WritePhysicalMemory64(std::uint32_t low, std::uint32_t high, std::uint32_t length,
+                                      std::span<const std::byte> buffer);
+
+  /// The mapped address, or 0; `record`, when given, takes the whole answer.
+  std::uint32_t MapPhysicalMemory(std::uint32_t address, std::uint32_t length, MappingRecord* record);
+
+  /// Releases a mapping and zeroes its record. False when the driver refused.
+  bool UnmapPhysicalMemory(MappingRecord& record);
+
+  // ---- others
+
+  /// In: the register's index in the low half of `value`. Out: its content. 0, or the system's error number.
+  std::uint32_t ReadMsr(std::uint64_t& value);
+
+  std::uint8_t ReadFirmwareByte(std::uint16_t segment, std::uint16_t offset);
+  std::uint16_t ReadFirmwareWord(std::uint16_t segment, std::uint16_t offset);
+
+ private:
+  struct NameSet;
+  static NameSet PresentNames();
+
+  explicit CDevio(NameSet names);
+  void SetNames(NameSet names);
+  std::uint32_t Inport(std::uint32_t code, std::uint16_t port, std::uint32_t width);
+  bool Outport(std::uint32_t code, std::uint16_t port, std::uint32_t width, std::uint32_t value,
+               std::size_t answerSize);
+  std::uint8_t PciRequest(std::uint32_t code, std::uint16_t location, std::uint16_t reg, std::uint32_t& value);
+  std::uint8_t PciSearch(std::uint32_t code, std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
+                         std::uint16_t index, std::uint16_t& location);
+  std::uint64_t Map32(std::uint32_t address, std::uint32_t length, MappingRecord* record);
+  std::uint64_t Map64(std::uint64_t address, std::uint32_t length);
+  std::uint32_t CopyFrom(std::uint64_t mapped, std::uint32_t length, std::span<std::byte> buffer);
+  std::uint32_t CopyTo(std::uint64_t mapped, std::uint32_t length, std::span<const std::byte> buffer);
+  std::uint16_t ReadFirmware(std::uint32_t code, std::uint16_t segment, std::uint16_t offset);
+
+  std::unique_ptr<platform::DriverDevice> device;  // null: not loaded
+  std::string serviceName;
+  std::string displayName;
+  std::string deviceName;
+  std::string imagePath;  // relative to the system root
+  LoadState loadState = LoadState::kNotStarted;
+};
+
+}  // namespace panelglow
