@@ -1,0 +1,82 @@
+#include "board/ChipTable.h"
+
+#include <algorithm>
+
+#include "board/chips/GIoSpaceChip.h"
+#include "board/chips/GMemorySpaceChip.h"
+
+namespace panelglow {
+
+namespace {
+
+template <class Class>
+std::unique_ptr<Chip> Make() {
+  return std::make_unique<Class>();
+}
+
+// A name is compared whole and with letter case. A row without a factory is a class still to be written; a new one
+// gets its factory here.
+constexpr ChipRow kRows[] = {
+    {1, "chip", Make<Chip>},
+    {2, "adt", nullptr},
+    {3, "adt_sio11", nullptr},
+    {4, "acpi", nullptr},
+    {5, "casl", nullptr},
+    {6, "ec", nullptr},
+    {7, "ec_wpc8763", nullptr},
+    {8, "ec_it8512", nullptr},
+    {9, "ec_it8518", nullptr},
+    {10, "fin", nullptr},
+    {11, "fin_f8000", nullptr},
+    {12, "fin_f71858", nullptr},
+    {13, "fin_f71855", nullptr},
+    {14, "fin_f71863", nullptr},
+    {15, "fin_f71808a", nullptr},
+    {16, "fin_f71808e", nullptr},
+    {17, "hudson", nullptr},
+    {19, "intelc200", nullptr},
+    {18, "ich", nullptr},
+    {20, "ite", nullptr},
+    {21, "ite_8758", nullptr},
+    {22, "ite_8721", nullptr},
+    {23, "ite_8772", nullptr},
+    {24, "mcp", nullptr},
+    {25, "nuv_w83667", nullptr},
+    {26, "nuv_nct5571", nullptr},
+    {27, "nuv_nct5572", nullptr},
+    {28, "sbx", nullptr},
+    {29, "sb710", nullptr},
+    {30, "sio", nullptr},
+    {31, "smbus_device", nullptr},
+    {32, "smsc5407", nullptr},
+    {33, "win", nullptr},
+    {34, "win_w83202g", nullptr},
+    {35, "win_wpcd376", nullptr},
+    {36, "vt1211", nullptr},
+    {37, "nuv_npcd378h", nullptr},
+    {38, "smsc_sch5327b", nullptr},
+    {39, "g_fintek", nullptr},
+    {39, "g_it8702", nullptr},
+    {39, "g_ite", nullptr},
+    {39, "g_sio", nullptr},
+    {40, "g_ec_it8519", nullptr},
+    {40, "g_ec", nullptr},
+    {41, "videochip", nullptr},
+    {42, "smsc_mec1322", nullptr},
+    {43, "smsc_kbc1126", nullptr},
+    {44, "g_iospace", Make<GIoSpaceChip>},
+    {45, "g_memoryspace", Make<GMemorySpaceChip>},
+    {46, "g_codec", nullptr},
+};
+
+}  // namespace
+
+std::span<const ChipRow> ChipRows() { return kRows; }
+
+std::size_t ChipPlaceOf(std::string_view name) {
+  // The plain chip has no name of its own here: it is what every other name means.
+  const auto found = std::find_if(std::begin(kRows) + 1, std::end(kRows), [&](const ChipRow& row) { return row.name == name; });
+  return found == std::end(kRows) ? kPlainChipPlace : found->place;
+}
+
+}  // namespace panelglow

@@ -1,0 +1,133 @@
+// The board library's face: one object stands for the system board, and the tests ask it for LEDs without knowing what
+// is behind them. This is also the class "generic": the INI files name the chips to build, and the chips do the work.
+//
+// A board holds the machine-wide mutex of the board library for all of its life, so boards are one at a time across
+// all threads and processes of the suite (one thread may nest them): building one blocks while another is alive.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "board/ChipTable.h"
+#include "board/chips/Chip.h"
+#include "platform/NamedMutexes.h"
+
+namespace panelglow {
+
+class MotherBoard {
+ public:
+  /// A board by the INI data of this system (or of `systemIdOverride`); null when the data selects no class of this
+  /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException 990431
+  /// when the chip file is missing, mblib_exception for chip data that cannot be used.
+  static std::unique_ptr<MotherBoard> Instantiate(const std::string& detectIniPath, const std::string& testIniPath,
+                                                  const std::string& chipIniPath, const std::string& classKey,
+                                                  const std::string& systemIdOverride);
+
+  /// A board of the oldest kind by the key "MotherboardClass"; null when there is none of that name.
+  static std::unique_ptr<MotherBoard> Instance(const std::string& detectIniPath);
+
+  /// The generic class. `systemIdText` is the system id as hexadecimal text.
+  explicit MotherBoard(const std::string& systemIdText);
+  virtual ~MotherBoard() = default;
+  MotherBoard(const MotherBoard&) = delete;
+  MotherBoard& operator=(const MotherBoard&) = delete;
+
+  /// The chip of a name in the class table; the plain chip for an empty or unknown name. Owned by the board.
+  [[nodiscard]] Chip& GetChip(const std::string& chipName) { return *chips[ChipPlaceOf(chipName) - 1]; }
+
+  [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
+  [[nodiscard]] const std::string& GetClassName() const { return className; }
+
+  // ---- LED operations. False: the board has no such LED. A blink that returns true has set the chip to blink the LED
+  // by itself; otherwise the caller toggles. Save and restore must come on the same board.
+
+  /// True when the tests are to use their own legacy port code instead of this board.
+  virtual bool IsPanelLedLegacy();
+
+  virtual bool IsPowerLedRedSupported(bool& supported);
+  virtual bool SavePowerLedState();
+  virtual bool AssertPowerLedGreen();
+  virtual bool AssertPowerLedRed();
+  virtual bool DeassertPowerLed();
+  virtual bool RestorePowerLedState();
+  virtual bool BlinkPowerLedGreen();
+  virtual bool BlinkPowerLedRed();
+
+  virtual bool IsChargeLedRedSupported(bool& supported);
+  virtual bool AssertChargeLedWhite();
+  virtual bool DeassertChargeLedWhite();
+  virtual bool AssertChargeLedRed();
+  virtual bool DeassertChargeLedRed();
+  virtual bool BlinkChargeLedWhite();
+  virtual bool BlinkChargeLedRed();
+  virtual bool SaveChargeLedState();
+  virtual bool RestoreChargeLedState();
+
+  virtual bool IsHdLedRedSupported(bool& supported);
+  virtual bool SaveHdLedState();
+  virtual bool RestoreHdLedState();
+  virtual bool AssertHdLedRed();
+  virtual bool DeassertHdLedRed();
+  virtual bool BlinkHdLedRed();
+
+  virtual bool IsWirelessLedSupported(bool& supported);
+  virtual bool SaveWirelessLedState();
+  virtual bool RestoreWirelessLedState();
+  virtual bool AssertWirelessLed();
+  virtual bool DeassertWirelessLed();
+  virtual bool BlinkWirelessLed();
+
+  virtual bool SaveSpeakerLedState();
+  virtual bool RestoreSpeakerLedState();
+  virtual bool BlinkSpeakerLed();
+  virtual bool BlinkMicrophoneLed();
+  virtual bool AssertSpeakerLed();
+  virtual bool DeassertSpeakerLed();
+  virtual bool AssertMicrophoneLed();
+  virtual bool DeassertMicrophoneLed();
+
+  // ---- power button
+  virtual bool SavePowerButton();
+  virtual bool RestorePowerButton();
+  virtual bool ArmPowerButton();
+  virtual bool IsPowerButtonPressed(bool& pressed);
+
+  // ---- latched status bits, by the plain chip
+  virtual bool ReadLatchedBit(std::uint16_t port, int bit);
+  virtual bool ClearLatchedBit(std::uint16_t port, int bit);
+
+ protected:
+  /// The chip that serves one LED (or the button): found at first use by the name in the INI files, unless a board
+  /// class has preset that name.
+  struct ChipChoice {
+    const char* key;
+    std::string name;
+    Chip* chip = nullptr;
+  };
+  Chip& ChipOf(ChipChoice& choice);
+
+  /// The answer of an INI key "yes" or "no"; for anything else the chip's.
+  bool IsSupported(const char* key, ChipChoice& choice, bool (Chip::*ask)(bool&), bool& supported);
+
+  ChipChoice powerLed{"test.powerled.chip", {}};
+  ChipChoice chargeLed{"test.chargeled.chip", {}};
+  ChipChoice hdLed{"test.hdled.chip", {}};
+  ChipChoice wirelessLed{"test.wirelessled.chip", {}};
+  ChipChoice speakerLed{"test.speakerled.chip", {}};
+  ChipChoice microphoneLed{"test.microphoneled.chip", {}};
+  ChipChoice powerButton{"test.powerbutton.chip", {}};
+
+ private:
+  void BuildListedChips(const std::string& list);
+  void BuildAllChips();
+  void InitializeGeneric(std::size_t place);
+
+  platform::NamedMutexLock lock;  // first member: given up last, and also when the construction fails
+  std::array<std::unique_ptr<Chip>, kChipPlaces> chips;
+  std::uint16_t systemId;
+  std::string className;
+};
+
+}  // namespace panelglow

@@ -1,0 +1,83 @@
+// The one reader of the files that describe a board: a test file over a detection file, the section of this very
+// system over a common one, and for chip settings a file of chip definitions in which a section can build on another.
+#pragma once
+
+#include <map>
+#include <optional>
+#include <string>
+
+#include "config/IniFile.h"
+
+namespace panelglow {
+
+/// No lock: the board library's mutex keeps two boards apart.
+class IniReader {
+ public:
+  /// What a look-up found. A key set to "undef" hides the same key in everything behind it.
+  enum status_t { kNotFound = 0, kUndefined = 1, kFound = 2 };
+
+  /// The process-wide reader, made with the default paths when it does not exist yet.
+  static IniReader& Instance();
+
+  /// The same, set to these values at once; only the chip file stays the one that was read first.
+  static IniReader& Instance(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
+                             const std::string& chipIni);
+
+  IniReader();
+  IniReader(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
+            const std::string& chipIni);
+  virtual ~IniReader() = default;
+
+  /// Typed reads of the layered files: status kFound gives the value, kUndefined an empty text or 0, kNotFound the
+  /// default. Numbers are decimal, or hexadecimal behind "0x"; any other text is 0.
+  std::string ReadIniValue(const std::string& key, status_t& status, const std::string& defaultValue);
+  int ReadIniInt(const std::string& key, status_t& status, int defaultValue);
+  unsigned int ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue);
+
+  /// Typed reads of a chip section; "chip.<section>.<key>" in the layered files comes first.
+  std::string ReadChipValue(const std::string& chipSection, const std::string& key, status_t& status,
+                            const std::string& defaultValue);
+  int ReadChipInt(const std::string& chipSection, const std::string& key, status_t& status, int defaultValue);
+
+  /// Writes the record of all look-ups to standard output.
+  void DumpLookups() const;
+
+  [[nodiscard]] const std::map<std::string, std::string>& GetLookups() const { return lookups; }
+  [[nodiscard]] bool IsChipIniPresent() const { return chipIniPresent; }
+  [[nodiscard]] const std::string& GetChipIniPath() const { return chipIniPath; }
+  [[nodiscard]] const std::string& GetSection() const { return section; }
+
+ private:
+  struct Result {
+    status_t status = kNotFound;
+    std::string text;
+  };
+
+  void Configure(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
+                 const std::string& chipIni);
+  [[nodiscard]] Result LookUp(const std::string& key) const;
+  Result LookUpChip(const std::string& chipSection, const std::string& key);
+  static Result Judge(const std::string& raw);
+  std::string ReadText(const Result& result, const std::string& entry, const std::string& defaultValue);
+  template <class Number>
+  Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue);
+
+  std::string detectIniPath;
+  std::string section;  // of this system: its id in upper-case hexadecimal
+  std::string testIniPath;
+  std::string chipIniPath;
+  bool testIniPresent = false;
+  bool chipIniPresent = false;
+  std::map<std::string, std::string> lookups;
+  std::optional<IniFile> chipFile;  // opened at the first chip look-up, kept from then on
+};
+
+// The same on IniReader::Instance(), for all of the board library.
+std::string ReadIniValue(const std::string& key, const std::string& defaultValue);
+std::string ReadIniValue(const std::string& key, IniReader::status_t& status, const std::string& defaultValue);
+int ReadIniInt(const std::string& key, int defaultValue);
+unsigned int ReadIniUnsigned(const std::string& key, unsigned int defaultValue);
+std::string ReadChipValue(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
+int ReadChipInt(const std::string& chipSection, const std::string& key, int defaultValue);
+
+}  // namespace panelglow
