@@ -1,0 +1,153 @@
+#include "harness/CDMConstraint.h"
+
+#include <algorithm>
+#include <array>
+#include <sstream>
+#include <vector>
+
+#include "harness/base/CDMUtil.h"
+
+namespace panelglow {
+
+namespace {
+
+constexpr std::array<std::string_view, 5> kTypeWords{"string", "integer", "boolean", "double", "largeinteger"};
+
+// By CDMConstraintType.
+constexpr std::array<std::string_view, 6> kComparisonHelp{
+    "\n\t - Value must be equal to ",
+    "\n\t - Value must be different than ",
+    "\n\t - Value must be greater than ",
+    "\n\t - Value must be equal to or greater than ",
+    "\n\t - Value must be equal to or less than ",
+    "\n\t - Value must be less than ",
+};
+
+constexpr const char* kNoNumber = "invalidString";
+
+double DoubleOf(const std::string& text) {
+  std::istringstream stream(text);
+  double value = 0;
+  stream >> value;
+  return value;
+}
+
+}  // namespace
+
+std::string_view WordOf(CDMArgumentType type) {
+  const auto index = static_cast<std::size_t>(type);
+  return index < kTypeWords.size() ? kTypeWords[index] : std::string_view();
+}
+
+CDMConstraint::CDMConstraint(int low, int high)
+    : intLow(low), intHigh(high), isRange(true), valueType(CDMArgumentType::Integer) {}
+CDMConstraint::CDMConstraint(double low, double high)
+    : doubleLow(low), doubleHigh(high), isRange(true), valueType(CDMArgumentType::Double) {}
+CDMConstraint::CDMConstraint(std::int64_t low, std::int64_t high)
+    : longLow(low), longHigh(high), isRange(true), valueType(CDMArgumentType::LargeInteger) {}
+CDMConstraint::CDMConstraint(int value, CDMConstraintType type)
+    : intValue(value), comparison(type), valueType(CDMArgumentType::Integer) {}
+CDMConstraint::CDMConstraint(double value, CDMConstraintType type)
+    : doubleValue(value), comparison(type), valueType(CDMArgumentType::Double) {}
+CDMConstraint::CDMConstraint(std::int64_t value, CDMConstraintType type)
+    : longValue(value), comparison(type), valueType(CDMArgumentType::LargeInteger) {}
+CDMConstraint::CDMConstraint(const std::string& allowed) : list(allowed) {}
+
+bool CDMConstraint::IsInList(const std::string& value) const {
+  std::vector<std::string> allowed;
+  CDMUtil::Split(list, allowed, ",");
+  return std::any_of(allowed.begin(), allowed.end(),
+                     [&](const std::string& entry) { return CDMUtil::EqualIgnoreCase(entry, value); });
+}
+
+template <class Number>
+bool CDMConstraint::Compare(Number value, Number low, Number high, Number single) const {
+  if (isRange) {
+    return low <= value && value <= high;
+  }
+  switch (comparison) {
+    case CDMConstraintType::Equal:
+      return value == single;
+    case CDMConstraintType::DifferentThan:
+      return value != single;
+    case CDMConstraintType::GreaterThan:
+      return value > single;
+    case CDMConstraintType::EqualToOrGreaterThan:
+      return value >= single;
+    case CDMConstraintType::EqualToOrLessThan:
+      return value <= single;
+    case CDMConstraintType::LessThan:
+      return value < single;
+  }
+  return false;
+}
+
+bool CDMConstraint::Check(const std::string& value) const {
+  if (!list.empty()) {
+    return IsInList(value);
+  }
+  switch (valueType) {
+    case CDMArgumentType::Integer:
+      return CDMUtil::IsInteger(value) && Compare(CDMUtil::ToInt(value), intLow, intHigh, intValue);
+    case CDMArgumentType::Double:
+      return CDMUtil::IsDouble(value) && Compare(DoubleOf(value), doubleLow, doubleHigh, doubleValue);
+    case CDMArgumentType::LargeInteger:
+      return CDMUtil::IsInteger(value) && Compare(CDMUtil::ToInt64(value), longLow, longHigh, longValue);
+    default:
+      return false;
+  }
+}
+
+std::string CDMConstraint::GetLowText() const {
+  switch (valueType) {
+    case CDMArgumentType::Integer:
+      return CDMUtil::ToString(intLow);
+    case CDMArgumentType::Double:
+      return CDMUtil::ToString(doubleLow);
+    case CDMArgumentType::LargeInteger:
+      return CDMUtil::ToString(longLow);
+    default:
+      return kNoNumber;
+  }
+}
+
+std::string CDMConstraint::GetHighText() const {
+  switch (valueType) {
+    case CDMArgumentType::Integer:
+      return CDMUtil::ToString(intHigh);
+    case CDMArgumentType::Double:
+      return CDMUtil::ToString(doubleHigh);
+    case CDMArgumentType::LargeInteger:
+      return CDMUtil::ToString(longHigh);
+    default:
+      return kNoNumber;
+  }
+}
+
+std::string CDMConstraint::GetValueText() const {
+  switch (valueType) {
+    case CDMArgumentType::Integer:
+      return CDMUtil::ToString(intValue);
+    case CDMArgumentType::Double:
+      return CDMUtil::ToString(doubleValue);
+    case CDMArgumentType::LargeInteger:
+      return CDMUtil::ToString(longValue);
+    default:
+      return {};
+  }
+}
+
+std::string CDMConstraint::GetHelp() const {
+  if (!list.empty()) {
+    std::string allowed = list;
+    std::replace(allowed.begin(), allowed.end(), ',', '|');
+    return "\n\t - Value must be one of [" + allowed + "]";
+  }
+  if (isRange) {
+    return "\n\t - Value must be between [" + GetLowText() + ".." + GetHighText() + "]";
+  }
+  const auto index = static_cast<std::size_t>(comparison);
+  return index < kComparisonHelp.size() ? std::string(kComparisonHelp[index]) + GetValueText() : std::string();
+}
+
+}  // namespace panelglow

@@ -1,0 +1,44 @@
+// Turns message numbers into texts: for log lines in debug mode and for the prompts that a subtest shows. The texts lie
+// in the installation's message files, one section per locale; an integrator can put a file of his own in front.
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "config/IniFile.h"
+#include "config/WIniFile.h"
+#include "platform/Text.h"
+
+namespace panelglow {
+
+class MessageFiles {
+ public:
+  /// The files of this process, each opened at its first use. Safe to reach from several threads at once.
+  static MessageFiles& Instance();
+
+  /// `programPath` names the standard files, `integratorFile` may be empty.
+  MessageFiles(const std::string& programPath, const std::string& integratorFile, std::string localeName);
+
+  /// The text of a log line: the file's entry with `text` put in, or the number, a blank, and the text in quotation
+  /// marks.
+  [[nodiscard]] std::string ResolveLogMessage(unsigned int id, const std::string& text) const;
+
+  /// The text of a prompt, in the same way.
+  [[nodiscard]] wstring GetResourceString(int id, const wstring& text) const;
+
+  /// As before, with `fallback` when no file has the text; `mediaPath` becomes the picture that goes with it, empty
+  /// for none.
+  [[nodiscard]] wstring GetResourceString(int id, const wstring& text, const wstring& fallback,
+                                          wstring& mediaPath) const;
+
+ private:
+  [[nodiscard]] wstring LookUpMedia(const WIniFile& file, const wstring& key) const;
+
+  std::string locale;
+  IniFile logTexts;
+  WIniFile integratorTexts;
+  WIniFile customTexts;
+  WIniFile standardTexts;
+};
+
+}  // namespace panelglow

@@ -1,0 +1,617 @@
+#include "prompts/PromptWindow.h"
+
+#include <algorithm>
+#include <array>
+#include <string_view>
+#include <utility>
+
+#include "harness/base/CDMUtil.h"
+#include "harness/base/CDMout.h"
+#include "platform/Host.h"
+#include "prompts/CDMWindow.h"
+
+namespace panelglow {
+
+namespace message = platform::message;
+namespace style = platform::style;
+namespace position = platform::position;
+using platform::Rectangle;
+using platform::WindowHandle;
+
+namespace {
+
+constexpr const char* kPlainClass = "PromptWindowClassName";
+constexpr std::uint32_t kClassStyle = 3;  // redraw on horizontal and vertical resize
+constexpr std::uint32_t kImageWindowStyle = 0x90840001;
+constexpr std::uint32_t kTextWindowStyle = 0x90800001;
+constexpr std::uint32_t kTextFieldStyle = 0x50802000;
+constexpr std::uint32_t kDefaultButtonStyle = 0x50010301;
+constexpr std::uint32_t kButtonStyle = 0x50010300;
+constexpr std::uint32_t kImageAreaStyle = 0x5000000E;
+constexpr std::uint32_t kFailedImageStyle = 0x50800000;
+constexpr std::uint32_t kHorizontalBarStyle = 0x50000004;
+constexpr std::uint32_t kVerticalBarStyle = 0x50000005;
+constexpr std::uint32_t kShowInPlace = position::kNoSize | position::kNoMove | position::kShowWindow;  // 0x43
+
+constexpr int kFirstButtonId = 1000;  // a button's id is this and its result
+constexpr int kTextFieldId = 1000;
+constexpr int kImageAreaId = 1008;
+
+// Layout, in pixels.
+constexpr int kDefaultWidth = 540;
+constexpr int kImageFormHeight = 300;
+constexpr int kTextFormHeight = 290;
+constexpr int kImageMarginX = 50;
+constexpr int kImageMarginY = 140;
+constexpr int kFailedImageWidth = 490;
+constexpr int kFailedImageHeight = 160;
+constexpr int kMargin = 10;
+constexpr int kButtonHeight = 25;
+constexpr int kNarrowestButton = 80;
+constexpr int kColumnX = 365;
+constexpr int kColumnStep = 30;
+constexpr int kColumnTextWidth = 340;
+constexpr int kColumnTextHeight = 270;
+constexpr int kBarThickness = 20;
+constexpr platform::Font kFont{18, 600};
+
+// Timers.
+constexpr std::uint32_t kTickTimer = 0;
+constexpr std::uint32_t kTick_ms = 10;
+constexpr std::uint32_t kTicksPerSecond = 1000 / kTick_ms;
+constexpr std::uint32_t kStopTimer = 1;
+constexpr std::uint32_t kStopPeriod_ms = 5000;
+
+// Device events in wParam of the device-change message.
+constexpr std::uintptr_t kNodesChanged = 7;
+constexpr std::uintptr_t kArrival = 0x8000;
+constexpr std::uintptr_t kRemoveComplete = 0x8004;
+
+constexpr unsigned int kImageMessage = 8;
+
+// Captions by result.
+struct Caption {
+  int textId;
+  const char16_t* fallback;
+};
+constexpr std::array<Caption, 8> kCaptions{{{0, u""},
+                                            {20016, u"&Abort"},
+                                            {20012, u"&Cancel"},
+                                            {20017, u"&Ignore"},
+                                            {20015, u"&No"},
+                                            {20011, u"&OK"},
+                                            {20013, u"&Retry"},
+                                            {20014, u"&Yes"}}};
+
+// Button sets by style: the buttons in order, and the default one. Every other style has the first set.
+struct ButtonSet {
+  std::array<int, 3> results;
+  std::size_t count;
+  int defaultResult;
+};
+constexpr std::array<ButtonSet, 6> kButtonSets{{
+    {{prompt_result::kOk, 0, 0}, 1, prompt_result::kOk},
+    {{prompt_result::kOk, prompt_result::kCancel, 0}, 2, prompt_result::kOk},
+    {{prompt_result::kAbort, prompt_result::kRetry, prompt_result::kIgnore}, 3, prompt_result::kIgnore},
+    {{prompt_result::kYes, prompt_result::kNo, prompt_result::kCancel}, 3, prompt_result::kYes},
+    {{prompt_result::kYes, prompt_result::kNo, 0}, 2, prompt_result::kYes},
+    {{prompt_result::kRetry, prompt_result::kCancel, 0}, 2, prompt_result::kRetry},
+}};
+
+const ButtonSet& ButtonSetOf(unsigned int promptStyle) {
+  return kButtonSets[promptStyle < kButtonSets.size() ? promptStyle : 0];
+}
+
+wstring CaptionOf(int result) {
+  const Caption& caption = kCaptions[static_cast<std::size_t>(result)];
+  return CDMWindow::Text(caption.textId, caption.fallback);
+}
+
+// Estimated width of a caption's character: only this changes with the language.
+int CharWidthOf(bool imageForm) {
+  constexpr std::array<std::string_view, 4> kWideLocales{"zh_CN", "zh_TW", "ko_KR", "ja_JP"};
+  const std::string locale = CDMWindow::Locale();
+  if (std::find(kWideLocales.begin(), kWideLocales.end(), locale) != kWideLocales.end()) {
+    return 18;
+  }
+  return imageForm ? 30 : 10;
+}
+
+wstring TitleOf(const wstring& title) {
+  return title.empty() ? CDMUtil::ToWString(platform::TheHost().files.ExecutablePath()) : title;
+}
+
+// A window class registered for the life of the object.
+class RegisteredClass {
+ public:
+  RegisteredClass(platform::Desktop& desktop, const platform::WindowClass& windowClass)
+      : desktop_(desktop), name_(windowClass.name) {
+    desktop_.RegisterWindowClass(windowClass);
+  }
+  ~RegisteredClass() { desktop_.UnregisterWindowClass(name_); }
+  RegisteredClass(const RegisteredClass&) = delete;
+  RegisteredClass& operator=(const RegisteredClass&) = delete;
+
+ private:
+  platform::Desktop& desktop_;
+  std::string name_;
+};
+
+}  // namespace
+
+int ImagePrompt(const wstring& text, const wstring& title, unsigned int promptStyle, const wstring& imagePath,
+                AutoWorker autoWorker, int autoResult) {
+  ThePromptState().workerRunning = false;
+  ThePromptState().workerDone = false;
+  return PromptWindow({kPlainClass, platform::kButtonFaceColor, false},
+                      {text, title, promptStyle, true, imagePath, std::move(autoWorker), autoResult})
+      .Run();
+}
+
+int TextPrompt(const wstring& text, const wstring& title, unsigned int promptStyle, AutoWorker autoWorker,
+               int autoResult) {
+  return PromptWindow({kPlainClass, platform::kButtonFaceColor, false},
+                      {text, title, promptStyle, false, {}, std::move(autoWorker), autoResult})
+      .Run();
+}
+
+PromptWindow::PromptWindow(const Family& family, Request request)
+    : family_(family), request_(std::move(request)), desktop_(platform::TheHost().desktop) {
+  topmost_ = (request_.style & kPromptTopmost) != 0;
+  request_.style &= ~kPromptTopmost;
+  if (!family_.configurable) {
+    // The plain family's flag is the process's: once a prompt was topmost, all are.
+    PromptState& state = ThePromptState();
+    state.topmost = state.topmost || topmost_;
+    topmost_ = state.topmost;
+    timeoutTicks_ = std::exchange(state.timeoutSeconds, 0U) * 1000 / kTick_ms;
+  }
+  charWidth_ = CharWidthOf(request_.imageForm);
+  request_.title = TitleOf(request_.title);
+  MeasureImage();
+}
+
+// However the prompt ends, its window does not outlive the object that handles its messages.
+PromptWindow::~PromptWindow() { desktop_.DestroyWindow(window_); }
+
+// Window size, image size, and whether there is an image and a text.
+void PromptWindow::MeasureImage() {
+  windowWidth_ = kDefaultWidth;
+  windowHeight_ = request_.imageForm ? kImageFormHeight : kTextFormHeight;
+  hasText_ = !request_.imageForm || !request_.text.empty();
+  if (request_.imagePath.empty()) {
+    return;
+  }
+  const std::optional<platform::ImageSize> size = platform::TheHost().images.Size(request_.imagePath);
+  hasImage_ = size.has_value();
+  imageFailed_ = !hasImage_;
+  if (imageFailed_) {
+    CDMout::LogMessage(LogOptions::Debug, kImageMessage, "Error Loading Image File.");
+    imageWidth_ = kFailedImageWidth;
+    imageHeight_ = kFailedImageHeight;
+    return;
+  }
+  imageWidth_ = size->width;
+  imageHeight_ = size->height;
+  windowWidth_ = std::min(imageWidth_ + kImageMarginX, desktop_.ScreenWidth());
+  windowHeight_ = std::min(imageHeight_ + kImageMarginY, desktop_.ScreenHeight());
+}
+
+int PromptWindow::Run() {
+  const RegisteredClass registered(
+      desktop_, {family_.className, kClassStyle, 1, family_.background,
+                 [this](const platform::Message& received) { return Handle(received); }});
+  if (!Create()) {
+    CDMout::LogMessage(LogOptions::ServiceErrors, kFreeText, "A prompt cannot be shown: there is no display.");
+    return prompt_result::kNone;
+  }
+  CreateButtons();
+  if (hasText_) {
+    CreateTextField();
+  }
+  if (HasPictureArea()) {
+    CreateImageArea();
+  }
+  RunLoop();
+  desktop_.DestroyWindow(std::exchange(window_, 0));
+  return result_;
+}
+
+bool PromptWindow::Create() {
+  platform::WindowRequest request;
+  request.className = family_.className;
+  request.text = request_.title;
+  request.style = request_.imageForm ? kImageWindowStyle : kTextWindowStyle;
+  request.x = desktop_.ScreenWidth() / 2 - windowWidth_ / 2;
+  request.y = desktop_.ScreenHeight() / 2 - windowHeight_ / 2;
+  request.width = windowWidth_;
+  request.height = windowHeight_;
+  window_ = desktop_.CreateWindow(request);
+  if (window_ == 0) {
+    return false;
+  }
+  desktop_.SetWindowPosition(window_, topmost_ ? platform::ZOrder::kTopmost : platform::ZOrder::kTop, 0, 0, 0, 0,
+                             kShowInPlace);
+  return true;
+}
+
+void PromptWindow::CreateButtons() {
+  const ButtonSet& set = ButtonSetOf(request_.style);
+  std::size_t longest = 0;
+  for (std::size_t i = 0; i < set.count; ++i) {
+    longest = std::max(longest, CaptionOf(set.results[i]).size());
+  }
+  buttonWidth_ = std::max(kNarrowestButton, static_cast<int>(longest) * charWidth_);
+  WindowHandle defaultButton = 0;
+  for (std::size_t i = 0; i < set.count; ++i) {
+    const int result = set.results[i];
+    platform::WindowRequest request;
+    request.className = "BUTTON";
+    request.text = CaptionOf(result);
+    request.style = result == set.defaultResult ? kDefaultButtonStyle : kButtonStyle;
+    request.x = kColumnX;
+    request.y = kMargin + static_cast<int>(i) * kColumnStep;
+    request.width = buttonWidth_;
+    request.height = kButtonHeight;
+    request.parent = window_;
+    const WindowHandle button = desktop_.CreateWindow(request);
+    desktop_.SetControlId(button, kFirstButtonId + result);
+    desktop_.SetFont(button, kFont);
+    buttons_.push_back({result, button});
+    defaultButton = result == set.defaultResult ? button : defaultButton;
+  }
+  if (request_.imageForm) {
+    PlaceButtonRow();
+  }
+  desktop_.SetFocus(defaultButton);
+}
+
+// Spreads the buttons over the window's lower edge with equal gaps; the arithmetic is unsigned.
+void PromptWindow::PlaceButtonRow() {
+  const auto count = static_cast<std::uint32_t>(buttons_.size());
+  const auto width = static_cast<std::uint32_t>(buttonWidth_);
+  const std::uint32_t gap = (static_cast<std::uint32_t>(clientWidth_) - count * width) / (count + 1);
+  for (std::uint32_t i = 0; i < count; ++i) {
+    const auto left = static_cast<int>(gap + i * (width + gap));
+    desktop_.MoveWindow(buttons_[i].window, left, clientHeight_ - kButtonHeight, buttonWidth_, kButtonHeight);
+  }
+}
+
+Rectangle PromptWindow::TextFieldPlace() const {
+  const auto place = [](int left, int top, int width, int height) {
+    return Rectangle{left, top, left + width, top + height};
+  };
+  if (!request_.imageForm) {
+    return place(kMargin, kMargin, kColumnTextWidth, kColumnTextHeight);
+  }
+  return HasPictureArea() ? place(kMargin, clientHeight_ - 90, clientWidth_ - 40, 60)
+                          : place(kMargin, kMargin, clientWidth_ - 40, clientHeight_ - 40);
+}
+
+Rectangle PromptWindow::ImageAreaPlace() const {
+  const int height = clientHeight_ - (hasText_ ? 130 : 50);
+  return {kMargin, kMargin, kMargin + clientWidth_ - 40, kMargin + height};
+}
+
+Rectangle PromptWindow::HorizontalBarPlace() const {
+  const int top = clientHeight_ - (hasText_ ? 120 : 50);
+  return {kMargin, top, kMargin + clientWidth_ - 30, top + kBarThickness};
+}
+
+Rectangle PromptWindow::VerticalBarPlace() const {
+  const Rectangle area = ImageAreaPlace();
+  return {clientWidth_ - kBarThickness, kMargin, clientWidth_, area.bottom};
+}
+
+void PromptWindow::CreateTextField() {
+  const Rectangle place = TextFieldPlace();
+  platform::WindowRequest request;
+  request.className = "STATIC";
+  request.text = request_.text;
+  request.style = kTextFieldStyle;
+  request.x = place.left;
+  request.y = place.top;
+  request.width = place.Width();
+  request.height = place.Height();
+  request.parent = window_;
+  textControl_ = desktop_.CreateWindow(request);
+  desktop_.SetControlId(textControl_, kTextFieldId);
+  desktop_.SetFont(textControl_, kFont);
+}
+
+void PromptWindow::CreateImageArea() {
+  const auto create = [this](const char* className, std::uint32_t controlStyle, const Rectangle& place,
+                             const wstring& text) {
+    platform::WindowRequest request;
+    request.className = className;
+    request.text = text;
+    request.style = controlStyle;
+    request.x = place.left;
+    request.y = place.top;
+    request.width = place.Width();
+    request.height = place.Height();
+    request.parent = window_;
+    return desktop_.CreateWindow(request);
+  };
+  imageControl_ = create("STATIC", hasImage_ ? kImageAreaStyle : kFailedImageStyle, ImageAreaPlace(),
+                         hasImage_ ? wstring() : request_.imagePath);
+  desktop_.SetControlId(imageControl_, kImageAreaId);
+  desktop_.SetFont(imageControl_, kFont);
+  horizontalBar_ = create("SCROLLBAR", kHorizontalBarStyle, HorizontalBarPlace(), {});
+  verticalBar_ = create("SCROLLBAR", kVerticalBarStyle, VerticalBarPlace(), {});
+  SetScrollRanges();
+}
+
+// Both bars show the whole image's size and a page of the area's; a bar is there only when the image is larger.
+void PromptWindow::SetScrollRanges() {
+  const Rectangle area = desktop_.ClientRectangle(imageControl_);
+  imageAreaWidth_ = area.Width();
+  imageAreaHeight_ = area.Height();
+  desktop_.SetScroll(horizontalBar_, {0, imageWidth_, imageAreaWidth_, 0});
+  desktop_.SetScroll(verticalBar_, {0, imageHeight_, imageAreaHeight_, 0});
+  desktop_.ShowWindow(horizontalBar_, imageWidth_ > imageAreaWidth_);
+  desktop_.ShowWindow(verticalBar_, imageHeight_ > imageAreaHeight_);
+}
+
+void PromptWindow::RunLoop() {
+  platform::Message received;
+  while (desktop_.GetMessage(received) && result_ == 0) {
+    if (!desktop_.IsDialogMessage(window_, received)) {
+      desktop_.Translate(received);
+      desktop_.Dispatch(received);
+    }
+  }
+}
+
+// ---- the window's messages
+
+std::intptr_t PromptWindow::Handle(const platform::Message& received) {
+  switch (received.id) {
+    case message::kCreate:
+      OnCreate(received.window);
+      break;
+    case message::kDestroy:
+      CDMWindow::ReleasePrompt();
+      break;
+    case message::kSize:
+      OnSize(received);
+      break;
+    case message::kSetFocus:
+    case message::kLeftButtonUp:
+      if (!family_.configurable) {
+        FocusFirstChild(false);
+      } else if (desktop_.Parent(desktop_.Focus()) != received.window) {
+        FocusFirstChild(true);
+      }
+      break;
+    case message::kKillFocus:
+      desktop_.SetWindowPosition(received.window, platform::ZOrder::kTopmost, 0, 0, 0, 0, kShowInPlace);
+      desktop_.SetForegroundWindow(received.window);
+      desktop_.SetActiveWindow(received.window);
+      break;
+    case message::kGetMinMaxInfo: {
+      auto* limits = reinterpret_cast<platform::TrackLimits*>(received.lParam);
+      *limits = {kDefaultWidth, kImageFormHeight, desktop_.ScreenWidth(), desktop_.ScreenHeight()};
+      break;
+    }
+    case message::kCommand: {
+      const auto id = static_cast<int>(received.wParam & 0xFFFFU);
+      if (id > kFirstButtonId && id <= kFirstButtonId + prompt_result::kYes) {
+        result_ = id - kFirstButtonId;
+      }
+      break;
+    }
+    case message::kTimer:
+      OnTimer();
+      break;
+    case message::kHorizontalScroll:
+    case message::kVerticalScroll:
+      OnScroll(received);
+      break;
+    case message::kPaint:
+      return OnPaint(received);
+    case message::kSyncPaint:
+      return 0;
+    case message::kDeviceChange:
+      if (!family_.configurable) {
+        OnDeviceChange(received.wParam);
+      }
+      break;
+    default:
+      break;
+  }
+  return desktop_.DefaultProcedure(received);
+}
+
+// The lock is taken while the window is being created: the call blocks while another prompt is open.
+void PromptWindow::OnCreate(WindowHandle created) {
+  CDMWindow::LockPrompt();
+  window_ = created;
+  if (family_.configurable) {
+    desktop_.SetTimer(created, kStopTimer, kStopPeriod_ms, nullptr);
+  } else if (topmost_) {
+    desktop_.SetTimer(created, kTickTimer, kTick_ms, nullptr);
+  }
+  desktop_.SetForegroundWindow(created);
+}
+
+void PromptWindow::OnSize(const platform::Message& received) {
+  const auto packed = static_cast<std::uint32_t>(received.lParam);
+  const int width = static_cast<int>(packed & 0xFFFFU);
+  const int height = static_cast<int>(packed >> 16U);
+  if (width == 0 || height == 0) {
+    return;
+  }
+  clientWidth_ = width;
+  clientHeight_ = height;
+  const auto move = [this](WindowHandle control, const Rectangle& place) {
+    desktop_.MoveWindow(control, place.left, place.top, place.Width(), place.Height());
+  };
+  if (!request_.imageForm) {
+    return;  // of fixed size, and its controls with it
+  }
+  if (textControl_ != 0) {
+    move(textControl_, TextFieldPlace());
+  }
+  if (imageControl_ != 0) {
+    move(imageControl_, ImageAreaPlace());
+    SetScrollRanges();
+    move(horizontalBar_, HorizontalBarPlace());
+    move(verticalBar_, VerticalBarPlace());
+  }
+  if (!buttons_.empty()) {
+    PlaceButtonRow();
+  }
+  horizontalPosition_ = 0;
+  verticalPosition_ = 0;
+  desktop_.Invalidate(received.window);
+}
+
+void PromptWindow::OnTimer() {
+  if (family_.configurable) {
+    if (CDMWindow::IsStopRequested()) {
+      result_ = prompt_result::kTerminated;
+      return;
+    }
+    desktop_.SetTimer(window_, kStopTimer, kStopPeriod_ms, nullptr);
+    if (topmost_) {
+      KeepForeground();
+    }
+    return;
+  }
+  ThePromptState().promptEvents |= kPromptTick;
+  CheckWorker();
+  if (topmost_) {
+    KeepForeground();
+  }
+  CountDown();
+}
+
+// A worker that returns without being done is started again at the next tick.
+void PromptWindow::CheckWorker() {
+  PromptState& state = ThePromptState();
+  if (!request_.autoWorker || state.workerRunning) {
+    return;
+  }
+  if (state.workerDone) {
+    result_ = request_.autoResult;
+    return;
+  }
+  state.workerRunning = true;
+  platform::TheHost().threads.Start("prompt worker", [worker = request_.autoWorker, &state] {
+    worker(state.workerDone);
+    state.workerRunning = false;
+  });
+}
+
+// Takes the foreground back, but not from a window with the same title: prompts of sister processes do not fight.
+void PromptWindow::KeepForeground() {
+  const WindowHandle foreground = desktop_.ForegroundWindow();
+  if (foreground == window_ || desktop_.WindowText(foreground) == request_.title) {
+    return;
+  }
+  if (!family_.configurable) {
+    desktop_.AttachInput(foreground, true);
+  }
+  desktop_.SetForegroundWindow(window_);
+  if (!family_.configurable) {
+    desktop_.SetFocus(window_);
+    desktop_.AttachInput(foreground, false);
+  }
+  FocusFirstChild(true);
+}
+
+void PromptWindow::CountDown() {
+  if (timeoutTicks_ == 0) {
+    return;
+  }
+  ++elapsedTicks_;
+  if (elapsedTicks_ > timeoutTicks_) {
+    result_ = ThePromptState().timeoutResult;
+    timeoutTicks_ = 0;
+  }
+  if (elapsedTicks_ % kTicksPerSecond == 0) {
+    desktop_.Invalidate(desktop_.ForegroundWindow());
+  }
+}
+
+void PromptWindow::OnScroll(const platform::Message& received) {
+  const bool vertical = received.id == message::kVerticalScroll;
+  const WindowHandle bar = vertical ? verticalBar_ : horizontalBar_;
+  const int largest = vertical ? imageHeight_ : imageWidth_;
+  int place = desktop_.Scroll(bar).position;
+  switch (received.wParam & 0xFFFFU) {
+    case platform::scroll::kLineBack:
+      place = std::max(0, place - 1);
+      break;
+    case platform::scroll::kLineForward:
+      place = std::min(largest, place + 1);
+      break;
+    case platform::scroll::kThumbPosition:
+    case platform::scroll::kThumbTrack:
+      place = static_cast<int>(received.wParam >> 16U & 0xFFFFU);
+      break;
+    case platform::scroll::kStart:
+      place = 0;
+      break;
+    case platform::scroll::kEnd:
+      place = largest;
+      break;
+    default:
+      break;
+  }
+  (vertical ? verticalPosition_ : horizontalPosition_) = place;
+  platform::ScrollState state = desktop_.Scroll(bar);
+  state.position = place;
+  desktop_.SetScroll(bar, state);
+  desktop_.Invalidate(received.window);
+}
+
+std::intptr_t PromptWindow::OnPaint(const platform::Message& received) {
+  if (!hasImage_ && timeoutTicks_ == 0) {
+    return desktop_.DefaultProcedure(received);
+  }
+  const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(received.window);
+  if (hasImage_) {
+    const Rectangle area = ImageAreaPlace();
+    canvas->DrawImage(area.left - horizontalPosition_, area.top - verticalPosition_, request_.imagePath, area);
+  }
+  if (timeoutTicks_ != 0) {
+    const Rectangle client = desktop_.ClientRectangle(received.window);
+    const std::uint32_t seconds = (timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000;
+    canvas->DrawText((client.left + client.right) / 5, client.top + client.bottom - 22,
+                     CDMUtil::ToWString(CDMUtil::ToString(seconds)), kFont, 0, std::nullopt);
+  }
+  return 0;
+}
+
+void PromptWindow::OnDeviceChange(std::uintptr_t event) {
+  std::atomic<std::uint32_t>& events = ThePromptState().promptEvents;
+  switch (event) {
+    case kNodesChanged:
+      events |= kDeviceTreeChanged;
+      break;
+    case kArrival:
+      events |= kDeviceArrived;
+      break;
+    case kRemoveComplete:
+      events |= kDeviceRemoved;
+      break;
+    default:
+      break;
+  }
+}
+
+void PromptWindow::FocusFirstChild(bool onlyButton) {
+  const std::vector<WindowHandle> children = desktop_.Children(window_);
+  if (children.empty()) {
+    return;
+  }
+  const bool isButton =
+      std::any_of(buttons_.begin(), buttons_.end(), [&](const Button& b) { return b.window == children.front(); });
+  if (isButton || !onlyButton) {
+    desktop_.SetFocus(children.front());
+  }
+}
+
+}  // namespace panelglow
