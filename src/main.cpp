@@ -1,0 +1,26 @@
+// Starts the program: builds the manager and the subtests, and runs what the command line asks for.
+#include "harness/DiagnosticManager.h"
+#include "ledtests/CustomLEDTest.h"
+#include "ledtests/LEDStatusIndicator.h"
+#include "ledtests/LEDTest.h"
+
+namespace {
+
+constexpr const char* kName = "Panelglow-diags";
+constexpr const char* kVersion =
+    "4.10.0, timestamp: Sep 25 2013 13:10:03 1212\n"
+    "   (cdm: 4.15.0)\n"
+    "   (mb : 4.15.0)\n"
+    "   (ms : 4.15.0)";
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  using namespace panelglow;
+  DiagnosticManager manager(argc, argv, kVersion, kName);
+  // Subtests live to the end of the process and are never destroyed: what is to be left behind is written during Run.
+  manager.RegisterSubtest("LEDTest", new LEDTest);
+  manager.RegisterSubtest("CustomLEDTest", new CustomLEDTest);
+  manager.RegisterSubtest("LEDStatusIndicator", new LEDStatusIndicator);
+  return manager.Run();
+}
