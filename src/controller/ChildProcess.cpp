@@ -1,0 +1,110 @@
+#include "controller/ChildProcess.h"
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <stdexcept>
+
+extern "C" char** environ;
+
+namespace panelglow::controller {
+
+namespace {
+
+volatile std::sig_atomic_t g_childPid = 0;
+
+// A terminal sends its interrupt to both processes at once; a termination reaches this one alone.
+extern "C" void PassOn(int number) {
+  if (g_childPid > 0 && number == SIGTERM) {
+    ::kill(g_childPid, number);
+  }
+}
+
+void PassSignalsOn() {
+  struct sigaction action {};
+  action.sa_handler = PassOn;
+  action.sa_flags = SA_RESTART;
+  ::sigaction(SIGINT, &action, nullptr);
+  ::sigaction(SIGTERM, &action, nullptr);
+}
+
+std::vector<char*> Pointers(std::vector<std::string>& texts) {
+  std::vector<char*> pointers;
+  for (std::string& text : texts) {
+    pointers.push_back(text.data());
+  }
+  pointers.push_back(nullptr);
+  return pointers;
+}
+
+}  // namespace
+
+ChildProcess::ChildProcess(const Command& command) {
+  std::array<int, 2> pipe{};
+  if (::pipe2(pipe.data(), O_CLOEXEC) != 0) {
+    throw std::runtime_error(std::string("no pipe: ") + std::strerror(errno));
+  }
+  std::vector<std::string> arguments = command.arguments;
+  std::vector<std::string> environment;
+  for (char** variable = environ; *variable != nullptr; ++variable) {
+    const std::string text = *variable;
+    if (command.environment.find(text.substr(0, text.find('='))) == command.environment.end()) {
+      environment.push_back(text);
+    }
+  }
+  for (const auto& [name, value] : command.environment) {
+    environment.push_back(name + "=" + value);
+  }
+  posix_spawn_file_actions_t actions;
+  ::posix_spawn_file_actions_init(&actions);
+  ::posix_spawn_file_actions_adddup2(&actions, pipe[1], STDOUT_FILENO);
+  const int error = ::posix_spawn(&pid_, command.program.c_str(), &actions, nullptr, Pointers(arguments).data(),
+                                  Pointers(environment).data());
+  ::posix_spawn_file_actions_destroy(&actions);
+  ::close(pipe[1]);
+  output_ = pipe[0];
+  if (error != 0) {
+    ::close(output_);
+    throw std::runtime_error(command.program + " does not start: " + std::strerror(error));
+  }
+  g_childPid = pid_;
+  PassSignalsOn();
+}
+
+ChildProcess::~ChildProcess() {
+  ::close(output_);
+  if (pid_ > 0) {
+    ::kill(pid_, SIGKILL);
+    Wait();
+  }
+}
+
+std::optional<std::string> ChildProcess::Read() {
+  std::array<char, 4096> bytes{};
+  for (;;) {
+    const ssize_t got = ::read(output_, bytes.data(), bytes.size());
+    if (got > 0) {
+      return std::string(bytes.data(), static_cast<std::size_t>(got));
+    }
+    if (got == 0 || errno != EINTR) {
+      return std::nullopt;
+    }
+  }
+}
+
+ChildProcess::End ChildProcess::Wait() {
+  int status = 0;
+  while (::waitpid(pid_, &status, 0) < 0 && errno == EINTR) {
+  }
+  pid_ = -1;
+  g_childPid = 0;
+  return WIFSIGNALED(status) ? End{true, WTERMSIG(status)} : End{false, WEXITSTATUS(status)};
+}
+
+}  // namespace panelglow::controller
