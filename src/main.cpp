@@ -19,8 +19,12 @@ int main(int argc, char** argv) {
   using namespace panelglow;
   DiagnosticManager manager(argc, argv, kVersion, kName);
   // Subtests live to the end of the process and are never destroyed: what is to be left behind is written during Run.
-  manager.RegisterSubtest("LEDTest", new LEDTest);
-  manager.RegisterSubtest("CustomLEDTest", new CustomLEDTest);
-  manager.RegisterSubtest("LEDStatusIndicator", new LEDStatusIndicator);
+  // These pointers own them.
+  static LEDTest* const ledTest = new LEDTest;
+  static CustomLEDTest* const customLedTest = new CustomLEDTest;
+  static LEDStatusIndicator* const ledStatusIndicator = new LEDStatusIndicator;
+  manager.RegisterSubtest("LEDTest", ledTest);
+  manager.RegisterSubtest("CustomLEDTest", customLedTest);
+  manager.RegisterSubtest("LEDStatusIndicator", ledStatusIndicator);
   return manager.Run();
 }

@@ -75,7 +75,8 @@ std::span<const ChipRow> ChipRows() { return kRows; }
 
 std::size_t ChipPlaceOf(std::string_view name) {
   // The plain chip has no name of its own here: it is what every other name means.
-  const auto found = std::find_if(std::begin(kRows) + 1, std::end(kRows), [&](const ChipRow& row) { return row.name == name; });
+  const auto found =
+      std::find_if(std::begin(kRows) + 1, std::end(kRows), [&](const ChipRow& row) { return row.name == name; });
   return found == std::end(kRows) ? kPlainChipPlace : found->place;
 }
 

@@ -24,9 +24,9 @@ constexpr const char* kNotFound = "was_not_found";
 constexpr const char* kUndef = "undef";
 
 // System ids whose boards are served by the older path unless the INI data names a class.
-constexpr std::array<std::string_view, 20> kOlderBoards{
-    "A08", "0A08", "A58",  "0A58", "AA8", "0AA8", "A9C", "0A9C", "A98",  "0A98",
-    "2820", "3029", "A80", "0A80", "AA0", "0AA0", "A1C", "0A1C", "2821", "AC8"};
+constexpr std::array<std::string_view, 20> kOlderBoards{"A08",  "0A08", "A58",  "0A58", "AA8",  "0AA8", "A9C",
+                                                        "0A9C", "A98",  "0A98", "2820", "3029", "A80",  "0A80",
+                                                        "AA0",  "0AA0", "A1C",  "0A1C", "2821", "AC8"};
 constexpr std::string_view kLastOlderBoard = "0AC8";
 
 bool IsOlderBoard(std::string_view systemId) {
@@ -41,7 +41,9 @@ struct BoardRow {
   BoardFactory make;  // null: a class still to be written, answered like an unknown one
 };
 
-std::unique_ptr<MotherBoard> MakeGeneric(const std::string& systemId) { return std::make_unique<MotherBoard>(systemId); }
+std::unique_ptr<MotherBoard> MakeGeneric(const std::string& systemId) {
+  return std::make_unique<MotherBoard>(systemId);
+}
 
 constexpr std::array<BoardRow, 6> kBoardClasses{{{"generic", MakeGeneric},
                                                  {"ich_win", nullptr},
@@ -65,8 +67,9 @@ std::string SelectClass(const std::string& classKey, const std::string& systemId
 
 }  // namespace
 
-std::unique_ptr<MotherBoard> MotherBoard::Instantiate(const std::string& detectIniPath, const std::string& testIniPath,
-                                                      const std::string& chipIniPath, const std::string& classKey,
+std::unique_ptr<MotherBoard> MotherBoard::Instantiate(const std::string& detectIniPath,
+                                                      const std::string& testIniPath, const std::string& chipIniPath,
+                                                      const std::string& classKey,
                                                       const std::string& systemIdOverride) {
   if (!CDMUtil::FileExists(chipIniPath)) {
     CDMException missing(kChipFileMissing);
@@ -74,7 +77,8 @@ std::unique_ptr<MotherBoard> MotherBoard::Instantiate(const std::string& detectI
     throw missing;
   }
   const std::string systemId = SMBIOSDiscovery::Instance().GetProductText();
-  IniReader::Instance(systemIdOverride.empty() ? systemId : systemIdOverride, detectIniPath, testIniPath, chipIniPath);
+  IniReader::Instance(systemIdOverride.empty() ? systemId : systemIdOverride, detectIniPath, testIniPath,
+                      chipIniPath);
   const std::string wanted = SelectClass(classKey, systemId);
   const auto found = std::find_if(kBoardClasses.begin(), kBoardClasses.end(),
                                   [&](const BoardRow& row) { return row.name == wanted; });
@@ -166,7 +170,9 @@ bool MotherBoard::IsSupported(const char* key, ChipChoice& choice, bool (Chip::*
   return (ChipOf(choice).*ask)(supported);
 }
 
-bool MotherBoard::IsPanelLedLegacy() { return CDMUtil::ToLower(ReadIniValue("test.panelglow.uselegacy", "no")) == "yes"; }
+bool MotherBoard::IsPanelLedLegacy() {
+  return CDMUtil::ToLower(ReadIniValue("test.panelglow.uselegacy", "no")) == "yes";
+}
 
 bool MotherBoard::IsPowerLedRedSupported(bool& supported) {
   return IsSupported("test.powerled.redled.support", powerLed, &Chip::IsPowerLedRedSupported, supported);

@@ -1,5 +1,6 @@
-// The board library's face: one object stands for the system board, and the tests ask it for LEDs without knowing what
-// is behind them. This is also the class "generic": the INI files name the chips to build, and the chips do the work.
+// The board library's face: one object stands for the system board, and the tests ask it for LEDs without knowing
+// what is behind them. This is also the class "generic": the INI files name the chips to build, and the chips do the
+// work.
 //
 // A board holds the machine-wide mutex of the board library for all of its life, so boards are one at a time across
 // all threads and processes of the suite (one thread may nest them): building one blocks while another is alive.
@@ -19,8 +20,8 @@ namespace panelglow {
 class MotherBoard {
  public:
   /// A board by the INI data of this system (or of `systemIdOverride`); null when the data selects no class of this
-  /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException 990431
-  /// when the chip file is missing, mblib_exception for chip data that cannot be used.
+  /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException
+  /// 990431 when the chip file is missing, mblib_exception for chip data that cannot be used.
   static std::unique_ptr<MotherBoard> Instantiate(const std::string& detectIniPath, const std::string& testIniPath,
                                                   const std::string& chipIniPath, const std::string& classKey,
                                                   const std::string& systemIdOverride);
@@ -40,8 +41,8 @@ class MotherBoard {
   [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
   [[nodiscard]] const std::string& GetClassName() const { return className; }
 
-  // ---- LED operations. False: the board has no such LED. A blink that returns true has set the chip to blink the LED
-  // by itself; otherwise the caller toggles. Save and restore must come on the same board.
+  // ---- LED operations. False: the board has no such LED. A blink that returns true has set the chip to blink the
+  // LED by itself; otherwise the caller toggles. Save and restore must come on the same board.
 
   /// True when the tests are to use their own legacy port code instead of this board.
   virtual bool IsPanelLedLegacy();

@@ -19,7 +19,8 @@ std::string Padded(std::string text, std::size_t width) {
 }
 
 std::size_t ColumnOf(std::uint64_t time_us, const RunReport& report, std::size_t columns) {
-  return std::min(columns - 1, static_cast<std::size_t>(time_us * columns / std::max<std::uint64_t>(report.end_us, 1)));
+  return std::min(columns - 1,
+                  static_cast<std::size_t>(time_us * columns / std::max<std::uint64_t>(report.end_us, 1)));
 }
 
 // A LED's whole run, one character per column of time.
@@ -55,7 +56,8 @@ std::size_t TimesLit(const RunReport& report, std::size_t led) {
 }  // namespace
 
 std::string ShowPanel(const RunReport& report, std::size_t columns) {
-  std::string text = "Front panel over " + Seconds(report.end_us) + " of the machine's time (# lit, . dark, ~ changing):\n";
+  std::string text =
+      "Front panel over " + Seconds(report.end_us) + " of the machine's time (# lit, . dark, ~ changing):\n";
   std::size_t widest = std::string("operator").size();
   for (const RunReport::Led& led : report.leds) {
     widest = std::max(widest, led.name.size());
@@ -71,7 +73,8 @@ std::string ShowPanel(const RunReport& report, std::size_t columns) {
     for (const RunReport::Press& press : report.presses) {
       strip[ColumnOf(press.time_us, report, columns)] = '^';
     }
-    text += "  " + Padded("operator", widest) + " " + strip + " " + std::to_string(report.presses.size()) + " presses\n";
+    text +=
+        "  " + Padded("operator", widest) + " " + strip + " " + std::to_string(report.presses.size()) + " presses\n";
     for (const RunReport::Press& press : report.presses) {
       text += "    " + Padded(Seconds(press.time_us), 8) + " " + press.what + "\n";
     }

@@ -1,5 +1,5 @@
-// Follows the line protocol of a run as a controller does: progress while it comes, and the verdict from the last lines
-// and the exit code.
+// Follows the line protocol of a run as a controller does: progress while it comes, and the verdict from the last
+// lines and the exit code.
 #pragma once
 
 #include <string>

@@ -214,7 +214,8 @@ int Follow(ChildProcess& child, const Options& options, ProtocolFollower& follow
     return Complain(kRunImpossible, "the program ended with code " + std::to_string(end.code));
   }
   if (!follower.IsOrderly()) {
-    return Complain(kRunImpossible, "the program broke the line protocol: more than one result, or lines behind its end");
+    return Complain(kRunImpossible,
+                    "the program broke the line protocol: more than one result, or lines behind its end");
   }
   return end.code;
 }
@@ -264,7 +265,8 @@ int Run(const Options& options) {
 int main(int argc, char** argv) {
   Options options;
   CLI::App app{
-      "Runs panelglow-diags on a simulated machine with a simulated operator, follows it as a controller does, and shows "
+      "Runs panelglow-diags on a simulated machine with a simulated operator, follows it as a controller does, and "
+      "shows "
       "the front panel's time line and the verdict. Run it in the folder of an installation.\n"
       "Exits with the program's code (0 passed, 1 failed); 2: a wrong call; 3: a run that could not be made."};
   app.name("panelglow-sim");

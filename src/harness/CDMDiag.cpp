@@ -76,8 +76,8 @@ std::atomic<unsigned int> CDMDiag::signalCount{0};
 
 CDMDiag::CDMDiag() {
   DeclareArgument("-integratormsgfile", CDMArgumentType::String, "",
-                  "Name and path of messsage file from which the prompt needs to be displayed.", false, nullptr, false,
-                  false);
+                  "Name and path of messsage file from which the prompt needs to be displayed.", false, nullptr,
+                  false, false);
   DeclareArgument("-DataCollectionFile", CDMArgumentType::String, "",
                   "Filepath to the XML fileto output test status for DataCollection.", false, nullptr, false, false);
   DeclareArgument("-paramfile", CDMArgumentType::String, "",
@@ -138,7 +138,8 @@ bool CDMDiag::ValidateArguments() {
   for (const auto& [argumentName, argument] : arguments) {
     declared[CDMUtil::ToLower(argumentName)] = argument.get();
     if (argument->IsRequired() && parser.GetParameter(argumentName, "").empty()) {
-      LogMessage(LogOptions::Invalid, kFreeText, "Mandatory argument " + argumentName + " is not present in command line");
+      LogMessage(LogOptions::Invalid, kFreeText,
+                 "Mandatory argument " + argumentName + " is not present in command line");
       return false;
     }
   }

@@ -25,8 +25,8 @@ class CDMDiag {
   CDMDiag(const CDMDiag&) = delete;
   CDMDiag& operator=(const CDMDiag&) = delete;
 
-  /// The subtest itself. True: passed. False: failed, and said why through ReportFailure or the log. Called once, with
-  /// a validated command line.
+  /// The subtest itself. True: passed. False: failed, and said why through ReportFailure or the log. Called once,
+  /// with a validated command line.
   virtual bool Run() = 0;
 
   /// Checks the command line against the declared arguments and logs the first bad parameter.
@@ -68,8 +68,9 @@ class CDMDiag {
   /// Notes a console control event; called on the system's control thread.
   static void AddSignal(std::uint32_t type);
 
-  // ---- prompts: block until the operator has answered; the result is a PromptResult. With a diagnostic configuration
-  // file the configurable windows take the plain ones' place, and the last two arguments have no effect.
+  // ---- prompts: block until the operator has answered; the result is a PromptResult. With a diagnostic
+  // configuration file the configurable windows take the plain ones' place, and the last two arguments have no
+  // effect.
   static int PopWindow(const wstring& text, const wstring& title, unsigned int style, const wstring& imagePath,
                        AutoWorker autoWorker, int autoResult);
   static int PopWindow(const wstring& text, const wstring& title, unsigned int style, AutoWorker autoWorker,

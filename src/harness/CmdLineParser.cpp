@@ -51,6 +51,8 @@ void CmdLineParser::AddParameter(std::string_view name, const std::string& value
   }
 }
 
-bool CmdLineParser::IsBoolean(std::string_view name) const { return CDMUtil::IsBoolean(GetParameter(name, "invalid")); }
+bool CmdLineParser::IsBoolean(std::string_view name) const {
+  return CDMUtil::IsBoolean(GetParameter(name, "invalid"));
+}
 
 }  // namespace panelglow

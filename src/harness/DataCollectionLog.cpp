@@ -155,8 +155,8 @@ void PopulateAttemptInformation(int attemptNumber, const std::string& errorCode,
   details.attempts.push_back(current);
 }
 
-void PopulateSubtestInfoAndWriteLog(const std::string& path, const std::string& diagnosticName, SubtestDetails details,
-                                    std::uint32_t startTicks, bool corrupted) {
+void PopulateSubtestInfoAndWriteLog(const std::string& path, const std::string& diagnosticName,
+                                    SubtestDetails details, std::uint32_t startTicks, bool corrupted) {
   platform::Clock& clock = platform::TheHost().clock;
   const std::uint32_t duration_ms = clock.TickCount() - startTicks;
   const std::time_t end = clock.WallTime();

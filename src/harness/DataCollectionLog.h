@@ -49,7 +49,7 @@ void PopulateAttemptInformation(int attemptNumber, const std::string& errorCode,
 /// Fills times into a copy of `details` and adds the run to the file; to be called once on any way out. `startTicks`:
 /// tick count at the subtest's begin. Nothing is written without a path, or when the file was found corrupted. A file
 /// that cannot be written is a debug line and nothing more: the run's verdict does not depend on it.
-void PopulateSubtestInfoAndWriteLog(const std::string& path, const std::string& diagnosticName, SubtestDetails details,
-                                    std::uint32_t startTicks, bool corrupted);
+void PopulateSubtestInfoAndWriteLog(const std::string& path, const std::string& diagnosticName,
+                                    SubtestDetails details, std::uint32_t startTicks, bool corrupted);
 
 }  // namespace panelglow::CDMUtil

@@ -54,19 +54,16 @@ DiagnosticManager::DiagnosticManager(int argc, const char* const* argv, const st
     : version(versionText), name(diagnosticName) {
   platform::TheHost().console.SetControlHandler(HandleControl);
   // What the leaves of the harness need of it, before anything is logged.
-  CDMout::SetDebugQuery([] {
-    return CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter("-debug", "false"), "true");
-  });
-  CDMout::SetMessageResolver([](unsigned int id, const std::string& text) {
-    return MessageFiles::Instance().ResolveLogMessage(id, text);
-  });
-  CDMWindow::SetServices(
-      {[](int id, const wstring& fallback) {
-         wstring noMedia;
-         return MessageFiles::Instance().GetResourceString(id, wstring(), fallback, noMedia);
-       },
-       [] { return CmdLineParser::GetInstance().GetParameter("-locale", "en_US"); },
-       [] { return CDMDiag::ShouldTestBeTerminated() || CDMDiag::IsSignalReceived(); }});
+  CDMout::SetDebugQuery(
+      [] { return CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter("-debug", "false"), "true"); });
+  CDMout::SetMessageResolver(
+      [](unsigned int id, const std::string& text) { return MessageFiles::Instance().ResolveLogMessage(id, text); });
+  CDMWindow::SetServices({[](int id, const wstring& fallback) {
+                            wstring noMedia;
+                            return MessageFiles::Instance().GetResourceString(id, wstring(), fallback, noMedia);
+                          },
+                          [] { return CmdLineParser::GetInstance().GetParameter("-locale", "en_US"); },
+                          [] { return CDMDiag::ShouldTestBeTerminated() || CDMDiag::IsSignalReceived(); }});
   CmdLineParser::GetInstance(argc, argv);
 }
 

@@ -1,5 +1,5 @@
-// Runs one subtest and decides what the controller sees of it: the result line, the end of test, and the exit code all
-// come from here.
+// Runs one subtest and decides what the controller sees of it: the result line, the end of test, and the exit code
+// all come from here.
 #pragma once
 
 #include <cstdint>

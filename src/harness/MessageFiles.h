@@ -1,5 +1,5 @@
-// Turns message numbers into texts: for log lines in debug mode and for the prompts that a subtest shows. The texts lie
-// in the installation's message files, one section per locale; an integrator can put a file of his own in front.
+// Turns message numbers into texts: for log lines in debug mode and for the prompts that a subtest shows. The texts
+// lie in the installation's message files, one section per locale; an integrator can put a file of his own in front.
 #pragma once
 
 #include <optional>

@@ -30,8 +30,8 @@ void LogEnd(const std::string& reason) {
   CDMout::LogMessage(LogOptions::DeviceErrors, kFreeText, "A LED could not be blinked: " + reason);
 }
 
-// Puts something back when the scope is left, however it is left. A worker that is told to end in the middle of putting
-// back does it once more, undisturbed: after that nothing interrupts the thread any more.
+// Puts something back when the scope is left, however it is left. A worker that is told to end in the middle of
+// putting back does it once more, undisturbed: after that nothing interrupts the thread any more.
 class PutBack {
  public:
   explicit PutBack(std::function<void()> action) : action_(std::move(action)) {}
@@ -339,8 +339,8 @@ void CustomBlinkNoLED() {
   }
   entry->workerStarted = true;
   BlinkLoop(*entry, kPhase_ms, Nothing, Nothing);
-  entry->workerFinished = true;
   CDMout::LogMessage(LogOptions::Status, kFreeText, "NoB Thread Exited");
+  entry->workerFinished = true;
 }
 
 void CustomBlinkNumLockLED() { BlinkLockKey(kNumLock, CustomToggleNumLock); }
@@ -351,7 +351,9 @@ void CustomBlinkRedPowerLED() { BlinkPowerLed(kRedPowerLed, CustomBlinkRedPowerL
 void CustomBlinkGreenPowerLED() { BlinkPowerLed(kGreenPowerLed, CustomBlinkGreenPowerLED_Legacy); }
 
 void CustomBlinkRedPowerLED_Legacy() { BlinkLegacyPowerLed(kPowerRed, &LegacyPanelPorts::CustomAssertRedPwrLed); }
-void CustomBlinkGreenPowerLED_Legacy() { BlinkLegacyPowerLed(kPowerGreen, &LegacyPanelPorts::CustomAssertGreenPwrLed); }
+void CustomBlinkGreenPowerLED_Legacy() {
+  BlinkLegacyPowerLed(kPowerGreen, &LegacyPanelPorts::CustomAssertGreenPwrLed);
+}
 
 void CustomBlinkRedHDLED() {
   std::unique_ptr<MotherBoard> board = MakeBoard();

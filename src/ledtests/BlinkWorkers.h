@@ -1,6 +1,6 @@
-// The blink workers of CustomLEDTest: thread functions without arguments that make one LED blink until the operator has
-// answered or 50 cycles are over, and leave it as they found it. They talk to the dialog through the flags of their
-// entry in the device array; a LED that cannot blink fails in the operator's eyes.
+// The blink workers of CustomLEDTest: thread functions without arguments that make one LED blink until the operator
+// has answered or 50 cycles are over, and leave it as they found it. They talk to the dialog through the flags of
+// their entry in the device array; a LED that cannot blink fails in the operator's eyes.
 #pragma once
 
 #include <cstdint>

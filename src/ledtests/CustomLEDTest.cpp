@@ -50,8 +50,8 @@ void CustomLEDTest::DeclareArguments() {
   const auto atLeast = [](int low) {
     return std::make_unique<CDMConstraint>(low, CDMConstraintType::EqualToOrGreaterThan);
   };
-  const auto declare = [this](const char* argument, CDMArgumentType type, const char* defaultValue,
-                              const char* text, std::unique_ptr<CDMConstraint> constraint) {
+  const auto declare = [this](const char* argument, CDMArgumentType type, const char* defaultValue, const char* text,
+                              std::unique_ptr<CDMConstraint> constraint) {
     DeclareArgument(argument, type, defaultValue, text, false, std::move(constraint), false, false);
   };
   using Type = CDMArgumentType;
@@ -64,16 +64,17 @@ void CustomLEDTest::DeclareArguments() {
   declare("-OperatorCheating", Type::Boolean, "true", "if true, then LED Blink Sequence is random", nullptr);
   declare("-UIFile", Type::String, kDefaultUiFile, "UI.xml file name and path", nullptr);
   declare("-UIValidationFile", Type::String, kDefaultUiSchema, "ui.xsd file name and path", nullptr);
-  declare("-ButtonDefinitionFile", Type::String, kDefaultButtonFile, "ButtonDefinition.xml file name and path", nullptr);
+  declare("-ButtonDefinitionFile", Type::String, kDefaultButtonFile, "ButtonDefinition.xml file name and path",
+          nullptr);
   declare("-ButtonDefinitionValidationFile", Type::String, kDefaultButtonSchema,
           "ButtonDefinition.xsd file name and path", nullptr);
   declare("-SectionID", Type::String, "Default", "SectionID in UIFile to use for LED test", nullptr);
   declare("-AutoStart", Type::Boolean, "false", "if true, test will start automatically after confirming pop-prompt",
           nullptr);
-  declare("-BeginPrompt", Type::Integer, "24", "This is customized message number from\n\tmessage file for BeginPrompt.",
-          atLeast(0));
-  declare("-RetryPrompt", Type::Integer, "24", "This is customized message number from\n\tmessage file for RetryPrompt.",
-          atLeast(0));
+  declare("-BeginPrompt", Type::Integer, "24",
+          "This is customized message number from\n\tmessage file for BeginPrompt.", atLeast(0));
+  declare("-RetryPrompt", Type::Integer, "24",
+          "This is customized message number from\n\tmessage file for RetryPrompt.", atLeast(0));
 }
 
 bool CustomLEDTest::Run() {
@@ -126,10 +127,10 @@ void CustomLEDTest::ReadArguments() {
   noteDefault(buttonDefinitionFile, kDefaultButtonFile, "Using default buttondefinition.xml file");
   noteDefault(buttonDefinitionValidationFile, kDefaultButtonSchema,
               "Using default buttondefinition.xsd xml validation file");
-  beginPromptText = GetResourceString(beginPrompt, u"", CDMUtil::ToWString(CDMUtil::ToString(beginPrompt)),
-                                      beginPromptMedia);
-  retryPromptText = GetResourceString(retryPrompt, u"", CDMUtil::ToWString(CDMUtil::ToString(retryPrompt)),
-                                      retryPromptMedia);
+  beginPromptText =
+      GetResourceString(beginPrompt, u"", CDMUtil::ToWString(CDMUtil::ToString(beginPrompt)), beginPromptMedia);
+  retryPromptText =
+      GetResourceString(retryPrompt, u"", CDMUtil::ToWString(CDMUtil::ToString(retryPrompt)), retryPromptMedia);
 }
 
 // The driver and the files that a run cannot do without.
@@ -156,9 +157,9 @@ void CustomLEDTest::CheckPrerequisites() {
   require(buttonDefinitionFile, kFileMissing);
   require(buttonDefinitionValidationFile, kFileMissing);
   const std::string missing = CheckForResourceFiles(
-      {"super.ico",    "diags.ico",    "spr_flop.ico", "spr_tape.ico", "spr_num.ico",  "spr_cd.ico",   "spr_dvd.ico",
-       "spr_caps.ico", "spr_zip.ico",  "spr_ls.ico",   "spr_scr.ico",  "spr_pd.ico",   "spr_cdrw.ico", "spr_chrg.ico",
-       "spr_hdrv.ico", "spr_jaz.ico",  "spr_pcsp.ico", "spr_redh.ico", "spr_pwr.ico",  "spr_net.ico",  "no_led.ico",
+      {"super.ico",    "diags.ico",    "spr_flop.ico", "spr_tape.ico",  "spr_num.ico", "spr_cd.ico",   "spr_dvd.ico",
+       "spr_caps.ico", "spr_zip.ico",  "spr_ls.ico",   "spr_scr.ico",   "spr_pd.ico",  "spr_cdrw.ico", "spr_chrg.ico",
+       "spr_hdrv.ico", "spr_jaz.ico",  "spr_pcsp.ico", "spr_redh.ico",  "spr_pwr.ico", "spr_net.ico",  "no_led.ico",
        "spr_redp.ico", "spr_wave.ico", "spr_webc.ico", "spr_chrgrd.ico"});
   if (!missing.empty()) {
     Fail({.recordedCode = "990618", .exceptionCode = 990618, .messageId = kFileMissing, .text = missing});

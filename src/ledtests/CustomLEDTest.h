@@ -1,5 +1,5 @@
-// The subtest that lets an operator test all front-panel LEDs of a machine in one dialog: each LED blinks in turn, and
-// the operator presses its button. What there is to test comes from two XML files.
+// The subtest that lets an operator test all front-panel LEDs of a machine in one dialog: each LED blinks in turn,
+// and the operator presses its button. What there is to test comes from two XML files.
 #pragma once
 
 #include <array>
@@ -35,8 +35,8 @@ class CustomLEDTest : public CDMDiag {
   CustomLEDTest();
   ~CustomLEDTest() override;
 
-  /// True when all LEDs passed in some attempt; false when the last attempt failed and the LED has no code of its own.
-  /// Throws a new CDMException in all other cases.
+  /// True when all LEDs passed in some attempt; false when the last attempt failed and the LED has no code of its
+  /// own. Throws a new CDMException in all other cases.
   bool Run() override;
 
   // ---- the device array; shared with dialog and workers

@@ -35,7 +35,8 @@ std::string Rule() { return std::string(79, '-') + "\n"; }
 
 // A value for use between apostrophes in a filter.
 std::string Quoted(const std::string& value) {
-  return value.find_first_of("<>&'\"") == std::string::npos ? "'" + value + "'" : "'" + CDMUtil::EscapeXml(value) + "'";
+  return value.find_first_of("<>&'\"") == std::string::npos ? "'" + value + "'"
+                                                            : "'" + CDMUtil::EscapeXml(value) + "'";
 }
 
 }  // namespace
@@ -92,13 +93,14 @@ std::unique_ptr<platform::XmlDocument> CustomLEDTest::LoadXMLForValidation(const
           .exceptionCode = kFileNotLoaded,
           .option = LogOptions::ServiceErrors,
           .messageId = kTextMessage,
-          .text = "\n    Input file " + inputXml + " is corrupt or cannot be found.\n    " + Describe(problem, "    ")});
+          .text =
+              "\n    Input file " + inputXml + " is corrupt or cannot be found.\n    " + Describe(problem, "    ")});
   }
   return document;
 }
 
-// The check runs on a copy beside the file, whose root names the schema; the file itself is never changed. A copy that
-// does not fit stays for the integrator to look at.
+// The check runs on a copy beside the file, whose root names the schema; the file itself is never changed. A copy
+// that does not fit stays for the integrator to look at.
 bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::string& inputXsd) {
   const std::string workFile = inputXml + ".modif";
   std::string componentError;

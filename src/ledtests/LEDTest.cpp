@@ -57,8 +57,8 @@ LEDTest::LEDTest() {
     DeclareArgument(declaration.name, declaration.type, declaration.defaultValue, declaration.description, false,
                     nullptr, false, false);
   }
-  DeclareArgument("-RetryPrompt", kInteger, "260", "The message number for the acknowledge retry window prompt", false,
-                  nullptr, false, true);
+  DeclareArgument("-RetryPrompt", kInteger, "260", "The message number for the acknowledge retry window prompt",
+                  false, nullptr, false, true);
 }
 
 bool LEDTest::Run() {

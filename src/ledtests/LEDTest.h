@@ -1,5 +1,5 @@
-// The sibling of CustomLEDTest whose LEDs are chosen by arguments. Its parameters are declared; its run is still to be
-// written, and ends with a failure that says so.
+// The sibling of CustomLEDTest whose LEDs are chosen by arguments. Its parameters are declared; its run is still to
+// be written, and ends with a failure that says so.
 #pragma once
 
 #include "harness/CDMDiag.h"

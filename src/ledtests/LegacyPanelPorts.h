@@ -1,5 +1,5 @@
-// The power and drive LEDs of machines whose board the INI files do not know: fixed registers of the Super-I/O and the
-// chipset, one read-modify-write per operation. Nothing guards them against other threads.
+// The power and drive LEDs of machines whose board the INI files do not know: fixed registers of the Super-I/O and
+// the chipset, one read-modify-write per operation. Nothing guards them against other threads.
 #pragma once
 
 #include <cstdint>

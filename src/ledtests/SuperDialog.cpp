@@ -31,9 +31,10 @@ constexpr std::uint32_t kStartButtonStyle = 0x50010001;
 constexpr platform::Font kFont{18, 600};
 
 // Flags of SetWindowPosition at its three places.
-constexpr std::uint32_t kPlaceFlags = position::kNoSize | position::kNoZOrder | position::kShowWindow;               // 69
-constexpr std::uint32_t kCreateFlags = position::kNoSize | position::kNoMove | position::kNoZOrder | position::kShowWindow;  // 71
-constexpr std::uint32_t kRaiseFlags = position::kNoSize | position::kNoMove | position::kShowWindow;                 // 67
+constexpr std::uint32_t kPlaceFlags = position::kNoSize | position::kNoZOrder | position::kShowWindow;  // 69
+constexpr std::uint32_t kCreateFlags =
+    position::kNoSize | position::kNoMove | position::kNoZOrder | position::kShowWindow;              // 71
+constexpr std::uint32_t kRaiseFlags = position::kNoSize | position::kNoMove | position::kShowWindow;  // 67
 
 // Layout, in pixels from the client origin.
 constexpr int kWindowWidth = 615;
@@ -438,9 +439,9 @@ void SuperDialog::AwaitEnd(int number, const LEDStruct& entry) {
   constexpr std::uint32_t kPoll_ms = 100;
   const std::uint32_t begin = TheClock().TickCount();
   const auto log = [&](const char* text) {
-    CDMout::LogMessage(LogOptions::Status, kFreeText,
-                       text + CDMUtil::ToString(number) +
-                           ", Finished: " + CDMUtil::ToString(bool{entry.workerFinished}));
+    CDMout::LogMessage(
+        LogOptions::Status, kFreeText,
+        text + CDMUtil::ToString(number) + ", Finished: " + CDMUtil::ToString(bool{entry.workerFinished}));
   };
   log("Exit_Window: DeviceID - ");
   while (!entry.workerFinished && TheClock().TickCount() - begin < kLongestWait_ms) {

@@ -1,5 +1,6 @@
-// One attempt of CustomLEDTest: a topmost window with a grid of icons and buttons, which starts the LEDs of the device
-// array one after the other and judges the operator's answers. Runs on a thread of its own, which owns the window.
+// One attempt of CustomLEDTest: a topmost window with a grid of icons and buttons, which starts the LEDs of the
+// device array one after the other and judges the operator's answers. Runs on a thread of its own, which owns the
+// window.
 #pragma once
 
 #include <cstdint>

@@ -1,5 +1,5 @@
-// The prompt lock and what prompts need of the harness. A prompt, or a test's own dialog, holds the lock for as long as
-// the operator can see it, so that those of all processes of the machine appear one after the other.
+// The prompt lock and what prompts need of the harness. A prompt, or a test's own dialog, holds the lock for as long
+// as the operator can see it, so that those of all processes of the machine appear one after the other.
 #pragma once
 
 #include <cstdint>

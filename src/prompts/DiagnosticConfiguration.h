@@ -1,5 +1,5 @@
-// The look of the prompts that a field integrator can change: an INI file whose mere existence selects the configurable
-// window family.
+// The look of the prompts that a field integrator can change: an INI file whose mere existence selects the
+// configurable window family.
 #pragma once
 
 #include <cstdint>

@@ -16,7 +16,8 @@ int DiagnosticWindow::ImageForm(const wstring& text, const wstring& title, unsig
 }
 
 int DiagnosticWindow::TextForm(const wstring& text, const wstring& title, unsigned int style) {
-  return PromptWindow({kClassName, configuration.GetBackgroundBrush(), true}, {text, title, style, false, {}, nullptr, 0})
+  return PromptWindow({kClassName, configuration.GetBackgroundBrush(), true},
+                      {text, title, style, false, {}, nullptr, 0})
       .Run();
 }
 

@@ -198,9 +198,9 @@ void PromptWindow::MeasureImage() {
 }
 
 int PromptWindow::Run() {
-  const RegisteredClass registered(
-      desktop_, {family_.className, kClassStyle, 1, family_.background,
-                 [this](const platform::Message& received) { return Handle(received); }});
+  const RegisteredClass registered(desktop_,
+                                   {family_.className, kClassStyle, 1, family_.background,
+                                    [this](const platform::Message& received) { return Handle(received); }});
   if (!Create()) {
     CDMout::LogMessage(LogOptions::ServiceErrors, kFreeText, "A prompt cannot be shown: there is no display.");
     return prompt_result::kNone;

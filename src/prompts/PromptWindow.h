@@ -1,5 +1,5 @@
-// The plain prompts: a window with a text, optionally an image with scroll bars, and buttons. A call shows it, waits in
-// its own message loop until a button, a time-out or a worker ends it, and returns the result.
+// The plain prompts: a window with a text, optionally an image with scroll bars, and buttons. A call shows it, waits
+// in its own message loop until a button, a time-out or a worker ends it, and returns the result.
 #pragma once
 
 #include <cstdint>
@@ -12,8 +12,8 @@
 
 namespace panelglow {
 
-/// An image with scroll bars, a text field and a row of buttons; resizable. Either may be missing. An image that cannot
-/// be loaded is logged and replaced by its file's name. An empty title becomes the executable's full path.
+/// An image with scroll bars, a text field and a row of buttons; resizable. Either may be missing. An image that
+/// cannot be loaded is logged and replaced by its file's name. An empty title becomes the executable's full path.
 int ImagePrompt(const wstring& text, const wstring& title, unsigned int style, const wstring& imagePath,
                 AutoWorker autoWorker, int autoResult);
 

@@ -7,8 +7,8 @@ namespace panelglow {
 
 namespace {
 
-constexpr int kTachClock = 5'400'000;             // counts per minute of the tachometers' clock
-constexpr std::uint32_t kTachStopped = 0xFFFF;    // a tachometer that has run over: the fan stands
+constexpr int kTachClock = 5'400'000;           // counts per minute of the tachometers' clock
+constexpr std::uint32_t kTachStopped = 0xFFFF;  // a tachometer that has run over: the fan stands
 constexpr int kFullDuty = 255;
 
 // Power button registers of the chipset.

@@ -1,6 +1,6 @@
-// One hardware part of a board, seen through one wide interface: fans, temperatures, GPIO lines, the power button, and
-// each front-panel LED. The base gives a neutral negative answer to every operation; a chip class overrides what its
-// silicon can do. Serves the chip name "chip".
+// One hardware part of a board, seen through one wide interface: fans, temperatures, GPIO lines, the power button,
+// and each front-panel LED. The base gives a neutral negative answer to every operation; a chip class overrides what
+// its silicon can do. Serves the chip name "chip".
 //
 // Operations return true when the part can do what was asked; false means that the platform has no such thing and
 // changes nothing. A chip is one board's and one thread's.
@@ -46,7 +46,8 @@ class Chip {
   virtual void RestoreFanControl(int /*fan*/) {}
 
   // ---- temperatures, degrees Celsius
-  virtual bool ReadProcessorTemperature(int /*zone*/, int& /*value*/, bool /*flag*/, const std::string& /*zoneName*/) {
+  virtual bool ReadProcessorTemperature(int /*zone*/, int& /*value*/, bool /*flag*/,
+                                        const std::string& /*zoneName*/) {
     return false;
   }
   virtual bool ReadVirtualTemperature(int /*zone*/, bool /*flag*/, int& /*value*/) { return false; }
@@ -143,8 +144,8 @@ class Chip {
 
   CDevio& devio;
   std::string name;
-  bool manualFanMode = false;   // fans are under software control
-  bool fanStateSaved = false;   // saved fan registers are valid
+  bool manualFanMode = false;    // fans are under software control
+  bool fanStateSaved = false;    // saved fan registers are valid
   std::uint32_t lastStatus = 0;  // last value of a latched status read
 
  private:

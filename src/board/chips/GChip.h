@@ -42,10 +42,10 @@ class GChip : public Chip {
   [[nodiscard]] std::vector<std::uint32_t> ReadNumberedList(const std::string& countKey, const std::string& prefix,
                                                             const std::string& suffix) const;
 
-  std::string section;                         // chip file section; empty until loaded
-  std::vector<std::uint8_t> savedFanData;      // values read by SaveFanState
+  std::string section;                     // chip file section; empty until loaded
+  std::vector<std::uint8_t> savedFanData;  // values read by SaveFanState
   std::vector<std::uint8_t> fanSaveRegs;
-  std::uint32_t fanRestoreSleep = 0;           // ms
+  std::uint32_t fanRestoreSleep = 0;  // ms
   std::vector<std::uint32_t> tachRegs;
   std::vector<std::uint16_t> pwmRegs;
   std::uint8_t fullSpeedData = 255;

@@ -11,10 +11,10 @@ namespace {
 
 // Keys of the lists, in the order of MaskedLedChip::List.
 constexpr std::array<std::string_view, 12> kListKeys{
-    "powerled.green.assert.sequence",    "powerled.green.deassert.sequence",  "powerled.red.assert.sequence",
-    "powerled.red.deassert.sequence",    "chargeled.white.assert.sequence",   "chargeled.white.deassert.sequence",
-    "chargeled.red.assert.sequence",     "chargeled.red.deassert.sequence",   "hdled.red.assert.sequence",
-    "hdled.red.deassert.sequence",       "wirelessled.assert.sequence",       "wirelessled.deassert.sequence"};
+    "powerled.green.assert.sequence", "powerled.green.deassert.sequence", "powerled.red.assert.sequence",
+    "powerled.red.deassert.sequence", "chargeled.white.assert.sequence",  "chargeled.white.deassert.sequence",
+    "chargeled.red.assert.sequence",  "chargeled.red.deassert.sequence",  "hdled.red.assert.sequence",
+    "hdled.red.deassert.sequence",    "wirelessled.assert.sequence",      "wirelessled.deassert.sequence"};
 
 std::uint8_t MaskOf(const SequenceEntry& entry) { return entry.data.empty() ? std::uint8_t{0} : entry.data.front(); }
 

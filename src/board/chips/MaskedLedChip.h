@@ -1,5 +1,6 @@
-// What "g_iospace" and "g_memoryspace" share: LEDs that are bits of plain registers. A sequence entry's command is the
-// register's address, its first data byte a mask. How a register is read, changed and waited for is the derived class's.
+// What "g_iospace" and "g_memoryspace" share: LEDs that are bits of plain registers. A sequence entry's command is
+// the register's address, its first data byte a mask. How a register is read, changed and waited for is the derived
+// class's.
 #pragma once
 
 #include <array>
@@ -30,7 +31,9 @@ class MaskedLedChip : public GChip {
   bool AssertHdLedRed() override { return Set(list(kHdRedAssert)); }
   bool DeassertHdLedRed() override { return Keep(list(kHdRedDeassert)); }
 
-  bool SaveWirelessLedState() override { return Save(list(kWirelessAssert), list(kWirelessDeassert), savedWirelessLed); }
+  bool SaveWirelessLedState() override {
+    return Save(list(kWirelessAssert), list(kWirelessDeassert), savedWirelessLed);
+  }
   bool RestoreWirelessLedState() override { return Restore(list(kWirelessAssert), savedWirelessLed); }
   bool AssertWirelessLed() override { return Flip(list(kWirelessAssert)); }
   bool DeassertWirelessLed() override { return Flip(list(kWirelessDeassert)); }

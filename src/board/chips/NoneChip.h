@@ -1,5 +1,5 @@
-// The part that a board does not have: fills its place in the chip table and answers every operation as the base does.
-// Serves the chip name "none".
+// The part that a board does not have: fills its place in the chip table and answers every operation as the base
+// does. Serves the chip name "none".
 #pragma once
 
 #include "board/chips/Chip.h"

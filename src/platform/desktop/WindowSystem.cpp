@@ -254,7 +254,8 @@ void WindowSystem::DestroyWindow(WindowHandle handle) {
   std::erase(order_, handle);
   windows_.erase(handle);
   if (foreground_ == handle) {
-    const auto visible = std::find_if(order_.rbegin(), order_.rend(), [&](WindowHandle w) { return Find(w)->visible; });
+    const auto visible =
+        std::find_if(order_.rbegin(), order_.rend(), [&](WindowHandle w) { return Find(w)->visible; });
     foreground_ = visible == order_.rend() ? 0 : *visible;
   }
 }
@@ -496,8 +497,8 @@ WindowHandle WindowSystem::FindControl(WindowHandle parent, int id) {
   if (window == nullptr) {
     return 0;
   }
-  const auto found =
-      std::find_if(window->children.begin(), window->children.end(), [&](WindowHandle c) { return Find(c)->id == id; });
+  const auto found = std::find_if(window->children.begin(), window->children.end(),
+                                  [&](WindowHandle c) { return Find(c)->id == id; });
   return found == window->children.end() ? 0 : *found;
 }
 
@@ -695,8 +696,7 @@ bool WindowSystem::TakeInput(Queue& queue, Message& message) {
       message = {target, input.alt ? message::kSysKeyDown : message::kKeyDown, input.virtualKey, 0};
       queue.posted.push_front({target, input.alt ? message::kSysKeyUp : message::kKeyUp, input.virtualKey, 0});
       if (input.character != 0) {
-        queue.posted.push_front(
-            {target, input.alt ? message::kSysChar : message::kChar, input.character, 0});
+        queue.posted.push_front({target, input.alt ? message::kSysChar : message::kChar, input.character, 0});
       }
       return true;
     }

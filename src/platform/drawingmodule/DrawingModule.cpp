@@ -28,8 +28,8 @@ using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
 using Description = std::unique_ptr<PangoFontDescription, Deleter<pango_font_description_free>>;
 using Pixbuf = std::unique_ptr<GdkPixbuf, Deleter<g_object_unref>>;
 
-constexpr int kIconSize = 32;              // pixels
-constexpr int kLargestImageSide = 16384;   // pixels; larger pictures are treated as unreadable
+constexpr int kIconSize = 32;             // pixels
+constexpr int kLargestImageSide = 16384;  // pixels; larger pictures are treated as unreadable
 
 std::string Utf8(std::u16string_view text) {
   glong length = 0;

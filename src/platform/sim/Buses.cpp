@@ -7,7 +7,8 @@ namespace panelglow::platform::sim {
 namespace {
 
 bool AnyContains(const std::vector<AddressRange>& ranges, std::uint64_t address) {
-  return std::any_of(ranges.begin(), ranges.end(), [&](const AddressRange& range) { return range.Contains(address); });
+  return std::any_of(ranges.begin(), ranges.end(),
+                     [&](const AddressRange& range) { return range.Contains(address); });
 }
 
 }  // namespace

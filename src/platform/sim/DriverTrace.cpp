@@ -31,8 +31,8 @@ std::string Bytes(const std::vector<std::byte>& bytes) {
 }  // namespace
 
 std::string Describe(const DriverRequest& request) {
-  const std::string head = "simulated " + std::to_string(request.time) + " us thread " +
-                           std::to_string(request.thread) + " ";
+  const std::string head =
+      "simulated " + std::to_string(request.time) + " us thread " + std::to_string(request.thread) + " ";
   const std::string failed = request.result == 0 ? "" : " error " + std::to_string(request.result);
   switch (request.code) {
     case 0x220004:

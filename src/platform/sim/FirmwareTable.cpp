@@ -51,8 +51,8 @@ std::vector<std::uint8_t> BuildFirmwareTable(const FirmwareDescription& firmware
   // 0, BIOS information: vendor, version, segment, release date, ROM size, characteristics.
   table.Add(0, {1, 2, 0x00, 0xF0, 3, 0x0F, 0x80, 0, 0, 0, 0, 0, 0, 0}, {"Panelglow BIOS", "1.00", "03/01/2024"});
   // 1, system information: manufacturer, product, version, serial, UUID, wake-up, SKU, family.
-  table.Add(1, {1, 2, 3, 4, 0x33, 0x22, 0x11, 0x00, 0x55, 0x44, 0x77, 0x66, 0x88, 0x99, 0xAA, 0xBB, 0xCC, 0xDD, 0xEE,
-                0xFF, 6, 5, 6},
+  table.Add(1, {1,    2,    3,    4,    0x33, 0x22, 0x11, 0x00, 0x55, 0x44, 0x77, 0x66,
+                0x88, 0x99, 0xAA, 0xBB, 0xCC, 0xDD, 0xEE, 0xFF, 6,    5,    6},
             {firmware.boardManufacturer, firmware.systemProduct, "A1", "SIM0001", "SKU1", "Simulated"});
   // 2, base board: manufacturer, product, version, serial.
   if (firmware.boardProduct.empty()) {
@@ -64,8 +64,18 @@ std::vector<std::uint8_t> BuildFirmwareTable(const FirmwareDescription& firmware
   table.Add(3, {1, 0x03, 0, 0, 0, 3, 3, 3, 3}, {firmware.boardManufacturer});
   for (const ProcessorDescription& processor : firmware.processors) {
     // 4, processor: socket, type, family, manufacturer, id, version, voltage, clocks, status (populated, enabled).
-    table.Add(4, {1, 3, processor.family, 2, 0, 0, 0, 0, 0, 0, 0, 0, 3, 0x8C, 100, 0, 0x10, 0x0E, 0x10, 0x0E, 0x41, 1,
-                  0, 0, 0, 0, 0, 0, 0, 0, 0, 4, 4, 8},
+    table.Add(4, {1,    3,    processor.family,
+                  2,    0,    0,
+                  0,    0,    0,
+                  0,    0,    0,
+                  3,    0x8C, 100,
+                  0,    0x10, 0x0E,
+                  0x10, 0x0E, 0x41,
+                  1,    0,    0,
+                  0,    0,    0,
+                  0,    0,    0,
+                  0,    4,    4,
+                  8},
               {"CPU 0", processor.manufacturer, "Simulated processor"});
   }
   table.Add(127, {}, {});

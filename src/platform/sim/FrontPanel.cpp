@@ -28,7 +28,8 @@ std::string WrongColor(const std::string& color) { return color == "red" ? "gree
 }  // namespace
 
 std::optional<LedFault> LedFaultByName(std::string_view name) {
-  const auto found = std::find_if(kFaultNames.begin(), kFaultNames.end(), [&](const FaultName& f) { return f.name == name; });
+  const auto found =
+      std::find_if(kFaultNames.begin(), kFaultNames.end(), [&](const FaultName& f) { return f.name == name; });
   return found == kFaultNames.end() ? std::nullopt : std::optional<LedFault>(found->fault);
 }
 

@@ -8,10 +8,10 @@
 
 namespace panelglow::platform::sim {
 
-/// Base + 0x33 and + 0x34: configuration of the green and the red power LED, bit 2 set: the Super-I/O drives the LED by
-/// itself (green steady on, red off: the machine is awake); clear: the LED follows the data register. Base + 0x4D: data
-/// register, bit 0 the red, bit 1 the green power LED; the two share one pair of lines, so both set leaves both dark.
-/// Port 0xFA0E: chipset GPIO, bit 7 the red drive LED.
+/// Base + 0x33 and + 0x34: configuration of the green and the red power LED, bit 2 set: the Super-I/O drives the LED
+/// by itself (green steady on, red off: the machine is awake); clear: the LED follows the data register. Base + 0x4D:
+/// data register, bit 0 the red, bit 1 the green power LED; the two share one pair of lines, so both set leaves both
+/// dark. Port 0xFA0E: chipset GPIO, bit 7 the red drive LED.
 class LegacyPanelBlock : public Device {
  public:
   static constexpr std::uint16_t kChipsetGpioData = 0xFA0E;

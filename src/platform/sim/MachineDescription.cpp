@@ -13,7 +13,8 @@ namespace panelglow::platform::sim {
 
 namespace {
 
-// A table of the file that knows which of its keys were asked for, so that a misspelt key is an error and not silence.
+// A table of the file that knows which of its keys were asked for, so that a misspelt key is an error and not
+// silence.
 class Section {
  public:
   Section(const toml::table& table, std::string_view source, std::string path)
@@ -171,8 +172,8 @@ void ReadDriver(Section& section, DriverDescription& driver) {
   driver.startError = section.Get("start_error", driver.startError);
   driver.version = section.Get("version", driver.version);
   section.Each("service", [&](Section& service) {
-    driver.services.push_back({service.Required("name"), service.Get("running", false),
-                               service.Get<std::uint32_t>("start_error", 0)});
+    driver.services.push_back(
+        {service.Required("name"), service.Get("running", false), service.Get<std::uint32_t>("start_error", 0)});
   });
 }
 

@@ -15,7 +15,9 @@ class MemoryRegisters : public Device {
   MemoryRegisters(std::uint64_t base, std::vector<std::uint8_t> bytes) : base_(base), bytes_(std::move(bytes)) {}
 
   [[nodiscard]] std::vector<AddressRange> MemoryRanges() const override { return {{base_, bytes_.size()}}; }
-  std::uint8_t ReadMemory(std::uint64_t address) override { return bytes_[static_cast<std::size_t>(address - base_)]; }
+  std::uint8_t ReadMemory(std::uint64_t address) override {
+    return bytes_[static_cast<std::size_t>(address - base_)];
+  }
   void WriteMemory(std::uint64_t address, std::uint8_t value) override {
     bytes_[static_cast<std::size_t>(address - base_)] = value;
   }

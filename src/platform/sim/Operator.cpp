@@ -12,15 +12,15 @@ namespace panelglow::platform::sim {
 namespace {
 
 constexpr Microseconds kMillisecond = 1000;
-constexpr Microseconds kGlance = 50 * kMillisecond;       // how often the person looks
-constexpr Microseconds kReaction = 300 * kMillisecond;    // from knowing to pressing
-constexpr Microseconds kReading = 800 * kMillisecond;     // of a prompt
-constexpr Microseconds kBlindPause = 3000 * kMillisecond; // between presses of one who does not look
+constexpr Microseconds kGlance = 50 * kMillisecond;        // how often the person looks
+constexpr Microseconds kReaction = 300 * kMillisecond;     // from knowing to pressing
+constexpr Microseconds kReading = 800 * kMillisecond;      // of a prompt
+constexpr Microseconds kBlindPause = 3000 * kMillisecond;  // between presses of one who does not look
 // A LED blinks when it has changed four times and not long ago: a LED that is put back after its turn changes up to
 // three times more. The slowest blink has phases of 1.5 s.
 constexpr std::size_t kEdgesOfABlink = 4;
 constexpr Microseconds kLongestPhase = 1600 * kMillisecond;
-constexpr Microseconds kDarkness = 6000 * kMillisecond;   // nothing has changed for so long: no LED blinks
+constexpr Microseconds kDarkness = 6000 * kMillisecond;  // nothing has changed for so long: no LED blinks
 
 constexpr int kOkButton = 1005;
 constexpr int kCancelTest = 999;
@@ -81,7 +81,8 @@ Operator::Operator(Simulation& simulation, const std::string& policy)
   const std::size_t colon = policy.find(':');
   const std::string name = policy.substr(0, colon);
   const std::string detail = colon == std::string::npos ? "" : policy.substr(colon + 1);
-  const auto found = std::find_if(kPolicies.begin(), kPolicies.end(), [&](const PolicyName& p) { return p.name == name; });
+  const auto found =
+      std::find_if(kPolicies.begin(), kPolicies.end(), [&](const PolicyName& p) { return p.name == name; });
   if (found == kPolicies.end()) {
     throw MachineError("there is no operator \"" + name + "\" (" + PolicyNames() + ")");
   }
@@ -191,7 +192,8 @@ std::optional<int> Operator::JudgePanel(const std::vector<Button>& buttons) cons
   std::vector<std::size_t> edges(panel.Leds().size());
   std::vector<Microseconds> latest(panel.Leds().size());
   Microseconds lastChange = turnBegan_;
-  for (auto change = panel.TimeLine().rbegin(); change != panel.TimeLine().rend() && change->time >= turnBegan_; ++change) {
+  for (auto change = panel.TimeLine().rbegin(); change != panel.TimeLine().rend() && change->time >= turnBegan_;
+       ++change) {
     ++edges[change->led];
     latest[change->led] = std::max(latest[change->led], change->time);
     lastChange = std::max(lastChange, change->time);
@@ -224,8 +226,8 @@ std::optional<int> Operator::JudgePanel(const std::vector<Button>& buttons) cons
 std::optional<int> Operator::GuessButton(const std::vector<Button>& buttons) {
   std::vector<int> choices;
   for (const Button& button : buttons) {
-    const bool used = policy_ == Policy::kElimination &&
-                      std::find(pressed_.begin(), pressed_.end(), button.id) != pressed_.end();
+    const bool used =
+        policy_ == Policy::kElimination && std::find(pressed_.begin(), pressed_.end(), button.id) != pressed_.end();
     if (button.id > kStartTest && !used) {
       choices.push_back(button.id);
     }

@@ -214,8 +214,8 @@ Scheduler::Thread* Scheduler::Choose() {
       Stuck("deadlock: no thread can ever run again");
     }
     AdvanceTo(earliest);
-    Thread* next =
-        candidates.size() == 1 ? candidates.front() : candidates[Random(static_cast<std::uint32_t>(candidates.size()))];
+    Thread* next = candidates.size() == 1 ? candidates.front()
+                                          : candidates[Random(static_cast<std::uint32_t>(candidates.size()))];
     next->state = State::kReady;
     next->wake = now_;
     next->deadline.reset();

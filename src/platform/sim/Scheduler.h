@@ -30,8 +30,8 @@ class Scheduler {
 
   struct Options {
     std::uint64_t seed = 1;
-    bool realTime = false;              // time follows the wall clock, for a person to watch
-    Microseconds timeLimit_us = 0;      // 0: no limit
+    bool realTime = false;          // time follows the wall clock, for a person to watch
+    Microseconds timeLimit_us = 0;  // 0: no limit
   };
 
   /// Adopts the calling thread as the first simulated thread, which holds the baton.
@@ -89,8 +89,8 @@ class Scheduler {
     ThreadId id = 0;
     std::string name;
     State state = State::kReady;
-    Microseconds wake = 0;                  // when ready
-    std::optional<Microseconds> deadline;   // when blocked
+    Microseconds wake = 0;                 // when ready
+    std::optional<Microseconds> deadline;  // when blocked
     WaitKey key = nullptr;
     std::string waitsFor;
     bool terminate = false;

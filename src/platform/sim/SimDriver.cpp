@@ -47,10 +47,15 @@ class SimDriver::LinkedDevice : public DriverDevice {
 
   std::uint32_t Control(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) override {
     driver_.scheduler_.Spend(kRequestCost_us);
-    std::vector<std::byte> request(in.begin(), in.end());  // buffered transfer: the answer never overlaps the question
+    std::vector<std::byte> request(in.begin(),
+                                   in.end());  // buffered transfer: the answer never overlaps the question
     const std::uint32_t result = driver_.Answer(code, request, out);
     if (driver_.trace_.IsWanted()) {
-      driver_.trace_.Add({driver_.scheduler_.Now(), driver_.scheduler_.Current(), code, result, std::move(request),
+      driver_.trace_.Add({driver_.scheduler_.Now(),
+                          driver_.scheduler_.Current(),
+                          code,
+                          result,
+                          std::move(request),
                           {out.begin(), out.end()}});
     }
     driver_.moved_();
@@ -81,7 +86,11 @@ class SimDriver::LinkedDevice : public DriverDevice {
     if (driver_.trace_.IsWanted()) {
       std::vector<std::byte> where(8);
       Put(where, 0, 8, address);
-      driver_.trace_.Add({driver_.scheduler_.Now(), driver_.scheduler_.Current(), code, 0, std::move(where),
+      driver_.trace_.Add({driver_.scheduler_.Now(),
+                          driver_.scheduler_.Current(),
+                          code,
+                          0,
+                          std::move(where),
                           {bytes.begin(), bytes.end()}});
     }
   }
@@ -286,9 +295,8 @@ std::uint32_t SimDriver::AnswerPciSearch(std::uint32_t code, std::span<std::byte
       const auto found = function.registers.find(offset);
       return found == function.registers.end() ? 0U : found->second;
     };
-    const bool matches = code == kFindPciClass
-                             ? (dword(8) >> 8U) == Get(record, 0, 4)
-                             : dword(0) == (Get(record, 4, 2) | Get(record, 6, 2) << 16U);
+    const bool matches = code == kFindPciClass ? (dword(8) >> 8U) == Get(record, 0, 4)
+                                               : dword(0) == (Get(record, 4, 2) | Get(record, 6, 2) << 16U);
     if (matches && index-- == 0) {
       Put(record, 10, 2, function.location);
       Put(record, 12, 1, 0);

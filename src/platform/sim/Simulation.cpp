@@ -167,9 +167,7 @@ class SimTouchpad : public Touchpad {
   SimTouchpad(bool present, Scheduler& scheduler, KeyboardDevice& device, std::function<void()> moved)
       : present_(present), scheduler_(scheduler), device_(device), moved_(std::move(moved)) {}
 
-  std::unique_ptr<TouchpadApi> Create() override {
-    return present_ ? std::make_unique<Api>(*this) : nullptr;
-  }
+  std::unique_ptr<TouchpadApi> Create() override { return present_ ? std::make_unique<Api>(*this) : nullptr; }
 
  private:
   static constexpr std::int32_t kDevice = 3;
@@ -282,8 +280,8 @@ struct Simulation::Parts {
         windowHost(scheduler),
         windows(windowHost, description.screenWidth, description.screenHeight),
         images(drawing),
-        host{clock, console, cpu, windows, driver, environment, files, images, keyboard, management, mutexes, profiles,
-             driver, threads, touchpad, xmlDocuments} {}
+        host{clock,    console,    cpu,     windows,  driver, environment, files,    images,
+             keyboard, management, mutexes, profiles, driver, threads,     touchpad, xmlDocuments} {}
 
   static KeyboardDevice& AttachAll(Buses& buses, const MachineDescription& machine) {
     auto keyboard = std::make_unique<KeyboardDevice>();

@@ -169,7 +169,8 @@ class LibXmlDocument : public XmlDocument {
     xmlChar* bytes = nullptr;
     int size = 0;
     xmlDocDumpMemory(document_.get(), &bytes, &size);
-    std::string text = bytes == nullptr ? std::string() : std::string(reinterpret_cast<char*>(bytes), static_cast<std::size_t>(size));
+    std::string text = bytes == nullptr ? std::string()
+                                        : std::string(reinterpret_cast<char*>(bytes), static_cast<std::size_t>(size));
     xmlFree(bytes);
     return text;
   }
@@ -189,8 +190,9 @@ class LibXmlDocument : public XmlDocument {
     xmlFree(named);
     const Schema schema = LoadSchema(schemaPath, findings);
     if (!schema) {
-      findings.problems.insert(findings.problems.begin(),
-                               {XML_SCHEMAP_FAILED_LOAD, "the schema file \"" + schemaPath + "\" cannot be used\n", "/"});
+      findings.problems.insert(
+          findings.problems.begin(),
+          {XML_SCHEMAP_FAILED_LOAD, "the schema file \"" + schemaPath + "\" cannot be used\n", "/"});
       return findings.problems;
     }
     const Validator validator(xmlSchemaNewValidCtxt(schema.get()));
