@@ -39,6 +39,15 @@ class Section {
     return *value;
   }
 
+  // A number that has to be there.
+  template <class T>
+  T Number(std::string_view key) {
+    if (Node(key) == nullptr) {
+      Fail(table_, "\"" + path_ + std::string(key) + "\" is missing");
+    }
+    return Get<T>(key, {});
+  }
+
   std::string Required(std::string_view key) {
     if (Node(key) == nullptr) {
       Fail(table_, "\"" + path_ + std::string(key) + "\" is missing");
@@ -212,7 +221,7 @@ void ReadEvent(Section& section, MachineDescription& machine) {
   } else if (section.Get("fill_disk", false)) {
     event.kind = ScriptedEvent::Kind::kFillDisk;
   } else {
-    event.console = section.Get<std::uint32_t>("console", 0);
+    event.console = section.Number<std::uint32_t>("console");  // an event that does nothing is a mistake
   }
   machine.events.push_back(event);
 }
@@ -294,8 +303,8 @@ MachineDescription ParseMachine(std::string_view text, std::string_view source) 
   root.Each("led", [&](Section& section) { ReadLed(section, machine); });
   root.Each("event", [&](Section& section) { ReadEvent(section, machine); });
   root.Each("peer", [&](Section& section) {
-    machine.peers.push_back({section.Required("mutex"), Milliseconds(section, "from_ms"),
-                             Milliseconds(section, "until_ms"), section.Get("killed", false)});
+    machine.peers.push_back(
+        {section.Required("mutex"), Milliseconds(section, "from_ms"), Milliseconds(section, "until_ms")});
   });
   root.Each("management", [&](Section& section) { ReadManagement(section, machine); });
   root.RefuseUnknownKeys();

@@ -78,12 +78,12 @@ struct ScriptedEvent {
   std::uint32_t console = 0;
 };
 
-/// Another process of the machine that holds a named mutex for a while. A killed one never releases it.
+/// Another process of the machine that holds a named mutex for a while. Whether it then releases the mutex or is
+/// killed makes no difference to the one who waits.
 struct Peer {
   std::string mutex;
   Microseconds from = 0;
   Microseconds until = 0;
-  bool killed = false;
 };
 
 struct ManagementTable {

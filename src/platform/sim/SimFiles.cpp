@@ -7,6 +7,10 @@ namespace panelglow::platform::sim {
 
 namespace {
 constexpr Microseconds kFileCost_us = 50;
+
+// The simulated program goes by its product's name, so that it finds the product's message files.
+constexpr std::string_view kSimulatedProgram = "panelglow-diags-sim";
+constexpr std::string_view kProduct = "panelglow-diags";
 }  // namespace
 
 std::string SimFiles::Key(std::string_view path) {
@@ -99,7 +103,8 @@ std::string SimFiles::CurrentDirectory() { return real_ != nullptr ? real_->Curr
 
 std::string SimFiles::FileName(std::string_view path) {
   const std::size_t separator = path.find_last_of("\\/");
-  return std::string(separator == std::string_view::npos ? path : path.substr(separator + 1));
+  const std::string_view name = separator == std::string_view::npos ? path : path.substr(separator + 1);
+  return std::string(name == kSimulatedProgram ? kProduct : name);
 }
 
 std::string SimFiles::ExecutablePath() {

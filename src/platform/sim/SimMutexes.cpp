@@ -14,7 +14,6 @@ SimMutexes::SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers) : s
         mutex.count = 1;
       }
     });
-    // A peer that is killed and one that releases look alike to the waiter: the mutex is to be had.
     scheduler_.At(peer.until, [this, handle] {
       Mutex& mutex = mutexes_[handle];
       if (mutex.owner == kPeer) {
