@@ -8,6 +8,10 @@ namespace panelglow::platform::posix {
 
 void* LoadSymbol(const std::string& module, const char* symbol, std::string& error) {
   const std::string executable = PosixFiles().ExecutablePath();
+  if (executable.empty()) {
+    error = "the program's own folder is not known";
+    return nullptr;
+  }
   const std::string folder = executable.substr(0, executable.find_last_of('/') + 1);
   void* library = nullptr;
   for (const char* place : {"../lib/", ""}) {

@@ -10,8 +10,11 @@
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
-#include <ctime>
-#include <utility>
+#include <filesystem>
+#include <functional>
+#include <thread>
+
+#include "platform/posix/Descriptor.h"
 
 namespace panelglow::platform::posix {
 
@@ -19,27 +22,7 @@ namespace {
 
 constexpr mode_t kNewFileMode = 0644;
 constexpr int kLockTries = 100;
-constexpr long kLockPause_ns = 100'000'000;  // with the tries: about ten seconds
-
-class Descriptor {
- public:
-  explicit Descriptor(int fd) : fd_(fd) {}
-  Descriptor(Descriptor&& other) noexcept : fd_(std::exchange(other.fd_, -1)) {}
-  Descriptor& operator=(Descriptor&& other) noexcept {
-    std::swap(fd_, other.fd_);
-    return *this;
-  }
-  ~Descriptor() {
-    if (fd_ >= 0) {
-      ::close(fd_);
-    }
-  }
-  [[nodiscard]] int Get() const { return fd_; }
-  explicit operator bool() const { return fd_ >= 0; }
-
- private:
-  int fd_;
-};
+constexpr std::chrono::milliseconds kLockPause{100};  // with the tries: about ten seconds
 
 // Never blocks on a FIFO, never opens a folder or a device as a file.
 Descriptor OpenRegular(const std::string& path, int flags) {
@@ -52,13 +35,6 @@ Descriptor OpenRegular(const std::string& path, int flags) {
     return Descriptor(-1);
   }
   return file;
-}
-
-void Lock(int fd) {
-  for (int i = 0; i < kLockTries && ::flock(fd, LOCK_EX | LOCK_NB) != 0 && (errno == EWOULDBLOCK || errno == EINTR); ++i) {
-    const timespec pause{0, kLockPause_ns};
-    ::nanosleep(&pause, nullptr);
-  }
 }
 
 // The content from the beginning; nothing when it is too large or cannot be read.
@@ -125,34 +101,62 @@ bool IsCurrent(int fd, const std::string& path) {
          opened.st_dev == named.st_dev;
 }
 
-Descriptor OpenLocked(const std::string& path, int flags) {
-  for (int i = 0; i < kLockTries; ++i) {
-    Descriptor file = OpenRegular(path, flags);
-    if (!file) {
-      return file;
-    }
-    Lock(file.Get());
-    if (IsCurrent(file.Get(), path)) {
-      return file;
+// Opens and locks; without the lock when it is not to be had in time. `pause` lets some time pass between two tries.
+Descriptor OpenLocked(const std::string& path, int flags, const std::function<void()>& pause) {
+  Descriptor file = OpenRegular(path, flags);
+  for (int i = 0; i < kLockTries && file; ++i) {
+    if (::flock(file.Get(), LOCK_EX | LOCK_NB) == 0) {
+      if (IsCurrent(file.Get(), path)) {
+        break;
+      }
+      file = OpenRegular(path, flags);
+    } else if (errno == EWOULDBLOCK) {
+      pause();
+    } else if (errno != EINTR) {
+      break;  // a file system without locks
     }
   }
-  return OpenRegular(path, flags);
+  return file;
 }
 
-// Puts a new file with `bytes` in the place of `path`. False, and nothing changed, when that does not work.
-bool ReplaceFile(const std::string& path, std::string_view bytes, mode_t mode, bool& madeTemporary) {
+enum class Replacement { kDone, kNoSpace, kNotPossible };
+
+// Puts a new file with `bytes` in the place of `path`, with the owner and the rights of the old one. Otherwise
+// nothing is changed: the bytes found no space, or the folder does not take a new file under this name.
+Replacement ReplaceFile(const std::string& path, std::string_view bytes, const struct stat& old) {
   std::string temporary = path + ".XXXXXX";
-  Descriptor file(::mkostemp(temporary.data(), O_CLOEXEC));
-  madeTemporary = static_cast<bool>(file);
+  const Descriptor file(::mkostemp(temporary.data(), O_CLOEXEC));
   if (!file) {
-    return false;
+    return Replacement::kNotPossible;
   }
-  const bool written = WriteAll(file.Get(), bytes) && ::fchmod(file.Get(), mode & 07777U) == 0 &&
-                       ::fsync(file.Get()) == 0 && ::rename(temporary.c_str(), path.c_str()) == 0;
-  if (!written) {
-    ::unlink(temporary.c_str());
+  Replacement result = Replacement::kNotPossible;
+  struct stat made {};
+  if (!WriteAll(file.Get(), bytes) || ::fsync(file.Get()) != 0) {
+    result = Replacement::kNoSpace;
+  } else if (::fstat(file.Get(), &made) == 0 &&
+             ((made.st_uid == old.st_uid && made.st_gid == old.st_gid) ||
+              ::fchown(file.Get(), old.st_uid, old.st_gid) == 0) &&
+             ::fchmod(file.Get(), old.st_mode & 07777U) == 0 && ::rename(temporary.c_str(), path.c_str()) == 0) {
+    return Replacement::kDone;
   }
-  return written;
+  ::unlink(temporary.c_str());
+  return result;
+}
+
+// Writes into the file itself; puts the old content back when that fails half-way.
+bool OverwriteFile(int fd, std::string_view bytes) {
+  const auto store = [&](std::string_view content) {
+    return ::lseek(fd, 0, SEEK_SET) == 0 && WriteAll(fd, content) &&
+           ::ftruncate(fd, static_cast<off_t>(content.size())) == 0;
+  };
+  const std::optional<std::string> old = ::lseek(fd, 0, SEEK_SET) == 0 ? ReadAll(fd) : std::nullopt;
+  if (old && store(bytes)) {
+    return true;
+  }
+  if (old) {
+    store(*old);
+  }
+  return false;
 }
 
 }  // namespace
@@ -171,7 +175,7 @@ std::optional<std::string> PosixFiles::Read(std::string_view path) {
 }
 
 std::optional<std::string> PosixFiles::ReadLocked(std::string_view path) {
-  const Descriptor file = OpenLocked(NativePath(path), O_RDONLY);
+  const Descriptor file = OpenLocked(NativePath(path), O_RDONLY, [this] { Pause(kLockPause); });
   return file ? ReadAll(file.Get()) : std::nullopt;
 }
 
@@ -182,52 +186,30 @@ bool PosixFiles::Write(std::string_view path, std::string_view bytes) {
 
 bool PosixFiles::WriteLocked(std::string_view path, std::string_view bytes) {
   std::string native = NativePath(path);
-  std::array<char, PATH_MAX> resolved{};
-  if (::realpath(native.c_str(), resolved.data()) != nullptr) {
-    native = resolved.data();  // a link stays a link: its target is replaced
-  }
   const bool isNew = ::access(native.c_str(), F_OK) != 0;
-  const Descriptor file = OpenLocked(native, O_RDWR | O_CREAT);
+  const Descriptor file = OpenLocked(native, O_RDWR | O_CREAT, [this] { Pause(kLockPause); });
   struct stat status {};
   if (!file || ::fstat(file.Get(), &status) != 0) {
     return false;
   }
-  bool madeTemporary = false;
-  if (ReplaceFile(native, bytes, status.st_mode, madeTemporary)) {
-    return true;
+  std::array<char, PATH_MAX> resolved{};
+  if (::realpath(native.c_str(), resolved.data()) != nullptr) {
+    native = resolved.data();  // a link stays a link: its target is replaced
   }
-  if (madeTemporary) {
-    if (isNew) {
-      ::unlink(native.c_str());
-    }
-    return false;  // a full disk: the old content is safe
+  const Replacement replacement = ReplaceFile(native, bytes, status);
+  const bool written = replacement == Replacement::kDone ||
+                       (replacement == Replacement::kNotPossible && OverwriteFile(file.Get(), bytes));
+  if (!written && isNew && status.st_size == 0) {
+    ::unlink(native.c_str());
   }
-  // The folder takes no new files; the file itself may still be written.
-  const std::optional<std::string> old = ReadAll(file.Get());
-  const auto store = [&](std::string_view content) {
-    return ::lseek(file.Get(), 0, SEEK_SET) == 0 && WriteAll(file.Get(), content) &&
-           ::ftruncate(file.Get(), static_cast<off_t>(content.size())) == 0;
-  };
-  if (store(bytes)) {
-    return true;
-  }
-  if (old) {
-    store(*old);
-  }
-  return false;
+  return written;
 }
 
 bool PosixFiles::Remove(std::string_view path) { return ::unlink(NativePath(path).c_str()) == 0; }
 
+// One file has one full path, whatever "." and ".." the caller's form has: locks are named after it.
 std::string PosixFiles::FullPath(std::string_view path) {
-  std::string native = NativePath(path);
-  if (native.starts_with('/')) {
-    return native;
-  }
-  while (native.starts_with("./")) {
-    native.erase(0, 2);
-  }
-  return CurrentDirectory() + "/" + native;
+  return (std::filesystem::path(CurrentDirectory()) / NativePath(path)).lexically_normal().string();
 }
 
 std::string PosixFiles::CurrentDirectory() {
@@ -239,6 +221,8 @@ std::string PosixFiles::FileName(std::string_view path) {
   const std::size_t separator = path.find_last_of("\\/");
   return std::string(separator == std::string_view::npos ? path : path.substr(separator + 1));
 }
+
+void PosixFiles::Pause(std::chrono::milliseconds duration) { std::this_thread::sleep_for(duration); }
 
 std::string PosixFiles::ExecutablePath() {
   std::array<char, PATH_MAX> path{};

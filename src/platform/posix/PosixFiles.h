@@ -1,6 +1,8 @@
 // Files of a system whose separator is '/'.
 #pragma once
 
+#include <chrono>
+
 #include "platform/Files.h"
 
 namespace panelglow::platform::posix {
@@ -20,6 +22,10 @@ class PosixFiles : public Files {
   std::string CurrentDirectory() override;
   std::string FileName(std::string_view path) override;
   std::string ExecutablePath() override;
+
+ protected:
+  /// Lets the calling thread wait before it tries again for a lock. May throw.
+  virtual void Pause(std::chrono::milliseconds duration);
 };
 
 }  // namespace panelglow::platform::posix

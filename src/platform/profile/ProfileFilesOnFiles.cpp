@@ -20,8 +20,8 @@ wstring WideOf(std::string_view bytes) {
   wstring text;
   text.reserve(bytes.size() / 2);
   for (std::size_t i = kWideMark.size(); i + 1 < bytes.size(); i += 2) {
-    text.push_back(static_cast<char16_t>(static_cast<unsigned char>(bytes[i]) |
-                                         static_cast<unsigned char>(bytes[i + 1]) << 8U));
+    text.push_back(
+        static_cast<char16_t>(static_cast<unsigned char>(bytes[i]) | static_cast<unsigned char>(bytes[i + 1]) << 8U));
   }
   return text;
 }
@@ -33,6 +33,10 @@ std::string WideBytes(std::u16string_view text) {
     bytes.push_back(static_cast<char>(static_cast<unsigned char>(c >> 8U)));
   }
   return bytes;
+}
+
+std::optional<wstring> Widened(std::optional<std::string_view> text) {
+  return text ? std::optional<wstring>(WideFromCodePage(*text)) : std::nullopt;
 }
 
 std::string NarrowOf(std::string bytes) { return IsWide(bytes) ? CodePageFromWide(WideOf(bytes)) : bytes; }
@@ -61,8 +65,9 @@ std::size_t Answer(std::basic_string_view<Char> text, std::optional<std::basic_s
 
 }  // namespace
 
-std::size_t ProfileFilesOnFiles::GetValue(std::optional<std::string_view> section, std::optional<std::string_view> key,
-                                          std::string_view fallback, std::span<char> buffer, std::string_view path) {
+std::size_t ProfileFilesOnFiles::GetValue(std::optional<std::string_view> section,
+                                          std::optional<std::string_view> key, std::string_view fallback,
+                                          std::span<char> buffer, std::string_view path) {
   const std::string text = NarrowOf(files_.Read(path).value_or(std::string()));
   return Answer<char>(text, section, key, fallback, buffer);
 }
@@ -81,23 +86,38 @@ std::size_t ProfileFilesOnFiles::GetSection(std::string_view section, std::span<
 
 bool ProfileFilesOnFiles::SetValue(std::string_view section, std::optional<std::string_view> key,
                                    std::optional<std::string_view> value, std::string_view path) {
-  const std::string bytes = files_.ReadLocked(path).value_or(std::string());
-  if (!IsWide(bytes)) {
-    return files_.WriteLocked(path, WithValue<char>(bytes, section, key, value));
+  const std::optional<std::string> bytes = ReadToEdit(path);
+  if (!bytes) {
+    return false;
   }
-  const auto widen = [](std::string_view text) { return WideFromCodePage(text); };
-  const wstring wideKey = widen(key.value_or(""));
-  const wstring wideValue = widen(value.value_or(""));
-  return SetValue(widen(section), key ? std::optional<std::u16string_view>(wideKey) : std::nullopt,
-                  value ? std::optional<std::u16string_view>(wideValue) : std::nullopt, WideFromUtf8(path));
+  if (!IsWide(*bytes)) {
+    return files_.WriteLocked(path, WithValue<char>(*bytes, section, key, value));
+  }
+  const std::optional<wstring> wideKey = Widened(key);
+  const std::optional<wstring> wideValue = Widened(value);
+  return files_.WriteLocked(
+      path, WideBytes(WithValue<char16_t>(WideOf(*bytes), WideFromCodePage(section), wideKey, wideValue)));
 }
 
 bool ProfileFilesOnFiles::SetValue(std::u16string_view section, std::optional<std::u16string_view> key,
                                    std::optional<std::u16string_view> value, std::u16string_view path) {
   const std::string file = Utf8FromWide(path);
-  const std::string bytes = files_.ReadLocked(file).value_or(std::string());
-  const wstring edited = WithValue<char16_t>(WideOf(bytes), section, key, value);
-  return files_.WriteLocked(file, IsWide(bytes) ? WideBytes(edited) : CodePageFromWide(edited));
+  const std::optional<std::string> bytes = ReadToEdit(file);
+  if (!bytes) {
+    return false;
+  }
+  const wstring edited = WithValue<char16_t>(WideOf(*bytes), section, key, value);
+  return files_.WriteLocked(file, IsWide(*bytes) ? WideBytes(edited) : CodePageFromWide(edited));
+}
+
+// An absent file is edited like an empty one. One that is there but cannot be read must not be replaced by its one
+// new line.
+std::optional<std::string> ProfileFilesOnFiles::ReadToEdit(std::string_view path) {
+  std::optional<std::string> bytes = files_.ReadLocked(path);
+  if (!bytes && !files_.CanRead(path)) {
+    bytes.emplace();
+  }
+  return bytes;
 }
 
 }  // namespace panelglow::platform::profile

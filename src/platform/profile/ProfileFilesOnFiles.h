@@ -1,6 +1,8 @@
 // The profile services over the files of any backend. Nothing is cached: each call reads the file anew.
 #pragma once
 
+#include <string>
+
 #include "platform/Files.h"
 #include "platform/ProfileFiles.h"
 
@@ -21,6 +23,8 @@ class ProfileFilesOnFiles : public ProfileFiles {
                 std::optional<std::u16string_view> value, std::u16string_view path) override;
 
  private:
+  std::optional<std::string> ReadToEdit(std::string_view path);
+
   Files& files_;
 };
 

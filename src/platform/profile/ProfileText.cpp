@@ -114,9 +114,9 @@ std::optional<Section<Char>> FindSection(View<Char> text, View<Char> name) {
 template <class Char>
 struct Line {
   std::size_t begin = 0;
-  std::size_t end = 0;   // position of the line end
-  std::size_t next = 0;  // begin of the next line
-  View<Char> content;    // without blanks around it
+  std::size_t end = 0;                    // position of the line end
+  std::size_t next = 0;                   // begin of the next line
+  View<Char> content;                     // without blanks around it
   std::size_t equals = View<Char>::npos;  // in content
 
   [[nodiscard]] View<Char> Key() const { return TrimBlanks(content.substr(0, equals)); }

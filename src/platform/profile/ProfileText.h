@@ -10,8 +10,8 @@
 
 namespace panelglow::platform::profile {
 
-/// The value of a key, without blanks around it and one pair of equal quotes; nothing when there is no such section or
-/// key. The view lives as long as `text`.
+/// The value of a key, without blanks around it and one pair of equal quotes; nothing when there is no such section
+/// or key. The view lives as long as `text`.
 template <class Char>
 std::optional<std::basic_string_view<Char>> FindValue(std::basic_string_view<Char> text,
                                                       std::basic_string_view<Char> section,
