@@ -1,0 +1,91 @@
+#include "platform/host_linux/LinuxConsole.h"
+
+#include <poll.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <system_error>
+#include <thread>
+#include <utility>
+
+#include "platform/host_linux/CurrentThread.h"
+
+namespace panelglow::platform::host_linux {
+
+namespace {
+
+void WriteAll(int fd, std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t written = ::write(fd, bytes.data(), bytes.size());
+    if (written >= 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(written));
+    } else if (errno == EAGAIN) {
+      // Whoever shares the descriptor made it non-blocking.
+      pollfd ready{fd, POLLOUT, 0};
+      ::poll(&ready, 1, -1);
+    } else if (errno != EINTR) {
+      return;
+    }
+  }
+}
+
+sigset_t ControlSignals() {
+  sigset_t signals;
+  ::sigemptyset(&signals);
+  ::sigaddset(&signals, SIGINT);
+  ::sigaddset(&signals, SIGTERM);
+  return signals;
+}
+
+}  // namespace
+
+LinuxConsole::LinuxConsole() { std::signal(SIGPIPE, SIG_IGN); }
+
+void LinuxConsole::Write(std::string_view bytes) {
+  CurrentThread::CheckEndRequest();
+  const std::lock_guard<std::mutex> lock(output_);
+  WriteAll(STDOUT_FILENO, bytes);
+}
+
+void LinuxConsole::WriteError(std::string_view bytes) { WriteAll(STDERR_FILENO, bytes); }
+
+void LinuxConsole::SetControlHandler(std::function<bool(std::uint32_t)> handler) {
+  const std::lock_guard<std::mutex> lock(handlerGuard_);
+  handler_ = std::move(handler);
+  if (std::exchange(isArmed_, true)) {
+    return;
+  }
+  // From here on the signals stay with the process, also those that come before anybody listens; every thread that is
+  // started later inherits that. The listening thread is made when the program first waits for something: a start
+  // that only prints a text and ends does without.
+  const sigset_t signals = ControlSignals();
+  ::pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+  CurrentThread::BeforeNextBlock([this] { StartListening(); });
+}
+
+void LinuxConsole::StartListening() {
+  try {
+    std::thread([this] { Listen(); }).detach();
+  } catch (const std::system_error& failure) {
+    std::fprintf(stderr, "interrupts will not be noticed: %s\n", failure.what());
+  }
+}
+
+void LinuxConsole::Listen() {
+  ::pthread_setname_np(::pthread_self(), "console control");
+  const sigset_t signals = ControlSignals();
+  for (;;) {
+    int number = 0;
+    if (::sigwait(&signals, &number) != 0) {
+      continue;
+    }
+    const std::lock_guard<std::mutex> lock(handlerGuard_);
+    if (handler_) {
+      handler_(number == SIGINT ? kControlC : kControlBreak);
+    }
+  }
+}
+
+}  // namespace panelglow::platform::host_linux

@@ -1,0 +1,33 @@
+// Standard output and standard error without buffers, and the interrupt signals as control events.
+#pragma once
+
+#include <mutex>
+
+#include "platform/Console.h"
+
+namespace panelglow::platform::host_linux {
+
+/// SIGINT is control type 0, SIGTERM type 1. Once a handler is installed neither ends the process, whatever the
+/// handler answers. Has to outlive the program's threads.
+class LinuxConsole : public Console {
+ public:
+  /// A reader that goes away is no signal any more, but an error that Write overlooks.
+  LinuxConsole();
+
+  void Write(std::string_view bytes) override;
+  void WriteError(std::string_view bytes) override;
+
+  /// Waits for a handler that runs. An empty handler lets all later events pass unnoticed.
+  void SetControlHandler(std::function<bool(std::uint32_t type)> handler) override;
+
+ private:
+  void StartListening();
+  void Listen();
+
+  std::mutex output_;  // keeps lines whole that the system takes in pieces
+  std::mutex handlerGuard_;
+  std::function<bool(std::uint32_t)> handler_;  // by handlerGuard_
+  bool isArmed_ = false;                        // by handlerGuard_
+};
+
+}  // namespace panelglow::platform::host_linux

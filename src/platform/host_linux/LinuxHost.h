@@ -1,0 +1,43 @@
+// The real machine under Linux. What it cannot reach yet (driver, management, display, keys) answers as absent.
+#pragma once
+
+#include "platform/Host.h"
+#include "platform/host_linux/AbsentDriver.h"
+#include "platform/host_linux/AbsentInputs.h"
+#include "platform/host_linux/EmptyManagement.h"
+#include "platform/host_linux/LinuxClock.h"
+#include "platform/host_linux/LinuxConsole.h"
+#include "platform/host_linux/LinuxCpu.h"
+#include "platform/host_linux/LinuxEnvironment.h"
+#include "platform/host_linux/LinuxFiles.h"
+#include "platform/host_linux/LinuxMutexes.h"
+#include "platform/host_linux/LinuxThreads.h"
+#include "platform/host_linux/NoDesktop.h"
+#include "platform/posix/LazyDrawing.h"
+#include "platform/posix/LazyXmlDocuments.h"
+#include "platform/profile/ProfileFilesOnFiles.h"
+
+namespace panelglow::platform::host_linux {
+
+/// Making it costs next to nothing: whatever is more than an object in memory is made by the call that needs it.
+struct LinuxHost {
+  LinuxClock clock;
+  LinuxConsole console;
+  LinuxCpu cpu;
+  NoDesktop desktop;
+  AbsentDriver driver;
+  LinuxEnvironment environment;
+  LinuxFiles files;
+  posix::LazyDrawing drawing;
+  posix::DrawnImages images{drawing};
+  AbsentInputs inputs;
+  EmptyManagement management;
+  LinuxMutexes mutexes;
+  profile::ProfileFilesOnFiles profiles{files};
+  LinuxThreads threads;
+  posix::LazyXmlDocuments xmlDocuments;
+  Host host{clock,  console,    cpu,     desktop,  driver, environment, files,  images,
+            inputs, management, mutexes, profiles, driver, threads,     inputs, xmlDocuments};
+};
+
+}  // namespace panelglow::platform::host_linux

@@ -1,0 +1,68 @@
+// The host as a whole: what a start costs, and what a machine without driver, management and display answers.
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <string>
+
+#include "platform/Host.h"
+#include "platform/host_linux/ChildProcess.h"
+#include "platform/host_linux/NoDesktop.h"
+
+namespace panelglow::platform {
+namespace {
+
+Host& host() { return TheHost(); }
+
+int EntriesOf(const char* folder) {
+  return static_cast<int>(
+      std::distance(std::filesystem::directory_iterator(folder), std::filesystem::directory_iterator()));
+}
+
+// An informational request and a refused command line must start like a program that does nothing else.
+TEST(HostTest, AStartThatWaitsForNothingMakesNoThreadAndOpensNothing) {
+  ChildProcess child([](int) {
+    const int threads = EntriesOf("/proc/self/task");
+    const int descriptors = EntriesOf("/proc/self/fd");
+    std::uint32_t error = 0;
+    ManagementError managementError;
+    host().console.SetControlHandler([](std::uint32_t) { return true; });
+    host().console.Write("");
+    host().clock.TickCount();
+    host().files.CanRead("missing");
+    host().drivers.Open("missing", error);
+    host().management.Connect("ROOT\\CIMV2", managementError);
+    return EntriesOf("/proc/self/task") - threads + 10 * (EntriesOf("/proc/self/fd") - descriptors);
+  });
+  EXPECT_EQ(child.Wait(), 0);
+}
+
+TEST(HostTest, WithoutADisplayWindowsFailWithOneLineAndNoLoopWaits) {
+  host_linux::NoDesktop desktop;
+  testing::internal::CaptureStderr();
+  EXPECT_TRUE(desktop.RegisterWindowClass({"class", 0, 0, 0, nullptr}));
+  for (int i = 0; i < 2; ++i) {
+    EXPECT_EQ(desktop.CreateWindow({"class", {}, 0, 0, 0, 0, 0, 0, 0, 0}), 0U);
+  }
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "no display: windows are not available on this system yet\n");
+  Message message;
+  EXPECT_FALSE(desktop.GetMessage(message));
+  EXPECT_NE(desktop.BeginPaint(0), nullptr);
+}
+
+TEST(HostTest, SleepTakesAtLeastItsTimeByTheTickCounter) {
+  const std::uint32_t begin = host().clock.TickCount();
+  host().clock.Sleep(3);
+  EXPECT_GE(host().clock.TickCount() - begin, 2U);  // both ends are cut to milliseconds
+}
+
+TEST(HostTest, AProcessorLeafThatIsNotThereReadsAsZero) {
+  const CpuidRegisters missing = host().cpu.Cpuid(0x7FFFFFFF);
+  EXPECT_EQ(missing.eax | missing.ebx | missing.ecx | missing.edx, 0U);
+#if defined(__x86_64__)
+  EXPECT_GE(host().cpu.Cpuid(0).eax, 1U);
+  EXPECT_TRUE(host().cpu.Is64BitSystem());
+#endif
+}
+
+}  // namespace
+}  // namespace panelglow::platform
