@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <optional>
+#include <type_traits>
 
 namespace panelglow {
 
@@ -12,7 +13,7 @@ using View = std::basic_string_view<Char>;
 
 template <class Char>
 bool IsOneOf(Char c, std::string_view set) {
-  return c < Char(0x80) && set.find(static_cast<char>(c)) != std::string_view::npos;
+  return static_cast<std::make_unsigned_t<Char>>(c) < 0x80U && set.find(static_cast<char>(c)) != std::string_view::npos;
 }
 
 // A conversion behind its percent sign.

@@ -8,6 +8,15 @@ namespace panelglow::platform::desktop {
 
 namespace {
 
+// Places and sizes are 16-bit numbers on the home system: what lies beyond is cut to that.
+int Coordinate(int value) { return std::clamp(value, -32768, 32767); }
+
+Rectangle PlaceOf(int x, int y, int width, int height) {
+  const int left = Coordinate(x);
+  const int top = Coordinate(y);
+  return {left, top, left + Coordinate(width), top + Coordinate(height)};
+}
+
 constexpr std::uint32_t kShortestTimer_ms = 10;
 
 // Virtual-key codes of the dialog keys.
@@ -201,7 +210,7 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
   window.topmost = (request.extendedStyle & style::kExTopmost) != 0;
   window.visible = (request.style & style::kVisible) != 0;
   window.enabled = (request.style & style::kDisabled) == 0;
-  window.area = {request.x, request.y, request.x + request.width, request.y + request.height};
+  window.area = PlaceOf(request.x, request.y, request.width, request.height);
   window.parent = request.parent;
   window.text = request.text;
   const WindowHandle handle = window.handle;
@@ -333,7 +342,7 @@ void WindowSystem::MoveWindow(WindowHandle handle, int x, int y, int width, int 
     }
   }
   const Rectangle before = window->area;
-  window->area = {x, y, x + width, y + height};
+  window->area = PlaceOf(x, y, width, height);
   if (before.Width() != width || before.Height() != height) {
     SendSize(handle);
     Invalidate(handle);

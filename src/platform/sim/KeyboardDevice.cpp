@@ -3,7 +3,7 @@
 namespace panelglow::platform::sim {
 
 namespace {
-constexpr std::uint64_t kTouchpadRegister = 0x100;
+constexpr std::uint64_t kTouchpadRegister = KeyboardDevice::kTouchpadLed;
 }  // namespace
 
 void KeyboardDevice::Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) {

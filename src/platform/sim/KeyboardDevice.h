@@ -11,6 +11,9 @@ namespace panelglow::platform::sim {
 
 class KeyboardDevice : public Device {
  public:
+  /// Stands for the touchpad's LED among the registers of this device, beside the virtual-key codes.
+  static constexpr std::uint64_t kTouchpadLed = 0x100;
+
   /// A key event; a press of a lock key that is up toggles its LED.
   void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags);
 

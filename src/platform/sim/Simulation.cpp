@@ -164,8 +164,8 @@ class SimKeyboard : public Keyboard {
 // The vendor's touchpad interface: one touchpad with one LED property.
 class SimTouchpad : public Touchpad {
  public:
-  SimTouchpad(bool present, Scheduler& scheduler, KeyboardDevice& device, std::function<void()> moved)
-      : present_(present), scheduler_(scheduler), device_(device), moved_(std::move(moved)) {}
+  SimTouchpad(bool present, Scheduler& scheduler, Buses& buses, KeyboardDevice& device, std::function<void()> moved)
+      : present_(present), scheduler_(scheduler), buses_(buses), device_(device), moved_(std::move(moved)) {}
 
   std::unique_ptr<TouchpadApi> Create() override { return present_ ? std::make_unique<Api>(*this) : nullptr; }
 
@@ -182,7 +182,9 @@ class SimTouchpad : public Touchpad {
       if (property != kLedProperty) {
         return false;
       }
-      owner_.device_.SetTouchpadLed(value != 0);
+      if (!owner_.buses_.IsIgnored(kKeyboard, KeyboardDevice::kTouchpadLed)) {
+        owner_.device_.SetTouchpadLed(value != 0);
+      }
       owner_.moved_();
       return true;
     }
@@ -211,6 +213,7 @@ class SimTouchpad : public Touchpad {
 
   bool present_;
   Scheduler& scheduler_;
+  Buses& buses_;
   KeyboardDevice& device_;
   std::function<void()> moved_;
 };
@@ -274,7 +277,7 @@ struct Simulation::Parts {
         environment(description.environment),
         cpu(description),
         keyboard(scheduler, buses, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
-        touchpad(description.touchpad, scheduler, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
+        touchpad(description.touchpad, scheduler, buses, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
         files(simulationOptions.realFiles ? &posixFiles : nullptr, scheduler),
         profiles(files),
         windowHost(scheduler),

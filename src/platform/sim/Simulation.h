@@ -30,7 +30,7 @@ struct SimulationOptions {
   bool captureOutput = true;   // standard output is kept instead of written
   std::string operatorPolicy;  // empty: nobody sits at the machine
   std::string screenshots;     // folder for PNG pictures, empty for none
-  Microseconds timeLimit_us = Microseconds{14} * 24 * 3600 * 1'000'000;
+  Microseconds timeLimit_us = Microseconds{25} * 3600 * 1'000'000;  // a little over the longest planned run, a day
 };
 
 class Simulation {

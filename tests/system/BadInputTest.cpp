@@ -1,0 +1,239 @@
+// Files and firmware as they should not be: a clear error, nothing lost, and always one end of test.
+#include <gmock/gmock.h>
+
+#include <filesystem>
+#include <functional>
+
+#include "system/SystemRun.h"
+
+namespace panelglow::systemtest {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+namespace fs = std::filesystem;
+
+const std::vector<std::string> kDesktopTest = {"-subtest=CustomLEDTest", "-SectionID=Desktop", "-Retries=0"};
+
+Outcome RunDesktop(const Installation& installation, const std::vector<std::string>& more = {},
+                   const std::string& machineText = {}) {
+  std::vector<std::string> arguments = kDesktopTest;
+  arguments.insert(arguments.end(), more.begin(), more.end());
+  return SimulatedRun{installation.Machine("desktop.toml", machineText), "perfect", 1, {}, arguments}.In(
+      installation);
+}
+
+std::string Repeated(const std::string& text, std::size_t times) {
+  std::string all;
+  all.reserve(text.size() * times);
+  for (std::size_t i = 0; i < times; ++i) {
+    all += text;
+  }
+  return all;
+}
+
+std::string Replaced(std::string text, const std::string& from, const std::string& to) {
+  const std::size_t at = text.find(from);
+  EXPECT_NE(at, std::string::npos) << from;
+  return at == std::string::npos ? text : text.replace(at, from.size(), to);
+}
+
+using Spoil = std::function<void(const Installation&)>;
+
+struct Case {
+  const char* name;
+  Spoil spoil;
+  const char* code;     // of the TestFailed line
+  const char* message;  // in the output
+};
+
+Spoil Removing(const char* file) {
+  return [file](const Installation& installation) { fs::remove(installation.Path(file)); };
+}
+
+Spoil Writing(const char* file, const std::string& content) {
+  return [file, content](const Installation& installation) { installation.Write(file, content); };
+}
+
+Spoil Editing(const char* file, const char* from, const char* to) {
+  return [=](const Installation& installation) {
+    installation.Write(file, Replaced(installation.Read(file), from, to));
+  };
+}
+
+Spoil MakingFolder(const char* file) {
+  return [file](const Installation& installation) {
+    fs::remove(installation.Path(file));
+    fs::create_directory(installation.Path(file));
+  };
+}
+
+const std::string kHostileDocument =
+    "<?xml version=\"1.0\"?>\n<!DOCTYPE UI [<!ENTITY a \"aaaaaaaaaa\"><!ENTITY b \"&a;&a;&a;&a;&a;&a;&a;&a;\">"
+    "<!ENTITY c \"&b;&b;&b;&b;&b;&b;&b;&b;\"><!ENTITY d \"&c;&c;&c;&c;&c;&c;&c;&c;\">"
+    "<!ENTITY e SYSTEM \"file:///etc/passwd\">]>\n<UI><Section ID=\"Desktop\">&d;&e;</Section></UI>";
+
+TEST(SystemBadInput, EachSpoiledFileIsNamedWithItsCode) {
+  const Case kCases[] = {
+      {"no chip file", Removing("chip.ini"), "990100", "LogMessage 8 49 \".\\chip.ini\""},
+      {"no detection file", Removing("mbdetect.ini"), "990100", "LogMessage 8 49 \".\\mbdetect.ini\""},
+      {"no button file", Removing("ui.xml"), "990100", "LogMessage 8 61 \".\\ui.xml\""},
+      {"a folder for a file", MakingFolder("ui.xml"), "990100", "LogMessage 8 61 \".\\ui.xml\""},
+      {"no schema", Removing("buttondefinition.xsd"), "990100", "LogMessage 8 61 \".\\buttondefinition.xsd\""},
+      {"no icon", Removing("spr_jaz.ico"), "990618", "LogMessage 7 61 \"spr_jaz.ico\""},
+      {"empty document", Writing("ui.xml", ""), "990632", "Input file .\\ui.xml is corrupt or cannot be found."},
+      {"binary document", Writing("ui.xml", std::string("\0\1\2\xFF<", 5)), "990632",
+       "Input file .\\ui.xml is corrupt"},
+      {"truncated document", Writing("buttondefinition.xml", "<Buttons><Button ID=\"a"), "990632",
+       "Input file .\\buttondefinition.xml is corrupt"},
+      {"entities", Writing("ui.xml", kHostileDocument), "990632", "Input file .\\ui.xml is corrupt"},
+      {"100,000 levels", Writing("ui.xml", Repeated("<a>", 100000) + Repeated("</a>", 100000)), "990632",
+       "Input file .\\ui.xml is corrupt"},
+      {"unknown attribute",
+       Editing("ui.xml", "<Button ID=\"CapsLock\"/>", "<Button ID=\"CapsLock\" Colour=\"red\"/>"), "990163",
+       "Colour"},
+      {"five-digit code", Editing("buttondefinition.xml", "771003", "77100"), "990163", "77100"},
+      {"command that is no number", Editing("buttondefinition.xml", "\"1003\"", "\"10O3\""), "990163", "10O3"},
+      {"broken schema", Writing("ui.xsd", "<xs:schema"), "990163", ".\\ui.xml is not proper"},
+      {"bad sequence", Editing("chip.ini", "0xA20:0x01", "0xA20"), "995205",
+       "malformed sequence entry: '0xa20'. should be: 'cmd:data[.data]*,...'"},
+  };
+  for (const Case& c : kCases) {
+    SCOPED_TRACE(c.name);
+    const Installation installation;
+    c.spoil(installation);
+    const Outcome outcome = RunDesktop(installation, {"-DataCollectionFile=log.xml"});
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_TRUE(outcome.IsOrderly()) << outcome.output;
+    ASSERT_EQ(outcome.Tagged("TestFailed").size(), 1U) << outcome.output;
+    EXPECT_THAT(outcome.Tagged("TestFailed").front(), HasSubstr(std::string("TestFailed ") + c.code));
+    EXPECT_THAT(outcome.output, HasSubstr(c.message));
+    EXPECT_THAT(outcome.output, Not(HasSubstr("root:")));
+    if (std::string(c.code) != "995205") {
+      EXPECT_THAT(installation.Read("log.xml"), HasSubstr("errorcode=\"" + std::string(c.code) + "\"/>"));
+    }
+  }
+}
+
+TEST(SystemBadInput, ASchemaFailureLeavesTheWorkFileAndTheNextSuccessRemovesIt) {
+  const Installation installation;
+  const std::string good = installation.Read("ui.xml");
+  installation.Write("ui.xml", Replaced(good, "ID=\"NumLock\"", "Id=\"NumLock\""));
+  RunDesktop(installation);
+  EXPECT_TRUE(fs::exists(installation.Path("ui.xml.modif")));
+  installation.Write("ui.xml", good);
+  EXPECT_EQ(RunDesktop(installation).exitCode, 0);
+  EXPECT_FALSE(fs::exists(installation.Path("ui.xml.modif")));
+  EXPECT_EQ(installation.Read("ui.xml"), good);
+}
+
+TEST(SystemBadInput, ASectionThatDoesNotExistIsNamedWithItsFile) {
+  const Installation installation;
+  for (const char* section : {"Laptop", "O'Brien & <Sons>"}) {
+    const Outcome outcome = RunDesktop(installation, {std::string("-SectionID=") + section});
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_TRUE(outcome.IsOrderly());
+    EXPECT_THAT(outcome.output,
+                HasSubstr("There is no section \"" + std::string(section) + "\" in the file .\\ui.xml"));
+  }
+}
+
+TEST(SystemBadInput, ASectionWithoutEndIsRefusedInLinearTime) {
+  const Installation installation;
+  installation.Write(
+      "ui.xml", "<UI><Section ID=\"Desktop\">" + Repeated("<Button ID=\"NumLock\"/>", 50000) + "</Section></UI>");
+  const Outcome outcome = RunDesktop(installation);
+  EXPECT_TRUE(outcome.IsOrderly());
+  EXPECT_THAT(outcome.Tagged("TestFailed"), ElementsAre("TestFailed 990163 \"\""));
+}
+
+TEST(SystemBadInput, IniFilesThatMakeNoSenseAreAnUnknownMachine) {
+  // The LEDs of this machine are then not where the program looks for them: they stay dark, and are found out.
+  for (const std::string& content : {std::string(), std::string("\0\xFF\xFE\x80[", 5), Repeated("x", 1000000),
+                                     "[7D10]\nchips=" + Repeated("g_nothing ", 100000)}) {
+    const Installation installation;
+    installation.Write("mbdetect.ini", content);
+    const Outcome outcome = RunDesktop(installation);
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_TRUE(outcome.IsOrderly());
+    EXPECT_THAT(outcome.Tagged("TestFailed"), ElementsAre(HasSubstr("TestFailed 7710")));
+  }
+}
+
+TEST(SystemBadInput, NoMessageTextCanBreakARun) {
+  for (const char* format : {"%n%n%n%n", "%s%s%s%s", "%", "100%", "%99999d%99999s", "%*.*s", "%S%c%p%x"}) {
+    SCOPED_TRACE(format);
+    const Installation installation;
+    std::string texts = "[en_US]\n";
+    for (const char* number : {"2", "3", "8", "20000", "23", "24", "57", "59", "60", "20011"}) {
+      texts += std::string(number) + "=" + format + "\n";
+    }
+    installation.Write("panelglow-diags.msg", texts);
+    installation.Write("nonui_panelglow-diags.msg", texts);
+    const Outcome outcome = RunDesktop(installation, {"-debug=true"});
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.output;
+    EXPECT_TRUE(outcome.IsOrderly());
+  }
+}
+
+TEST(SystemBadInput, ADataCollectionPathThatCannotBeWrittenLeavesTheVerdictAlone) {
+  struct LogCase {
+    const char* path;
+    const char* machineText;
+  };
+  const LogCase kCases[] = {{"folder", ""},
+                            {"no/such/folder/log.xml", ""},
+                            {"log.xml", "\n[[event]]\nat_ms = 3000\nfill_disk = true\n"},
+                            {"   ", ""}};
+  for (const LogCase& c : kCases) {
+    SCOPED_TRACE(c.path);
+    const Installation installation;
+    fs::create_directory(installation.Path("folder"));
+    const Outcome outcome =
+        RunDesktop(installation, {std::string("-DataCollectionFile=") + c.path, "-AutoStart=true"}, c.machineText);
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.output;
+    EXPECT_TRUE(outcome.IsOrderly());
+    EXPECT_THAT(outcome.output, Not(HasSubstr("written successfully")));
+  }
+}
+
+TEST(SystemBadInput, ADamagedLogStaysAsItIsAndAnOlderOneGrows) {
+  const Installation installation;
+  installation.Write("log.xml", "<DiagnosticsData Version=\"4.15.0\"><Diagnostic");
+  const Outcome damaged = RunDesktop(installation, {"-DataCollectionFile=log.xml"});
+  EXPECT_EQ(damaged.exitCode, 0);
+  EXPECT_THAT(damaged.output, HasSubstr("XML file is corrupted!"));
+  EXPECT_EQ(installation.Read("log.xml"), "<DiagnosticsData Version=\"4.15.0\"><Diagnostic");
+  installation.Write("log.xml", "<DiagnosticsData><Diagnostic name=\"older &amp; other\"/></DiagnosticsData>");
+  RunDesktop(installation, {"-DataCollectionFile=log.xml"});
+  EXPECT_THAT(installation.Read("log.xml"),
+              HasSubstr("<DiagnosticsData Version=\"4.15.0\">\n  <Diagnostic name=\"older &amp; other\"/>\n"
+                        "  <Diagnostic name=\"panelglow-diags\">\n"));
+}
+
+TEST(SystemBadInput, AFirmwareTableThatLiesAboutItsLengthsIsAnUnknownMachine) {
+  for (const char* table : {"[2, 255, 0, 0, 1]", "[2, 8, 1, 0, 0, 1, 0, 0, 65, 66]", "[4, 4]", "[2, 0, 0, 0, 0, 0]",
+                            "[1, 27, 0, 0, 1, 2, 3, 4]", "[17, 255, 7]"}) {
+    SCOPED_TRACE(table);
+    const Installation installation;
+    const std::string machine = installation.Machine("unknown-board.toml", "\n");
+    installation.Write("machine.toml", Replaced(installation.Read("machine.toml"), "board_product = \"7E40\"",
+                                                "raw_table = " + std::string(table)));
+    const Outcome outcome = SimulatedRun{machine, "perfect", 1, {}, kDesktopTest}.In(installation);
+    EXPECT_TRUE(outcome.IsOrderly()) << outcome.errors;
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.output;
+  }
+}
+
+TEST(SystemBadInput, AMachineWithoutDriverSaysSo) {
+  const Installation installation;
+  const Outcome outcome = RunDesktop(installation, {}, "\n[driver]\npresent = false\n");
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_THAT(outcome.Tagged("TestFailed"), ElementsAre("TestFailed 020472 \"\""));
+  EXPECT_THAT(outcome.output, HasSubstr("LogMessage 7 17 \"\" \"\"\n"));
+}
+
+}  // namespace
+}  // namespace panelglow::systemtest

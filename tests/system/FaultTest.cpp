@@ -1,0 +1,188 @@
+// Ill front panels: every kind of LED against every fault, answered by an operator who sees only the panel.
+#include <gmock/gmock.h>
+
+#include <algorithm>
+#include <map>
+#include <set>
+
+#include "system/SystemRun.h"
+
+namespace panelglow::systemtest {
+namespace {
+
+using ::testing::Contains;
+using ::testing::HasSubstr;
+
+struct LedCase {
+  std::string name;
+  std::string device;
+  std::string kindCode;    // ReportFailure
+  std::string buttonCode;  // TestFailed
+  // What a LED of a wrong colour makes the operator do: press the button of the LED that it now looks like, or wait
+  // in vain for one that this machine has.
+  bool looksLikeAnother;
+};
+
+struct MachineCase {
+  std::string file;
+  std::string section;
+  std::vector<LedCase> leds;
+};
+
+const std::vector<MachineCase>& Machines() {
+  static const std::vector<MachineCase> kMachines = {
+      {"desktop.toml",
+       "Desktop",
+       {{"power-green", "power-gpio", "770133", "771017", true},
+        {"power-red", "power-gpio", "770134", "771020", true},
+        {"drive-red", "drive-gpio", "770132", "771016", false},
+        {"num-lock", "keyboard", "770102", "771003", false},
+        {"caps-lock", "keyboard", "770101", "771006", false},
+        {"scroll-lock", "keyboard", "770100", "771009", false}}},
+      {"notebook.toml",
+       "Notebook",
+       {{"power-white", "chipset-gpio", "770133", "771017", false},
+        {"power-amber", "chipset-gpio", "770134", "771020", false},
+        {"charge-white", "chipset-gpio", "770148", "771012", false},
+        {"charge-amber", "chipset-gpio", "770149", "771015", false},
+        {"touchpad", "keyboard", "770146", "771025", false},
+        {"num-lock", "keyboard", "770102", "771003", false}}},
+      {"unknown-board.toml",
+       "Desktop",
+       {{"power-green", "panel", "770133", "771017", true}, {"drive-red", "panel", "770132", "771016", false}}},
+  };
+  return kMachines;
+}
+
+// What a run with a fault may end with. Which LED of several it is depends on the order, which is the seed's.
+struct Expectation {
+  bool passes = false;
+  std::set<std::string> failures;     // ReportFailure
+  std::set<std::string> buttonCodes;  // TestFailed
+};
+
+void AddWrongAnswer(Expectation& expected, const LedCase& led) {
+  expected.failures.insert(led.kindCode);
+  expected.buttonCodes.insert(led.buttonCode);
+}
+
+constexpr const char* kTimeOut = "770118";
+
+Expectation Expect(const MachineCase& machine, const LedCase& led, const LedCase& partner, const std::string& fault) {
+  Expectation expected;
+  if (fault == "inverted") {
+    expected.passes = true;  // it blinks all the same: no blink test can tell
+  } else if (fault == "dead" || fault == "stuck") {
+    AddWrongAnswer(expected, led);
+  } else if (fault == "wrong-color") {
+    AddWrongAnswer(expected, led);
+    if (!led.looksLikeAnother) {
+      expected.failures.insert(kTimeOut);  // or nothing blinks any more: a lock key's 50 blinks are over in 20 s
+    }
+  } else if (fault == "swapped") {
+    AddWrongAnswer(expected, led);
+    AddWrongAnswer(expected, partner);
+  } else if (fault == "shorted") {
+    AddWrongAnswer(expected, led);  // one that is lit all the time hides the other's blinking
+    AddWrongAnswer(expected, partner);
+    expected.failures.insert(kTimeOut);
+  } else {
+    for (const LedCase& other : machine.leds) {  // a chip that is absent, or a register, may serve several
+      if (other.name == led.name || other.device == led.device) {
+        AddWrongAnswer(expected, other);
+      }
+    }
+    if (led.device == "keyboard") {
+      expected.failures.insert({"770100", "770101", "770102", "770146"});
+      expected.buttonCodes.insert({"771003", "771006", "771009", "771025"});
+    }
+    if (led.device == "panel") {
+      expected.failures.insert("770134");
+      expected.buttonCodes.insert("771020");
+    }
+  }
+  return expected;
+}
+
+// Lit or dark, per LED, before the run and after it.
+std::map<std::string, std::pair<bool, bool>> StatesOf(const Outcome& outcome) {
+  std::map<std::string, std::pair<bool, bool>> states;
+  for (const Edge& edge : outcome.edges) {
+    if (edge.time_us == 0) {
+      states[edge.led].first = edge.lit;
+    }
+    states[edge.led].second = edge.lit;
+  }
+  return states;
+}
+
+std::string CodeBehind(const std::vector<std::string>& lines, std::size_t position) {
+  return lines.empty() ? std::string() : lines.front().substr(position, 6);
+}
+
+void CheckRun(const MachineCase& machine, const LedCase& led, const LedCase& partner, const std::string& fault) {
+  const bool needsPartner = fault == "swapped" || fault == "shorted";
+  const Installation installation;
+  const SimulatedRun run{
+      installation.Machine(machine.file),
+      "perfect",
+      11,
+      {led.name + "=" + fault + (needsPartner ? ":" + partner.name : "")},
+      {"-subtest=CustomLEDTest", "-SectionID=" + machine.section, "-Retries=0", "-DataCollectionFile=log.xml"}};
+  SCOPED_TRACE(run.Describe());
+  const Expectation expected = Expect(machine, led, partner, fault);
+  const Outcome outcome = run.In(installation);
+  EXPECT_TRUE(outcome.IsOrderly());
+  EXPECT_EQ(outcome.exitCode, expected.passes ? 0 : 1);
+  const std::string log = installation.Read("log.xml");
+  if (expected.passes) {
+    EXPECT_THAT(log, HasSubstr("<Attempt number=\"0\" errorcode=\"0\"/>"));
+  } else {
+    const std::string failure = CodeBehind(outcome.Tagged("ReportFailure"), std::string("ReportFailure ").size());
+    const std::string code = CodeBehind(outcome.Tagged("TestFailed"), std::string("TestFailed ").size());
+    EXPECT_THAT(expected.failures, Contains(failure));
+    EXPECT_THAT(expected.buttonCodes, Contains(code));
+    // The attempt is recorded with the LED's own code, also when its time ran out.
+    EXPECT_THAT(log, HasSubstr("<Attempt number=\"0\" errorcode=\"770"));
+    if (failure != kTimeOut) {
+      EXPECT_THAT(log, HasSubstr("errorcode=\"" + failure + "\"/>"));
+    }
+  }
+  for (const auto& [name, state] : StatesOf(outcome)) {
+    if (name != led.name && name != partner.name) {
+      EXPECT_EQ(state.first, state.second) << name << " is left in another state";
+    }
+  }
+}
+
+TEST(SystemFault, EveryKindOfLedAgainstEveryFault) {
+  for (const MachineCase& machine : Machines()) {
+    for (std::size_t i = 0; i < machine.leds.size(); ++i) {
+      const LedCase& partner = machine.leds[(i + 1) % machine.leds.size()];
+      for (const char* fault :
+           {"dead", "stuck", "wrong-color", "swapped", "shorted", "inverted", "lying-write", "absent-chip"}) {
+        CheckRun(machine, machine.leds[i], partner, fault);
+      }
+    }
+  }
+}
+
+TEST(SystemFault, AnIllLedIsFoundAgainAtEveryRetry) {
+  const Installation installation;
+  const SimulatedRun run{
+      installation.Machine("desktop.toml"),
+      "perfect",
+      4,
+      {"caps-lock=dead"},
+      {"-subtest=CustomLEDTest", "-SectionID=Desktop", "-Retries=3", "-DataCollectionFile=log.xml"}};
+  const Outcome outcome = run.In(installation);
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_EQ(outcome.Tagged("ReportFailure"), std::vector<std::string>{"ReportFailure 770101"});
+  const std::string log = installation.Read("log.xml");
+  for (const char* number : {"0", "1", "2", "3"}) {
+    EXPECT_THAT(log, HasSubstr("<Attempt number=\"" + std::string(number) + "\" errorcode=\"770101\"/>"));
+  }
+}
+
+}  // namespace
+}  // namespace panelglow::systemtest
