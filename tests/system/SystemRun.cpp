@@ -165,6 +165,8 @@ std::string SimulatedRun::Describe() const {
   return text;
 }
 
+std::string Golden(const std::string& name) { return TextOf(kSource / "tests/data" / name); }
+
 std::vector<unsigned> Seeds(unsigned usual) {
   const char* wanted = std::getenv("PANELGLOW_CAMPAIGN_SEEDS");
   std::vector<unsigned> seeds(wanted == nullptr ? usual : static_cast<unsigned>(std::strtoul(wanted, nullptr, 10)));

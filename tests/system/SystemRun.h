@@ -68,6 +68,9 @@ struct SimulatedRun {
 Outcome RunProgram(const std::string& program, const std::vector<std::string>& arguments,
                    const std::filesystem::path& folder, const std::map<std::string, std::string>& environment);
 
+/// A file of tests/data.
+std::string Golden(const std::string& name);
+
 /// The seeds of a campaign: PANELGLOW_CAMPAIGN_SEEDS of them, or `usual`.
 std::vector<unsigned> Seeds(unsigned usual);
 

@@ -1,0 +1,102 @@
+// The reference controller as people call it, and the product on a machine without its hardware.
+#include <gmock/gmock.h>
+
+#include "system/SystemRun.h"
+
+namespace panelglow::systemtest {
+namespace {
+
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::Not;
+using ::testing::StartsWith;
+
+Outcome Controller(const Installation& installation, const std::vector<std::string>& arguments) {
+  return RunProgram("panelglow-sim", arguments, installation.Path(""), {});
+}
+
+TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
+  const Installation installation;
+  const std::string machine = installation.Machine("desktop.toml");
+  installation.Write("broken.toml", "[[chip]]\n");
+  struct Case {
+    std::vector<std::string> arguments;
+    int exitCode;
+    const char* error;
+  };
+  const std::vector<Case> kCases = {
+      {{"--help"}, 0, ""},
+      {{}, 2, "--machine is required"},
+      {{"--machine", machine, "--operator", "nobody"}, 2, "there is no operator \"nobody\" (perfect"},
+      {{"--machine", machine, "--fault", "caps-lock"}, 2, "must have the form LED=KIND"},
+      {{"--machine", machine, "--fault", "caps-lock=wet"}, 2, "there is no fault \"wet\" (dead"},
+      {{"--machine", machine, "--seed", "many"}, 2, "--seed"},
+      {{"--machine", "none.toml"}, 3, "none.toml cannot be read"},
+      {{"--machine", "broken.toml"}, 3, "broken.toml:1: \"chip.name\" is missing"},
+      {{"--machine", machine, "--", "-subtest=None"}, 1, ""},
+      {{"--machine", machine, "--", "-subtest=CustomLEDTest"}, 0, ""},
+  };
+  for (const Case& c : kCases) {
+    const Outcome outcome = Controller(installation, c.arguments);
+    EXPECT_EQ(outcome.exitCode, c.exitCode) << ::testing::PrintToString(c.arguments);
+    EXPECT_THAT(outcome.errors, HasSubstr(c.error));
+  }
+}
+
+TEST(SystemController, RawPassesTheProgramsLinesThroughUnchanged) {
+  const Installation installation;
+  const std::string machine = installation.Machine("desktop.toml");
+  const std::vector<std::string> run = {"-subtest=CustomLEDTest", "-Retries=0"};
+  const Outcome direct = SimulatedRun{machine, "wrong:2", 3, {}, run}.In(installation);
+  const Outcome raw = Controller(
+      installation, {"--machine", machine, "--operator", "wrong:2", "--seed", "3", "--raw", "--", run[0], run[1]});
+  // All but the first line, which names the program.
+  EXPECT_EQ(raw.output.substr(raw.output.find('\n')), direct.output.substr(direct.output.find('\n')));
+  EXPECT_EQ(raw.exitCode, 1);
+}
+
+TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
+  const Installation installation;
+  const Outcome outcome =
+      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--fault", "caps-lock=dead",
+                                "--trace", "trace.txt", "--screenshots", "pictures", "--", "-subtest=CustomLEDTest",
+                                "-Retries=0", "-SectionID=Desktop"});
+  EXPECT_THAT(outcome.output, HasSubstr("  50 %\n"));
+  EXPECT_THAT(outcome.output, HasSubstr("green, power-gpio.0, lit 0 times, FAULT: dead\n"));
+  EXPECT_THAT(outcome.output, EndsWith("FAILED: ReportFailure 770133: TestFailed 771017 \"\" (exit code 1)\n"));
+  EXPECT_THAT(outcome.output, Not(HasSubstr("\x1B")));  // no colour where no terminal is
+  EXPECT_THAT(installation.Read("trace.txt"), HasSubstr("0A20"));
+  EXPECT_THAT(installation.Read("pictures/01-prompt.png"), StartsWith("\x89PNG"));
+  EXPECT_GT(installation.Read("pictures/01-prompt.png").size(), 2000U);
+}
+
+TEST(SystemController, NothingTestedIsNeverAPass) {
+  const Installation installation;
+  const Outcome outcome =
+      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--", "-subtest=LEDTest"});
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_THAT(outcome.output, HasSubstr("nothing was tested"));
+  EXPECT_THAT(outcome.output, Not(HasSubstr("PASSED")));
+}
+
+TEST(SystemController, TheProductWithoutItsDriverSaysSoWhateverTheEnvironmentHolds) {
+  const Installation installation;
+  const Outcome outcome = RunProgram(
+      "panelglow-diags", {"-subtest=CustomLEDTest"}, installation.Path(""),
+      {{"PANELGLOW_SIM_MACHINE", installation.Machine("desktop.toml")}, {"PANELGLOW_SIM_OPERATOR", "perfect"}});
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_TRUE(outcome.IsOrderly());
+  EXPECT_THAT(outcome.output, HasSubstr("TestFailed 020472 \"\"\n"));
+}
+
+TEST(SystemController, TheWholeOutputOfARun) {
+  const Installation installation;
+  const Outcome raw =
+      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--operator", "wrong:2", "--seed",
+                                "1", "--raw", "--", "-subtest=CustomLEDTest", "-SectionID=Default", "-Retries=1",
+                                "-debug=true", "-OperatorCheating=false"});
+  EXPECT_EQ(raw.output, Golden("wrong-then-right.golden"));
+}
+
+}  // namespace
+}  // namespace panelglow::systemtest
