@@ -31,10 +31,11 @@ constexpr std::size_t kStripColumns = 64;
 
 struct Options {
   std::string machine;
-  std::string person = "perfect";
+  std::string person;
   std::uint64_t seed = 1;
   std::vector<std::string> faults;
   bool realTime = false;
+  bool window = false;
   bool raw = false;
   std::string screenshots;
   std::string trace;
@@ -84,7 +85,9 @@ int Check(const Options& options) {
         const auto [led, kind] = SplitFault(fault);
         machine.Break(led, kind);
       }
-      const sim::Operator person(machine, options.person);
+      if (!options.person.empty()) {
+        const sim::Operator person(machine, options.person);
+      }
     } catch (const sim::MachineError& error) {
       return Complain(kWrongCall, error.what());
     }
@@ -132,6 +135,7 @@ ChildProcess::Command CommandFor(const Options& options, const std::string& repo
                          {sim::kSeedVariable, std::to_string(options.seed)},
                          {sim::kFaultsVariable, faults},
                          {sim::kRealTimeVariable, options.realTime ? "1" : ""},
+                         {sim::kWindowVariable, options.window ? "1" : ""},
                          {sim::kScreenshotsVariable, AbsolutePath(options.screenshots)},
                          {sim::kTraceVariable, AbsolutePath(options.trace)},
                          {sim::kReportVariable, reportPath}};
@@ -221,8 +225,9 @@ int Follow(ChildProcess& child, const Options& options, ProtocolFollower& follow
 }
 
 std::string ReproducingCommand(const Options& options) {
-  std::string command = "panelglow-sim --machine " + options.machine + " --operator " + options.person + " --seed " +
-                        std::to_string(options.seed);
+  std::string command = "panelglow-sim --machine " + options.machine;
+  command += options.person.empty() ? "" : " --operator " + options.person;
+  command += " --seed " + std::to_string(options.seed);
   for (const std::string& fault : options.faults) {
     command += " --fault " + fault;
   }
@@ -272,13 +277,15 @@ int main(int argc, char** argv) {
   app.name("panelglow-sim");
   app.add_option("--machine", options.machine, "the machine's file, as machines/notebook.toml")->required();
   app.add_option("--operator", options.person,
-                 "who sits there: " + sim::Operator::PolicyNames() + " (some take a number: wrong:2, slow:10)")
-      ->capture_default_str();
+                 "who sits there: " + sim::Operator::PolicyNames() +
+                     " (some take a number: wrong:2, slow:10); perfect, or with --window nobody but you");
   app.add_option("--seed", options.seed, "another seed is another order of LEDs and events")->capture_default_str();
   app.add_option("--fault", options.faults,
                  "LED=KIND, repeatable; kinds: " + sim::LedFaultNames() + " (swapped:OTHER, shorted:OTHER)")
       ->allow_extra_args(false);
   app.add_flag("--real-time", options.realTime, "follow the wall clock instead of jumping through time");
+  app.add_flag("--window", options.window,
+               "show windows and front panel on the display, in real time, and take the test yourself");
   app.add_option("--screenshots", options.screenshots, "save a picture of the screen at each press in this folder");
   app.add_option("--trace", options.trace, "write every driver request to this file");
   app.add_flag("--raw", options.raw, "pass the program's lines through unchanged, and nothing else");
@@ -288,6 +295,10 @@ int main(int argc, char** argv) {
     app.parse(argc, argv);
   } catch (const CLI::ParseError& error) {
     return app.exit(error) == 0 ? 0 : kWrongCall;
+  }
+  options.realTime = options.realTime || options.window;
+  if (options.person.empty() && !options.window) {
+    options.person = "perfect";
   }
   return Run(options);
 }

@@ -33,12 +33,20 @@ struct ImageOperation {
   Rectangle clip;
 };
 
-using DrawOperation = std::variant<FillOperation, TextOperation, ImageOperation>;
+/// A filled disc that touches all sides of `area`.
+struct DiscOperation {
+  Rectangle area;
+  Color color = 0;
+};
+
+using DrawOperation = std::variant<FillOperation, TextOperation, ImageOperation, DiscOperation>;
 
 enum class WindowKind { kPlain, kStatic, kIcon, kImageArea, kButton, kEdit, kScrollBar };
 
 /// One visible window, bottom-most first in Scene::windows.
 struct SceneWindow {
+  WindowHandle handle = 0;
+  WindowHandle topLevel = 0;  // the window itself, when it has no parent
   WindowKind kind = WindowKind::kPlain;
   Rectangle frame;   // screen pixels
   Rectangle client;  // screen pixels
@@ -63,6 +71,7 @@ struct Scene {
   int height = 0;
   Color background = 0x00604838;
   std::vector<SceneWindow> windows;
+  WindowHandle foreground = 0;
 };
 
 /// Implemented by the drawing module.

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <optional>
 #include <string>
 
@@ -23,6 +24,12 @@ class WindowHost {
 
   /// A platform call that costs a little time and may be interrupted.
   virtual void Spend() = 0;
+
+  /// Runs a window's own code: a host with a lock around the window logic gives it up meanwhile.
+  virtual void RunProcedure(const std::function<void()>& procedure) { procedure(); }
+
+  /// Runs what touches the window logic from within a window's own code: takes that lock again.
+  virtual void RunInside(const std::function<void()>& action) { action(); }
 };
 
 }  // namespace panelglow::platform::desktop

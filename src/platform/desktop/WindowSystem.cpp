@@ -4,6 +4,8 @@
 #include <array>
 #include <utility>
 
+#include "platform/desktop/ScrollParts.h"
+
 namespace panelglow::platform::desktop {
 
 namespace {
@@ -28,13 +30,18 @@ constexpr std::uint32_t kLeftKey = 0x25;
 constexpr std::uint32_t kUpKey = 0x26;
 constexpr std::uint32_t kRightKey = 0x27;
 constexpr std::uint32_t kDownKey = 0x28;
-constexpr std::uint32_t kShiftTabKey = 0x0109;  // our own: Tab with the Shift key
 
 // Commands that a dialog gets for Enter without a default button, and for Escape.
 constexpr std::uintptr_t kOkCommand = 1;
 constexpr std::uintptr_t kCancelCommand = 2;
 
 constexpr std::uint32_t kLimitEditCharacters = 30000;
+
+// Edges of a frame that the mouse drags.
+constexpr int kLeftEdge = 1;
+constexpr int kTopEdge = 2;
+constexpr int kRightEdge = 4;
+constexpr int kBottomEdge = 8;
 
 WindowKind KindOf(std::string_view className, std::uint32_t style) {
   if (className == "BUTTON") {
@@ -77,6 +84,9 @@ Rectangle Intersect(const Rectangle& a, const Rectangle& b) {
   r.bottom = std::max(r.bottom, r.top);
   return r;
 }
+
+int XOf(const Message& message) { return static_cast<std::int16_t>(message.lParam & 0xFFFF); }
+int YOf(const Message& message) { return static_cast<std::int16_t>(message.lParam >> 16 & 0xFFFF); }
 
 char16_t UpperLetter(char16_t c) { return c >= u'a' && c <= u'z' ? static_cast<char16_t>(c - 32) : c; }
 
@@ -147,10 +157,14 @@ class WindowSystem::PaintCanvas : public Canvas {
   }
 
  private:
+  // Called by a window's own code.
   void Add(DrawOperation operation) {
-    if (Window* window = system_.Find(window_)) {
-      window->operations.push_back(std::move(operation));
-    }
+    system_.host_.RunInside([&] {
+      if (Window* window = system_.Find(window_)) {
+        window->operations.push_back(std::move(operation));
+        system_.Changed();
+      }
+    });
   }
 
   WindowSystem& system_;
@@ -204,7 +218,11 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
     window.procedure = found->second->procedure;
     window.extra.resize(found->second->extraWords);
   } else {
-    window.procedure = [this](const Message& message) { return ControlProcedure(message); };
+    window.procedure = [this](const Message& message) {
+      std::intptr_t result = 0;
+      host_.RunInside([&] { result = ControlProcedure(message); });
+      return result;
+    };
   }
   window.style = request.style;
   window.topmost = (request.extendedStyle & style::kExTopmost) != 0;
@@ -215,6 +233,7 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
   window.text = request.text;
   const WindowHandle handle = window.handle;
   windows_.emplace(handle, std::move(owned));
+  Changed();
   if (Window* parent = Find(request.parent)) {
     parent->children.push_back(handle);
   } else {
@@ -262,6 +281,8 @@ void WindowSystem::DestroyWindow(WindowHandle handle) {
   }
   std::erase(order_, handle);
   windows_.erase(handle);
+  captured_ = captured_ == handle ? 0 : captured_;
+  Changed();
   if (foreground_ == handle) {
     const auto visible =
         std::find_if(order_.rbegin(), order_.rend(), [&](WindowHandle w) { return Find(w)->visible; });
@@ -299,6 +320,7 @@ void WindowSystem::Raise(WindowHandle handle, ZOrder order) {
     place = std::find_if(order_.begin(), order_.end(), [&](WindowHandle other) { return Find(other)->topmost; });
   }
   order_.insert(place, handle);
+  Changed();
 }
 
 void WindowSystem::SetWindowPosition(WindowHandle handle, ZOrder order, int x, int y, int width, int height,
@@ -343,6 +365,10 @@ void WindowSystem::MoveWindow(WindowHandle handle, int x, int y, int width, int 
   }
   const Rectangle before = window->area;
   window->area = PlaceOf(x, y, width, height);
+  if (before == window->area) {
+    return;
+  }
+  Changed();
   if (before.Width() != width || before.Height() != height) {
     SendSize(handle);
     Invalidate(handle);
@@ -363,6 +389,7 @@ void WindowSystem::SendSize(WindowHandle handle) {
 void WindowSystem::ShowWindow(WindowHandle handle, bool visible) {
   if (Window* window = Find(handle); window != nullptr && window->visible != visible) {
     window->visible = visible;
+    Changed();
     Invalidate(handle);
   }
 }
@@ -373,6 +400,7 @@ void WindowSystem::EnableWindow(WindowHandle handle, bool enabled) {
     return;
   }
   window->enabled = enabled;
+  Changed();
   Queue& queue = QueueOf(window->thread);
   if (!enabled && queue.focus == handle) {
     queue.focus = 0;
@@ -446,18 +474,21 @@ wstring WindowSystem::WindowText(WindowHandle handle) {
 void WindowSystem::SetWindowText(WindowHandle handle, std::u16string_view text) {
   if (Window* window = Find(handle)) {
     window->text = text;
+    Changed();
   }
 }
 
 void WindowSystem::SetFont(WindowHandle handle, const Font& font) {
   if (Window* window = Find(handle)) {
     window->font = font;
+    Changed();
   }
 }
 
 void WindowSystem::SetIcon(WindowHandle handle, std::u16string_view path) {
   if (Window* window = Find(handle); window != nullptr && window->kind == WindowKind::kIcon) {
     window->iconPath = path;
+    Changed();
   }
 }
 
@@ -543,6 +574,7 @@ void WindowSystem::SetFocus(WindowHandle handle) {
     }
   }
   const WindowHandle loser = std::exchange(queue.focus, handle);
+  Changed();
   if (loser != 0) {
     Call({loser, message::kKillFocus, handle, 0});
   }
@@ -578,6 +610,7 @@ bool WindowSystem::SetForegroundWindow(WindowHandle handle) {
   if (foreground_ != handle || order_.back() != handle) {
     Raise(handle, ZOrder::kTop);
     foreground_ = handle;
+    Changed();
   }
   if (window->thread == host_.CurrentThread()) {
     Activate(handle);
@@ -621,7 +654,9 @@ std::intptr_t WindowSystem::Call(const Message& message) {
     return 0;
   }
   const WindowProcedure procedure = window->procedure;  // the window may end itself while it runs
-  return procedure(message);
+  std::intptr_t result = 0;
+  host_.RunProcedure([&] { result = procedure(message); });
+  return result;
 }
 
 std::intptr_t WindowSystem::Send(const Message& message) {
@@ -695,34 +730,109 @@ bool WindowSystem::GetMessage(Message& message) {
 
 bool WindowSystem::TakeInput(Queue& queue, Message& message) {
   while (!queue.input.empty()) {
-    Input input = queue.input.front();
+    const Input input = queue.input.front();
     queue.input.pop_front();
-    if (!input.mouse) {
-      const WindowHandle target = queue.focus != 0 ? queue.focus : queue.active;
-      if (target == 0) {
-        continue;
-      }
-      message = {target, input.alt ? message::kSysKeyDown : message::kKeyDown, input.virtualKey, 0};
-      queue.posted.push_front({target, input.alt ? message::kSysKeyUp : message::kKeyUp, input.virtualKey, 0});
-      if (input.character != 0) {
-        queue.posted.push_front({target, input.alt ? message::kSysChar : message::kChar, input.character, 0});
-      }
+    if (input.kind == InputKind::kKey ? TakeKey(queue, input, message) : TakeMouse(input, message)) {
       return true;
     }
-    WindowHandle target = WindowAt(input.x, input.y);
-    const Window* window = Find(target);
-    if (window == nullptr) {
-      continue;
-    }
-    const Rectangle frame = ScreenRectangle(target);
-    const auto packed = static_cast<std::intptr_t>((static_cast<std::uint32_t>(input.y - frame.top) << 16U) |
-                                                   static_cast<std::uint32_t>(input.x - frame.left));
-    SetForegroundWindow(TopLevelOf(target));
-    message = {target, message::kLeftButtonDown, 1, packed};
-    queue.posted.push_front({target, message::kLeftButtonUp, 0, packed});
-    return true;
   }
   return false;
+}
+
+bool WindowSystem::TakeKey(Queue& queue, const Input& input, Message& message) {
+  const WindowHandle target = queue.focus != 0 ? queue.focus : queue.active;
+  if (target == 0) {
+    return false;
+  }
+  message = {target, input.alt ? message::kSysKeyDown : message::kKeyDown, input.virtualKey, 0};
+  queue.posted.push_front({target, input.alt ? message::kSysKeyUp : message::kKeyUp, input.virtualKey, 0});
+  if (input.character != 0) {
+    queue.posted.push_front({target, input.alt ? message::kSysChar : message::kChar, input.character, 0});
+  }
+  return true;
+}
+
+bool WindowSystem::TakeMouse(const Input& input, Message& message) {
+  if (input.kind == InputKind::kMouseDown) {
+    captured_ = WindowAt(input.x, input.y);
+    if (const Window* window = Find(captured_)) {
+      dragEdges_ = FrameEdgesAt(*window, input.x, input.y);
+      dragX_ = input.x;
+      dragY_ = input.y;
+      SetForegroundWindow(TopLevelOf(captured_));
+    }
+  }
+  const WindowHandle target = captured_;
+  if (input.kind == InputKind::kMouseUp) {
+    captured_ = 0;
+  }
+  const Window* window = Find(target);
+  if (window == nullptr || window->thread != host_.CurrentThread()) {
+    return false;
+  }
+  if (dragEdges_ != 0) {
+    if (input.kind == InputKind::kMouseMove) {
+      captured_ = target;
+      DragFrame(input.x, input.y);
+    }
+    return false;
+  }
+  const Rectangle frame = ScreenRectangle(target);
+  const auto packed = static_cast<std::intptr_t>((static_cast<std::uint32_t>(input.y - frame.top) & 0xFFFFU) << 16U |
+                                                 (static_cast<std::uint32_t>(input.x - frame.left) & 0xFFFFU));
+  switch (input.kind) {
+    case InputKind::kMouseDown:
+      message = {target, message::kLeftButtonDown, 1, packed};
+      break;
+    case InputKind::kMouseUp:
+      message = {target, message::kLeftButtonUp, 0, packed};
+      break;
+    default:
+      message = {target, message::kMouseMove, 1, packed};
+      break;
+  }
+  return true;
+}
+
+// Which edges of a sizing frame a point is on, as bits; 0 for none.
+int WindowSystem::FrameEdgesAt(const Window& window, int x, int y) const {
+  constexpr int kCorner = 12;  // pixels from a corner where both edges are taken
+  if ((window.style & style::kSizeFrame) == 0) {
+    return 0;
+  }
+  const Rectangle frame = ScreenRectangle(window.handle);
+  if (ClientOnScreen(window).Contains(x, y)) {
+    return 0;
+  }
+  return (x < frame.left + kCorner ? kLeftEdge : 0) | (y < frame.top + kCorner ? kTopEdge : 0) |
+         (x >= frame.right - kCorner ? kRightEdge : 0) | (y >= frame.bottom - kCorner ? kBottomEdge : 0);
+}
+
+void WindowSystem::DragFrame(int x, int y) {
+  const Window* window = Find(captured_);
+  const int dx = x - dragX_;
+  const int dy = y - dragY_;
+  const Rectangle before = window->area;
+  Rectangle area = before;
+  area.left += (dragEdges_ & kLeftEdge) != 0 ? dx : 0;
+  area.right += (dragEdges_ & kRightEdge) != 0 ? dx : 0;
+  area.top += (dragEdges_ & kTopEdge) != 0 ? dy : 0;
+  area.bottom += (dragEdges_ & kBottomEdge) != 0 ? dy : 0;
+  const WindowHandle handle = captured_;
+  MoveWindow(handle, area.left, area.top, std::max(1, area.Width()), std::max(1, area.Height()));
+  window = Find(handle);
+  if (window == nullptr) {
+    return;
+  }
+  // The edge that is not dragged stays where it was, also when a limit keeps the window from following the mouse.
+  Rectangle now = window->area;
+  const int left = (dragEdges_ & kLeftEdge) != 0 ? before.right - now.Width() : before.left;
+  const int top = (dragEdges_ & kTopEdge) != 0 ? before.bottom - now.Height() : before.top;
+  if (left != now.left || top != now.top) {
+    MoveWindow(handle, left, top, now.Width(), now.Height());
+  }
+  dragX_ = x;
+  dragY_ = y;
 }
 
 bool WindowSystem::TakeTimer(Queue& queue, Message& message) {
@@ -768,7 +878,7 @@ void WindowSystem::Dispatch(const Message& message) {
     for (const Timer& timer : QueueOf(window->thread).timers) {
       if (timer.window == message.window && timer.id == message.wParam && timer.procedure) {
         const TimerProcedure procedure = timer.procedure;
-        procedure(message.window, static_cast<std::uint32_t>(message.wParam));
+        host_.RunProcedure([&] { procedure(message.window, static_cast<std::uint32_t>(message.wParam)); });
         return;
       }
     }
@@ -806,6 +916,7 @@ std::unique_ptr<Canvas> WindowSystem::BeginPaint(WindowHandle handle) {
   if (Window* window = Find(handle)) {
     window->dirty = false;
     window->operations.clear();
+    Changed();
   }
   return std::make_unique<PaintCanvas>(*this, handle);
 }
@@ -831,6 +942,7 @@ void WindowSystem::SetScroll(WindowHandle bar, const ScrollState& state) {
     window->scroll = state;
     const int highest = std::max(state.minimum, state.maximum - std::max(0, state.page - 1));
     window->scroll.position = std::clamp(state.position, state.minimum, highest);
+    Changed();
   }
 }
 
@@ -850,6 +962,79 @@ void WindowSystem::PressButton(WindowHandle button) {
         static_cast<std::intptr_t>(button)});
 }
 
+// A control's mouse coordinates are those of its frame.
+void WindowSystem::OnControlDown(WindowHandle control, int x, int y) {
+  Window* window = Find(control);
+  if (window->kind == WindowKind::kButton || window->kind == WindowKind::kEdit) {
+    SetFocus(control);
+    window = Find(control);
+    if (window != nullptr && window->kind == WindowKind::kButton) {
+      window->pressed = true;
+      Changed();
+    }
+    return;
+  }
+  if (window->kind != WindowKind::kScrollBar) {
+    return;
+  }
+  const bool vertical = (window->style & style::kScrollBarVertical) != 0;
+  const ScrollParts parts =
+      PartsOfScrollBar({0, 0, window->area.Width(), window->area.Height()}, vertical, window->scroll);
+  if (parts.backArrow.Contains(x, y)) {
+    SendScroll(control, scroll::kLineBack, 0);
+  } else if (parts.forwardArrow.Contains(x, y)) {
+    SendScroll(control, scroll::kLineForward, 0);
+  } else if (parts.thumb.Contains(x, y)) {
+    window->pressed = true;
+    dragX_ = x - parts.thumb.left;
+    dragY_ = y - parts.thumb.top;
+  } else if (parts.track.Contains(x, y)) {
+    const bool back = vertical ? y < parts.thumb.top : x < parts.thumb.left;
+    SendScroll(control, back ? scroll::kPageBack : scroll::kPageForward, 0);
+  }
+}
+
+void WindowSystem::OnControlMove(WindowHandle control, int x, int y) {
+  Window* window = Find(control);
+  if (window->kind == WindowKind::kButton) {
+    const bool inside = Rectangle{0, 0, window->area.Width(), window->area.Height()}.Contains(x, y);
+    if (captured_ == control && inside != window->pressed) {
+      window->pressed = inside;
+      Changed();
+    }
+  } else if (window->kind == WindowKind::kScrollBar && window->pressed) {
+    const bool vertical = (window->style & style::kScrollBarVertical) != 0;
+    const ScrollParts parts =
+        PartsOfScrollBar({0, 0, window->area.Width(), window->area.Height()}, vertical, window->scroll);
+    const int along = vertical ? y - dragY_ - parts.track.top : x - dragX_ - parts.track.left;
+    const int position =
+        window->scroll.minimum + static_cast<int>(static_cast<long long>(std::clamp(along, 0, parts.travel)) *
+                                                  parts.distance / std::max(1, parts.travel));
+    SendScroll(control, scroll::kThumbTrack, position);
+  }
+}
+
+void WindowSystem::OnControlUp(WindowHandle control) {
+  Window* window = Find(control);
+  if (!window->pressed) {
+    return;
+  }
+  window->pressed = false;
+  Changed();
+  if (window->kind == WindowKind::kButton) {
+    PressButton(control);
+  } else if (window->kind == WindowKind::kScrollBar) {
+    SendScroll(control, scroll::kThumbPosition, window->scroll.position);
+  }
+}
+
+void WindowSystem::SendScroll(WindowHandle bar, std::uint32_t request, int position) {
+  const Window* window = Find(bar);
+  const bool vertical = (window->style & style::kScrollBarVertical) != 0;
+  Send({window->parent, vertical ? message::kVerticalScroll : message::kHorizontalScroll,
+        (static_cast<std::uint32_t>(position) & 0xFFFFU) << 16U | request, static_cast<std::intptr_t>(bar)});
+}
+
 std::intptr_t WindowSystem::ControlProcedure(const Message& message) {
   Window* window = Find(message.window);
   if (window == nullptr) {
@@ -857,18 +1042,13 @@ std::intptr_t WindowSystem::ControlProcedure(const Message& message) {
   }
   switch (message.id) {
     case message::kLeftButtonDown:
-      if (window->kind == WindowKind::kButton || window->kind == WindowKind::kEdit) {
-        SetFocus(message.window);
-        if (Window* still = Find(message.window)) {
-          still->pressed = still->kind == WindowKind::kButton;
-        }
-      }
+      OnControlDown(message.window, XOf(message), YOf(message));
+      return 0;
+    case message::kMouseMove:
+      OnControlMove(message.window, XOf(message), YOf(message));
       return 0;
     case message::kLeftButtonUp:
-      if (window->pressed) {
-        window->pressed = false;
-        PressButton(message.window);
-      }
+      OnControlUp(message.window);
       return 0;
     case message::kKeyDown:
       if (window->kind == WindowKind::kButton && message.wParam == kSpaceKey) {
@@ -963,8 +1143,8 @@ bool WindowSystem::IsDialogMessage(WindowHandle dialog, const Message& message) 
     const Window* focused = Find(focus);
     switch (message.wParam) {
       case kTabKey:
-      case kShiftTabKey:
-        FocusNext(dialog, message.wParam == kShiftTabKey);
+      case WindowSystem::kShiftTabKey:
+        FocusNext(dialog, message.wParam == WindowSystem::kShiftTabKey);
         return true;
       case kLeftKey:
       case kUpKey:
@@ -1028,14 +1208,41 @@ WindowHandle WindowSystem::WindowAt(int x, int y) const {
 }
 
 void WindowSystem::Click(int x, int y) {
-  if (const Window* window = Find(WindowAt(x, y))) {
-    Queue& queue = QueueOf(window->thread);
-    Input input;
-    input.mouse = true;
-    input.x = x;
-    input.y = y;
-    queue.input.push_back(input);
-    host_.Wake(&queue);
+  MouseButton(x, y, true);
+  MouseButton(x, y, false);
+}
+
+void WindowSystem::MouseButton(int x, int y, bool down) {
+  if (down) {
+    const Window* window = Find(WindowAt(x, y));
+    mouseThread_ = window == nullptr ? 0 : window->thread;
+  }
+  PushMouse(down ? InputKind::kMouseDown : InputKind::kMouseUp, x, y);
+}
+
+void WindowSystem::MouseMove(int x, int y) {
+  if (captured_ != 0) {
+    PushMouse(InputKind::kMouseMove, x, y);
+  }
+}
+
+// To the thread whose window the button went down on.
+void WindowSystem::PushMouse(InputKind kind, int x, int y) {
+  const auto found = queues_.find(mouseThread_);
+  if (found == queues_.end()) {
+    return;
+  }
+  Input input;
+  input.kind = kind;
+  input.x = x;
+  input.y = y;
+  found->second->input.push_back(input);
+  host_.Wake(found->second.get());
+}
+
+void WindowSystem::Broadcast(std::uint32_t id, std::uintptr_t wParam) {
+  for (const WindowHandle handle : std::vector<WindowHandle>(order_)) {
+    Post({handle, id, wParam, 0});
   }
 }
 
@@ -1063,6 +1270,8 @@ void WindowSystem::AddToScene(Scene& scene, const Window& window, const Rectangl
     return;
   }
   SceneWindow picture;
+  picture.handle = window.handle;
+  picture.topLevel = TopLevelOf(window.handle);
   picture.kind = window.kind;
   picture.frame = ScreenRectangle(window.handle);
   picture.client = ClientOnScreen(window);
@@ -1098,6 +1307,7 @@ Scene WindowSystem::MakeScene() const {
   Scene scene;
   scene.width = screenWidth_;
   scene.height = screenHeight_;
+  scene.foreground = foreground_;
   for (const WindowHandle handle : order_) {
     AddToScene(scene, *Find(handle), {0, 0, screenWidth_, screenHeight_});
   }

@@ -19,6 +19,9 @@ namespace panelglow::platform::desktop {
 
 class WindowSystem : public Desktop {
  public:
+  /// Our own key code: Tab with the Shift key.
+  static constexpr std::uint32_t kShiftTabKey = 0x0109;
+
   WindowSystem(WindowHost& host, int screenWidth, int screenHeight);
   ~WindowSystem() override;
 
@@ -80,6 +83,11 @@ class WindowSystem : public Desktop {
   /// its thread takes the message, not the one that is there now.
   void Click(int x, int y);
 
+  /// The left mouse button going down or up, and the mouse moving, at a point of the screen. While the button is down
+  /// everything goes to the window that it went down on.
+  void MouseButton(int x, int y, bool down);
+  void MouseMove(int x, int y);
+
   /// A key press and release by virtual-key code; `character` is what it types, 0 for none. `alt`: with the Alt key.
   void Key(std::uint32_t virtualKey, char16_t character, bool alt);
 
@@ -90,6 +98,12 @@ class WindowSystem : public Desktop {
   [[nodiscard]] Rectangle ScreenRectangle(WindowHandle window) const;
 
   [[nodiscard]] Scene MakeScene() const;
+
+  /// Grows whenever the scene changes.
+  [[nodiscard]] std::uint64_t Revision() const { return revision_; }
+
+  /// Posts a message to every top-level window, as the system does when a device comes or goes.
+  void Broadcast(std::uint32_t id, std::uintptr_t wParam);
 
   /// Destroys the windows that the calling thread, which is about to end, still owns.
   void EndThread();
@@ -107,8 +121,9 @@ class WindowSystem : public Desktop {
     std::uint64_t due_ms = 0;
     TimerProcedure procedure;
   };
+  enum class InputKind { kKey, kMouseDown, kMouseUp, kMouseMove };
   struct Input {
-    bool mouse = false;
+    InputKind kind = InputKind::kKey;
     int x = 0;
     int y = 0;
     std::uint32_t virtualKey = 0;
@@ -128,6 +143,9 @@ class WindowSystem : public Desktop {
   std::intptr_t Call(const Message& message);
   void HandleSentMessages(Queue& queue);
   bool TakeInput(Queue& queue, Message& message);
+  bool TakeKey(Queue& queue, const Input& input, Message& message);
+  bool TakeMouse(const Input& input, Message& message);
+  void PushMouse(InputKind kind, int x, int y);
   bool TakeTimer(Queue& queue, Message& message);
   bool TakePaint(std::uint32_t thread, Message& message);
   void Activate(WindowHandle window);
@@ -138,6 +156,13 @@ class WindowSystem : public Desktop {
   [[nodiscard]] WindowHandle WindowAt(int x, int y) const;
   [[nodiscard]] bool IsShown(const Window& window) const;
   std::intptr_t ControlProcedure(const Message& message);
+  void OnControlDown(WindowHandle control, int x, int y);
+  void OnControlMove(WindowHandle control, int x, int y);
+  void OnControlUp(WindowHandle control);
+  void SendScroll(WindowHandle bar, std::uint32_t request, int position);
+  [[nodiscard]] int FrameEdgesAt(const Window& window, int x, int y) const;
+  void DragFrame(int x, int y);
+  void Changed() { ++revision_; }
   void PressButton(WindowHandle button);
   void FocusNext(WindowHandle dialog, bool backwards);
   void FocusInGroup(WindowHandle dialog, bool backwards);
@@ -156,6 +181,14 @@ class WindowSystem : public Desktop {
   std::map<std::uint32_t, std::unique_ptr<Queue>> queues_;
   WindowHandle nextWindow_ = 1;
   WindowHandle foreground_ = 0;
+  std::uint64_t revision_ = 0;
+
+  // While the mouse button is down.
+  std::uint32_t mouseThread_ = 0;
+  WindowHandle captured_ = 0;  // where it went down
+  int dragEdges_ = 0;          // edges of the captured window's frame that are dragged
+  int dragX_ = 0;              // last place of a drag; of a scroll thumb, the grip within it
+  int dragY_ = 0;
   std::function<SceneDrawing*()> drawing_;
 };
 

@@ -1,4 +1,4 @@
-// The real machine under Linux. What it cannot reach yet (driver, management, display, keys) answers as absent.
+// The real machine under Linux. What it cannot reach yet (driver, management, keys) answers as absent.
 #pragma once
 
 #include "platform/Host.h"
@@ -8,11 +8,11 @@
 #include "platform/host_linux/LinuxClock.h"
 #include "platform/host_linux/LinuxConsole.h"
 #include "platform/host_linux/LinuxCpu.h"
+#include "platform/host_linux/LinuxDesktop.h"
 #include "platform/host_linux/LinuxEnvironment.h"
 #include "platform/host_linux/LinuxFiles.h"
 #include "platform/host_linux/LinuxMutexes.h"
 #include "platform/host_linux/LinuxThreads.h"
-#include "platform/host_linux/NoDesktop.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
 #include "platform/profile/ProfileFilesOnFiles.h"
@@ -24,11 +24,11 @@ struct LinuxHost {
   LinuxClock clock;
   LinuxConsole console;
   LinuxCpu cpu;
-  NoDesktop desktop;
   AbsentDriver driver;
   LinuxEnvironment environment;
   LinuxFiles files;
   posix::LazyDrawing drawing;
+  LinuxDesktop desktop{drawing};
   posix::DrawnImages images{drawing};
   AbsentInputs inputs;
   EmptyManagement management;

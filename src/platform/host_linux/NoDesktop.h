@@ -1,13 +1,11 @@
 // A desktop without a display: no window can be made, and nothing waits for one.
 #pragma once
 
-#include <atomic>
-
 #include "platform/Desktop.h"
 
 namespace panelglow::platform::host_linux {
 
-/// Creating a window fails, the first time with a line on standard error; getting a message gives the quit message at
+/// Creating a window fails; getting a message gives the quit message at
 /// once, so that no message loop hangs. Everything else answers as for a window that does not exist.
 class NoDesktop : public Desktop {
  public:
@@ -61,9 +59,6 @@ class NoDesktop : public Desktop {
   Rectangle MeasureText(std::u16string_view text, int width, const Font& font) override;
   void SetScroll(WindowHandle bar, const ScrollState& state) override;
   ScrollState Scroll(WindowHandle bar) override;
-
- private:
-  std::atomic<bool> told_{false};
 };
 
 }  // namespace panelglow::platform::host_linux

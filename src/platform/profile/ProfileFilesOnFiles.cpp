@@ -39,7 +39,12 @@ std::optional<wstring> Widened(std::optional<std::string_view> text) {
   return text ? std::optional<wstring>(WideFromCodePage(*text)) : std::nullopt;
 }
 
-std::string NarrowOf(std::string bytes) { return IsWide(bytes) ? CodePageFromWide(WideOf(bytes)) : bytes; }
+std::string NarrowOf(std::string bytes) {
+  if (IsWide(bytes)) {
+    return CodePageFromWide(WideOf(bytes));
+  }
+  return bytes;
+}
 
 // The three kinds of answer that one look-up can give.
 template <class Char>

@@ -98,6 +98,7 @@ std::unique_ptr<Simulation> MakeSimulationFromEnvironment() {
   options.operatorPolicy = Setting(kOperatorVariable);
   options.screenshots = Setting(kScreenshotsVariable);
   options.realTime = Setting(kRealTimeVariable) == "1";
+  options.window = Setting(kWindowVariable) == "1";
   const std::string seed = Setting(kSeedVariable);
   if (!seed.empty()) {
     const auto [end, error] = std::from_chars(seed.data(), seed.data() + seed.size(), options.seed);

@@ -13,6 +13,7 @@ inline constexpr const char* kOperatorVariable = "PANELGLOW_SIM_OPERATOR";      
 inline constexpr const char* kSeedVariable = "PANELGLOW_SIM_SEED";                // decimal
 inline constexpr const char* kFaultsVariable = "PANELGLOW_SIM_FAULTS";            // "LED=KIND" separated by ';'
 inline constexpr const char* kRealTimeVariable = "PANELGLOW_SIM_REAL_TIME";       // "1"
+inline constexpr const char* kWindowVariable = "PANELGLOW_SIM_WINDOW";            // "1"
 inline constexpr const char* kScreenshotsVariable = "PANELGLOW_SIM_SCREENSHOTS";  // folder
 inline constexpr const char* kTraceVariable = "PANELGLOW_SIM_TRACE";              // file for driver requests
 inline constexpr const char* kReportVariable = "PANELGLOW_SIM_REPORT";            // file for the panel's time line

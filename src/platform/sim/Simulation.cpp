@@ -25,6 +25,7 @@
 #include "platform/sim/SimHost.h"
 #include "platform/sim/SimManagement.h"
 #include "platform/sim/SimMutexes.h"
+#include "platform/sim/SimScreen.h"
 
 namespace panelglow::platform::sim {
 
@@ -323,6 +324,7 @@ struct Simulation::Parts {
   posix::LazyXmlDocuments xmlDocuments;
   Host host;
   std::unique_ptr<Operator> person;
+  std::unique_ptr<SimScreen> screen;
   std::string initialState;
   unsigned pictures = 0;
   Simulation* former = nullptr;
@@ -373,7 +375,15 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
     std::signal(SIGINT, NoteSignal);
     std::signal(SIGTERM, NoteSignal);
     std::signal(SIGPIPE, SIG_IGN);
+  }
+  if (options.window) {
+    p.screen = std::make_unique<SimScreen>(p.windows, p.panel, p.description.name);
+  }
+  if (!options.captureOutput || options.window) {
     p.scheduler.OnHandOver([this] {
+      if (parts_->screen) {
+        parts_->screen->Look();
+      }
       for (std::uint32_t type = 0; type < 2; ++type) {
         if (g_pendingSignals[type] != 0) {
           g_pendingSignals[type] = 0;

@@ -26,10 +26,11 @@ class Operator;
 struct SimulationOptions {
   std::uint64_t seed = 1;
   bool realTime = false;
-  bool realFiles = false;      // the current directory's files are the machine's; otherwise all files live in memory
-  bool captureOutput = true;   // standard output is kept instead of written
-  std::string operatorPolicy;  // empty: nobody sits at the machine
-  std::string screenshots;     // folder for PNG pictures, empty for none
+  bool window = false;        // windows and front panel are shown on a display, for a person to take the test
+  bool realFiles = false;     // the current directory's files are the machine's; otherwise all files live in memory
+  bool captureOutput = true;  // standard output is kept instead of written
+  std::string operatorPolicy = {};                                  // empty: nobody sits at the machine
+  std::string screenshots = {};                                     // folder for PNG pictures, empty for none
   Microseconds timeLimit_us = Microseconds{25} * 3600 * 1'000'000;  // a little over the longest planned run, a day
 };
 

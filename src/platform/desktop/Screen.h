@@ -1,0 +1,42 @@
+// A display that people look at: shows scenes, and says what mouse and keyboard did.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "platform/desktop/Scene.h"
+
+namespace panelglow::platform::desktop {
+
+struct ScreenEvent {
+  enum class Kind { kMouseDown, kMouseUp, kMouseMove, kKey };
+  Kind kind = Kind::kKey;
+  int x = 0;  // screen pixels
+  int y = 0;
+  std::uint32_t virtualKey = 0;  // of the home system; WindowSystem's own code for Shift+Tab
+  char16_t character = 0;        // what the key types, 0 for none
+  bool alt = false;
+};
+
+class Screen {
+ public:
+  virtual ~Screen() = default;
+
+  [[nodiscard]] virtual int Width() const = 0;   // pixels
+  [[nodiscard]] virtual int Height() const = 0;  // pixels
+
+  /// A file descriptor that is readable when TakeEvents() may have something.
+  [[nodiscard]] virtual int Descriptor() const = 0;
+
+  /// Shows the scene's top-level windows, each as a window of the display, and takes away those that are not in it.
+  virtual void Show(const Scene& scene) = 0;
+
+  /// What has happened since the last call; never blocks. Exposed parts are drawn again on the way.
+  virtual std::vector<ScreenEvent> TakeEvents() = 0;
+
+  /// False once the display has gone away.
+  [[nodiscard]] virtual bool IsAlive() const = 0;
+};
+
+}  // namespace panelglow::platform::desktop

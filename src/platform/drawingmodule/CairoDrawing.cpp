@@ -1,0 +1,372 @@
+#include "platform/drawingmodule/CairoDrawing.h"
+
+#include <pango/pangocairo.h>
+
+#include <algorithm>
+
+#include "platform/desktop/ScrollParts.h"
+
+namespace panelglow::platform::desktop {
+
+namespace {
+
+using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
+using Description = std::unique_ptr<PangoFontDescription, Deleter<pango_font_description_free>>;
+
+constexpr int kIconSize = 32;             // pixels
+constexpr int kLargestImageSide = 16384;  // pixels; larger pictures are treated as unreadable
+
+std::string Utf8(std::u16string_view text) {
+  glong length = 0;
+  gchar* converted = g_utf16_to_utf8(reinterpret_cast<const gunichar2*>(text.data()), static_cast<glong>(text.size()),
+                                     nullptr, &length, nullptr);
+  if (converted == nullptr) {
+    return "?";
+  }
+  std::string utf8(converted, static_cast<std::size_t>(length));
+  g_free(converted);
+  return utf8;
+}
+
+// A caption without its marks.
+struct Caption {
+  std::u16string text;
+  std::size_t underlined = std::u16string::npos;
+};
+
+// A caption with its '&' marks taken out: "&&" is one '&', "&x" underlines the x.
+Caption ReadCaption(std::u16string_view source) {
+  Caption caption;
+  for (std::size_t i = 0; i < source.size(); ++i) {
+    if (source[i] == u'&' && i + 1 < source.size()) {
+      ++i;
+      if (source[i] != u'&' && caption.underlined == std::u16string::npos) {
+        caption.underlined = caption.text.size();
+      }
+    }
+    caption.text.push_back(source[i]);
+  }
+  return caption;
+}
+
+void SetColor(cairo_t* cr, Color color) {
+  cairo_set_source_rgb(cr, (color & 0xFFU) / 255.0, (color >> 8U & 0xFFU) / 255.0, (color >> 16U & 0xFFU) / 255.0);
+}
+
+void FillRectangle(cairo_t* cr, const Rectangle& area, Color color) {
+  SetColor(cr, color);
+  cairo_rectangle(cr, area.left, area.top, area.Width(), area.Height());
+  cairo_fill(cr);
+}
+
+// A one pixel frame, light and dark as if lit from the top left.
+void DrawBevel(cairo_t* cr, const Rectangle& area, Color topLeft, Color bottomRight) {
+  cairo_set_line_width(cr, 1);
+  SetColor(cr, topLeft);
+  cairo_move_to(cr, area.left + 0.5, area.bottom - 0.5);
+  cairo_line_to(cr, area.left + 0.5, area.top + 0.5);
+  cairo_line_to(cr, area.right - 0.5, area.top + 0.5);
+  cairo_stroke(cr);
+  SetColor(cr, bottomRight);
+  cairo_move_to(cr, area.right - 0.5, area.top + 0.5);
+  cairo_line_to(cr, area.right - 0.5, area.bottom - 0.5);
+  cairo_line_to(cr, area.left + 0.5, area.bottom - 0.5);
+  cairo_stroke(cr);
+}
+
+Layout MakeLayout(cairo_t* cr, const std::string& text, const Font& font) {
+  Layout layout(pango_cairo_create_layout(cr));
+  const Description description(pango_font_description_from_string("DejaVu Sans, Noto Sans CJK JP, Sans"));
+  // A font's height is that of its cell; the letters take about three quarters of it.
+  pango_font_description_set_absolute_size(description.get(), font.height * 0.74 * PANGO_SCALE);
+  pango_font_description_set_weight(description.get(), static_cast<PangoWeight>(font.weight));
+  pango_layout_set_font_description(layout.get(), description.get());
+  pango_layout_set_text(layout.get(), text.data(), static_cast<int>(text.size()));
+  return layout;
+}
+
+void DrawPixbuf(cairo_t* cr, const GdkPixbuf* image, int x, int y) {
+  const int width = gdk_pixbuf_get_width(image);
+  const int height = gdk_pixbuf_get_height(image);
+  const Surface surface(cairo_image_surface_create(CAIRO_FORMAT_ARGB32, width, height));
+  if (cairo_surface_status(surface.get()) != CAIRO_STATUS_SUCCESS) {
+    return;
+  }
+  cairo_surface_flush(surface.get());
+  unsigned char* target = cairo_image_surface_get_data(surface.get());
+  const int targetStride = cairo_image_surface_get_stride(surface.get());
+  const guint8* source = gdk_pixbuf_read_pixels(image);
+  const int sourceStride = gdk_pixbuf_get_rowstride(image);
+  const int channels = gdk_pixbuf_get_n_channels(image);
+  for (int row = 0; row < height; ++row) {
+    const guint8* from = source + static_cast<std::ptrdiff_t>(row) * sourceStride;
+    auto* to = reinterpret_cast<std::uint32_t*>(target + static_cast<std::ptrdiff_t>(row) * targetStride);
+    for (int column = 0; column < width; ++column, from += channels) {
+      const std::uint32_t alpha = channels == 4 ? from[3] : 255U;
+      const auto part = [&](int index) { return from[index] * alpha / 255U; };
+      to[column] = alpha << 24U | part(0) << 16U | part(1) << 8U | part(2);
+    }
+  }
+  cairo_surface_mark_dirty(surface.get());
+  cairo_set_source_surface(cr, surface.get(), x, y);
+  cairo_paint(cr);
+}
+
+std::string FilePath(std::u16string_view path) {
+  std::string name = Utf8(path);
+  std::replace(name.begin(), name.end(), '\\', '/');
+  return name;
+}
+
+void DrawCaption(cairo_t* cr, const SceneWindow& window, std::u16string_view source, bool marks, bool centred) {
+  Caption caption{std::u16string(source), std::u16string::npos};
+  if (marks) {
+    caption = ReadCaption(source);
+  }
+  const Layout layout = MakeLayout(cr, Utf8(caption.text), window.font);
+  if (caption.underlined != std::u16string::npos) {
+    const std::size_t begin = Utf8(std::u16string_view(caption.text).substr(0, caption.underlined)).size();
+    const std::size_t end = Utf8(std::u16string_view(caption.text).substr(0, caption.underlined + 1)).size();
+    PangoAttrList* attributes = pango_attr_list_new();
+    PangoAttribute* underline = pango_attr_underline_new(PANGO_UNDERLINE_SINGLE);
+    underline->start_index = static_cast<guint>(begin);
+    underline->end_index = static_cast<guint>(end);
+    pango_attr_list_insert(attributes, underline);
+    pango_layout_set_attributes(layout.get(), attributes);
+    pango_attr_list_unref(attributes);
+  }
+  int width = 0;
+  int height = 0;
+  if (centred) {
+    pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
+    pango_layout_set_width(layout.get(), std::max(0, window.frame.Width() - 8) * PANGO_SCALE);
+    pango_layout_set_alignment(layout.get(), PANGO_ALIGN_CENTER);
+    pango_layout_get_pixel_size(layout.get(), &width, &height);
+    cairo_move_to(cr, window.frame.left + 4, window.frame.top + (window.frame.Height() - height) / 2.0);
+  } else {
+    pango_layout_set_width(layout.get(), window.client.Width() * PANGO_SCALE);
+    pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
+    cairo_move_to(cr, window.client.left + 2, window.client.top + 1);
+  }
+  SetColor(cr, window.enabled ? 0x000000 : 0x808080);
+  pango_cairo_show_layout(cr, layout.get());
+}
+
+void DrawButton(cairo_t* cr, const SceneWindow& window) {
+  FillRectangle(cr, window.frame, window.pressed ? 0x00D0D0D0 : 0x00E8E8E8);
+  DrawBevel(cr, window.frame, 0x00FFFFFF, 0x00606060);
+  if (window.defaultButton || window.focused) {
+    cairo_set_line_width(cr, 1);
+    SetColor(cr, 0x00000000);
+    cairo_rectangle(cr, window.frame.left + 0.5, window.frame.top + 0.5, window.frame.Width() - 1,
+                    window.frame.Height() - 1);
+    cairo_stroke(cr);
+  }
+  DrawCaption(cr, window, window.text, true, true);
+  if (window.focused) {
+    const double dashes[] = {1, 1};
+    cairo_set_dash(cr, dashes, 2, 0);
+    cairo_rectangle(cr, window.frame.left + 3.5, window.frame.top + 3.5, window.frame.Width() - 7,
+                    window.frame.Height() - 7);
+    cairo_stroke(cr);
+    cairo_set_dash(cr, nullptr, 0, 0);
+  }
+}
+
+// An arrow of a scroll bar: a bevelled field with a triangle.
+void DrawArrow(cairo_t* cr, const Rectangle& area, bool vertical, bool back) {
+  FillRectangle(cr, area, 0x00E8E8E8);
+  DrawBevel(cr, area, 0x00FFFFFF, 0x00606060);
+  const double x = (area.left + area.right) / 2.0;
+  const double y = (area.top + area.bottom) / 2.0;
+  const double tip = back ? -3 : 3;
+  SetColor(cr, 0x00000000);
+  if (vertical) {
+    cairo_move_to(cr, x, y + tip);
+    cairo_line_to(cr, x - 4, y - tip / 2);
+    cairo_line_to(cr, x + 4, y - tip / 2);
+  } else {
+    cairo_move_to(cr, x + tip, y);
+    cairo_line_to(cr, x - tip / 2, y - 4);
+    cairo_line_to(cr, x - tip / 2, y + 4);
+  }
+  cairo_close_path(cr);
+  cairo_fill(cr);
+}
+
+void DrawScrollBar(cairo_t* cr, const SceneWindow& window) {
+  const ScrollParts parts = PartsOfScrollBar(window.frame, window.vertical, window.scroll);
+  FillRectangle(cr, window.frame, 0x00D0D0D0);
+  DrawArrow(cr, parts.backArrow, window.vertical, true);
+  DrawArrow(cr, parts.forwardArrow, window.vertical, false);
+  if (parts.travel > 0) {
+    FillRectangle(cr, parts.thumb, window.pressed ? 0x00B0B0B0 : 0x00E8E8E8);
+    DrawBevel(cr, parts.thumb, 0x00FFFFFF, 0x00606060);
+  }
+}
+
+}  // namespace
+
+bool CairoDrawing::WritePng(const Scene& scene, const std::string& path) {
+  const Surface surface(cairo_image_surface_create(CAIRO_FORMAT_RGB24, scene.width, scene.height));
+  const Context context(cairo_create(surface.get()));
+  FillRectangle(context.get(), {0, 0, scene.width, scene.height}, scene.background);
+  for (const SceneWindow& window : scene.windows) {
+    DrawWindow(context.get(), window);
+  }
+  return cairo_surface_write_to_png(surface.get(), path.c_str()) == CAIRO_STATUS_SUCCESS;
+}
+
+std::optional<std::pair<int, int>> CairoDrawing::ImageSize(const std::string& path) {
+  const GdkPixbuf* image = Load(path);
+  if (image == nullptr) {
+    return std::nullopt;
+  }
+  return std::pair{gdk_pixbuf_get_width(image), gdk_pixbuf_get_height(image)};
+}
+
+std::pair<int, int> CairoDrawing::MeasureText(std::u16string_view text, int width, const Font& font) {
+  const Surface surface(cairo_image_surface_create(CAIRO_FORMAT_RGB24, 1, 1));
+  const Context context(cairo_create(surface.get()));
+  const Layout layout = MakeLayout(context.get(), Utf8(text), font);
+  pango_layout_set_width(layout.get(), width * PANGO_SCALE);
+  pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
+  int w = 0;
+  int h = 0;
+  pango_layout_get_pixel_size(layout.get(), &w, &h);
+  return {w, h};
+}
+
+// Null when the file does not decode. An image stays in memory for the next drawing.
+const GdkPixbuf* CairoDrawing::Load(const std::string& path) {
+  const auto known = images_.find(path);
+  if (known != images_.end()) {
+    return known->second.get();
+  }
+  int width = 0;
+  int height = 0;
+  Pixbuf image;
+  if (gdk_pixbuf_get_file_info(path.c_str(), &width, &height) != nullptr && width <= kLargestImageSide &&
+      height <= kLargestImageSide) {
+    image.reset(gdk_pixbuf_new_from_file(path.c_str(), nullptr));
+  }
+  return images_.emplace(path, std::move(image)).first->second.get();
+}
+
+void CairoDrawing::DrawOperations(cairo_t* cr, const SceneWindow& window) {
+  cairo_save(cr);
+  cairo_rectangle(cr, window.client.left, window.client.top, window.client.Width(), window.client.Height());
+  cairo_clip(cr);
+  cairo_translate(cr, window.client.left, window.client.top);
+  for (const DrawOperation& operation : window.operations) {
+    std::visit([&](const auto& step) { Draw(cr, step); }, operation);
+  }
+  cairo_restore(cr);
+}
+
+void CairoDrawing::Draw(cairo_t* cr, const FillOperation& fill) { FillRectangle(cr, fill.area, fill.color); }
+
+void CairoDrawing::Draw(cairo_t* cr, const DiscOperation& disc) {
+  constexpr double kFullTurn = 6.283185307179586;
+  SetColor(cr, disc.color);
+  cairo_arc(cr, (disc.area.left + disc.area.right) / 2.0, (disc.area.top + disc.area.bottom) / 2.0,
+            disc.area.Width() / 2.0, 0, kFullTurn);
+  cairo_fill(cr);
+}
+
+void CairoDrawing::Draw(cairo_t* cr, const TextOperation& text) {
+  const Layout layout = MakeLayout(cr, Utf8(text.text), text.font);
+  cairo_save(cr);
+  if (text.boxed) {
+    cairo_rectangle(cr, text.area.left, text.area.top, text.area.Width(), text.area.Height());
+    cairo_clip(cr);
+    if (text.layout.wordBreak) {
+      pango_layout_set_width(layout.get(), text.area.Width() * PANGO_SCALE);
+      pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
+    }
+  }
+  if (text.background) {
+    int width = 0;
+    int height = 0;
+    pango_layout_get_pixel_size(layout.get(), &width, &height);
+    FillRectangle(cr, {text.area.left, text.area.top, text.area.left + width, text.area.top + height},
+                  *text.background);
+  }
+  cairo_move_to(cr, text.area.left, text.area.top);
+  SetColor(cr, text.color);
+  pango_cairo_show_layout(cr, layout.get());
+  cairo_restore(cr);
+}
+
+void CairoDrawing::Draw(cairo_t* cr, const ImageOperation& operation) {
+  if (const GdkPixbuf* image = Load(FilePath(operation.path))) {
+    cairo_save(cr);
+    cairo_rectangle(cr, operation.clip.left, operation.clip.top, operation.clip.Width(), operation.clip.Height());
+    cairo_clip(cr);
+    DrawPixbuf(cr, image, operation.x, operation.y);
+    cairo_restore(cr);
+  }
+}
+
+void CairoDrawing::DrawIcon(cairo_t* cr, const SceneWindow& window) {
+  const GdkPixbuf* image = window.iconPath.empty() ? nullptr : Load(FilePath(window.iconPath));
+  if (image == nullptr) {
+    return;
+  }
+  if (gdk_pixbuf_get_width(image) == kIconSize && gdk_pixbuf_get_height(image) == kIconSize) {
+    DrawPixbuf(cr, image, window.frame.left, window.frame.top);
+    return;
+  }
+  const Pixbuf scaled(gdk_pixbuf_scale_simple(image, kIconSize, kIconSize, GDK_INTERP_BILINEAR));
+  if (scaled) {
+    DrawPixbuf(cr, scaled.get(), window.frame.left, window.frame.top);
+  }
+}
+
+void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
+  cairo_save(cr);
+  cairo_rectangle(cr, window.clip.left, window.clip.top, window.clip.Width(), window.clip.Height());
+  cairo_clip(cr);
+  switch (window.kind) {
+    case WindowKind::kButton:
+      DrawButton(cr, window);
+      break;
+    case WindowKind::kScrollBar:
+      DrawScrollBar(cr, window);
+      break;
+    case WindowKind::kIcon:
+      DrawIcon(cr, window);
+      break;
+    case WindowKind::kEdit:
+      FillRectangle(cr, window.frame, 0x00FFFFFF);
+      DrawBevel(cr, window.frame, 0x00606060, 0x00FFFFFF);
+      DrawCaption(cr, window, window.text, false, false);
+      break;
+    case WindowKind::kStatic:
+    case WindowKind::kImageArea:
+      FillRectangle(cr, window.frame, window.background);
+      if (window.border) {
+        DrawBevel(cr, window.frame, 0x00606060, 0x00606060);
+      }
+      if (window.kind == WindowKind::kStatic) {
+        DrawCaption(cr, window, window.text, false, false);
+      }
+      break;
+    case WindowKind::kPlain:
+      FillRectangle(cr, window.frame, window.background);
+      if (window.raisedFrame) {
+        DrawBevel(cr, window.frame, 0x00FFFFFF, 0x00404040);
+      } else if (window.border) {
+        DrawBevel(cr, window.frame, 0x00606060, 0x00606060);
+      }
+      break;
+  }
+  cairo_restore(cr);
+  cairo_save(cr);
+  cairo_rectangle(cr, window.clip.left, window.clip.top, window.clip.Width(), window.clip.Height());
+  cairo_clip(cr);
+  DrawOperations(cr, window);
+  cairo_restore(cr);
+}
+
+}  // namespace panelglow::platform::desktop

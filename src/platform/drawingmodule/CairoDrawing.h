@@ -1,0 +1,48 @@
+// Draws scenes of windows with cairo and pango, and decodes image files with gdk-pixbuf.
+#pragma once
+
+#include <cairo.h>
+#include <gdk-pixbuf/gdk-pixbuf.h>
+
+#include <map>
+#include <memory>
+#include <string>
+
+#include "platform/desktop/Scene.h"
+
+namespace panelglow::platform::desktop {
+
+/// For the C libraries' objects, each with its own way to be given up.
+template <auto Free>
+struct Deleter {
+  template <class T>
+  void operator()(T* object) const {
+    Free(object);
+  }
+};
+using Surface = std::unique_ptr<cairo_surface_t, Deleter<cairo_surface_destroy>>;
+using Context = std::unique_ptr<cairo_t, Deleter<cairo_destroy>>;
+using Pixbuf = std::unique_ptr<GdkPixbuf, Deleter<g_object_unref>>;
+
+class CairoDrawing : public SceneDrawing {
+ public:
+  bool WritePng(const Scene& scene, const std::string& path) override;
+  std::optional<std::pair<int, int>> ImageSize(const std::string& path) override;
+  std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font) override;
+
+  /// Draws one window of a scene, in screen coordinates.
+  void DrawWindow(cairo_t* cr, const SceneWindow& window);
+
+ private:
+  const GdkPixbuf* Load(const std::string& path);
+  void DrawOperations(cairo_t* cr, const SceneWindow& window);
+  void DrawIcon(cairo_t* cr, const SceneWindow& window);
+  void Draw(cairo_t* cr, const FillOperation& fill);
+  void Draw(cairo_t* cr, const DiscOperation& disc);
+  void Draw(cairo_t* cr, const TextOperation& text);
+  void Draw(cairo_t* cr, const ImageOperation& operation);
+
+  std::map<std::string, Pixbuf> images_;  // null for a file that does not decode
+};
+
+}  // namespace panelglow::platform::desktop
