@@ -64,6 +64,13 @@ inline constexpr std::uint32_t kHotKey = 0x0312;
 inline constexpr std::uint32_t kAppCommand = 0x0319;
 }  // namespace message
 
+/// What happened to a device, in the `wParam` of kDeviceChange.
+namespace device_event {
+inline constexpr std::uint32_t kNodesChanged = 0x0007;
+inline constexpr std::uint32_t kArrival = 0x8000;
+inline constexpr std::uint32_t kRemoveComplete = 0x8004;
+}  // namespace device_event
+
 /// Window style bits.
 namespace style {
 inline constexpr std::uint32_t kPopup = 0x80000000;

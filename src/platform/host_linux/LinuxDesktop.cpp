@@ -12,6 +12,7 @@
 #include <utility>
 
 #include "platform/host_linux/CurrentThread.h"
+#include "platform/host_linux/DeviceEvents.h"
 #include "platform/posix/ModuleLoader.h"
 
 namespace panelglow::platform::host_linux {
@@ -88,9 +89,11 @@ void LinuxDesktop::Inject(const desktop::ScreenEvent& event) {
 }
 
 void LinuxDesktop::RunScreen() {
+  DeviceEvents devices;
   std::uint64_t shown = 0;
   while (screen_->IsAlive()) {
-    std::array<pollfd, 2> watched{{{screen_->Descriptor(), POLLIN, 0}, {changed_, POLLIN, 0}}};
+    std::array<pollfd, 3> watched{
+        {{screen_->Descriptor(), POLLIN, 0}, {changed_, POLLIN, 0}, {devices.Descriptor(), POLLIN, 0}}};
     ::poll(watched.data(), watched.size(), -1);
     std::uint64_t count = 0;
     if (watched[1].revents != 0 && ::read(changed_, &count, sizeof count) < 0) {
@@ -103,6 +106,9 @@ void LinuxDesktop::RunScreen() {
       const LinuxWindowHost::Guard guard(host_);
       for (const desktop::ScreenEvent& event : events) {
         Inject(event);
+      }
+      for (const std::uint32_t event : devices.Take()) {
+        windows_->Broadcast(message::kDeviceChange, event);
       }
       isNew = std::exchange(shown, windows_->Revision()) != windows_->Revision();
       if (isNew) {

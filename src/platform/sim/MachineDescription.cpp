@@ -39,6 +39,10 @@ class Section {
     return *value;
   }
 
+  [[noreturn]] void Refuse(std::string_view key, const std::string& rule) {
+    Fail(*Node(key), "\"" + path_ + std::string(key) + "\" " + rule);
+  }
+
   // A number that has to be there.
   template <class T>
   T Number(std::string_view key) {
@@ -218,6 +222,12 @@ void ReadEvent(Section& section, MachineDescription& machine) {
   } else if (!remove.empty()) {
     event.kind = ScriptedEvent::Kind::kDeleteFile;
     event.path = remove;
+  } else if (const std::string device = section.Get<std::string>("device", ""); !device.empty()) {
+    event.kind = ScriptedEvent::Kind::kDevice;
+    event.arrives = device == "arrives";
+    if (!event.arrives && device != "leaves") {
+      section.Refuse("device", "must be \"arrives\" or \"leaves\"");
+    }
   } else if (section.Get("fill_disk", false)) {
     event.kind = ScriptedEvent::Kind::kFillDisk;
   } else {

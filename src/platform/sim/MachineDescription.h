@@ -70,12 +70,13 @@ struct FirmwareDescription {
 
 /// Something that happens at a moment of the run.
 struct ScriptedEvent {
-  enum class Kind { kWriteFile, kDeleteFile, kConsole, kFillDisk };
+  enum class Kind { kWriteFile, kDeleteFile, kConsole, kFillDisk, kDevice };
   Microseconds at = 0;
   Kind kind = Kind::kConsole;
   std::string path;
   std::string content;
   std::uint32_t console = 0;
+  bool arrives = false;  // of a device event; otherwise it is removed
 };
 
 /// Another process of the machine that holds a named mutex for a while. Whether it then releases the mutex or is

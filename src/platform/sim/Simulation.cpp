@@ -364,6 +364,11 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
         case ScriptedEvent::Kind::kFillDisk:
           parts_->files.FillDisk();
           break;
+        case ScriptedEvent::Kind::kDevice:
+          parts_->windows.Broadcast(message::kDeviceChange, device_event::kNodesChanged);
+          parts_->windows.Broadcast(message::kDeviceChange,
+                                    event.arrives ? device_event::kArrival : device_event::kRemoveComplete);
+          break;
         case ScriptedEvent::Kind::kConsole:
           RaiseConsole(event.console);
           break;
