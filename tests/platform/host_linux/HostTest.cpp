@@ -6,7 +6,6 @@
 
 #include "platform/Host.h"
 #include "platform/host_linux/ChildProcess.h"
-#include "platform/host_linux/NoDesktop.h"
 
 namespace panelglow::platform {
 namespace {
@@ -34,19 +33,6 @@ TEST(HostTest, AStartThatWaitsForNothingMakesNoThreadAndOpensNothing) {
     return EntriesOf("/proc/self/task") - threads + 10 * (EntriesOf("/proc/self/fd") - descriptors);
   });
   EXPECT_EQ(child.Wait(), 0);
-}
-
-TEST(HostTest, WithoutADisplayWindowsFailWithOneLineAndNoLoopWaits) {
-  host_linux::NoDesktop desktop;
-  testing::internal::CaptureStderr();
-  EXPECT_TRUE(desktop.RegisterWindowClass({"class", 0, 0, 0, nullptr}));
-  for (int i = 0; i < 2; ++i) {
-    EXPECT_EQ(desktop.CreateWindow({"class", {}, 0, 0, 0, 0, 0, 0, 0, 0}), 0U);
-  }
-  EXPECT_EQ(testing::internal::GetCapturedStderr(), "no display: windows are not available on this system yet\n");
-  Message message;
-  EXPECT_FALSE(desktop.GetMessage(message));
-  EXPECT_NE(desktop.BeginPaint(0), nullptr);
 }
 
 TEST(HostTest, SleepTakesAtLeastItsTimeByTheTickCounter) {
