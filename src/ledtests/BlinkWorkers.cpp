@@ -57,13 +57,19 @@ class PutBack {
   std::function<void()> action_;
 };
 
-// The common loop: at most 50 cycles of an on phase and an off phase, while the entry's `running` is set.
+// The common loop: at most 50 cycles of an on phase and an off phase, while the entry's `running` is set. A worker
+// that is told to end in an on phase still switches off: not every LED is saved and restored.
 void BlinkLoop(const LEDStruct& entry, std::uint32_t phase_ms, const std::function<void()>& switchOn,
                const std::function<void()>& switchOff) {
   for (int cycle = 0; cycle < kMostCycles && entry.running; ++cycle) {
-    switchOn();
-    Sleep(phase_ms);
-    switchOff();
+    try {
+      switchOn();
+      Sleep(phase_ms);
+      switchOff();
+    } catch (const platform::ThreadTerminated&) {
+      switchOff();  // undisturbed now
+      throw;
+    }
     Sleep(phase_ms);
   }
 }
@@ -85,36 +91,42 @@ constexpr LockKey kNumLockKey{144, 69};
 constexpr LockKey kCapsLockKey{20, 58};
 constexpr LockKey kScrollLockKey{145, 70};
 
-void Toggle(const LockKey& key) {
+// A press and its release. `toggled`: the key's LED is not as it was found; it changes with the press. A key that is
+// pressed is released in any case.
+void Toggle(const LockKey& key, bool& toggled) {
   using platform::Keyboard;
   Keyboard& keyboard = platform::TheHost().keyboard;
+  const auto release = [&] {
+    keyboard.Event(key.virtualKey, key.scanCode, Keyboard::kExtendedKey | Keyboard::kKeyUp);
+  };
   keyboard.Event(key.virtualKey, key.scanCode, Keyboard::kExtendedKey);
-  keyboard.Event(key.virtualKey, key.scanCode, Keyboard::kExtendedKey | Keyboard::kKeyUp);
+  toggled = !toggled;
+  try {
+    release();
+  } catch (const platform::ThreadTerminated&) {
+    release();  // undisturbed now
+    throw;
+  }
 }
 
-void CustomToggleNumLock() { Toggle(kNumLockKey); }
-void CustomToggleCapsLock() { Toggle(kCapsLockKey); }
-void CustomToggleScrollLock() { Toggle(kScrollLockKey); }
+void CustomToggleNumLock(bool& toggled) { Toggle(kNumLockKey, toggled); }
+void CustomToggleCapsLock(bool& toggled) { Toggle(kCapsLockKey, toggled); }
+void CustomToggleScrollLock(bool& toggled) { Toggle(kScrollLockKey, toggled); }
 
-void BlinkLockKey(std::int32_t deviceId, void (*toggle)()) {
+void BlinkLockKey(std::int32_t deviceId, void (*toggle)(bool& toggled)) {
   LEDStruct* entry = TheTest().FindDevice(deviceId);
   if (entry == nullptr) {
     return;
   }
   entry->workerStarted = true;
   bool toggled = false;
-  const auto change = [&] {
-    toggle();
-    toggled = !toggled;
+  const auto putBack = [&] {
+    if (toggled) {
+      toggle(toggled);
+    }
   };
-  {
-    const PutBack restore([&] {
-      if (toggled) {
-        change();
-      }
-    });
-    BlinkLoop(*entry, kLockKeyPhase_ms, change, change);
-  }
+  BlinkLoop(
+      *entry, kLockKeyPhase_ms, [&] { toggle(toggled); }, putBack);
   entry->workerFinished = true;
 }
 
@@ -190,7 +202,7 @@ void BlinkPowerLed(const BoardLed& led, BlinkWorker legacy) {
     board = MotherBoard::Instance(TheTest().iniFile);
   }
   if (!board || board->IsPanelLedLegacy()) {
-    board.reset();
+    board.reset();  // not needed further: others need not wait for it
     legacy();
     return;
   }

@@ -206,6 +206,7 @@ void CustomLEDTest::RunAttempt(bool& passed) {
 bool CustomLEDTest::RunSuperLEDTest() {
   platform::Threads& threads = platform::TheHost().threads;
   timerCounting = false;
+  testStarted = false;
   const platform::ThreadHandle dialog = threads.Start("dialog", [this] { SuperDialog(*this).CreateSuperDialog(); });
   if (dialog == 0) {
     LogMessage(LogOptions::ServiceErrors, 12, "");
@@ -230,8 +231,9 @@ bool CustomLEDTest::FinishFailed() {
   ReportFailure(testResult == kTimedOut ? CDMUtil::ToString(kTimedOut) : failureCode);
   details.status = kStatusFailed;
   WriteLog();
+  // Without a dialog no LED has had its turn, and none is to blame.
   const std::string& code = devices[static_cast<std::size_t>(currentIndex)].errorCode;
-  if (!code.empty()) {
+  if (testStarted && !code.empty()) {
     throw new CDMException(CDMUtil::ToInt(code));  // owned by whoever catches it
   }
   return false;

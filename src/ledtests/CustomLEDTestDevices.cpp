@@ -61,7 +61,7 @@ bool IsSupported(MotherBoard* board, SupportQuestion question) {
 
 void CustomLEDTest::AddDevice(std::int32_t deviceId, std::uint8_t address, const std::string& controllerId) {
   if (deviceCount == static_cast<std::int32_t>(kDeviceSlots)) {
-    return;
+    return;  // the array is full: what does not fit is left out
   }
   const bool isDrive = deviceId >= kFirstHdGreen;
   const auto kind = std::find_if(LedKinds().begin(), LedKinds().end(), [&](const LedKind& row) {
@@ -171,10 +171,13 @@ void CustomLEDTest::WaitForThreadToFinish(std::int32_t deviceId) {
     log("WFTTF Sleeping: DeviceID - ");
   }
   clock.Sleep(kAfterwards_ms);
-  if (entry.workerFinished) {
-    platform::TheHost().threads.Close(workerThread);
+  // A worker that overruns its wait keeps its handle, so that the end of the dialog can end it. The thread is asked
+  // and not the flag: a repeated entry's flag is set from its first turn on.
+  platform::Threads& threads = platform::TheHost().threads;
+  if (threads.Wait(workerThread, 0)) {
+    threads.Close(workerThread);
     workerThread = 0;
-  }  // a worker that overruns its wait keeps its handle, so that the end of the dialog can end it
+  }
 }
 
 }  // namespace panelglow

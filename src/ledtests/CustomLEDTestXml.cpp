@@ -109,6 +109,7 @@ bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::stri
     const std::unique_ptr<platform::XmlDocument> document = LoadXMLForValidation(inputXml);
     document->SetRootAttribute("xmlns:xsi", kSchemaInstance);
     document->SetRootAttribute("xsi:noNamespaceSchemaLocation", inputXsd);
+    // Without a new copy there is nothing to check; one from an earlier run is not to be taken for it.
     if (!platform::TheHost().files.Write(workFile, document->Text())) {
       throw platform::XmlComponentError("The work file " + workFile + " cannot be written.");
     }

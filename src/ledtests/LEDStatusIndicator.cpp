@@ -62,7 +62,7 @@ bool LEDStatusIndicator::Run() {
   if (blinkType.find("RedPower") != std::string::npos) {
     assertLed = &MotherBoard::AssertPowerLedRed;
   }
-  const std::unique_ptr<MotherBoard> board = MotherBoard::Instantiate(
+  std::unique_ptr<MotherBoard> board = MotherBoard::Instantiate(
       GetArgument("-INIFile", ""), GetArgument("-TestIni", ""), GetArgument("-ChipIni", ""), "platform", "");
   if (!board) {
     auto failure = std::make_unique<CDMException>(kNoBoard);
@@ -85,6 +85,7 @@ bool LEDStatusIndicator::Run() {
       clock.Sleep(blinkSpeed_ms);
     }
   }
+  board.reset();
   UpdatePercentage(100);
   return true;
 }

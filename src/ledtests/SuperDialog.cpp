@@ -105,7 +105,7 @@ void SuperDialog::CreateSuperDialog() {
   CDMout::UpdatePercentage(50);
   BeginTest(window_);
   RunLoop();
-  platform::TheHost().threads.Terminate(test_.workerThread);
+  EndWorkers();
   desktop_.UnregisterWindowClass(kClassName);
   CDMout::UpdatePercentage(80);
 }
@@ -280,6 +280,10 @@ std::intptr_t SuperDialog::CustomLEDDlgProc(const platform::Message& received) {
       return 1;
     case message::kCommand:
       return OnCommand(received);
+    case message::kClose:
+      // Closed by other means than its buttons: the LEDs that are left have not been answered, so this is no pass.
+      SendCommand(received.window, kCancelCommand);
+      return 0;
     default:
       break;
   }
@@ -287,6 +291,7 @@ std::intptr_t SuperDialog::CustomLEDDlgProc(const platform::Message& received) {
 }
 
 void SuperDialog::OnCreate(const platform::Message& received) {
+  window_ = received.window;
   CDMWindow::LockPrompt();
   desktop_.SetExtraWord(received.window, 0, received.lParam);
   test_.secondsTimer = desktop_.SetTimer(received.window, kSecondsTimer, kSecond_ms, nullptr);
@@ -372,12 +377,26 @@ void SuperDialog::StartWorker(const LedKind& kind) {
                        "This version cannot blink the LED of the function " + std::string(kind.function) + ".");
     return;
   }
+  if (test_.workerThread != 0) {
+    overrunning_.push_back(test_.workerThread);
+  }
   test_.workerThread =
       platform::TheHost().threads.Start("worker " + std::string(kind.function), [worker] { RunBlinkWorker(worker); });
   if (IsLockKey(kind.deviceId)) {
     TheClock().Sleep(kAfterLockKey_ms);
   }
   CDMout::LogMessage(LogOptions::Status, kFreeText, std::string(kind.logName) + " Thread Exited.\n");
+}
+
+// A worker that has not ended by now is ended: the device array is about to be filled anew.
+void SuperDialog::EndWorkers() {
+  platform::Threads& threads = platform::TheHost().threads;
+  overrunning_.push_back(std::exchange(test_.workerThread, 0));
+  for (const platform::ThreadHandle worker : overrunning_) {
+    threads.Terminate(worker);
+    threads.Close(worker);
+  }
+  overrunning_.clear();
 }
 
 // ---- answers

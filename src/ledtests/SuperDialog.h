@@ -8,6 +8,7 @@
 
 #include "ledtests/ButtonDefStruct.h"
 #include "platform/Desktop.h"
+#include "platform/Threads.h"
 
 namespace panelglow {
 
@@ -45,6 +46,7 @@ class SuperDialog {
   void OnPaint(platform::WindowHandle window);
   void KeepFocusInside(platform::WindowHandle window);
   void StartWorker(const LedKind& kind);
+  void EndWorkers();
   std::intptr_t Answer(platform::WindowHandle window, std::int32_t deviceId);
   std::intptr_t AnswerDrive(platform::WindowHandle window);
   std::intptr_t WrongAnswer(platform::WindowHandle window);
@@ -56,6 +58,7 @@ class SuperDialog {
   CustomLEDTest& test_;
   platform::Desktop& desktop_;
   platform::WindowHandle window_ = 0;
+  std::vector<platform::ThreadHandle> overrunning_;  // workers that were still running when their successor began
 };
 
 }  // namespace panelglow

@@ -266,14 +266,16 @@ void PromptWindow::CreateButtons() {
   desktop_.SetFocus(defaultButton);
 }
 
-// Spreads the buttons over the window's lower edge with equal gaps; the arithmetic is unsigned.
+// Spreads the buttons over the window's lower edge with equal gaps. Where the row does not fit, by long captions in a
+// small window, the buttons share the edge without gaps: each stays within reach of the mouse.
 void PromptWindow::PlaceButtonRow() {
-  const auto count = static_cast<std::uint32_t>(buttons_.size());
-  const auto width = static_cast<std::uint32_t>(buttonWidth_);
-  const std::uint32_t gap = (static_cast<std::uint32_t>(clientWidth_) - count * width) / (count + 1);
-  for (std::uint32_t i = 0; i < count; ++i) {
-    const auto left = static_cast<int>(gap + i * (width + gap));
-    desktop_.MoveWindow(buttons_[i].window, left, clientHeight_ - kButtonHeight, buttonWidth_, kButtonHeight);
+  const auto count = static_cast<int>(buttons_.size());
+  const int width = std::min(buttonWidth_, clientWidth_ / count);
+  const int gap = (clientWidth_ - count * width) / (count + 1);
+  for (int i = 0; i < count; ++i) {
+    const int left = gap + i * (width + gap);
+    desktop_.MoveWindow(buttons_[static_cast<std::size_t>(i)].window, left, clientHeight_ - kButtonHeight, width,
+                        kButtonHeight);
   }
 }
 
@@ -363,6 +365,12 @@ void PromptWindow::RunLoop() {
   }
 }
 
+// Sets the result; 0 leaves the prompt open. The message loop looks at it when it has a message, so it gets one.
+void PromptWindow::End(int result) {
+  result_ = result;
+  desktop_.Post({window_, message::kChar, 0, 1});
+}
+
 // ---- the window's messages
 
 std::intptr_t PromptWindow::Handle(const platform::Message& received) {
@@ -397,10 +405,12 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
     case message::kCommand: {
       const auto id = static_cast<int>(received.wParam & 0xFFFFU);
       if (id > kFirstButtonId && id <= kFirstButtonId + prompt_result::kYes) {
-        result_ = id - kFirstButtonId;
+        End(id - kFirstButtonId);
       }
       break;
     }
+    case message::kClose:
+      return 0;  // a prompt asks for an answer, and closing is none; as with Escape, it stays
     case message::kTimer:
       OnTimer();
       break;
@@ -425,8 +435,8 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
 
 // The lock is taken while the window is being created: the call blocks while another prompt is open.
 void PromptWindow::OnCreate(WindowHandle created) {
-  CDMWindow::LockPrompt();
   window_ = created;
+  CDMWindow::LockPrompt();
   if (family_.configurable) {
     desktop_.SetTimer(created, kStopTimer, kStopPeriod_ms, nullptr);
   } else if (topmost_) {
@@ -470,7 +480,7 @@ void PromptWindow::OnSize(const platform::Message& received) {
 void PromptWindow::OnTimer() {
   if (family_.configurable) {
     if (CDMWindow::IsStopRequested()) {
-      result_ = prompt_result::kTerminated;
+      End(prompt_result::kTerminated);
       return;
     }
     desktop_.SetTimer(window_, kStopTimer, kStopPeriod_ms, nullptr);
@@ -494,14 +504,18 @@ void PromptWindow::CheckWorker() {
     return;
   }
   if (state.workerDone) {
-    result_ = request_.autoResult;
+    End(request_.autoResult);
     return;
   }
   state.workerRunning = true;
-  platform::TheHost().threads.Start("prompt worker", [worker = request_.autoWorker, &state] {
-    worker(state.workerDone);
-    state.workerRunning = false;
-  });
+  const platform::ThreadHandle thread =
+      platform::TheHost().threads.Start("prompt worker", [worker = request_.autoWorker, &state] {
+        worker(state.workerDone);
+        state.workerRunning = false;
+      });
+  if (thread == 0) {
+    state.workerRunning = false;  // tried again at the next tick
+  }
 }
 
 // Takes the foreground back, but not from a window with the same title: prompts of sister processes do not fight.
@@ -527,7 +541,7 @@ void PromptWindow::CountDown() {
   }
   ++elapsedTicks_;
   if (elapsedTicks_ > timeoutTicks_) {
-    result_ = ThePromptState().timeoutResult;
+    End(ThePromptState().timeoutResult);
     timeoutTicks_ = 0;
   }
   if (elapsedTicks_ % kTicksPerSecond == 0) {

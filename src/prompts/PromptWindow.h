@@ -60,6 +60,7 @@ class PromptWindow {
   void CreateTextField();
   void CreateImageArea();
   void RunLoop();
+  void End(int result);
   std::intptr_t Handle(const platform::Message& message);
   void OnCreate(platform::WindowHandle created);
   void OnSize(const platform::Message& message);

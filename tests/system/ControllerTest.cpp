@@ -58,7 +58,7 @@ TEST(SystemController, RawPassesTheProgramsLinesThroughUnchanged) {
 TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
   const Installation installation;
   const Outcome outcome =
-      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--fault", "caps-lock=dead",
+      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--fault", "power-green=dead",
                                 "--trace", "trace.txt", "--screenshots", "pictures", "--", "-subtest=CustomLEDTest",
                                 "-Retries=0", "-SectionID=Desktop"});
   EXPECT_THAT(outcome.output, HasSubstr("  50 %\n"));

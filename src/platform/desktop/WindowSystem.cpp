@@ -226,7 +226,6 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
   }
   window.style = request.style;
   window.topmost = (request.extendedStyle & style::kExTopmost) != 0;
-  window.visible = (request.style & style::kVisible) != 0;
   window.enabled = (request.style & style::kDisabled) == 0;
   window.area = PlaceOf(request.x, request.y, request.width, request.height);
   window.parent = request.parent;
@@ -241,12 +240,17 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
     Raise(handle, window.topmost ? ZOrder::kTopmost : ZOrder::kTop);
   }
   QueueOf(host_.CurrentThread());
+  const bool visible = (request.style & style::kVisible) != 0;
   if (kind == WindowKind::kPlain) {
     if (Call({handle, message::kCreate, 0, request.creationParameter}) == -1 || Find(handle) == nullptr) {
       DestroyWindow(handle);
       return 0;
     }
     SendSize(handle);
+  }
+  // Not before: a window whose creation waits for something is not there for anybody yet.
+  if (visible) {
+    ShowWindow(handle, true);
   }
   Invalidate(handle);
   if (request.parent == 0 && IsWindowVisible(handle)) {

@@ -1,0 +1,155 @@
+// The blink workers by what they do to the panel and to the registers.
+#include <gmock/gmock.h>
+
+#include <set>
+
+#include "ledtests/Bench.h"
+
+namespace panelglow::ledtest {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+enum class Board { kKnown, kLegacy, kUnknown };
+
+void Use(Board board, Bench& bench) {
+  if (board == Board::kLegacy) {
+    bench.AddBoardSetting("test.panelglow.uselegacy=yes");
+  } else if (board == Board::kUnknown) {
+    bench.UseUnknownBoard();
+  }
+}
+
+TEST(BlinkWorkers, LeftAloneBlinkFiftyTimesAndLeaveThePanelAsFound) {
+  struct Case {
+    const char* function;
+    Board board;
+    const char* led;
+    int blinks;
+    unsigned total_s;
+  };
+  for (const Case& c :
+       {Case{"noled", Board::kKnown, "", 0, 50}, Case{"numlock", Board::kKnown, "num", 50, 20},
+        Case{"capslock", Board::kKnown, "caps", 50, 20}, Case{"scrolllock", Board::kKnown, "scroll", 50, 20},
+        Case{"touchpadlock", Board::kKnown, "touchpad", 50, 50},
+        Case{"powergreen", Board::kKnown, "green", 50, 54},  // with the chip's own waits
+        Case{"powerred", Board::kKnown, "red", 50, 54}, Case{"hdred", Board::kKnown, "drive", 50, 53},
+        Case{"chargegreen", Board::kKnown, "white", 50, 50}, Case{"chargered", Board::kKnown, "amber", 50, 50},
+        Case{"speakermute", Board::kKnown, "", 0, 50},  // no chip here has this LED
+        Case{"powergreen", Board::kUnknown, "old-green", 50, 50}, Case{"powerred", Board::kLegacy, "old-red", 50, 50},
+        Case{"hdred", Board::kUnknown, "old-drive", 50, 150}}) {
+    SCOPED_TRACE(c.function + std::string(" on ") + c.led);
+    Bench bench;
+    Use(c.board, bench);
+    const std::string found = bench.Lit();
+    bench.Prepare({c.function});
+    const unsigned begin_ms = bench.Now_ms();
+    bench.RunWorker(c.function);
+    EXPECT_NEAR((bench.Now_ms() - begin_ms) / 1000.0, c.total_s, 1);
+    EXPECT_EQ(bench.TimesLit(c.led), c.blinks);
+    EXPECT_EQ(bench.Lit(), found);
+    const LEDStruct& entry = bench.Entry(c.function);
+    EXPECT_TRUE(entry.workerStarted && entry.workerFinished && entry.running);
+  }
+}
+
+TEST(BlinkWorkers, WriteTheirRegistersInThisOrder) {
+  struct Case {
+    const char* function;
+    Board board;
+    bool running;  // false: the turn is over before the worker begins; true: over in the first on phase
+    const char* writes;
+  };
+  for (const Case& c :
+       {Case{"powergreen", Board::kUnknown, true,
+             "0433 <- 00, 0434 <- 00, 044D <- 02, 044D <- 00, 0433 <- 04, 0434 <- 04"},
+        Case{"powerred", Board::kLegacy, true,
+             "0433 <- 00, 0434 <- 00, 044D <- 01, 044D <- 00, 0433 <- 04, 0434 <- 04"},
+        Case{"hdred", Board::kUnknown, true,
+             "0433 <- 00, 0434 <- 00, FA0E <- 00, 044D <- 01, FA0E <- 80, FA0E <- 00, 0433 <- 04, 0434 <- 04"},
+        Case{"hdred", Board::kUnknown, false,
+             "0433 <- 00, 0434 <- 00, FA0E <- 00, 044D <- 01, 0433 <- 04, 0434 <- 04"},
+        Case{"hdred", Board::kKnown, false, "0A28 <- 00"},
+        Case{"chargered", Board::kKnown, false, "FE5C0408 <- 01, FE5C040C <- 01"},
+        Case{"chargered", Board::kKnown, true, "FE5C0408 <- 01, FE5C040C <- 01, FE5C040C <- 41, FE5C040C <- 01"}}) {
+    SCOPED_TRACE(c.writes);
+    Bench bench;
+    Use(c.board, bench);
+    bench.Prepare({c.function});
+    bench.After(200, [&] { bench.Entry(c.function).running = false; });
+    bench.RunWorker(c.function, c.running);
+    EXPECT_EQ(bench.Writes(), c.writes);
+    EXPECT_TRUE(bench.Entry(c.function).workerFinished);
+  }
+}
+
+TEST(BlinkWorkers, ThreeModelsHaveTheirLegacyRegistersElsewhere) {
+  for (const int systemId : {0x0AC8, 0x3029, 0x3047, 0x7D10}) {
+    Bench bench;
+    LegacyPanelPorts ports(g_objDriverObjectCustom, static_cast<std::uint16_t>(systemId));
+    bench.sim.Trace().Clear();
+    ports.CustomSetGreenPwrLedGpioMode();
+    ports.CustomSetRedPwrLedNativeMode();
+    ports.CustomAssertGreenPwrLed();
+    EXPECT_EQ(bench.Writes(),
+              systemId == 0x7D10 ? "0433 <- 00, 0434 <- 04, 044D <- 02" : "0833 <- FB, 0834 <- FF, 084D <- FE");
+  }
+}
+
+// Ended between any two steps of its first cycle, by a dialog that does not wait any longer.
+TEST(BlinkWorkers, EndedAtAnyMomentLeaveThePanelAsFoundAndNoLockBehind) {
+  struct Case {
+    const char* function;
+    Board board;
+  };
+  for (const Case& c :
+       {Case{"numlock", Board::kKnown}, Case{"touchpadlock", Board::kKnown}, Case{"powergreen", Board::kKnown},
+        Case{"powerred", Board::kKnown}, Case{"hdred", Board::kKnown}, Case{"chargegreen", Board::kKnown},
+        Case{"chargered", Board::kKnown}, Case{"powergreen", Board::kUnknown}, Case{"hdred", Board::kUnknown}}) {
+    Bench bench;
+    Use(c.board, bench);
+    bench.Prepare({c.function});
+    const std::string found = bench.Lit();
+    // A whole turn of one cycle tells when something happens.
+    const sim::Microseconds begin = bench.sim.Time().Now();
+    bench.After(150, [&] { bench.Entry(c.function).running = false; });
+    bench.RunWorker(c.function);
+    std::set<sim::Microseconds> moments;
+    const auto add = [&](sim::Microseconds time) {
+      if (time > begin) {
+        moments.insert({time - begin - 1, time - begin, time - begin + 1, time - begin + 100});
+      }
+    };
+    for (const sim::DriverRequest& request : bench.sim.Trace().Requests()) {
+      add(request.time);
+    }
+    for (const sim::LedChange& change : bench.sim.Panel().TimeLine()) {
+      add(change.time);
+    }
+    ASSERT_GE(moments.size(), 8U) << c.function;
+    for (const sim::Microseconds moment : moments) {
+      const platform::ThreadHandle worker = bench.StartWorker(c.function);
+      bench.sim.Time().SleepFor(moment);
+      platform::TheHost().threads.Terminate(worker);
+      ASSERT_EQ(bench.Lit(), found) << c.function << " ended after " << moment << " us";
+      ASSERT_THAT(bench.sim.HardwareState(), Not(HasSubstr("held down"))) << moment;
+      ASSERT_FALSE(bench.sim.IsMutexOwned("_HalcyonMotherBoardLib")) << moment;
+    }
+  }
+}
+
+TEST(BlinkWorkers, WithoutTheirHardwareDoNothingAndDoNotCountAsStarted) {
+  for (const char* function : {"chargegreen", "speakermute", "microphone", "touchpadlock"}) {
+    Bench bench("touchpad = false\n");
+    bench.UseUnknownBoard();
+    bench.Prepare({function});
+    bench.RunWorker(function);
+    EXPECT_EQ(bench.Writes(), "") << function;
+    EXPECT_FALSE(bench.Entry(function).workerStarted) << function;
+    EXPECT_EQ(bench.Entry(function).workerFinished, std::string(function) == "touchpadlock");
+  }
+}
+
+}  // namespace
+}  // namespace panelglow::ledtest

@@ -1,0 +1,117 @@
+// Whole runs inside the process: how the button files are read, and which prompts are shown.
+#include <gmock/gmock.h>
+
+#include <fstream>
+
+#include "ledtests/Bench.h"
+
+namespace panelglow::ledtest {
+namespace {
+
+using ::testing::Contains;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+
+void Write(const std::string& file, const std::string& content) { std::ofstream(file, std::ios::binary) << content; }
+
+std::string Read(const std::string& file) {
+  std::ostringstream text;
+  text << std::ifstream(file, std::ios::binary).rdbuf();
+  return text.str();
+}
+
+TEST(ButtonFiles, MergeIntoTheListOfButtons) {
+  Bench bench("", "silent");
+  Write("ui.xml", R"(<?xml version="1.0"?>
+<UI>
+  <Section ID="Other"><Button ID="PowerRed"/></Section>
+  <Section ID="Bench">
+    <Button ID="NumLock" Active="false"/>
+    <Button ID="CAPSLOCK" Active="FALSE" ErrorCode="123456" MessageID="99" Caption="a note"/>
+    <Button ID="NoSuchButton"/>
+    <Button ID="HardDrive" ErrorCode="" Active="false">
+      <Config Controller="All" LEDOnTime="250" LEDOffTime="0" LEDBlinkTime="7" Connector="X1" DeviceDescription="D"/>
+    </Button>
+  </Section>
+</UI>)");
+  bench.RunProgram();
+  std::vector<std::string> merged;
+  for (const ButtonDefStruct& b : bench.test.buttons) {
+    merged.push_back(b.id + " " + b.function + " " + b.buttonIco + " " + b.buttonLParam + " " + b.errorCode + " " +
+                     b.messageId + " " + (b.active ? "active" : "shown") + " [" + b.caption + b.controller +
+                     b.connector + b.deviceDescription + std::to_string(b.ledOnTime) + " " +
+                     std::to_string(b.ledOffTime) + " " + std::to_string(b.ledBlinkTime) + "]");
+  }
+  EXPECT_THAT(merged, ElementsAre("NumLock numlock spr_num.ico 1003 771003 28 shown [0 0 0]",
+                                  "CAPSLOCK capslock spr_caps.ico 1006 123456 99 active [a note0 0 0]",
+                                  "HardDrive hdgreen spr_hdrv.ico 1013 771013 38 shown [AllX1D250 0 7]"));
+  EXPECT_EQ(bench.test.deviceCount, 1);
+}
+
+TEST(ButtonFiles, SetTheFunctionsTheCodesAndTheDriveSettings) {
+  Bench bench;
+  const auto add = [&](const char* function, const char* code, bool active, const char* controller, int on_ms) {
+    ButtonDefStruct& button = bench.test.buttons.emplace_back();
+    button.function = function;
+    button.errorCode = code;
+    button.active = active;
+    button.controller = controller;
+    button.ledOnTime = on_ms;
+  };
+  add("NumLock", "", true, "", 0);  // the first of its function gives the code, even an empty one
+  add("numlock", "771003", true, "", 0);
+  add("capslock", "771006", false, "", 0);
+  add("none", "771001", true, "", 0);
+  add("HDGreen", "771013", true, "Sata A,SAS b", 250);
+  bench.test.MapButtonFunctionsToTests();
+  EXPECT_THAT(bench.test.functions, ElementsAre("hdgreen", "numlock"));
+  EXPECT_EQ(bench.test.hdControllers, "sata a,sas b");
+  EXPECT_EQ(bench.test.GetErrorCodeFromButtonFunctions("numlock"), "");
+  EXPECT_EQ(bench.test.GetErrorCodeFromButtonFunctions("capslock"), "771006");
+  EXPECT_EQ(bench.test.GetErrorCodeFromButtonFunctions("webcam"), "770146");
+  add("hdgreen", "", true, "ANY", 0);  // a later one wins; a time of 0 leaves what is there
+  bench.test.MapButtonFunctionsToTests();
+  EXPECT_EQ(bench.test.hdControllers, "all");
+  EXPECT_EQ(bench.test.hdOnTime, 250);
+  EXPECT_EQ(bench.test.hdOffTime, 500);
+}
+
+TEST(ButtonFiles, WithMoreButtonsThanTheDialogHasPlacesAreRefused) {
+  Bench bench;
+  std::string schema = Read("ui.xsd");  // one of an integrator's own that does not count
+  Write("ui.xsd", schema.replace(schema.find("\"24\""), 4, "\"99\""));
+  std::string buttons;
+  std::string definitions;
+  for (int i = 0; i < 25; ++i) {
+    const std::string id = "ID=\"b" + std::to_string(i) + "\"";
+    buttons += "<Button " + id + "/>";
+    definitions += "<Button " + id + R"( Function="none" ButtonIco="no_led.ico" ButtonLParam="1001"/>)";
+  }
+  Write("ui.xml", R"(<UI><Section ID="Bench">)" + buttons + "</Section></UI>");
+  Write("buttondefinition.xml", "<ButtonDefinitions>" + definitions + "</ButtonDefinitions>");
+  const std::vector<std::string> lines = bench.RunProgram();
+  EXPECT_THAT(lines, Contains(HasSubstr("The section \"Bench\" in the file .\\ui.xml has 25 buttons")));
+  EXPECT_THAT(lines, Contains("TestFailed 990163 \"\""));
+}
+
+TEST(Run, ChoosesThePromptsFamilyAnewForEachPrompt) {
+  Bench bench("", "silent");
+  Write("ui.xml", R"(<UI><Section ID="Bench"><Button ID="NumLock"/></Section></UI>)");
+  bench.sim.DiskFiles().Put(".\\diagconf.ini", "[WindowSettings]\nBackgroundColor=255\n");
+  std::vector<platform::Color> colors;
+  const auto look = [&] {
+    const auto scene = bench.windows.MakeScene();
+    colors.push_back(scene.windows.empty() ? 0 : scene.windows[0].background);
+  };
+  bench.After(500, look);  // the begin prompt
+  bench.After(5000, [&] { bench.sim.DiskFiles().Hide("diagconf.ini"); });
+  bench.After(5000, look);    // the dialog
+  bench.After(13'000, look);  // the retry prompt
+  const std::vector<std::string> lines = bench.RunProgram();
+  EXPECT_THAT(colors, ElementsAre(255U, 0xC0C0C0U, platform::kButtonFaceColor));
+  EXPECT_THAT(lines, Contains("ReportFailure 770118"));
+  EXPECT_THAT(lines, Contains("TestFailed 771003 \"\""));
+}
+
+}  // namespace
+}  // namespace panelglow::ledtest
