@@ -1,10 +1,12 @@
 // One layered look-up of a board setting in a 300 KB file, beside libraries that load a file and look a key up.
-#include <SimpleIni.h>
 #include <benchmark/benchmark.h>
 #include <glib.h>
 
 #include <fstream>
 #include <string>
+
+#define SI_NO_CONVERSION  // narrow text only
+#include <SimpleIni.h>
 
 #include "board/base/IniReader.h"
 #include "platform/sim/Simulation.h"
@@ -21,7 +23,7 @@ std::string BoardFile() {
   std::string text;
   for (int board = 0; text.size() < 300'000; ++board) {
     const std::string id = board == 600 ? std::string(kSection) : "B" + std::to_string(board);
-    text += "[" + id + "]\n; a board\nplatform=generic\nchips=g_iospace, g_ec\n";
+    text += "[" + id + "]\n# a board\nplatform=generic\nchips=g_iospace, g_ec\n";
     for (int key = 0; key < 8; ++key) {
       text += "detect.key." + std::to_string(key) + "=0x" + std::to_string(key) + "A20:0x01\n";
     }

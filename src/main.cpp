@@ -15,6 +15,8 @@ constexpr const char* kVersion =
 
 }  // namespace
 
+// No guard stands around this: building the manager and the subtests throws nothing short of memory running out, and
+// what a run throws is caught by the manager.
 int main(int argc, char** argv) {
   using namespace panelglow;
   DiagnosticManager manager(argc, argv, kVersion, kName);

@@ -2,8 +2,22 @@
 
 #include <algorithm>
 
+#include "board/chips/CaslChip.h"
+#include "board/chips/EcChip.h"
+#include "board/chips/EcIt8512Chip.h"
+#include "board/chips/EcIt8518Chip.h"
+#include "board/chips/EcWpc8763Chip.h"
+#include "board/chips/GCodecChip.h"
+#include "board/chips/GEcChip.h"
+#include "board/chips/GEcIt8519Chip.h"
+#include "board/chips/GFintekChip.h"
 #include "board/chips/GIoSpaceChip.h"
+#include "board/chips/GIt8702Chip.h"
+#include "board/chips/GIteChip.h"
 #include "board/chips/GMemorySpaceChip.h"
+#include "board/chips/GSioChip.h"
+#include "board/chips/SmscKbc1126Chip.h"
+#include "board/chips/SmscMec1322Chip.h"
 
 namespace panelglow {
 
@@ -21,11 +35,11 @@ constexpr ChipRow kRows[] = {
     {2, "adt", nullptr},
     {3, "adt_sio11", nullptr},
     {4, "acpi", nullptr},
-    {5, "casl", nullptr},
-    {6, "ec", nullptr},
-    {7, "ec_wpc8763", nullptr},
-    {8, "ec_it8512", nullptr},
-    {9, "ec_it8518", nullptr},
+    {5, "casl", Make<CaslChip>},
+    {6, "ec", Make<EcChip>},
+    {7, "ec_wpc8763", Make<EcWpc8763Chip>},
+    {8, "ec_it8512", Make<EcIt8512Chip>},
+    {9, "ec_it8518", Make<EcIt8518Chip>},
     {10, "fin", nullptr},
     {11, "fin_f8000", nullptr},
     {12, "fin_f71858", nullptr},
@@ -55,18 +69,18 @@ constexpr ChipRow kRows[] = {
     {36, "vt1211", nullptr},
     {37, "nuv_npcd378h", nullptr},
     {38, "smsc_sch5327b", nullptr},
-    {39, "g_fintek", nullptr},
-    {39, "g_it8702", nullptr},
-    {39, "g_ite", nullptr},
-    {39, "g_sio", nullptr},
-    {40, "g_ec_it8519", nullptr},
-    {40, "g_ec", nullptr},
+    {39, "g_fintek", Make<GFintekChip>},
+    {39, "g_it8702", Make<GIt8702Chip>},
+    {39, "g_ite", Make<GIteChip>},
+    {39, "g_sio", Make<GSioChip>},
+    {40, "g_ec_it8519", Make<GEcIt8519Chip>},
+    {40, "g_ec", Make<GEcChip>},
     {41, "videochip", nullptr},
-    {42, "smsc_mec1322", nullptr},
-    {43, "smsc_kbc1126", nullptr},
+    {42, "smsc_mec1322", Make<SmscMec1322Chip>},
+    {43, "smsc_kbc1126", Make<SmscKbc1126Chip>},
     {44, "g_iospace", Make<GIoSpaceChip>},
     {45, "g_memoryspace", Make<GMemorySpaceChip>},
-    {46, "g_codec", nullptr},
+    {46, "g_codec", Make<GCodecChip>},
 };
 
 }  // namespace

@@ -24,14 +24,12 @@ constexpr const char* kNotFound = "was_not_found";
 constexpr const char* kUndef = "undef";
 
 // System ids whose boards are served by the older path unless the INI data names a class.
-constexpr std::array<std::string_view, 20> kOlderBoards{"A08",  "0A08", "A58",  "0A58", "AA8",  "0AA8", "A9C",
+constexpr std::array<std::string_view, 21> kOlderBoards{"A08",  "0A08", "A58",  "0A58", "AA8",  "0AA8", "A9C",
                                                         "0A9C", "A98",  "0A98", "2820", "3029", "A80",  "0A80",
-                                                        "AA0",  "0AA0", "A1C",  "0A1C", "2821", "AC8"};
-constexpr std::string_view kLastOlderBoard = "0AC8";
+                                                        "AA0",  "0AA0", "A1C",  "0A1C", "2821", "AC8",  "0AC8"};
 
 bool IsOlderBoard(std::string_view systemId) {
-  return systemId == kLastOlderBoard ||
-         std::find(kOlderBoards.begin(), kOlderBoards.end(), systemId) != kOlderBoards.end();
+  return std::find(kOlderBoards.begin(), kOlderBoards.end(), systemId) != kOlderBoards.end();
 }
 
 using BoardFactory = std::unique_ptr<MotherBoard> (*)(const std::string& systemId);
@@ -110,11 +108,14 @@ MotherBoard::MotherBoard(const std::string& systemIdText)
 void MotherBoard::BuildListedChips(const std::string& list) {
   std::vector<std::string> names;
   CDMUtil::Split(list, names, ", ");
-  for (const ChipRow& row : ChipRows()) {
-    std::unique_ptr<Chip>& chip = chips[row.place - 1];
-    const bool listed = std::find(names.begin(), names.end(), row.name) != names.end();
-    if (!chip && listed && row.make != nullptr) {
-      chip = row.make();
+  for (const bool genericFamilies : {false, true}) {  // these two come last
+    for (const ChipRow& row : ChipRows()) {
+      const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
+      const bool listed = std::find(names.begin(), names.end(), row.name) != names.end();
+      std::unique_ptr<Chip>& chip = chips[row.place - 1];
+      if (isGeneric == genericFamilies && listed && !chip && row.make != nullptr) {
+        chip = row.make();
+      }
     }
   }
   for (const std::size_t place : {kGenericSuperIoPlace, kGenericEcPlace}) {
@@ -133,7 +134,7 @@ void MotherBoard::InitializeGeneric(std::size_t place) {
   if (!chip) {
     return;
   }
-  const IniReader& reader = IniReader::Instance();
+  IniReader& reader = IniReader::Instance();
   if (!reader.IsChipIniPresent()) {
     throw mblib_exception("missing chipset settings file: " + reader.GetChipIniPath());
   }
@@ -142,12 +143,13 @@ void MotherBoard::InitializeGeneric(std::size_t place) {
 
 // Without a list every class is built in its place; of the generic families the plainest, without its second stage.
 void MotherBoard::BuildAllChips() {
-  for (const ChipRow& row : ChipRows()) {
-    if (row.place == kPlainChipPlace) {
-      continue;
+  const std::span<const ChipRow> rows = ChipRows();
+  for (auto row = rows.begin(); row != rows.end(); ++row) {
+    const auto next = row + 1;
+    const bool isPlainest = next == rows.end() || next->place != row->place;  // the last row of a place
+    if (row->place != kPlainChipPlace && isPlainest) {
+      chips[row->place - 1] = row->make != nullptr ? row->make() : std::make_unique<NoneChip>();
     }
-    std::unique_ptr<Chip> chip = row.make != nullptr ? row.make() : std::make_unique<NoneChip>();
-    chips[row.place - 1] = std::move(chip);  // the last row of a place is the plainest
   }
 }
 

@@ -125,7 +125,7 @@ class MotherBoard {
   void BuildAllChips();
   void InitializeGeneric(std::size_t place);
 
-  platform::NamedMutexLock lock;  // first member: given up last, and also when the construction fails
+  platform::NamedMutexLock lock;  // in front of the chips: given up behind them, also when the construction fails
   std::array<std::unique_ptr<Chip>, kChipPlaces> chips;
   std::uint16_t systemId;
   std::string className;

@@ -17,6 +17,7 @@ class CmdLineParser {
   /// The same with no arguments: the manager's call has to come first.
   static CmdLineParser& GetInstance();
 
+  /// Logs nothing: a log line asks the singleton, which would be the very object that is being built.
   CmdLineParser(int argc, const char* const* argv);
   virtual ~CmdLineParser() = default;
 

@@ -115,13 +115,15 @@ bool WriteLog(const std::string& path, const std::string& diagnosticName, const 
 
 }  // namespace
 
+// Of the file that will be written: its path without the blanks that a parameter may bring along.
 bool isXMLCorrupted(const std::string& path) {
-  if (!FileExists(path)) {
+  const std::string file = Trim(path);
+  if (!FileExists(file)) {
     return false;
   }
   const std::unique_ptr<platform::XmlDocument> document = platform::TheHost().xmlDocuments.Create();
   platform::XmlProblem problem;
-  if (document != nullptr && document->Load(path, problem)) {
+  if (document != nullptr && document->Load(file, problem)) {
     return false;
   }
   CDMout::LogMessage(LogOptions::Debug, kLogMessage,

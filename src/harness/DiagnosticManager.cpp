@@ -1,5 +1,7 @@
 #include "harness/DiagnosticManager.h"
 
+#include <array>
+#include <atomic>
 #include <cstdlib>
 #include <exception>
 #include <memory>
@@ -28,12 +30,11 @@ constexpr int kStandardException = 995205;
 
 constexpr unsigned int kNoSuchSubtestMessage = 20001;
 constexpr unsigned int kArgumentsRejectedMessage = 20002;
+constexpr unsigned int kUnknownParameterMessage = 20003;
 constexpr unsigned int kControlMessage = 1;
 
-int EndOfTest(int exitCode) {
-  CDMout::EndOfTest();
-  return exitCode;
-}
+// Set once the command line can be asked for.
+std::atomic<bool> isCommandLineRead{false};
 
 // The version's lines as one line for the log.
 std::string OnOneLine(std::string text) {
@@ -48,12 +49,16 @@ std::string OnOneLine(std::string text) {
 }  // namespace
 
 std::map<std::string, CDMDiag*> DiagnosticManager::subtests;
+std::mutex DiagnosticManager::subtestsGuard;
 
 DiagnosticManager::DiagnosticManager(int argc, const char* const* argv, const std::string& versionText,
                                      const std::string& diagnosticName)
     : version(versionText), name(diagnosticName) {
   platform::TheHost().console.SetControlHandler(HandleControl);
-  // What the leaves of the harness need of it, before anything is logged.
+  CmdLineParser::GetInstance(argc, argv);
+  isCommandLineRead = true;
+  // What the leaves of the harness need of it. A log line asks for the command line, so it must not do so before that
+  // is there: a line that is logged while it is being read is a plain one.
   CDMout::SetDebugQuery(
       [] { return CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter("-debug", "false"), "true"); });
   CDMout::SetMessageResolver(
@@ -64,20 +69,26 @@ DiagnosticManager::DiagnosticManager(int argc, const char* const* argv, const st
                           },
                           [] { return CmdLineParser::GetInstance().GetParameter("-locale", "en_US"); },
                           [] { return CDMDiag::ShouldTestBeTerminated() || CDMDiag::IsSignalReceived(); }});
-  CmdLineParser::GetInstance(argc, argv);
 }
 
-DiagnosticManager::~DiagnosticManager() { subtests.clear(); }
+// The handler goes first: an event that arrives while the process takes its static objects down finds nobody.
+DiagnosticManager::~DiagnosticManager() {
+  platform::TheHost().console.SetControlHandler(nullptr);
+  const std::lock_guard<std::mutex> lock(subtestsGuard);
+  subtests.clear();
+}
 
 void DiagnosticManager::RegisterSubtest(const std::string& subtestName, CDMDiag* test) {
   if (test == nullptr) {
     return;
   }
-  subtests[subtestName] = test;
   test->SetName(subtestName);
+  const std::lock_guard<std::mutex> lock(subtestsGuard);
+  subtests[subtestName] = test;
 }
 
 std::string DiagnosticManager::GetSubtestNames() {
+  const std::lock_guard<std::mutex> lock(subtestsGuard);
   std::string names;
   for (const auto& [subtestName, test] : subtests) {
     names += (names.empty() ? "" : " | ") + subtestName;
@@ -86,6 +97,7 @@ std::string DiagnosticManager::GetSubtestNames() {
 }
 
 CDMDiag* DiagnosticManager::FindSubtest(const std::string& subtestName) {
+  const std::lock_guard<std::mutex> lock(subtestsGuard);
   const auto found = subtests.find(subtestName);
   return found == subtests.end() ? nullptr : found->second;
 }
@@ -96,13 +108,18 @@ int DiagnosticManager::Run() {
 
 // Whatever is thrown leaves exactly one result line and one end of test.
 int DiagnosticManager::RunSubtest(CDMDiag* test) const {
+  int exitCode = kFailed;
   try {
-    return RunGuarded(test);
+    exitCode = RunGuarded(test);
   } catch (const CDMException& failure) {
     failure.Report();
   } catch (CDMException* failure) {
     const std::unique_ptr<CDMException> owned(failure);
-    owned->Report();
+    if (owned == nullptr) {
+      CDMout::TestFailed(kUnknownException);  // a thrown nullptr is caught by the first pointer
+    } else {
+      owned->Report();
+    }
   } catch (int code) {
     CDMout::TestFailed(code, "");
   } catch (const std::string& text) {
@@ -118,19 +135,20 @@ int DiagnosticManager::RunSubtest(CDMDiag* test) const {
   } catch (...) {
     CDMout::TestFailed(kUnknownException);
   }
-  return EndOfTest(kFailed);
+  CDMout::EndOfTest();
+  return exitCode;
 }
 
 int DiagnosticManager::RunGuarded(CDMDiag* test) const {
   if (test == nullptr) {
     CDMout::LogMessage(LogOptions::Invalid, kNoSuchSubtestMessage, GetSubtestNames());
     CDMout::TestFailed(kNoSuchSubtest);
-    return EndOfTest(kFailed);
+    return kFailed;
   }
-  if (!test->ValidateArguments()) {
+  if (!IsAccepted(*test)) {
     CDMout::LogMessage(LogOptions::Invalid, kArgumentsRejectedMessage, "");
     CDMout::TestFailed(kArgumentsRejected);
-    return EndOfTest(kFailed);
+    return kFailed;
   }
   const std::string programPath = CmdLineParser::GetInstance().GetProgramPath();
   if (!programPath.empty()) {
@@ -148,7 +166,23 @@ int DiagnosticManager::RunGuarded(CDMDiag* test) const {
     CDMout::LogMessage(LogOptions::Debug, kFreeText,
                        "Test execution time: " + CDMUtil::ToString(end - begin) + " milliseconds");
   }
-  return EndOfTest(passed ? kPassed : kFailed);
+  return passed ? kPassed : kFailed;
+}
+
+// The subtest's own check, and one more: who asks for information must not get a test of his hardware instead. Such
+// requests are not answered yet, and refused like a parameter that nobody knows.
+bool DiagnosticManager::IsAccepted(CDMDiag& test) {
+  constexpr std::array<const char*, 4> kRequests{"-catalog", "-description", "-help", "-version"};
+  if (!test.ValidateArguments()) {
+    return false;
+  }
+  for (const char* request : kRequests) {
+    if (CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter(request, ""), "true")) {
+      CDMout::LogMessage(LogOptions::Invalid, kUnknownParameterMessage, request);
+      return false;
+    }
+  }
+  return true;
 }
 
 // Runs on the system's control thread. A break never ends the process: the subtest has to notice it.
@@ -157,7 +191,8 @@ bool DiagnosticManager::HandleControl(std::uint32_t type) {
   if (!isBreak) {
     return true;
   }
-  if (FindSubtest(CmdLineParser::GetInstance().GetParameter("-subtest", "")) != nullptr) {
+  // Before the command line is read nobody knows what will run: the break is kept for it.
+  if (!isCommandLineRead || FindSubtest(CmdLineParser::GetInstance().GetParameter("-subtest", "")) != nullptr) {
     CDMDiag::AddSignal(type);
   } else {
     CDMout::LogMessage(LogOptions::Status, kControlMessage, "");

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <map>
+#include <mutex>
 #include <string>
 
 namespace panelglow {
@@ -16,7 +17,7 @@ class DiagnosticManager {
   DiagnosticManager(int argc, const char* const* argv, const std::string& versionText,
                     const std::string& diagnosticName);
 
-  /// Forgets the subtests; they live to the end of the process.
+  /// Takes the control handler back, and forgets the subtests; they live to the end of the process.
   virtual ~DiagnosticManager();
   DiagnosticManager(const DiagnosticManager&) = delete;
   DiagnosticManager& operator=(const DiagnosticManager&) = delete;
@@ -39,11 +40,13 @@ class DiagnosticManager {
  private:
   int RunSubtest(CDMDiag* test) const;
   int RunGuarded(CDMDiag* test) const;
+  static bool IsAccepted(CDMDiag& test);
   static bool HandleControl(std::uint32_t type);
 
   std::string version;
   std::string name;
   static std::map<std::string, CDMDiag*> subtests;
+  static std::mutex subtestsGuard;  // the control handler looks a subtest up on a thread of its own
 };
 
 }  // namespace panelglow

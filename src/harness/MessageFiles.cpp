@@ -46,14 +46,14 @@ MessageFiles::MessageFiles(const std::string& programPath, const std::string& in
 
 std::string MessageFiles::ResolveLogMessage(unsigned int id, const std::string& text) const {
   const std::string number = CDMUtil::ToString(id);
-  const std::string format = logTexts.GetValue(locale, number);
+  const std::string format = (*logTexts).GetValue(locale, number);
   return format.empty() ? number + " \"" + text + "\"" : FormatMessageText(format, text);
 }
 
 wstring MessageFiles::GetResourceString(int id, const wstring& text) const {
   const wstring key = WideIdOf(id);
-  for (const WIniFile* file : {&integratorTexts, &customTexts, &standardTexts}) {
-    const wstring format = file->GetValue(CDMUtil::ToWString(locale), key);
+  for (const WideTexts* file : {&integratorTexts, &customTexts, &standardTexts}) {
+    const wstring format = (**file).GetValue(CDMUtil::ToWString(locale), key);
     if (!format.empty()) {
       return FormatMessageText(format, text);
     }
@@ -76,15 +76,16 @@ wstring MessageFiles::GetResourceString(int id, const wstring& text, const wstri
                                         wstring& mediaPath) const {
   const wstring key = WideIdOf(id);
   wstring format;
-  for (const WIniFile* file : {&integratorTexts, &customTexts, &standardTexts}) {
-    if (!file->Exists()) {
+  for (const WideTexts* texts : {&integratorTexts, &customTexts, &standardTexts}) {
+    const WIniFile& file = **texts;
+    if (!file.Exists()) {
       continue;
     }
-    if (file == &integratorTexts || mediaPath.empty()) {
-      mediaPath = LookUpMedia(*file, key);
+    if (texts == &integratorTexts || mediaPath.empty()) {
+      mediaPath = LookUpMedia(file, key);
     }
     if (format.empty()) {
-      format = file->GetValue(CDMUtil::ToWString(locale), key);
+      format = file.GetValue(CDMUtil::ToWString(locale), key);
     }
     if (!format.empty() && !mediaPath.empty()) {
       break;

@@ -2,8 +2,10 @@
 // lie in the installation's message files, one section per locale; an integrator can put a file of his own in front.
 #pragma once
 
-#include <optional>
+#include <atomic>
+#include <memory>
 #include <string>
+#include <utility>
 
 #include "config/IniFile.h"
 #include "config/WIniFile.h"
@@ -11,9 +13,36 @@
 
 namespace panelglow {
 
+/// A file that is opened at its first use and kept, by whichever thread comes first. Opening may wait, so no lock is
+/// held meanwhile: where two threads open it at once, the second one's is dropped.
+template <class File, class Path>
+class OpenedAtFirstUse {
+ public:
+  explicit OpenedAtFirstUse(Path filePath) : path(std::move(filePath)) {}
+  ~OpenedAtFirstUse() { delete file.load(); }
+  OpenedAtFirstUse(const OpenedAtFirstUse&) = delete;
+  OpenedAtFirstUse& operator=(const OpenedAtFirstUse&) = delete;
+
+  const File& operator*() const {
+    const File* opened = file.load();
+    if (opened == nullptr) {
+      auto mine = std::make_unique<const File>(path);
+      if (file.compare_exchange_strong(opened, mine.get())) {
+        opened = mine.release();
+      }
+    }
+    return *opened;
+  }
+
+ private:
+  Path path;
+  mutable std::atomic<const File*> file{nullptr};
+};
+
 class MessageFiles {
  public:
-  /// The files of this process, each opened at its first use. Safe to reach from several threads at once.
+  /// The files of this process, each opened at its first use and kept to the end. Safe to reach from several threads
+  /// at once.
   static MessageFiles& Instance();
 
   /// `programPath` names the standard files, `integratorFile` may be empty.
@@ -34,11 +63,13 @@ class MessageFiles {
  private:
   [[nodiscard]] wstring LookUpMedia(const WIniFile& file, const wstring& key) const;
 
+  using WideTexts = OpenedAtFirstUse<WIniFile, wstring>;
+
   std::string locale;
-  IniFile logTexts;
-  WIniFile integratorTexts;
-  WIniFile customTexts;
-  WIniFile standardTexts;
+  OpenedAtFirstUse<IniFile, std::string> logTexts;
+  WideTexts integratorTexts;
+  WideTexts customTexts;
+  WideTexts standardTexts;
 };
 
 }  // namespace panelglow

@@ -37,6 +37,35 @@ class ManagementRow {
   std::map<wstring, ManagementValue> properties_;  // by lowered name
 };
 
+/// A call of a method of an object, with one object as parameter ("InData") and one as result ("OutData").
+struct ManagementCall {
+  wstring className;   // of the object
+  wstring objectPath;  // which object of the class, by its "__RELPATH"
+  wstring method;
+  wstring inputClass;  // class of the parameter object
+  ManagementRow input;
+};
+
+/// The steps of a call, in order; kNone: all succeeded.
+enum class ManagementCallStep {
+  kNone,
+  kGetMethod,
+  kGetClass,
+  kSpawnParameters,
+  kGetInputClass,
+  kSpawnInput,
+  kPopulateInput,
+  kPutInput,
+  kExecute,
+  kGetOutput,
+  kQueryOutput,
+};
+
+struct ManagementCallResult {
+  ManagementCallStep failedAt = ManagementCallStep::kNone;
+  ManagementRow output;
+};
+
 /// A connected namespace.
 class ManagementConnection {
  public:
@@ -44,6 +73,8 @@ class ManagementConnection {
 
   /// The rows of a query, in the service's order; nothing when the query failed.
   virtual std::optional<std::vector<ManagementRow>> Query(std::u16string_view query) = 0;
+
+  virtual ManagementCallResult Call(const ManagementCall& call) = 0;
 };
 
 /// The steps at which a connection can fail, in order.

@@ -1,6 +1,7 @@
 #include "board/base/IniReader.h"
 
 #include <set>
+#include <utility>
 
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -13,6 +14,8 @@ constexpr const char* kCommonSection = "Common";
 constexpr const char* kUndef = "undef";
 constexpr const char* kBaseKey = "base";
 
+// The system's section, then the common one. IniFile's fallback to "en_US" holds for both: a section of that name is
+// no section of a board, and no file has one.
 std::string ValueIn(const IniFile& file, const std::string& section, const std::string& key) {
   std::string value = file.GetValue(section, key);
   return value.empty() ? file.GetValue(kCommonSection, key) : value;
@@ -20,6 +23,7 @@ std::string ValueIn(const IniFile& file, const std::string& section, const std::
 
 }  // namespace
 
+// Making the reader touches no file: nothing that can wait may happen while a static object is being built.
 IniReader& IniReader::Instance() {
   static IniReader reader;
   return reader;
@@ -28,25 +32,32 @@ IniReader& IniReader::Instance() {
 IniReader& IniReader::Instance(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
                                const std::string& chipIni) {
   IniReader& reader = Instance();
-  reader.Configure(systemId, detectIni, testIni, chipIni);
+  Sources sources = WithPresence({detectIni, systemId, testIni, chipIni});
+  const std::lock_guard<std::mutex> lock(reader.guard);
+  reader.sources = std::move(sources);
   return reader;
 }
 
-IniReader::IniReader() : IniReader("common", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini") {}
-
 IniReader::IniReader(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
-                     const std::string& chipIni) {
-  Configure(systemId, detectIni, testIni, chipIni);
+                     const std::string& chipIni)
+    : sources(WithPresence({detectIni, systemId, testIni, chipIni})) {}
+
+IniReader::Sources IniReader::WithPresence(Sources from) {
+  from.testIniPresent = CDMUtil::FileExists(from.testIniPath);
+  from.chipIniPresent = CDMUtil::FileExists(from.chipIniPath);
+  return from;
 }
 
-void IniReader::Configure(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
-                          const std::string& chipIni) {
-  section = systemId;
-  detectIniPath = detectIni;
-  testIniPath = testIni;
-  chipIniPath = chipIni;
-  testIniPresent = CDMUtil::FileExists(testIniPath);
-  chipIniPresent = CDMUtil::FileExists(chipIniPath);
+IniReader::Sources IniReader::GetSources() {
+  {
+    const std::lock_guard<std::mutex> lock(guard);
+    if (sources) {
+      return *sources;
+    }
+  }
+  const Sources defaults = WithPresence({});
+  const std::lock_guard<std::mutex> lock(guard);
+  return sources ? *sources : sources.emplace(defaults);
 }
 
 IniReader::Result IniReader::Judge(const std::string& raw) {
@@ -59,47 +70,63 @@ IniReader::Result IniReader::Judge(const std::string& raw) {
 
 // File order comes before section order: a value in the test file's common section wins over one in the detection
 // file's system section.
-IniReader::Result IniReader::LookUp(const std::string& key) const {
+IniReader::Result IniReader::LookUp(const Sources& from, const std::string& key) {
   std::string value;
-  if (testIniPresent) {
-    value = ValueIn(IniFile(testIniPath), section, key);
+  if (from.testIniPresent) {
+    value = ValueIn(IniFile(from.testIniPath), from.section, key);
   }
-  return Judge(value.empty() ? ValueIn(IniFile(detectIniPath), section, key) : value);
+  return Judge(value.empty() ? ValueIn(IniFile(from.detectIniPath), from.section, key) : value);
 }
 
 IniReader::Result IniReader::LookUpChip(const std::string& chipSection, const std::string& key) {
-  const Result layered = LookUp("chip." + chipSection + "." + key);
-  if (layered.status != kNotFound || !chipIniPresent) {
+  const Sources from = GetSources();
+  const Result layered = LookUp(from, "chip." + chipSection + "." + key);
+  if (layered.status != kNotFound || !from.chipIniPresent) {
     return layered;
   }
-  if (!chipFile) {
-    chipFile.emplace(chipIniPath);
-  }
+  const IniFile file = GetChipFile(from.chipIniPath);
   std::set<std::string> visited;
   std::string at = chipSection;
   // A chain that comes back to a section it has been in would never end: it ends there without a value.
   while (!at.empty() && visited.insert(CDMUtil::ToLower(at)).second) {
-    const std::string value = chipFile->GetValue(at, key);
+    const std::string value = file.GetValue(at, key);
     if (!value.empty()) {
       return Judge(value);
     }
-    at = chipFile->GetValue(at, kBaseKey);
+    at = file.GetValue(at, kBaseKey);
   }
   return {};
+}
+
+IniFile IniReader::GetChipFile(const std::string& path) {
+  {
+    const std::lock_guard<std::mutex> lock(guard);
+    if (chipFile) {
+      return *chipFile;
+    }
+  }
+  const IniFile opened(path);
+  const std::lock_guard<std::mutex> lock(guard);
+  return chipFile ? *chipFile : chipFile.emplace(opened);
+}
+
+void IniReader::Record(const std::string& entry, const std::string& value) {
+  const std::lock_guard<std::mutex> lock(guard);
+  lookups[entry] = value;
 }
 
 std::string IniReader::ReadText(const Result& result, const std::string& entry, const std::string& defaultValue) {
   switch (result.status) {
     case kFound:
-      lookups[entry] = result.text;
+      Record(entry, result.text);
       return result.text;
     case kUndefined:
-      lookups[entry] = "(undef)";
+      Record(entry, "(undef)");
       return {};
     case kNotFound:
       break;
   }
-  lookups[entry] = defaultValue + " (dflt)";
+  Record(entry, defaultValue + " (dflt)");
   return defaultValue;
 }
 
@@ -111,29 +138,32 @@ Number IniReader::ReadNumber(const Result& result, const std::string& entry, Num
     value = std::is_signed_v<Number> ? static_cast<Number>(CDMUtil::ToInt(trimmed))
                                      : static_cast<Number>(CDMUtil::ToUnsignedLong(trimmed));
   } else if (result.status == kUndefined) {
-    lookups[entry] = "(undef)";
+    Record(entry, "(undef)");
     return 0;
   }
-  lookups[entry] = CDMUtil::ToHexString(static_cast<int>(value)) + (result.status == kNotFound ? " (dflt)" : "");
+  Record(entry, CDMUtil::ToHexString(static_cast<int>(value)) + (result.status == kNotFound ? " (dflt)" : ""));
   return value;
 }
 
 std::string IniReader::ReadIniValue(const std::string& key, status_t& status, const std::string& defaultValue) {
-  const Result result = LookUp(key);
+  const Sources from = GetSources();
+  const Result result = LookUp(from, key);
   status = result.status;
-  return ReadText(result, section + " " + key, defaultValue);
+  return ReadText(result, from.section + " " + key, defaultValue);
 }
 
 int IniReader::ReadIniInt(const std::string& key, status_t& status, int defaultValue) {
-  const Result result = LookUp(key);
+  const Sources from = GetSources();
+  const Result result = LookUp(from, key);
   status = result.status;
-  return ReadNumber(result, section + " " + key, defaultValue);
+  return ReadNumber(result, from.section + " " + key, defaultValue);
 }
 
 unsigned int IniReader::ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue) {
-  const Result result = LookUp(key);
+  const Sources from = GetSources();
+  const Result result = LookUp(from, key);
   status = result.status;
-  return ReadNumber(result, section + " " + key, defaultValue);
+  return ReadNumber(result, from.section + " " + key, defaultValue);
 }
 
 std::string IniReader::ReadChipValue(const std::string& chipSection, const std::string& key, status_t& status,
@@ -150,10 +180,13 @@ int IniReader::ReadChipInt(const std::string& chipSection, const std::string& ke
   return ReadNumber(result, chipSection + " " + key, defaultValue);
 }
 
-void IniReader::DumpLookups() const {
-  std::string text = "motherboard.lib input data (chip.ini:" + std::string(chipIniPresent ? "1" : "0") + "):\n";
-  for (const auto& [entry, value] : lookups) {
-    text += entry + " = " + value + "\n";
+void IniReader::DumpLookups() {
+  std::string text = "motherboard.lib input data (chip.ini:" + std::string(IsChipIniPresent() ? "1" : "0") + "):\n";
+  {
+    const std::lock_guard<std::mutex> lock(guard);
+    for (const auto& [entry, value] : lookups) {
+      text += entry + " = " + value + "\n";
+    }
   }
   platform::TheHost().console.Write(text);
 }

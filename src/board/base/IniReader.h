@@ -3,6 +3,7 @@
 #pragma once
 
 #include <map>
+#include <mutex>
 #include <optional>
 #include <string>
 
@@ -10,20 +11,21 @@
 
 namespace panelglow {
 
-/// No lock: the board library's mutex keeps two boards apart.
+/// Safe to use from several threads: a board is selected, and some settings are looked up, outside the board
+/// library's mutex. Where two of them select different files, the last one counts.
 class IniReader {
  public:
   /// What a look-up found. A key set to "undef" hides the same key in everything behind it.
   enum status_t { kNotFound = 0, kUndefined = 1, kFound = 2 };
 
-  /// The process-wide reader, made with the default paths when it does not exist yet.
+  /// The process-wide reader, with the default paths until it is given others.
   static IniReader& Instance();
 
   /// The same, set to these values at once; only the chip file stays the one that was read first.
   static IniReader& Instance(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
                              const std::string& chipIni);
 
-  IniReader();
+  IniReader() = default;
   IniReader(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
             const std::string& chipIni);
   virtual ~IniReader() = default;
@@ -40,34 +42,39 @@ class IniReader {
   int ReadChipInt(const std::string& chipSection, const std::string& key, status_t& status, int defaultValue);
 
   /// Writes the record of all look-ups to standard output.
-  void DumpLookups() const;
+  void DumpLookups();
 
-  [[nodiscard]] const std::map<std::string, std::string>& GetLookups() const { return lookups; }
-  [[nodiscard]] bool IsChipIniPresent() const { return chipIniPresent; }
-  [[nodiscard]] const std::string& GetChipIniPath() const { return chipIniPath; }
-  [[nodiscard]] const std::string& GetSection() const { return section; }
+  [[nodiscard]] bool IsChipIniPresent() { return GetSources().chipIniPresent; }
+  [[nodiscard]] std::string GetChipIniPath() { return GetSources().chipIniPath; }
 
  private:
+  struct Sources {
+    std::string detectIniPath = ".\\mbdetect.ini";
+    std::string section = "common";  // of this system: its id in upper-case hexadecimal
+    std::string testIniPath = ".\\mbtest.ini";
+    std::string chipIniPath = ".\\chip.ini";
+    bool testIniPresent = false;
+    bool chipIniPresent = false;
+  };
+
   struct Result {
     status_t status = kNotFound;
     std::string text;
   };
 
-  void Configure(const std::string& systemId, const std::string& detectIni, const std::string& testIni,
-                 const std::string& chipIni);
-  [[nodiscard]] Result LookUp(const std::string& key) const;
+  static Sources WithPresence(Sources from);
+  Sources GetSources();
+  IniFile GetChipFile(const std::string& path);
+  static Result LookUp(const Sources& from, const std::string& key);
   Result LookUpChip(const std::string& chipSection, const std::string& key);
   static Result Judge(const std::string& raw);
+  void Record(const std::string& entry, const std::string& value);
   std::string ReadText(const Result& result, const std::string& entry, const std::string& defaultValue);
   template <class Number>
   Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue);
 
-  std::string detectIniPath;
-  std::string section;  // of this system: its id in upper-case hexadecimal
-  std::string testIniPath;
-  std::string chipIniPath;
-  bool testIniPresent = false;
-  bool chipIniPresent = false;
+  std::mutex guard;  // of all that follows; never held while a file is touched, which may wait
+  std::optional<Sources> sources;
   std::map<std::string, std::string> lookups;
   std::optional<IniFile> chipFile;  // opened at the first chip look-up, kept from then on
 };

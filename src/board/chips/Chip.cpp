@@ -23,6 +23,9 @@ constexpr std::uint8_t kClockBankRegister = 0xAA;
 
 constexpr std::uint32_t kLatchSettle_ms = 250;
 
+// False for a bit that the word does not have: bit numbers come from files.
+bool HasBit(std::uint32_t word, int bit) { return bit >= 0 && bit < 32 && (word >> bit & 1U) != 0; }
+
 }  // namespace
 
 Chip::Chip() : Chip("chip") {}
@@ -91,7 +94,7 @@ bool Chip::RestorePowerButtonState() {
 
 bool Chip::ReadLatchedPort(std::uint16_t port, int bit, bool& value) {
   const std::uint8_t status = devio.InportByte(port);
-  value = (status >> static_cast<unsigned>(bit) & 1U) != 0;
+  value = HasBit(status, bit);
   if (value) {
     devio.OutportByte(port, status);
   }
@@ -100,7 +103,7 @@ bool Chip::ReadLatchedPort(std::uint16_t port, int bit, bool& value) {
 
 bool Chip::ReadLatchedPortDword(std::uint16_t port, int bit, bool& value) {
   lastStatus = devio.InportDword(port);
-  value = (lastStatus >> static_cast<unsigned>(bit) & 1U) != 0;
+  value = HasBit(lastStatus, bit);
   if (value) {
     platform::TheHost().clock.Sleep(kLatchSettle_ms);
     ClearLatchedPortDword(port, bit);

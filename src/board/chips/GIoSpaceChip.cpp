@@ -12,6 +12,8 @@ void Settle() { platform::TheHost().clock.Sleep(kSettle_ms); }
 
 }  // namespace
 
+// A sequence's address is a port number: the low 16 bits of it, for the I/O space has no more.
+
 // The latch is cleared first; what the pin register then shows is what the other pins carry.
 std::uint8_t GIoSpaceChip::ReadPins(std::uint16_t port) {
   devio.OutportByte(port, 0);

@@ -16,8 +16,13 @@ constexpr std::uint32_t kFlipSettle_ms = 30;
 
 }  // namespace
 
+// The block's address is a setting of the board, under the chip's name or under the section that it is given.
 GMemorySpaceChip::GMemorySpaceChip() : MaskedLedChip("g_memoryspace"), gpioBar(kDefaultGpioBar) {
-  if (const unsigned int bar = ReadIniUnsigned("chip.g_memoryspace.gpiobar", 0); bar != 0) {
+  unsigned int bar = ReadIniUnsigned("chip." + name + ".gpiobar", 0);
+  if (bar == 0 && section != name) {
+    bar = ReadIniUnsigned("chip." + section + ".gpiobar", 0);
+  }
+  if (bar != 0) {
     gpioBar = bar;
   }
 }

@@ -7,6 +7,7 @@ namespace {
 class EmptyConnection : public ManagementConnection {
  public:
   std::optional<std::vector<ManagementRow>> Query(std::u16string_view /*query*/) override { return std::nullopt; }
+  ManagementCallResult Call(const ManagementCall& /*call*/) override { return {ManagementCallStep::kGetClass, {}}; }
 };
 
 }  // namespace

@@ -48,6 +48,8 @@ class SimManagement::Connection : public ManagementConnection {
     return table->second;
   }
 
+  ManagementCallResult Call(const ManagementCall& /*call*/) override { return {ManagementCallStep::kGetClass, {}}; }
+
  private:
   const Tables& tables_;
 };

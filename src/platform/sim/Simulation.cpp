@@ -100,7 +100,7 @@ class SimConsole : public Console {
 
   void Raise(std::uint32_t type) {
     if (handler_) {
-      scheduler_.Start("console control", [this, type] { handler_(type); });
+      scheduler_.Start("console control", [handler = handler_, type] { handler(type); });
     }
   }
   [[nodiscard]] const std::string& Output() const { return output_; }

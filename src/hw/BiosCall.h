@@ -1,0 +1,17 @@
+// The firmware's call interface through the management service: a command with input bytes, and an answer of one of
+// five sizes.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+namespace panelglow {
+
+/// `sizeIndex` picks the size of the answer: 0, 4, 128, 1024 or 4096 bytes. Throws InvalidTmbWMIException for a step
+/// that fails, InvalidTmbWMICallException when the firmware does not sign its answer. An answer shorter than its size
+/// is filled up with zeroes.
+std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandType,
+                                   const std::vector<std::uint8_t>& inputBytes, std::size_t sizeIndex);
+
+}  // namespace panelglow

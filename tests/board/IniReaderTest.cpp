@@ -1,0 +1,102 @@
+// Which of a board's files and sections answers a look-up, and how its text is read.
+#include "board/base/IniReader.h"
+
+#include <gtest/gtest.h>
+
+#include "board/BoardBench.h"
+
+namespace panelglow {
+namespace {
+
+constexpr const char* kFiles[] = {".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini"};
+
+IniReader Reader() { return IniReader("7D10", kFiles[0], kFiles[1], kFiles[2]); }
+
+// Status and text of a look-up, with "dflt" as default.
+std::string Read(IniReader& reader, const std::string& key, const char* chipSection = nullptr) {
+  IniReader::status_t status = IniReader::kNotFound;
+  const std::string text = chipSection == nullptr ? reader.ReadIniValue(key, status, "dflt")
+                                                  : reader.ReadChipValue(chipSection, key, status, "dflt");
+  return std::to_string(status) + " " + text;
+}
+
+TEST(IniReader, FilesComeBeforeSectionsAndUndefHidesWhatIsBehind) {
+  BoardBench bench;
+  bench.SetFiles("[7D10]\na=detect\nb=detect\nc=detect\ne=detect ; note\nf=;\nU=UNDEF\n[common]\nd=common\ng=x\n",
+                 "[Common]\nb=test common\n[7d10]\na=undef\nc=\ng=\nh=undef ;\n[7D11]\nd=other\n[en_US]\ni=any\n",
+                 "");
+  IniReader reader = Reader();
+  const std::pair<const char*, const char*> kCases[] = {
+      {"a", "1 "},      {"b", "2 test common"}, {"c", "2 detect"}, {"d", "2 common"}, {"E", "2 detect "}, {"f", "2 "},
+      {"u", "2 UNDEF"}, {"g", "2 x"},           {"h", "2 undef "}, {"i", "2 any"},    {"none", "0 dflt"},
+  };
+  for (const auto& [key, text] : kCases) {
+    EXPECT_EQ(Read(reader, key), text) << key;
+  }
+  bench.SetFiles("[7D10]\nA=edited\n", "", "");
+  EXPECT_EQ(Read(reader, "a"), "2 edited");
+}
+
+TEST(IniReader, AChipsSettingComesFromTheBoardThenFromItsSectionAndItsBases) {
+  BoardBench bench;
+  bench.SetFiles("[7D10]\nchip.g_sio.a=board\nchip.g_sio.b=undef\n", "",
+                 "[g_sio]\na=chip\nb=chip\nbase=Middle\n[middle]\nc=middle;\nd=undef\nbase=g_root\n"
+                 "[g_root]\nc=root\nd=root\ne=root\nbase=MIDDLE\n[self]\nbase=self\n[cut]\nbase=g_root;\n");
+  IniReader reader = Reader();
+  const std::tuple<const char*, const char*, const char*> kCases[] = {
+      {"g_sio", "a", "2 board"}, {"g_sio", "b", "1 "},     {"G_SIO", "c", "2 middle"},
+      {"g_sio", "d", "1 "},      {"g_sio", "e", "2 root"}, {"g_sio", "f", "0 dflt"},
+      {"self", "a", "0 dflt"},   {"none", "a", "0 dflt"},  {"cut", "e", "0 dflt"},
+  };
+  for (const auto& [section, key, text] : kCases) {
+    EXPECT_EQ(Read(reader, key, section), text) << section << " " << key;
+  }
+  bench.machine.DiskFiles().Hide(kFiles[2]);
+  EXPECT_EQ(Read(reader, "e", "g_sio"), "0 dflt");
+}
+
+TEST(IniReader, NumbersAreDecimalOrPrefixedAndEveryReadIsRecorded) {
+  BoardBench bench;
+  bench.SetFiles("[7D10]\na= \v0x2E\b \nb=2E\nc=46 ; note\nd=undef\ne=0xFED80100\nf=-1\ng=\"0x10\"\nh=text\n", "",
+                 "");
+  IniReader reader = Reader();
+  IniReader::status_t status = IniReader::kNotFound;
+  const std::pair<const char*, int> kInts[] = {{"a", 46},         {"b", 0},  {"c", 46}, {"d", 0},
+                                               {"e", 0x7FFFFFFF}, {"f", -1}, {"g", 16}, {"none", 255}};
+  for (const auto& [key, value] : kInts) {
+    EXPECT_EQ(reader.ReadIniInt(key, status, 255), value) << key;
+  }
+  EXPECT_EQ(reader.ReadIniUnsigned("e", status, 1), 0xFED80100U);
+  EXPECT_EQ(status, IniReader::kFound);
+  EXPECT_EQ(reader.ReadIniUnsigned("none2", status, 0xFFFFFFFF), 0xFFFFFFFFU);
+  EXPECT_EQ(status, IniReader::kNotFound);
+  EXPECT_EQ(reader.ReadChipInt("7D10", "none", status, 10), 10);
+  EXPECT_EQ(Read(reader, "h") + Read(reader, "i"), "2 text0 dflt");
+  reader.DumpLookups();
+  EXPECT_EQ(bench.machine.Output(),
+            "motherboard.lib input data (chip.ini:1):\n7D10 a = 2e\n7D10 b = 0\n7D10 c = 2e\n7D10 d = (undef)\n"
+            "7D10 e = fed80100\n7D10 f = ffffffff\n7D10 g = 10\n7D10 h = text\n7D10 i = dflt (dflt)\n"
+            "7D10 none = a (dflt)\n7D10 none2 = ffffffff (dflt)\n");
+}
+
+TEST(IniReader, WhichFilesThereAreIsKnownFromTheStartAndTheChipFileStaysTheFirst) {
+  BoardBench bench;
+  bench.machine.DiskFiles().Hide(kFiles[1]);
+  bench.machine.DiskFiles().Put(".\\other.ini", "[7D10]\na=other\n");
+  IniReader late = Reader();
+  bench.SetFiles("", "[7D10]\na=too late\n", "");
+  EXPECT_EQ(Read(late, "a"), "0 dflt");
+  EXPECT_FALSE(IniReader("7D10", "", "", "").IsChipIniPresent());
+
+  IniReader& shared = IniReader::Instance("7D10", kFiles[0], kFiles[1], kFiles[2]);
+  bench.SetFiles("", "", "[7D10]\na=first\n");
+  EXPECT_EQ(Read(shared, "a", "7D10"), "2 first");
+  IniReader::Instance("7D11", ".\\other.ini", "", ".\\other.ini");
+  EXPECT_EQ(Read(shared, "a", "7D10"), "2 first");
+  EXPECT_EQ(Read(shared, "a"), "0 dflt");
+  IniReader::Instance("7D10", ".\\other.ini", "", ".\\other.ini");
+  EXPECT_EQ(Read(shared, "a"), "2 other");
+}
+
+}  // namespace
+}  // namespace panelglow

@@ -1,0 +1,140 @@
+// Parameters: how they are split, what a declared one accepts, how it explains itself, and whose value counts.
+#include <gmock/gmock.h>
+
+#include "harness/CDMArgument.h"
+#include "harness/CmdLineParser.h"
+#include "harness/Probe.h"
+
+namespace panelglow {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::Pair;
+using ::testing::StartsWith;
+
+TEST(CmdLineParser, AParameterIsCutAtItsFirstEqualsSignAndTheLastOneOfAKeyCounts) {
+  const char* arguments[] = {"C:\\suite\\Probe.EXE", "-A=b=C", "-Help", "-subtest=LEDTest", "-SUBTEST=Other", "-e="};
+  const platform::sim::Simulation machine(platform::sim::MachineDescription{}, {});
+  CmdLineParser parser(6, arguments);
+  EXPECT_EQ(parser.GetProgramPath(), "C:\\suite\\Probe.EXE");
+  EXPECT_THAT(parser.GetParameters(),
+              ElementsAre(Pair("-a", "b=C"), Pair("-e", ""), Pair("-help", "-Help"), Pair("-subtest", "Other")));
+  EXPECT_EQ(parser.GetParameter("-E", "default"), "");
+  EXPECT_EQ(parser.GetParameter("-f", "default"), "default");
+  parser.AddParameter("-F", "added");
+  parser.AddParameter("-SubTest", "ignored");
+  EXPECT_EQ(parser.GetParameter("-f", ""), "added");
+  EXPECT_EQ(parser.GetParameter("-subtest", ""), "Other");
+  EXPECT_EQ(CmdLineParser(0, nullptr).GetProgramPath(), "");
+}
+
+TEST(CDMConstraint, AValuePassesByTypeAndRule) {
+  using T = CDMConstraintType;
+  constexpr std::int64_t kBig = 5'000'000'000;
+  struct Case {
+    CDMConstraint rule;
+    std::vector<const char*> passing;
+    std::vector<const char*> failing;
+  };
+  const Case kCases[] = {
+      {CDMConstraint(0, 10), {"0", "10", "0x0A", "-0"}, {"11", "-1", "abc", "", "1.0", " 1", "99999999999"}},
+      {CDMConstraint(0.5, 1.5), {"0.5", "1.5", "+1", ".75"}, {"1.51", "0.49", "1.", "-0.5", "0x1", "1e0"}},
+      {CDMConstraint(kBig, kBig + 1), {"5000000000", "0x12A05F201"}, {"4999999999", "5000000002", "-5000000000", ""}},
+      {CDMConstraint(5, T::Equal), {"5", "0x5"}, {"6", "x"}},
+      {CDMConstraint(5, T::DifferentThan), {"4", "-5"}, {"5", "x"}},
+      {CDMConstraint(5, T::GreaterThan), {"6"}, {"5"}},
+      {CDMConstraint(5, T::EqualToOrGreaterThan), {"5", "6"}, {"4"}},
+      {CDMConstraint(5, T::EqualToOrLessThan), {"5", "-6"}, {"6"}},
+      {CDMConstraint(5, T::LessThan), {"4"}, {"5"}},
+      {CDMConstraint(kBig, T::LessThan), {"4999999999", "-9000000000000000000"}, {"5000000000"}},
+      {CDMConstraint(5, static_cast<T>(6)), {}, {"4", "5", "6"}},
+      {CDMConstraint("Default,,Fast"), {"FAST", "default"}, {"fastest", "", "Default,,Fast", " fast"}},
+      {CDMConstraint(""), {}, {"", "a"}},
+      {CDMConstraint(","), {}, {"", ","}},
+  };
+  for (const Case& c : kCases) {
+    SCOPED_TRACE(c.rule.GetHelp());
+    for (const char* value : c.passing) {
+      EXPECT_TRUE(c.rule.Check(value)) << value;
+    }
+    for (const char* value : c.failing) {
+      EXPECT_FALSE(c.rule.Check(value)) << value;
+    }
+  }
+}
+
+TEST(CDMArgument, TheHelpBlockStatesTypeRuleDefaultAndNeed) {
+  using T = CDMConstraintType;
+  const auto help = [](const char* name, CDMArgumentType type, const char* defaultValue, bool required,
+                       auto... rule) {
+    std::unique_ptr<CDMConstraint> constraint;
+    ((constraint = std::make_unique<CDMConstraint>(rule)), ...);
+    return CDMArgument(name, type, defaultValue, "Text.", required, std::move(constraint), false, false).GetHelp();
+  };
+  using Type = CDMArgumentType;
+  EXPECT_EQ(help("-Retries", Type::Integer, "1", false, CDMConstraint(0, 10)),
+            "-Retries=<integer>      Text.\n\t - Value must be between [0..10]\n\t * Default value: 1\n"
+            "\t * Required: false");
+  EXPECT_EQ(help("-Mode", Type::String, "", true, CDMConstraint("A,b")),
+            "-Mode=<string>          Text.\n\t - Value must be one of [A|b]\n\t * Required: true");
+  EXPECT_EQ(help("-ThirteenLong", Type::Boolean, "", false), "-ThirteenLong=<boolean> Text.\n\t * Required: false");
+  EXPECT_EQ(help("-FourteenLongs", Type::Integer, "", true), "-FourteenLongs=<integer>  Text.\n\t * Required: true");
+  const std::pair<CDMConstraint, const char*> kRules[] = {
+      {CDMConstraint(0.25, 1000000.0), "between [0.25..1e+06]"},
+      {CDMConstraint(std::int64_t{-1}, std::int64_t{5'000'000'000}), "between [-1..5000000000]"},
+      {CDMConstraint(5, T::EqualToOrGreaterThan), "equal to or greater than 5"},
+      {CDMConstraint(0.5, T::DifferentThan), "different than 0.5"},
+      {CDMConstraint(std::int64_t{7}, T::LessThan), "less than 7"},
+      {CDMConstraint(""), "equal to "},
+  };
+  for (const auto& [rule, words] : kRules) {
+    EXPECT_EQ(rule.GetHelp(), std::string("\n\t - Value must be ") + words);
+  }
+  EXPECT_EQ(CDMConstraint(5, static_cast<T>(6)).GetHelp(), "");
+  EXPECT_EQ(CDMConstraint(3, 4).GetLowText() + CDMConstraint(0.5, 4.5).GetHighText(), "34.5");
+  EXPECT_EQ(CDMConstraint("a").GetLowText() + CDMConstraint("a").GetHighText(), "invalidStringinvalidString");
+}
+
+TEST(CDMDiag, AValueComesFromTheCommandLineThenTheDeclarationThenTheCaller) {
+  ProbeRun run{"-subtest=Probe -mode=fast -ratio= -serial=0x1F"};
+  run.prepare = [](Probe& probe) {
+    CDMDiag::LogMessage(LogOptions::Other, 1,
+                        CDMUtil::ToString(probe.GetArgument("-Level", 5)) + " " +
+                            probe.GetArgument("-MODE", "caller") + " " + probe.GetArgument("-Ratio", "caller") + " " +
+                            CDMUtil::ToString(probe.GetArgument("-Loud", false)) + " " +
+                            CDMUtil::ToString(probe.GetArgument("-loud", true)) + " " +
+                            CDMUtil::ToString(probe.GetArgument("-Serial", 5)) + " " +
+                            CDMUtil::ToString(probe.GetArgument("-Mode", 5)));
+    std::vector<std::string> lines;
+    CDMUtil::Split(probe.GetArgumentsHelp(), lines, "\n");
+    std::string help;
+    for (const std::string& line : lines) {
+      help += line.starts_with('-') ? line.substr(0, line.find('=')) + " " : "";
+    }
+    CDMDiag::LogMessage(LogOptions::Other, 2, help);
+  };
+  EXPECT_THAT(run.Lines(), StartsWith("LogMessage 1 1 \"30 fast caller true true 31 0\" \"\"\n"
+                                      "LogMessage 1 2 \"-DataCollectionFile -Level -Loud -Mode -Ratio "
+                                      "-integratormsgfile -paramfile -paramsection \" \"\"\n"));
+}
+
+TEST(CDMDiag, ControlFilesCountByPlaceAndWholeContentAlsoWithoutProgramData) {
+  const std::tuple<const char*, const char*, const char*> kCases[] = {
+      {"\\halcyon.ctl", "pause", "pause"}, {"\\halcyon.ctl", "resume", "resume"},
+      {"\\halcyon.ctl", "resume\r\n", ""}, {"\\halcyon.ctl", "terminate", "stop"},
+      {".\\halcyon.ctl", "terminate", ""}, {"\\Tamberlane\\kill.ctl", "", ""},
+      {"\\kill.ctl", "", "stop"},          {".\\kill.ctl", "", "stop"}};
+  for (const auto& [path, content, asked] : kCases) {
+    platform::sim::MachineDescription description;
+    description.environment.clear();
+    platform::sim::Simulation machine(std::move(description), {});
+    machine.DiskFiles().Put(path, content);
+    EXPECT_EQ(std::string(CDMDiag::ShouldTestBeTerminated() ? "stop" : "") +
+                  (CDMDiag::IsPauseRequested() ? "pause" : "") + (CDMDiag::IsResumeRequested() ? "resume" : ""),
+              asked)
+        << path << content;
+  }
+}
+
+}  // namespace
+}  // namespace panelglow

@@ -1,0 +1,80 @@
+// The manager with one subtest, in a process of its own on a simulated machine.
+#pragma once
+
+#include <functional>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "harness/CDMDiag.h"
+#include "harness/DiagnosticManager.h"
+#include "harness/OwnProcess.h"
+#include "harness/base/CDMUtil.h"
+#include "platform/sim/Simulation.h"
+
+namespace panelglow {
+
+class Probe : public CDMDiag {
+ public:
+  explicit Probe(std::function<bool()> runBody) : body(std::move(runBody)) {
+    Declare("-Level", CDMArgumentType::Integer, "30", std::make_unique<CDMConstraint>(0, 100));
+    Declare("-Loud", CDMArgumentType::Boolean, "TRUE");
+    Declare("-Ratio", CDMArgumentType::Double, "");
+    Declare("-Mode", CDMArgumentType::String, "Default", std::make_unique<CDMConstraint>("Default,Fast"));
+    DeclareArgument("-Serial", CDMArgumentType::LargeInteger, "", "", false, nullptr, true, false);  // hidden
+  }
+  void Declare(const char* argument, CDMArgumentType type, const char* defaultValue,
+               std::unique_ptr<CDMConstraint> rule = nullptr, bool required = false) {
+    DeclareArgument(argument, type, defaultValue, "", required, std::move(rule), false, false);
+  }
+  bool Run() override { return body(); }
+  using CDMDiag::GetArgument;
+
+ private:
+  std::function<bool()> body;
+};
+
+struct ProbeRun {
+  std::string words;  // of the command line, behind the program
+  std::function<bool()> body = [] { return true; };
+  std::function<void(Probe&)> prepare = [](Probe&) {};
+  std::map<std::string, std::string> files{};
+  std::string version{};
+
+  /// Standard output with the exit code behind it, as "= 0".
+  [[nodiscard]] std::string Output() const {
+    return InOwnProcess([this] {
+      platform::sim::Simulation machine(platform::sim::MachineDescription{}, {});
+      for (const auto& [path, content] : files) {
+        machine.DiskFiles().Put(path, content);
+      }
+      std::vector<std::string> arguments{"C:\\suite\\probe.exe"};
+      CDMUtil::Split(words, arguments, " ");
+      std::vector<const char*> argv;
+      for (const std::string& argument : arguments) {
+        argv.push_back(argument.c_str());
+      }
+      DiagnosticManager manager(static_cast<int>(argv.size()), argv.data(), version, "Probe");
+      Probe probe(body);
+      prepare(probe);
+      manager.RegisterSubtest("Probe", &probe);
+      manager.RegisterSubtest("Other", nullptr);
+      const int exitCode = manager.Run();
+      return machine.Output() + "= " + std::to_string(exitCode);
+    });
+  }
+
+  /// The same without log lines of the class Debug, and with a line end.
+  [[nodiscard]] std::string Lines() const {
+    std::vector<std::string> lines;
+    CDMUtil::Split(Output(), lines, "\n");
+    std::string kept;
+    for (const std::string& line : lines) {
+      kept += line.starts_with("LogMessage 14 ") ? "" : line + "\n";
+    }
+    return kept;
+  }
+};
+
+}  // namespace panelglow
