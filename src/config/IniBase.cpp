@@ -1,5 +1,7 @@
 #include "config/IniBase.h"
 
+#include <utility>
+
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
 
@@ -54,6 +56,10 @@ void IniBase::ParseLine(std::string_view raw) {
 const Section* IniBase::GetSection(const std::string& name) const {
   const auto found = sections.find(name);
   return found == sections.end() ? nullptr : found->second.get();
+}
+
+Section* IniBase::GetSection(const std::string& name) {
+  return const_cast<Section*>(std::as_const(*this).GetSection(name));
 }
 
 void IniBase::AddSection(std::unique_ptr<Section> section) {

@@ -24,6 +24,7 @@ class IniBase {
 
   /// Null when there is none of that name (compared with letter case). Owned by this object.
   [[nodiscard]] const Section* GetSection(const std::string& name) const;
+  [[nodiscard]] Section* GetSection(const std::string& name);
 
   /// Replaces a section of the same name.
   void AddSection(std::unique_ptr<Section> section);

@@ -10,7 +10,7 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::size_t kValueBuffer = 255;      // characters, the final NUL among them
+constexpr std::size_t kValueBuffer = 255;  // characters, the final NUL among them
 constexpr std::size_t kSectionBuffer = 0x2004;
 constexpr const char* kFallbackSection = "en_US";
 

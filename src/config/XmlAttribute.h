@@ -2,17 +2,18 @@
 #pragma once
 
 #include <string>
-#include <utility>
+#include <string_view>
 
 #include "config/Persistent.h"
+#include "config/XmlText.h"
 
 namespace panelglow {
 
-class XmlAttribute : public Persistent {
+class XmlAttribute final : public Persistent {
  public:
   XmlAttribute() = default;
-  XmlAttribute(std::string attributeName, std::string attributeValue)
-      : name(std::move(attributeName)), value(std::move(attributeValue)) {}
+  XmlAttribute(std::string_view attributeName, std::string_view attributeValue)
+      : name(attributeName), value(attributeValue) {}
 
   [[nodiscard]] unsigned int Version() const override { return 0; }
   void ReadAndWrite(ptstream& stream, Direction direction, unsigned int version) override;
@@ -22,8 +23,8 @@ class XmlAttribute : public Persistent {
     return std::make_unique<XmlAttribute>(*this);
   }
 
-  std::string name;
-  std::string value;
+  XmlText name;
+  XmlText value;
 };
 
 }  // namespace panelglow

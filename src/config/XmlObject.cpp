@@ -17,8 +17,9 @@ namespace {
 constexpr std::string_view kWrapperName = "xmlIndex";
 constexpr std::string_view kProperty = "property";
 
-// The fixed key of the scrambled form.
-constexpr std::string_view kScramblingKey = "panel lamps blink; a person looks, presses and the verdict is known";
+// The fixed key of the scrambled form. A scrambled byte of 0 would end the text. With "?" and "@" that could only
+// come of the bytes 0xC1 and 0xC0, which UTF-8 never has, so that no such text is cut.
+constexpr std::string_view kScramblingKey = "@?@@?@??@?@@@??@@?@?@??@@??@?@@??@?@@?@@@?@??@?@@?@??@@?@?@@??@?@@?";
 static_assert(kScramblingKey.size() == 67);
 
 // Adds (or, with `sign` -1, takes away) the repeating key, up to the first byte that is zero.
@@ -52,14 +53,15 @@ std::string_view Escape(char c, bool inAttribute) {
 }
 
 void AppendEscaped(std::string& out, std::string_view text, bool inAttribute) {
-  for (const char c : text) {
-    const std::string_view escaped = Escape(c, inAttribute);
-    if (escaped.empty()) {
-      out += c;
-    } else {
-      out += escaped;
+  std::size_t written = 0;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    const std::string_view escaped = Escape(text[i], inAttribute);
+    if (!escaped.empty()) {
+      out.append(text, written, i - written) += escaped;
+      written = i + 1;
     }
   }
+  out.append(text, written);
 }
 
 void AppendAttribute(std::string& out, const XmlAttribute& attribute) {
@@ -101,16 +103,7 @@ std::string Streamed(Number number) {
 
 XmlObject::XmlObject(const std::string& text) { XmlParser(text).ParseElement(*this); }
 
-XmlObject::XmlObject(const XmlObject& other)
-    : Persistent(other),
-      name(other.name),
-      value(other.value),
-      attributes(other.attributes),
-      declaration(other.declaration),
-      instructions(other.instructions),
-      children(other.children) {
-  Relink();
-}
+XmlObject::XmlObject(const XmlObject& other) : Persistent(other) { CopyContent(other); }
 
 XmlObject& XmlObject::operator=(const XmlObject& other) {
   if (this != &other) {
@@ -125,13 +118,9 @@ XmlObject::XmlObject(XmlObject&& other) noexcept
       value(std::move(other.value)),
       depth(other.depth),
       attributes(std::move(other.attributes)),
-      declaration(std::move(other.declaration)),
-      instructions(std::move(other.instructions)),
-      children(std::move(other.children)) {
-  // The children stay where they are; only their way up has changed.
-  for (XmlObject& child : children) {
-    child.parent = this;
-  }
+      children(std::move(other.children)),
+      prolog(std::move(other.prolog)) {
+  LinkChildren();
 }
 
 XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
@@ -139,12 +128,16 @@ XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
     name = std::move(other.name);
     value = std::move(other.value);
     attributes = std::move(other.attributes);
-    declaration = std::move(other.declaration);
-    instructions = std::move(other.instructions);
+    prolog = std::move(other.prolog);
     // `other` may be a descendant of this object: take its children before the old ones go.
     std::vector<XmlObject> taken = std::move(other.children);
+    const bool sameDepth = depth == other.depth;
     children = std::move(taken);
-    Relink();
+    if (sameDepth) {
+      LinkChildren();
+    } else {
+      Relink();
+    }
   }
   return *this;
 }
@@ -164,9 +157,30 @@ void XmlObject::Clear() {
   name.clear();
   value.clear();
   attributes.clear();
-  declaration.clear();
-  instructions.clear();
+  prolog.reset();
   children.clear();
+}
+
+// All but the place in a tree; this object is empty.
+void XmlObject::CopyContent(const XmlObject& other) {
+  name = other.name;
+  value = other.value;
+  attributes = other.attributes;
+  prolog = other.prolog == nullptr ? nullptr : std::make_unique<Prolog>(*other.prolog);
+  children.reserve(other.children.size());
+  for (const XmlObject& child : other.children) {
+    XmlObject& copy = children.emplace_back();
+    copy.parent = this;
+    copy.depth = depth + 1;
+    copy.CopyContent(child);
+  }
+}
+
+// After a move the children stay where they are; only their way up has changed.
+void XmlObject::LinkChildren() {
+  for (XmlObject& child : children) {
+    child.parent = this;
+  }
 }
 
 // Sets parent pointers and depths again through the whole subtree.
@@ -191,12 +205,11 @@ bool XmlObject::LoadFromFile(const std::string& path, bool scrambled, bool wrap,
   if (scrambled) {
     ApplyKey(*content, -1);
   }
-  std::string_view text = *content;
-  text = text.substr(0, text.find('\0'));
-  while (!text.empty() && IsXmlSpace(text.back())) {
-    text.remove_suffix(1);
+  content->resize(std::min(content->find('\0'), content->size()));
+  while (!content->empty() && IsXmlSpace(content->back())) {
+    content->pop_back();
   }
-  XmlParser parser(text);
+  XmlParser parser(*content);
   if (!wrap && index < 0) {
     parser.ParseElement(*this);
     return true;
@@ -247,6 +260,7 @@ std::string XmlObject::ToString(bool compact) const {
 }
 
 void XmlObject::Write(std::string& out, bool compact) const {
+  const auto& [declaration, instructions] = GetProlog();
   if (parent == nullptr && !declaration.empty()) {
     // The version comes first, whatever order the pairs were set in.
     out += "<?xml";
@@ -261,16 +275,16 @@ void XmlObject::Write(std::string& out, bool compact) const {
     }
     out += "?>\n";
   }
-  const std::string indentation = compact ? std::string() : std::string(2 * static_cast<std::size_t>(depth), ' ');
+  const std::size_t indentation = compact ? 0 : 2 * static_cast<std::size_t>(depth);
   const std::string_view lineEnd = compact ? "" : "\n";
   for (const std::string& instruction : instructions) {
     if (!instruction.empty()) {
-      out += indentation + instruction + "\n";
+      out.append(indentation, ' ') += instruction;
+      out += '\n';
     }
   }
   if (!name.empty()) {
-    out += indentation;
-    out += '<';
+    out.append(indentation, ' ') += '<';
     out += name;
     for (const XmlAttribute& attribute : attributes) {
       if (!attribute.name.empty()) {
@@ -293,7 +307,7 @@ void XmlObject::Write(std::string& out, bool compact) const {
   }
   if (!name.empty()) {
     if (!children.empty()) {
-      out += indentation;
+      out.append(indentation, ' ');
     }
     out += "</";
     out += name;
@@ -308,7 +322,7 @@ std::ostream& operator<<(std::ostream& stream, const XmlObject& object) { return
 
 std::string XmlObject::GetAttributeValue(std::string_view attribute, std::string_view defaultValue) const {
   const XmlAttribute* found = FindAttribute(attribute);
-  return found == nullptr ? std::string(defaultValue) : found->value;
+  return found == nullptr ? std::string(defaultValue) : std::string(found->value);
 }
 
 XmlAttribute* XmlObject::FindAttribute(std::string_view attribute) {
@@ -341,22 +355,35 @@ void XmlObject::RemoveAttribute(std::string_view attribute) {
   std::erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
 }
 
+const XmlObject::Prolog& XmlObject::GetProlog() const {
+  static const Prolog nothing;
+  return prolog == nullptr ? nothing : *prolog;
+}
+
+XmlObject::Prolog& XmlObject::GetProlog() {
+  if (prolog == nullptr) {
+    prolog = std::make_unique<Prolog>();
+  }
+  return *prolog;
+}
+
 std::string XmlObject::GetDeclarationValue(std::string_view attribute, std::string_view defaultValue) const {
-  const auto found = FindIn(declaration, attribute);
-  return found == declaration.end() ? std::string(defaultValue) : found->value;
+  const auto found = FindIn(GetProlog().declaration, attribute);
+  return found == GetProlog().declaration.end() ? std::string(defaultValue) : std::string(found->value);
 }
 
 XmlAttribute* XmlObject::FindDeclaration(std::string_view attribute) {
-  const auto found = FindIn(declaration, attribute);
-  return found == declaration.end() ? nullptr : &*found;
+  const auto found = FindIn(GetProlog().declaration, attribute);
+  return found == GetProlog().declaration.end() ? nullptr : &*found;
 }
 
 XmlAttribute* XmlObject::SetDeclaration(std::string_view attribute, const std::string& newValue) {
-  return SetIn(declaration, attribute, newValue);
+  return SetIn(GetProlog().declaration, attribute, newValue);
 }
 
 void XmlObject::RemoveDeclaration(std::string_view attribute) {
-  std::erase_if(declaration, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+  std::erase_if(GetProlog().declaration,
+                [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
 }
 
 // ---- children
@@ -371,9 +398,7 @@ XmlObject* XmlObject::AddChild(XmlObject&& child) {
   added.depth = depth + 1;
   added.Relink();
   if (sistersMove) {
-    for (XmlObject& sister : children) {
-      sister.parent = this;
-    }
+    LinkChildren();
   }
   return &added;
 }
@@ -434,7 +459,7 @@ bool XmlObject::Matches(const std::string& filter) {
     return true;
   }
   if (filter.find('=') == std::string::npos) {
-    return filter == value;
+    return value == filter;
   }
   const std::string text = "<filter " + filter + "/>";
   XmlObject pairs;
@@ -494,7 +519,7 @@ bool XmlObject::PassesChild(char form, std::string_view child, std::string_view 
       continue;
     }
     exists = true;
-    const bool contains = candidate.value.find(wanted) != std::string::npos;
+    const bool contains = std::string_view(candidate.value).find(wanted) != std::string::npos;
     switch (form) {
       case '#':
         passes = passes || contains;
@@ -523,8 +548,9 @@ std::string XmlObject::GetValue(const std::string& path, const std::string& defa
   if (last.starts_with('@')) {
     return element->GetAttributeValue(last.substr(1), defaultValue);
   }
-  const std::list<XmlObject*> found = element->FindChildren(last);
-  return found.empty() ? defaultValue : found.front()->value;
+  const auto child = std::find_if(element->children.begin(), element->children.end(),
+                                  [&](const XmlObject& candidate) { return candidate.name == last; });
+  return child == element->children.end() ? defaultValue : std::string(child->value);
 }
 
 std::string XmlObject::GetValueFromFile(const std::string& path, const std::string& outerName,

@@ -5,7 +5,7 @@
 
 #include <iosfwd>
 #include <list>
-#include <optional>
+#include <memory>
 #include <sstream>
 #include <string>
 #include <string_view>
@@ -14,20 +14,22 @@
 
 #include "config/Persistent.h"
 #include "config/XmlAttribute.h"
+#include "config/XmlText.h"
 
 namespace panelglow {
 
-class XmlObject : public Persistent {
+class XmlObject final : public Persistent {
  public:
   /// Elements nested deeper than this are refused with a parse error.
   static constexpr int kDeepestElement = 1000;
 
-  XmlObject() = default;
+  XmlObject() noexcept {}  // a defaulted one would clear the memory first: the parser makes very many
 
   /// Parses `text`; throws std::runtime_error with line and position when it is malformed.
   explicit XmlObject(const std::string& text);
 
-  // A copy is deep; its parent is null and its depth 0 until it is added somewhere.
+  // A copy is deep; its parent is null and its depth 0 until it is added somewhere. An element that is assigned to
+  // keeps its place in its tree.
   XmlObject(const XmlObject& other);
   XmlObject& operator=(const XmlObject& other);
   XmlObject(XmlObject&& other) noexcept;
@@ -41,7 +43,7 @@ class XmlObject : public Persistent {
   [[nodiscard]] std::string GetRealClassName() const override { return "XmlObject"; }
   [[nodiscard]] std::unique_ptr<Persistent> CreateCopy() const override { return std::make_unique<XmlObject>(*this); }
 
-  /// Empties the four lists, the name and the value.
+  /// Empties the lists, the name and the value.
   void Clear();
 
   // ---- file and text
@@ -120,31 +122,42 @@ class XmlObject : public Persistent {
                          int kind);
 
   template <class Number>
-    requires std::is_arithmetic_v<Number>
-  XmlObject* AddProperty(const std::string& property, const std::string& caption, Number propertyValue, int kind) {
+  requires std::is_arithmetic_v<Number> XmlObject* AddProperty(const std::string& property,
+                                                               const std::string& caption, Number propertyValue,
+                                                               int kind) {
     std::ostringstream text;
     text << +propertyValue;
     return AddProperty(property, caption, text.str(), kind);
   }
 
-  std::string name;   // the tag; empty for a wrapper without a tag
-  std::string value;  // the element's text, decoded
-  XmlObject* parent = nullptr;  // not owned
-  int depth = 0;                // 0 for a root
-  std::vector<XmlAttribute> attributes;   // in document order
-  std::vector<XmlAttribute> declaration;  // of an <?xml ... ?> line
-  std::vector<std::string> instructions;  // other <? ... ?> texts with their delimiters
+  // ---- what stands before the tag; nearly no element has any of it
+  struct Prolog {
+    std::vector<XmlAttribute> declaration;  // of an <?xml ... ?> line
+    std::vector<std::string> instructions;  // other <? ... ?> texts with their delimiters
+  };
+  [[nodiscard]] const Prolog& GetProlog() const;
+  [[nodiscard]] Prolog& GetProlog();
+
+  XmlText name;                          // the tag; empty for a wrapper without a tag
+  XmlText value;                         // the element's text, decoded
+  XmlObject* parent = nullptr;           // not owned
+  int depth = 0;                         // 0 for a root
+  std::vector<XmlAttribute> attributes;  // in document order
   std::vector<XmlObject> children;
 
  private:
   friend class XmlParser;
 
+  void CopyContent(const XmlObject& other);
+  void LinkChildren();
   void Relink();
   void Write(std::string& out, bool compact) const;
   [[nodiscard]] bool PassesPair(std::string_view key, std::string_view wanted) const;
   [[nodiscard]] bool PassesAttribute(char form, std::string_view attribute, std::string_view wanted) const;
   [[nodiscard]] bool PassesProperty(char form, std::string_view property, std::string_view wanted) const;
   [[nodiscard]] bool PassesChild(char form, std::string_view child, std::string_view wanted) const;
+
+  std::unique_ptr<Prolog> prolog;  // null when there is nothing
 };
 
 /// Writes the tree with indentation.

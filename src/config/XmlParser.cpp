@@ -2,9 +2,8 @@
 
 #include <algorithm>
 #include <array>
-#include <cstdint>
+#include <iterator>
 #include <stdexcept>
-#include <unordered_map>
 #include <utility>
 
 #include "harness/base/CDMUtil.h"
@@ -13,9 +12,14 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::string_view kCommentStart = "<!--";
-constexpr std::string_view kCommentEnd = "-->";
+constexpr char kCommentStart[] = "<!--";
+constexpr char kCommentEnd[] = "-->";
+constexpr std::size_t kCommentStartSize = sizeof(kCommentStart) - 1;
+constexpr std::size_t kCommentEndSize = sizeof(kCommentEnd) - 1;
 constexpr std::size_t kManyAttributes = 32;  // from here on a repeated name is looked up in a table
+
+// An element with more children takes them in portions, so that the stack stays small.
+constexpr std::size_t kMostWaitingChildren = 256;
 
 struct Entity {
   std::string_view text;
@@ -30,26 +34,32 @@ constexpr std::array<Entity, 8> kEntities{{{"&lt;", '<'},
                                            {"&#10;", '\n'},
                                            {"&#13;", '\r'}}};
 
-// Classes of the 256 byte values.
-constexpr std::uint8_t kXmlCharacter = 1;    // 0x09, 0x0A, 0x0D, 0x20 to 0xFE
-constexpr std::uint8_t kNoNameStart = 2;     // a digit or a punctuation character
-constexpr std::uint8_t kEndsPlainValue = 4;  // what an attribute value cannot simply run over
+// Classes of the 256 byte values. Each of the last four is what a run of that kind cannot simply go over; NUL, which
+// stands behind the text, ends all of them.
+constexpr std::uint8_t kXmlCharacter = 1;  // 0x09, 0x0A, 0x0D, 0x20 to 0xFE
+constexpr std::uint8_t kNoNameStart = 2;   // a digit or a punctuation character
+constexpr std::uint8_t kStopsValue = 4;
+constexpr std::uint8_t kStopsText = 8;
+constexpr std::uint8_t kStopsTagName = 16;
+constexpr std::uint8_t kStopsAttributeName = 32;
 
 constexpr std::array<std::uint8_t, 256> MakeClasses() {
   std::array<std::uint8_t, 256> classes{};
   for (unsigned c = 0; c < 256; ++c) {
-    std::uint8_t bits = 0;
-    if (c == 0x09 || c == 0x0A || c == 0x0D || (c >= 0x20 && c <= 0xFE)) {
-      bits |= kXmlCharacter;
-    }
+    const auto isOneOf = [&](std::string_view set) {
+      return set.find(static_cast<char>(c)) != std::string_view::npos;
+    };
     const bool letter = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z');
-    if (c > 0x20 && c < 0x7F && !letter) {
-      bits |= kNoNameStart;
-    }
-    if (c == '<' || c == '>' || c == '"' || c == '\'') {
-      bits |= kEndsPlainValue;
-    }
-    classes[c] = bits;
+    const bool xmlCharacter = isOneOf("\t\n\r") || (c >= 0x20 && c <= 0xFE);
+    const auto add = [&](std::uint8_t bit, bool wanted) {
+      classes[c] = static_cast<std::uint8_t>(classes[c] | (wanted ? bit : 0U));
+    };
+    add(kXmlCharacter, xmlCharacter);
+    add(kNoNameStart, c > 0x20 && c < 0x7F && !letter);
+    add(kStopsValue, isOneOf("<>-&\"'") || !xmlCharacter);
+    add(kStopsText, isOneOf("<>-") || c == 0);
+    add(kStopsTagName, isOneOf("<>-/ \t\n\r") || c == 0);
+    add(kStopsAttributeName, isOneOf("<>-= \t\n\r") || c == 0);
   }
   return classes;
 }
@@ -57,46 +67,39 @@ constexpr std::array<std::uint8_t, 256> kClasses = MakeClasses();
 
 constexpr bool Is(char c, std::uint8_t wanted) { return (kClasses[static_cast<std::uint8_t>(c)] & wanted) != 0; }
 
-// Thrown inside one level and turned into the error of that level there.
-struct LevelError {
-  std::string message;
-};
+constexpr bool MayBeCommentMark(char c) { return c == '<' || c == '-'; }
 
-std::string WithoutComments(std::string_view text) {
-  std::string result;
-  int depth = 0;
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    if (text.substr(i, kCommentStart.size()) == kCommentStart) {
-      ++depth;
-      i += kCommentStart.size() - 1;
-    } else if (depth > 0 && text.substr(i, kCommentEnd.size()) == kCommentEnd) {
-      --depth;
-      i += kCommentEnd.size() - 1;
-    } else if (depth == 0) {
-      result += text[i];
+// `commentDepth` is the element's where `raw` begins.
+std::string WithoutComments(std::string_view raw, int commentDepth) {
+  std::string kept;
+  while (!raw.empty()) {
+    if (raw.starts_with(kCommentStart)) {
+      ++commentDepth;
+      raw.remove_prefix(kCommentStartSize);
+    } else if (raw.starts_with(kCommentEnd)) {
+      --commentDepth;
+      raw.remove_prefix(kCommentEndSize);
+    } else {
+      kept.append(raw, 0, commentDepth > 0 ? 0 : 1);
+      raw.remove_prefix(1);
     }
   }
-  return result;
+  return kept;
 }
 
 }  // namespace
 
 std::string DecodeXmlEntities(std::string_view text) {
-  std::size_t ampersand = text.find('&');
-  if (ampersand == std::string_view::npos) {
-    return std::string(text);
-  }
   std::string decoded;
   decoded.reserve(text.size());
   std::size_t at = 0;
-  while (ampersand != std::string_view::npos) {
+  for (std::size_t ampersand = text.find('&'); ampersand != std::string_view::npos; ampersand = text.find('&', at)) {
     decoded += text.substr(at, ampersand - at);
     const std::string_view rest = text.substr(ampersand);
     const auto entity =
         std::find_if(kEntities.begin(), kEntities.end(), [&](const Entity& e) { return rest.starts_with(e.text); });
     decoded += entity == kEntities.end() ? '&' : entity->character;
     at = ampersand + (entity == kEntities.end() ? 1 : entity->text.size());
-    ampersand = text.find('&', at);
   }
   decoded += text.substr(at);
   return decoded;
@@ -107,97 +110,105 @@ std::string_view XmlCharactersOf(std::string_view text) {
   return text.substr(0, static_cast<std::size_t>(bad - text.begin()));
 }
 
+XmlParser::XmlParser(const std::string& text, bool lenient) : text_(text.c_str()), lenient_(lenient) {}
+
 bool XmlParser::ParseElement(XmlObject& object) {
-  const bool found = Parse(object, 0, false);
-  object.Relink();
+  const bool found = Parse(true);
+  object = std::move(stack_.front());
   return found;
 }
 
-bool XmlParser::SkipElement() {
-  XmlObject nothing;
-  return Parse(nothing, 0, true);
+bool XmlParser::SkipElement() { return Parse(false); }
+
+inline void XmlParser::RunTo(std::uint8_t stops) {
+  const char* here = text_.data() + position_;
+  while (!Is(*here, stops)) {
+    ++here;
+  }
+  position_ = static_cast<std::size_t>(here - text_.data());
 }
 
-// "line, position" of the character that is being looked at. Counted only when it is asked for.
-std::string XmlParser::Place() const {
-  const std::string_view read = text_.substr(0, std::min(position_ + 1, text_.size()));
-  const auto line = 1 + std::count(read.begin(), read.end(), '\n');
-  const std::size_t feed = read.rfind('\n');
-  const std::size_t column = feed == std::string_view::npos ? read.size() : read.size() - feed - 1;
-  return "(line " + std::to_string(line) + ", position " + std::to_string(column) + ") ";
-}
-
-void XmlParser::Fail(const std::string& message) { throw LevelError{message}; }
-
-bool XmlParser::Parse(XmlObject& object, int depth, bool skip) {
-  const std::size_t firstPair = pairs_.size();
-  try {
-    return ParseHere(object, depth, skip);
-  } catch (const LevelError& error) {
-    if (object.attributes.empty()) {
-      StoreAttributes(object, firstPair);  // the element as far as it was built
+// The element stands complete at the bottom of the stack afterwards.
+bool XmlParser::Parse(bool keep) {
+  keep_ = keep;
+  begin_ = position_;
+  open_.clear();
+  stack_.clear();
+  OpenElement();
+  if (!FindTag()) {
+    return false;
+  }
+  for (;;) {
+    if (ParseStartTag()) {
+      CloseElement();
     }
-    object.Relink();
-    throw std::runtime_error("XML Parsing Error " + Place() + error.message + object.ToString(false));
+    while (!open_.empty() && ParseContent()) {
+      CloseElement();
+    }
+    if (open_.empty()) {
+      return true;
+    }
+    OpenElement();  // a child
+    if (!FindTag()) {
+      CloseElement();
+      Fail("Missing end tag: " + std::string(Innermost().name));
+    }
   }
 }
 
-bool XmlParser::ParseHere(XmlObject& object, int depth, bool skip) {
-  if (depth > XmlObject::kDeepestElement) {
+void XmlParser::OpenElement() {
+  if (open_.size() > XmlObject::kDeepestElement) {
     Fail("Elements are nested deeper than " + std::to_string(XmlObject::kDeepestElement) + " levels");
   }
-  if (!FindTag(object)) {
-    return false;
-  }
-  if (ParseStartTag(object, !skip || depth == 0)) {
-    return true;
-  }
-  ParseContent(object, depth, skip);
-  return true;
+  open_.push_back({stack_.size()});
+  stack_.emplace_back().depth = static_cast<int>(open_.size()) - 1;
 }
 
-// Moves behind a comment that begins here; comments nest. True when there was one.
-bool XmlParser::SkipComment() {
-  if (!At(kCommentStart)) {
-    return false;
+void XmlParser::CloseElement() {
+  TakeChildren();
+  open_.pop_back();
+  if (open_.empty()) {
+    return;
   }
-  int depth = 0;
-  while (!AtEnd()) {
-    if (At(kCommentStart)) {
-      ++depth;
-      position_ += kCommentStart.size();
-    } else if (At(kCommentEnd)) {
-      position_ += kCommentEnd.size();
-      if (--depth == 0) {
-        return true;
-      }
-    } else {
-      // Only these two characters can begin a mark.
-      position_ = std::min(text_.find_first_of("<-", position_ + 1), text_.size());
+  if (!keep_) {
+    stack_.pop_back();
+  } else if (stack_.size() - open_.back().place > kMostWaitingChildren) {
+    TakeChildren();
+  }
+}
+
+// Moves the complete children of the innermost element from the stack into it. Their links to it are set when it
+// moves to its own place.
+void XmlParser::TakeChildren() {
+  const auto first = stack_.begin() + static_cast<std::ptrdiff_t>(open_.back().place) + 1;
+  std::vector<XmlObject>& children = Innermost().children;
+  const std::size_t needed = children.size() + static_cast<std::size_t>(stack_.end() - first);
+  if (needed > children.capacity()) {
+    children.reserve(std::max(needed, 2 * children.capacity()));
+  }
+  std::move(first, stack_.end(), std::back_inserter(children));
+  stack_.erase(first, stack_.end());
+}
+
+// Moves behind the "<" of the element's tag, gathering declaration and instructions on the way. False at the end of
+// the text.
+bool XmlParser::FindTag() {
+  for (;;) {
+    SkipBlanks();
+    if (AtEnd()) {
+      return false;
     }
-  }
-  return true;
-}
-
-// Moves behind the "<" of the element's tag, gathering declaration and instructions on the way.
-bool XmlParser::FindTag(XmlObject& object) {
-  while (!AtEnd()) {
-    const char c = text_[position_];
-    if (IsXmlSpace(c)) {
-      ++position_;
-    } else if (SkipComment()) {
-      continue;
-    } else if (c != '<') {
+    if (Here() != '<') {
       Fail("Left angle bracket character expected");
-    } else if (!TakeInstruction(object)) {
+    }
+    if (!TakeInstruction()) {
       ++position_;
       return true;
     }
   }
-  return false;
 }
 
-bool XmlParser::TakeInstruction(XmlObject& object) {
+bool XmlParser::TakeInstruction() {
   if (!At("<?")) {
     return false;
   }
@@ -206,216 +217,267 @@ bool XmlParser::TakeInstruction(XmlObject& object) {
     Fail("Missing end tag: <?");
   }
   const std::string_view inner = text_.substr(position_ + 2, end - position_ - 2);
-  if (inner.size() > 3 && inner.substr(0, 3) == "xml" && IsXmlSpace(inner[3])) {
+  if (inner.size() > 3 && inner.starts_with("xml") && IsXmlSpace(inner[3])) {
     const std::string rewritten = "<" + std::string(inner) + "/>";
     XmlObject element;
     XmlParser(rewritten).ParseElement(element);
-    object.declaration = std::move(element.attributes);
+    Innermost().GetProlog().declaration = std::move(element.attributes);
   } else {
-    object.instructions.emplace_back(text_.substr(position_, end + 2 - position_));
+    Innermost().GetProlog().instructions.emplace_back(text_.substr(position_, end + 2 - position_));
   }
   position_ = end + 2;
   return true;
 }
 
 // From behind the "<" to behind the ">". True when the element has ended with its start tag.
-bool XmlParser::ParseStartTag(XmlObject& object, bool withAttributes) {
-  const std::size_t firstPair = pairs_.size();
-  ParseName(object);
-  while (!AtEnd() && text_[position_] != '>') {
-    const char c = text_[position_];
-    if (c == '<' && SkipComment()) {
+bool XmlParser::ParseStartTag() {
+  ParseName();
+  const bool withAttributes = keep_ || open_.size() == 1;
+  for (char c = Here(); c != '>'; c = Here()) {
+    if (AtEnd()) {
+      Fail("Missing end tag: " + std::string(Innermost().name));
+    }
+    if (MayBeCommentMark(c) && SkipComment()) {
       continue;
     }
     if (!withAttributes || IsXmlSpace(c) || c == '/') {
       ++position_;
-    } else if (!ParseAttribute(object)) {
+    } else {
+      ParseAttribute();
+    }
+  }
+  StoreAttributes();
+  ++position_;
+  return text_[position_ - 2] == '/';
+}
+
+// A tag spelled "xml" is a name like any other.
+void XmlParser::ParseName() {
+  SkipBlanks();
+  const std::size_t begin = position_;
+  for (;; ++position_) {
+    RunTo(kStopsTagName);
+    const char c = Here();
+    const bool goesOn = c == '/' ? !At("/>") : MayBeCommentMark(c) && !At(kCommentStart) && !At(kCommentEnd);
+    if (AtEnd() || !goesOn) {
       break;
     }
   }
+  const std::string_view name = text_.substr(begin, position_ - begin);
   if (AtEnd()) {
-    Fail("Missing end tag: " + object.name);
+    Fail("Missing end tag: " + std::string(name));
   }
-  StoreAttributes(object, firstPair);
-  const bool ended = text_[position_ - 1] == '/';
-  ++position_;
-  return ended;
+  if (name.empty() || Is(name.front(), kNoNameStart)) {
+    Fail(IsXmlSpace(Here()) ? "Invalid tag name: " + std::string(name) : "Invalid tag name");
+  }
+  Innermost().name = name;
 }
 
-void XmlParser::ParseName(XmlObject& object) {
-  while (!AtEnd() && (IsXmlSpace(text_[position_]) || SkipComment())) {
-    position_ += AtEnd() || !IsXmlSpace(text_[position_]) ? 0 : 1;
-  }
+// One attribute. When the tag's ">" or the text's end comes before it is complete, it is dropped.
+void XmlParser::ParseAttribute() {
   const std::size_t begin = position_;
-  while (!AtEnd() && !IsXmlSpace(text_[position_]) && text_[position_] != '>' && !At("/>") && !At(kCommentStart)) {
-    ++position_;
-  }
-  object.name = text_.substr(begin, position_ - begin);
-  if (AtEnd()) {
-    Fail("Missing end tag: " + object.name);
-  }
-  if (object.name.empty() || Is(object.name.front(), kNoNameStart)) {
-    const bool atSpace = IsXmlSpace(text_[position_]);
-    const std::string refused = std::exchange(object.name, {});
-    Fail(atSpace ? "Invalid tag name: " + refused : "Invalid tag name");
-  }
-}
-
-// One attribute. False when the tag's ">" came before it was complete: it is dropped then.
-bool XmlParser::ParseAttribute(XmlObject& object) {
-  const std::size_t begin = position_;
-  while (!AtEnd() && !IsXmlSpace(text_[position_]) && text_[position_] != '=' && text_[position_] != '>') {
-    ++position_;
-  }
-  const std::string_view attribute = text_.substr(begin, position_ - begin);
-  if (AtEnd() || text_[position_] == '>') {
-    return false;
-  }
-  if (!lenient_ && (attribute.empty() || Is(attribute.front(), kNoNameStart))) {
-    Fail("Invalid attribute name: " + std::string(attribute));
-  }
-  while (!AtEnd() && text_[position_] != '=') {
-    const char c = text_[position_];
-    if (c == '>') {
-      return false;
+  for (;; ++position_) {
+    RunTo(kStopsAttributeName);
+    if (!MayBeCommentMark(Here()) || At(kCommentStart) || At(kCommentEnd)) {
+      break;
     }
-    if (SkipComment()) {
-      continue;
-    }
-    if (!IsXmlSpace(c)) {
-      Fail("Equal chracter expected: " + std::string(1, c) + " attribute value: " + std::string(attribute) +
-           " tag value: " + object.name);
-    }
-    ++position_;
   }
-  if (AtEnd()) {
-    return false;
+  if (AtEnd() || Here() == '>') {
+    return;
+  }
+  const std::string_view name = text_.substr(begin, position_ - begin);
+  if (!lenient_ && (name.empty() || Is(name.front(), kNoNameStart))) {
+    Fail("Invalid attribute name: " + std::string(name));
+  }
+  SkipBlanks();
+  if (AtEnd() || Here() == '>') {
+    return;
+  }
+  if (Here() != '=') {
+    Fail("Equal chracter expected: " + std::string(1, Here()) + " attribute value: " + std::string(name) +
+         " tag value: " + std::string(Innermost().name));
   }
   ++position_;
-  while (!AtEnd() && text_[position_] != '"' && text_[position_] != '\'') {
-    const char c = text_[position_];
-    if (c == '>') {
-      return false;
+  SkipBlanks();
+  if (AtEnd() || Here() == '>') {
+    return;
+  }
+  const char quote = Here();
+  if (quote != '"' && quote != '\'') {
+    Fail("Single or double quote expected: " + std::string(1, quote) + " attribute: " + std::string(name) +
+         " tag value: " + std::string(Innermost().name) + "\n\n\n");
+  }
+  const std::size_t valueBegin = ++position_;
+  const int commentDepth = open_.back().commentDepth;
+  bool encoded = false;
+  bool hasComments = false;
+  for (;;) {
+    RunTo(kStopsValue);
+    const char c = Here();
+    if (c == quote) {
+      break;
     }
-    if (SkipComment()) {
+    if (c == '>' || AtEnd()) {
+      return;
+    }
+    if (MayBeCommentMark(c) && SkipComment()) {
+      hasComments = true;
       continue;
     }
-    if (!IsXmlSpace(c)) {
-      Fail("Single or double quote expected: " + std::string(1, c) + " attribute: " + std::string(attribute) +
-           " tag value: " + object.name + "\n\n\n");
-    }
+    encoded = encoded || c == '&' || !Is(c, kXmlCharacter);
     ++position_;
   }
-  if (AtEnd()) {
-    return false;
+  std::string_view value = text_.substr(valueBegin, position_ - valueBegin);
+  if (hasComments) {
+    value = cleaned_.emplace_back(WithoutComments(value, commentDepth));
   }
-  const char quote = text_[position_++];
-  const std::size_t valueBegin = position_;
-  bool hasComment = false;
-  while (!AtEnd() && text_[position_] != quote) {
-    if (!Is(text_[position_], kEndsPlainValue)) {
+  AddAttribute({name, value, encoded});
+  ++position_;
+}
+
+// Moves over white space and comments.
+void XmlParser::SkipBlanks() {
+  do {
+    while (IsXmlSpace(Here())) {
       ++position_;
-      continue;
     }
-    if (text_[position_] == '>') {
-      return false;
-    }
-    if (SkipComment()) {
-      hasComment = true;
-      continue;
-    }
-    ++position_;
+  } while (MayBeCommentMark(Here()) && SkipComment());
+}
+
+// A repeated name (without regard to case) overwrites the first one's value.
+void XmlParser::AddAttribute(const Attribute& attribute) {
+  if (Attribute* first = FindRepeated(attribute.name)) {
+    first->value = attribute.value;
+    first->encoded = attribute.encoded;
+  } else {
+    tag_.push_back(attribute);
   }
-  if (AtEnd()) {
+}
+
+XmlParser::Attribute* XmlParser::FindRepeated(std::string_view name) {
+  if (tag_.size() < kManyAttributes) {
+    const auto found = std::find_if(tag_.begin(), tag_.end(), [&](const Attribute& known) {
+      return known.name.size() == name.size() && CDMUtil::EqualIgnoreCase(known.name, name);
+    });
+    return found == tag_.end() ? nullptr : &*found;
+  }
+  if (manyNames_.empty()) {
+    for (std::size_t i = 0; i < tag_.size(); ++i) {
+      manyNames_.emplace(CDMUtil::ToLower(tag_[i].name), i);
+    }
+  }
+  const auto [place, isNew] = manyNames_.emplace(CDMUtil::ToLower(name), tag_.size());
+  return isNew ? nullptr : &tag_[place->second];
+}
+
+// Moves the gathered attributes into the element.
+void XmlParser::StoreAttributes() {
+  std::vector<XmlAttribute>& attributes = Innermost().attributes;
+  attributes.reserve(tag_.size());
+  for (const Attribute& attribute : tag_) {
+    if (attribute.encoded) {
+      attributes.emplace_back(attribute.name, XmlCharactersOf(DecodeXmlEntities(attribute.value)));
+    } else {
+      attributes.emplace_back(attribute.name, attribute.value);
+    }
+  }
+  tag_.clear();
+  cleaned_.clear();
+  manyNames_.clear();
+}
+
+// Reads on from behind a start tag or a child. True when the element has ended; false at the "<" of a
+// child.
+bool XmlParser::ParseContent() {
+  const std::size_t begin = position_;
+  const int commentDepth = open_.back().commentDepth;
+  bool hasComments = false;
+  for (;;) {
+    RunTo(kStopsText);
+    const char c = Here();
+    if (AtEnd()) {
+      Fail("Missing end tag: " + std::string(Innermost().name));
+    }
+    if (c == '>') {
+      ++position_;
+      if (text_[position_ - 2] == '/') {
+        return true;  // a "/>" in the text ends the element as well
+      }
+    } else if (SkipComment()) {
+      hasComments = true;
+    } else if (c == '<') {
+      break;
+    } else {
+      ++position_;
+    }
+  }
+  if (std::exchange(open_.back().firstRun, false) && keep_) {
+    TakeText(text_.substr(begin, position_ - begin), hasComments, commentDepth);
+  }
+  if (!At("</")) {
     return false;
   }
-  const std::string_view raw = text_.substr(valueBegin, position_ - valueBegin);
-  ++position_;
-  std::string decoded = DecodeXmlEntities(hasComment ? WithoutComments(raw) : raw);
-  decoded.resize(XmlCharactersOf(decoded).size());
-  pairs_.push_back({attribute, std::move(decoded)});
+  const std::size_t end = text_.find('>', position_);
+  if (end == std::string_view::npos) {
+    Fail("Missing Right Angle Bracket Character");
+  }
+  position_ = end + 1;
   return true;
 }
 
-// Moves the gathered pairs into the object, a repeated name (without regard to case) overwriting the first.
-void XmlParser::StoreAttributes(XmlObject& object, std::size_t first) {
-  const std::size_t count = pairs_.size() - first;
-  object.attributes.reserve(count);
-  std::unordered_map<std::string, std::size_t> places;
-  for (std::size_t i = first; i < pairs_.size(); ++i) {
-    XmlAttribute* known = nullptr;
-    if (count < kManyAttributes) {
-      known = object.FindAttribute(pairs_[i].name);
-    } else {
-      const auto [place, isNew] = places.emplace(CDMUtil::ToLower(pairs_[i].name), object.attributes.size());
-      known = isNew ? nullptr : &object.attributes[place->second];
-    }
-    if (known != nullptr) {
-      known->value = std::move(pairs_[i].value);
-    } else {
-      object.attributes.emplace_back(std::string(pairs_[i].name), std::move(pairs_[i].value));
-    }
-  }
-  pairs_.resize(first);
-}
-
-// The first text of an element becomes its value when it holds more than white space.
-void XmlParser::TakeText(XmlObject& object, std::string_view run, bool hasComment) const {
+// A run that holds more than white space becomes the element's value.
+void XmlParser::TakeText(std::string_view run, bool hasComments, int commentDepth) {
   std::string cleaned;
-  if (hasComment) {
-    cleaned = WithoutComments(run);
+  if (hasComments) {
+    cleaned = WithoutComments(run, commentDepth);
     run = cleaned;
   }
   if (!std::all_of(run.begin(), run.end(), IsXmlSpace)) {
-    object.value = DecodeXmlEntities(run);
+    Innermost().value = DecodeXmlEntities(run);
   }
 }
 
-void XmlParser::ParseContent(XmlObject& object, int depth, bool skip) {
-  const std::size_t runBegin = position_;
-  bool firstRun = true;
-  bool hasComment = false;
-  for (;;) {
-    const std::size_t tag = std::min(text_.find('<', position_), text_.size());
-    // A "/>" in the text ends the element as well.
-    const std::size_t close = text_.substr(0, tag).find("/>", std::max(position_, std::size_t{1}) - 1);
-    if (close != std::string_view::npos) {
-      position_ = close + 2;
-      return;
-    }
-    position_ = tag;
-    if (AtEnd()) {
-      Fail("Missing end tag: " + object.name);
-    }
-    if (SkipComment()) {
-      hasComment = true;
-      continue;
-    }
-    if (std::exchange(firstRun, false) && !skip) {
-      TakeText(object, text_.substr(runBegin, position_ - runBegin), hasComment);
-    }
-    if (position_ + 1 < text_.size() && text_[position_ + 1] == '/') {
-      const std::size_t end = text_.find('>', position_);
-      if (end == std::string_view::npos) {
-        Fail("Missing Right Angle Bracket Character");
-      }
-      position_ = end + 1;
-      return;
-    }
-    bool complete = true;
-    if (skip) {
-      XmlObject nothing;
-      complete = Parse(nothing, depth + 1, true);
-    } else {
-      complete = Parse(object.children.emplace_back(), depth + 1, false);
-      if (!complete) {
-        object.children.pop_back();
-      }
-    }
-    if (!complete) {
-      Fail("Missing end tag: " + object.name);
-    }
+// Moves behind a comment that begins here; comments nest. A closing mark outside a comment is skipped as well, and
+// takes the effect from the next opening one. True when there was a mark.
+bool XmlParser::SkipComment() {
+  if (!At(kCommentStart) && !At(kCommentEnd)) {
+    return false;
   }
+  int& depth = open_.back().commentDepth;
+  do {
+    if (At(kCommentStart)) {
+      ++depth;
+      position_ += kCommentStartSize;
+    } else if (At(kCommentEnd)) {
+      --depth;
+      position_ += kCommentEndSize;
+    } else {
+      ++position_;
+      while (!AtEnd() && !MayBeCommentMark(Here())) {
+        ++position_;
+      }
+    }
+  } while (depth > 0 && !AtEnd());
+  return true;
+}
+
+// "line, position" of the character that is being looked at, counted from where the search for the top-level element
+// began. Counted only when it is asked for.
+std::string XmlParser::Place() const {
+  const std::string_view read = text_.substr(begin_, position_ + 1 - begin_);
+  const auto line = 1 + std::count(read.begin(), read.end(), '\n');
+  const std::size_t feed = read.rfind('\n');
+  const std::size_t column = feed == std::string_view::npos ? read.size() : read.size() - feed - 1;
+  return "(line " + std::to_string(line) + ", position " + std::to_string(column) + ") ";
+}
+
+// The message ends with the text of the innermost element as far as it was built.
+void XmlParser::Fail(const std::string& message) {
+  StoreAttributes();
+  TakeChildren();
+  Innermost().depth = 0;
+  Innermost().Relink();
+  throw std::runtime_error("XML Parsing Error " + Place() + message + Innermost().ToString(false));
 }
 
 }  // namespace panelglow

@@ -1,9 +1,13 @@
-// The parser behind XmlObject: one pass over one text, no copy but of what is kept.
+// The parser behind XmlObject: one pass over one text. Each element is built once, with its lists at their final
+// size, and moved once, when its parent is complete.
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
+#include <list>
 #include <string>
 #include <string_view>
+#include <unordered_map>
 #include <vector>
 
 #include "config/XmlObject.h"
@@ -12,8 +16,10 @@ namespace panelglow {
 
 class XmlParser {
  public:
-  /// `text` must outlive the parser. `lenient`: attribute names may begin with any character.
-  explicit XmlParser(std::string_view text, bool lenient = false) : text_(text), lenient_(lenient) {}
+  /// `text` must outlive the parser; it ends at its first NUL. `lenient`: attribute names may begin with any
+  /// character.
+  explicit XmlParser(const std::string& text, bool lenient = false);
+  explicit XmlParser(std::string&& text, bool lenient = false) = delete;
 
   /// Parses the next top-level element into `object`, which is empty. True when there was one; false when only white
   /// space, comments and instructions were left (the latter are kept in `object`). Throws std::runtime_error.
@@ -22,35 +28,70 @@ class XmlParser {
   /// Moves behind the next top-level element without keeping anything. False when there was none.
   bool SkipElement();
 
-  /// Where the next element would begin.
-  [[nodiscard]] std::size_t Position() const { return position_; }
-
  private:
-  struct Pair {
+  // An attribute of the tag being read.
+  struct Attribute {
     std::string_view name;
-    std::string value;
+    std::string_view value;  // raw, or without its comments in `cleaned_`
+    bool encoded = false;    // the value is to be decoded and cut
   };
 
-  bool Parse(XmlObject& object, int depth, bool skip);
-  bool ParseHere(XmlObject& object, int depth, bool skip);
-  bool FindTag(XmlObject& object);
-  bool TakeInstruction(XmlObject& object);
-  bool ParseStartTag(XmlObject& object, bool withAttributes);
-  void ParseName(XmlObject& object);
-  bool ParseAttribute(XmlObject& object);
-  void ParseContent(XmlObject& object, int depth, bool skip);
-  void TakeText(XmlObject& object, std::string_view run, bool hasComment) const;
-  void StoreAttributes(XmlObject& object, std::size_t first);
+  // An element whose end has not been found yet. On the stack it is followed by its complete children.
+  struct Open {
+    std::size_t place = 0;  // on the stack
+    int commentDepth = 0;
+    bool firstRun = true;  // no text run has ended yet
+  };
+
+  bool Parse(bool keep);
+  void OpenElement();
+  void CloseElement();
+  bool FindTag();
+  bool TakeInstruction();
+  bool ParseStartTag();
+  void ParseName();
+  void ParseAttribute();
+  void SkipBlanks();
+  void AddAttribute(const Attribute& attribute);
+  Attribute* FindRepeated(std::string_view name);
+  void StoreAttributes();
+  bool ParseContent();
+  void TakeText(std::string_view run, bool hasComments, int commentDepth);
+  void TakeChildren();
   bool SkipComment();
-  [[nodiscard]] bool At(std::string_view word) const { return text_.substr(position_, word.size()) == word; }
+
+  // True when `word` stands here. The NUL behind the text differs from every word.
+  template <std::size_t Size>
+  [[nodiscard]] bool At(const char (&word)[Size]) const {
+    const char* here = text_.data() + position_;
+    for (std::size_t i = 0; i + 1 < Size; ++i) {
+      if (here[i] != word[i]) {
+        return false;
+      }
+    }
+    return true;
+  }
   [[nodiscard]] bool AtEnd() const { return position_ >= text_.size(); }
+
+  // The character here; NUL at the end of the text.
+  [[nodiscard]] char Here() const { return *(text_.data() + position_); }
+
+  // Moves to the next character of one of the classes `stops`, which has NUL among them.
+  void RunTo(std::uint8_t stops);
+  [[nodiscard]] XmlObject& Innermost() { return stack_[open_.back().place]; }
   [[nodiscard]] std::string Place() const;
   [[noreturn]] void Fail(const std::string& message);
 
-  std::string_view text_;
+  std::string_view text_;  // a NUL stands behind it
   bool lenient_;
+  bool keep_ = true;
   std::size_t position_ = 0;
-  std::vector<Pair> pairs_;  // attributes of the start tags being read, innermost last
+  std::size_t begin_ = 0;           // of the top-level element being read
+  std::vector<Open> open_;          // outermost first
+  std::vector<XmlObject> stack_;    // the open elements, each with its complete children behind it
+  std::vector<Attribute> tag_;      // attributes of the tag being read
+  std::list<std::string> cleaned_;  // values of it that held comments
+  std::unordered_map<std::string, std::size_t> manyNames_;  // lowered names of a tag with many attributes
 };
 
 /// Replaces the known entities by their characters, from left to right; any other "&" stays.

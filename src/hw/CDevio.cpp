@@ -307,7 +307,9 @@ bool CDevio::FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, s
                                 std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location) {
   constexpr std::array<std::uint16_t, 4> kIdRegisters{0x00, 0x02, 0x2C, 0x2E};
   const std::array<std::uint16_t, 4> wanted{vendor, deviceId, subVendor, subDevice};
-  for (std::uint16_t index = 0; FindPciClass(classCode, index, location) == 0; ++index) {
+  constexpr std::uint32_t kMostFunctions = 0x10000;  // every location once
+  for (std::uint32_t index = 0;
+       index < kMostFunctions && FindPciClass(classCode, static_cast<std::uint16_t>(index), location) == 0; ++index) {
     std::array<std::uint16_t, 4> ids{};
     for (std::size_t i = 0; i < ids.size(); ++i) {
       ReadPciConfigWord(location, kIdRegisters[i], ids[i]);
@@ -316,6 +318,7 @@ bool CDevio::FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, s
       return true;
     }
   }
+  location = 0;
   return false;
 }
 

@@ -79,7 +79,7 @@ class CDevio {
   /// A base address register without its flag bits, with the next register as high half when it is a 64-bit one.
   std::uint8_t ReadPciBar(std::uint16_t location, std::uint16_t reg, std::uint64_t& base);
 
-  /// The first function of the class whose four ids equal the arguments.
+  /// The first function of the class whose four ids equal the arguments; false, and location 0, when there is none.
   bool FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
                           std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location);
 

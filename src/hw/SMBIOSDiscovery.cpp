@@ -21,8 +21,9 @@ constexpr std::size_t kProductCharacters = 4;
 
 // Names of a memory device's type, by the published code, from 1.
 constexpr std::array<std::string_view, 25> kMemoryTypes{
-    "Other",  "Unknown", "DRAM",  "EDRAM",  "VRAM",  "SRAM",  "RAM",  "ROM",      "FLASH",    "EEPROM",   "FEPROM", "EPROM", "CDRAM",
-    "3DRAM",  "SDRAM",   "SGRAM", "RDRAM",  "DDR",   "DDR2",  "DDR2-FBD", "Reserved", "Reserved", "Reserved", "DDR3",   "FBD2"};
+    "Other",  "Unknown",  "DRAM",     "EDRAM",    "VRAM",     "SRAM",  "RAM",   "ROM",   "FLASH",
+    "EEPROM", "FEPROM",   "EPROM",    "CDRAM",    "3DRAM",    "SDRAM", "SGRAM", "RDRAM", "DDR",
+    "DDR2",   "DDR2-FBD", "Reserved", "Reserved", "Reserved", "DDR3",  "FBD2"};
 
 // Names of a memory array's error correction, by the published code, from 1.
 constexpr std::array<std::string_view, 7> kErrorCorrections{"Other",          "Unknown",       "None", "Parity",
@@ -115,14 +116,17 @@ std::size_t SMBIOSDiscovery::ParseStructure(std::span<const std::uint8_t> rest) 
   if (at < rest.size() && rest[at] == 0) {
     at += at + 1 < rest.size() && rest[at + 1] == 0 ? 2 : 1;
   } else {
-    for (std::size_t number = 1; number < kMostStrings && at < rest.size() && rest[at] != 0; ++number) {
+    // Strings past the last number that a field can hold are passed over.
+    for (std::size_t number = 1; at < rest.size() && rest[at] != 0; ++number) {
       const auto end = std::find(rest.begin() + static_cast<std::ptrdiff_t>(at), rest.end(), std::uint8_t{0});
       std::string text(rest.begin() + static_cast<std::ptrdiff_t>(at), end);
       at += text.size() + 1;
       if (text.find_first_not_of(' ') == std::string::npos) {
         text.clear();  // keeps its number
       }
-      structure.AddString(std::move(text));
+      if (number < kMostStrings) {
+        structure.AddString(std::move(text));
+      }
     }
     ++at;
   }
@@ -166,9 +170,9 @@ void SMBIOSDiscovery::ReadBios(const Structure& s) {
 
 void SMBIOSDiscovery::ReadSystem(const Structure& s) {
   // The first three fields are little-endian numbers, the rest stands in stored order.
-  systemInfo.uuid = Format("%08X-%04X-%04X-%02X%02X-%02X%02X%02X%02X%02X%02X", s.Dword(8), s.Word(12), s.Word(14),
-                           s.Byte(16), s.Byte(17), s.Byte(18), s.Byte(19), s.Byte(20), s.Byte(21), s.Byte(22),
-                           s.Byte(23));
+  systemInfo.uuid =
+      Format("%08X-%04X-%04X-%02X%02X-%02X%02X%02X%02X%02X%02X", s.Dword(8), s.Word(12), s.Word(14), s.Byte(16),
+             s.Byte(17), s.Byte(18), s.Byte(19), s.Byte(20), s.Byte(21), s.Byte(22), s.Byte(23));
   systemInfo.manufacturer = s.Text(4);
   systemInfo.productName = s.Text(5);
   systemInfo.version = s.Text(6);
@@ -216,29 +220,59 @@ void SMBIOSDiscovery::ReadProcessor(const Structure& s) {
 }
 
 void SMBIOSDiscovery::ReadCache(const Structure& s) {
-  caches.push_back(s.Text(4) + " " + CDMUtil::ToString(static_cast<unsigned>(s.Word(9) & 0x7FFFU)));
+  constexpr std::uint16_t kIn64KB = 1U << 15U;  // otherwise in KB
+  const std::uint16_t configuration = s.Word(5);
+  const std::uint16_t size = s.Word(9);
+  const unsigned size_KB = (size & 0x7FFFU) * ((size & kIn64KB) != 0 ? 64U : 1U);
+  caches.push_back({Format("L%d", (configuration & 7) + 1), Format("%u", size_KB), s.Text(4)});
 }
 
-void SMBIOSDiscovery::ReadMemoryArray(const Structure& s) { memoryArrays.push_back(NameOf(kErrorCorrections, s.Byte(6))); }
+void SMBIOSDiscovery::ReadMemoryArray(const Structure& s) {
+  constexpr std::uint32_t kUnknownCapacity = 0x80000000;
+  std::uint32_t capacity = s.Dword(7);  // KB
+  MemoryArrayInfo info;
+  info.errorCorrection = NameOf(kErrorCorrections, s.Byte(6));
+  info.maximumCapacity = "Unknown";
+  if (capacity < kUnknownCapacity) {
+    constexpr std::string_view kUnits = "KMGT";
+    std::size_t unit = 0;
+    for (; capacity != 0 && capacity % 1024 == 0; capacity /= 1024) {
+      ++unit;
+    }
+    info.maximumCapacity = Format("%d %cB", static_cast<int>(capacity), kUnits[unit]);
+  }
+  memoryArrays.push_back(std::move(info));
+}
 
 void SMBIOSDiscovery::ReadMemoryDevice(const Structure& s) {
-  constexpr std::uint16_t kUnknownSize = 0xFFFF;
+  constexpr std::uint16_t kUnknown = 0xFFFF;
+  constexpr std::uint16_t kInExtendedField = 0x7FFF;
+  constexpr std::uint16_t kInKB = 1U << 15U;  // otherwise in MB
+  const auto number = [](std::uint16_t value) {
+    return value == kUnknown ? "Unknown" : Format("%u", static_cast<unsigned>(value));
+  };
   const std::uint16_t size = s.Word(12);
   MemoryDeviceInfo info;
-  info.size = size == kUnknownSize ? "Unknown" : Format("%u", static_cast<unsigned>(size & 0x7FFFU));
+  info.totalWidth = number(s.Word(8));
+  info.dataWidth = number(s.Word(10));
+  if (size == kUnknown) {
+    info.size = "Unknown";
+  } else if (size == kInExtendedField) {
+    info.size = Format("%u", s.Dword(28) & 0x7FFFFFFFU);
+  } else {
+    info.size = Format("%u", (size & kInKB) != 0 ? (size & 0x7FFFU) / 1024U : unsigned{size});
+  }
   info.installed = size == 0 ? "Not Installed" : "Installed";
   info.type = NameOf(kMemoryTypes, s.Byte(18));
-  info.speed = s.Word(21) == 0 ? "Unknown" : Format("%u", static_cast<unsigned>(s.Word(21)));
+  info.speed = s.Word(21) == 0 ? "Unknown" : number(s.Word(21));
   info.deviceLocator = s.Text(16);
   info.bankLocator = s.Text(17);
   info.manufacturer = s.Text(23);
   info.serial = s.Text(24);
+  info.assetTag = s.Text(25);
   info.partNumber = s.Text(26);
-  // A flash record is not counted: the next one takes its place.
-  if (!memoryDevices.empty() && CDMUtil::EqualIgnoreCase(memoryDevices.back().type, "flash")) {
-    memoryDevices.pop_back();
-  }
-  if (memoryDevices.size() < kMostMemoryDevices) {
+  // Flash is not counted as memory.
+  if (memoryDevices.size() < kMostMemoryDevices && !CDMUtil::EqualIgnoreCase(info.type, "flash")) {
     memoryDevices.push_back(std::move(info));
   }
 }

@@ -28,15 +28,31 @@ struct ProcessorInfo {
 
 /// A type 17 structure.
 struct MemoryDeviceInfo {
-  std::string size;  // megabytes, or "Unknown"
-  std::string installed;
+  std::string size;        // megabytes, or "Unknown"
+  std::string totalWidth;  // bits, or "Unknown"
+  std::string dataWidth;   // bits, or "Unknown"
+  std::string installed;   // "Installed" or "Not Installed"
   std::string type;
   std::string speed;  // MHz, or "Unknown"
   std::string deviceLocator;
   std::string bankLocator;
   std::string manufacturer;
   std::string serial;
+  std::string assetTag;
   std::string partNumber;
+};
+
+/// A type 16 structure.
+struct MemoryArrayInfo {
+  std::string errorCorrection;
+  std::string maximumCapacity;  // as "32 GB", or "Unknown"
+};
+
+/// A type 7 structure.
+struct CacheInfo {
+  std::string level;  // as "L1"
+  std::string size;   // kilobytes
+  std::string socket;
 };
 
 /// The type 1 structure.
@@ -91,8 +107,8 @@ class SMBIOSDiscovery {
   std::uint32_t populatedSockets = 0;
   bool isAmd = false;
   std::uint8_t oemByte = ' ';
-  std::vector<std::string> memoryArrays;  // a text per type 16 structure
-  std::vector<std::string> caches;        // a text per type 7 structure
+  std::vector<MemoryArrayInfo> memoryArrays;
+  std::vector<CacheInfo> caches;
 
  private:
   class Structure;

@@ -19,8 +19,8 @@ constexpr std::uint16_t kTableAddressLow = 24;
 constexpr std::uint16_t kTableAddressHigh = 26;
 constexpr std::uint16_t kStructureCount = 28;
 
-constexpr std::uint16_t kVersion21 = 0x0102;         // counts in one byte only
-constexpr std::uint8_t kMemoryControllerType = 5;    // has a length rule of its own
+constexpr std::uint16_t kVersion21 = 0x0102;       // counts in one byte only
+constexpr std::uint8_t kMemoryControllerType = 5;  // has a length rule of its own
 constexpr std::size_t kHeaderSize = 4;
 
 }  // namespace
@@ -96,8 +96,8 @@ std::string SmbiosScanner::StringOf(std::span<const std::uint8_t> structure, std
   auto at = structure.begin() + structure[1];
   for (unsigned number = 1;; ++number) {
     const auto end = std::find(at, structure.end(), std::uint8_t{0});
-    if (number == index || end == structure.end()) {
-      return number == index ? std::string(at, end) : std::string();
+    if (number == index || at == end || end == structure.end()) {
+      return number == index ? std::string(at, end) : std::string();  // an empty string ends the list
     }
     at = end + 1;
   }

@@ -1,6 +1,8 @@
 #include "hw/Tsk.h"
 
+#include <algorithm>
 #include <cstdlib>
+#include <limits>
 
 #include "harness/base/CDMException.h"
 #include "hw/CDevio.h"
@@ -38,9 +40,12 @@ std::string ProductText() {
 
 }  // namespace
 
+// The program's home system has a `long` of 32 bits: a text of more digits than that stands for its largest value.
 std::uint16_t SystemIdOf(std::string_view productText) {
   constexpr int kHexadecimal = 16;
-  return static_cast<std::uint16_t>(std::strtol(std::string(productText).c_str(), nullptr, kHexadecimal));
+  const long long number = std::strtoll(std::string(productText).c_str(), nullptr, kHexadecimal);
+  return static_cast<std::uint16_t>(std::clamp<long long>(number, std::numeric_limits<std::int32_t>::min(),
+                                                          std::numeric_limits<std::int32_t>::max()));
 }
 
 bool Tsk_GetSystemID(std::uint16_t& id) {

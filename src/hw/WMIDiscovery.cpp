@@ -46,6 +46,19 @@ std::optional<double> NumberOf(const platform::ManagementScalar& scalar) {
       scalar);
 }
 
+// The low byte of an integer; 0 for anything else.
+std::uint8_t ByteOf(const platform::ManagementScalar& scalar) {
+  return std::visit(
+      [](const auto& value) -> std::uint8_t {
+        if constexpr (std::is_integral_v<std::decay_t<decltype(value)>>) {
+          return static_cast<std::uint8_t>(value);
+        } else {
+          return 0;
+        }
+      },
+      scalar);
+}
+
 }  // namespace
 
 WMIDiscovery& WMIDiscovery::Instance() {
@@ -123,7 +136,7 @@ int WMIDiscovery::GetBinaryProperty(const wstring& className, const wstring& pro
     if (const auto* array = std::get_if<platform::ManagementArray>(&value->content)) {
       destination.clear();
       for (const platform::ManagementScalar& element : *array) {
-        destination.push_back(static_cast<std::uint8_t>(static_cast<std::int64_t>(NumberOf(element).value_or(0))));
+        destination.push_back(ByteOf(element));
       }
     }
   }

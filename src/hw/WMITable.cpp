@@ -1,27 +1,23 @@
 #include "hw/WMITable.h"
 
+#include <span>
+
 namespace panelglow {
 
 namespace {
 
-// The texts of a value: a text or an array of texts; null reads as one empty text, anything else as nothing.
-std::vector<std::string> TextsOf(const platform::ManagementValue& value) {
-  std::vector<std::string> texts;
-  const auto add = [&](const platform::ManagementScalar& scalar, bool inArray) {
+// The first text of a value, which may be an array; empty for null and for values of other types.
+std::string TextOf(const platform::ManagementValue& value) {
+  const auto* array = std::get_if<platform::ManagementArray>(&value.content);
+  const auto* single = std::get_if<platform::ManagementScalar>(&value.content);
+  const std::span<const platform::ManagementScalar> scalars =
+      array != nullptr ? std::span(*array) : std::span(single, 1);
+  for (const platform::ManagementScalar& scalar : scalars) {
     if (const auto* text = std::get_if<wstring>(&scalar)) {
-      texts.push_back(platform::CodePageFromWide(*text));
-    } else if (!inArray && std::holds_alternative<std::monostate>(scalar)) {
-      texts.emplace_back();
+      return platform::CodePageFromWide(*text);
     }
-  };
-  if (const auto* array = std::get_if<platform::ManagementArray>(&value.content)) {
-    for (const platform::ManagementScalar& element : *array) {
-      add(element, true);
-    }
-  } else {
-    add(std::get<platform::ManagementScalar>(value.content), false);
   }
-  return texts;
+  return {};
 }
 
 }  // namespace
@@ -35,8 +31,7 @@ bool WMITable::GetValue(const wstring& property, std::string& out, int row) cons
     out.clear();
     return false;
   }
-  const std::vector<std::string> texts = TextsOf(*value);
-  out = texts.empty() ? std::string() : texts.front();
+  out = TextOf(*value);
   return true;
 }
 

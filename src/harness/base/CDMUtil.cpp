@@ -38,8 +38,8 @@ std::string Streamed(Value value) {
   return stream.str();
 }
 
-// The number of a text of either form. A value out of range becomes the nearest one of the type, as a stream gives it;
-// a negative text read into an unsigned type wraps, as a stream does it.
+// The number of a text of either form. A value out of range becomes the nearest one of the type, as a stream gives
+// it; a negative text read into an unsigned type wraps, as a stream does it.
 template <class Value>
 Value NumberOf(std::string_view text) {
   const bool hexadecimal = IsHexadecimal(text);
@@ -50,7 +50,8 @@ Value NumberOf(std::string_view text) {
   std::string_view digits = text.substr(negative ? 1 : 0);
   digits.remove_prefix(hexadecimal ? 2 : 0);
   std::uint64_t magnitude = 0;
-  const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), magnitude, hexadecimal ? 16 : 10);
+  const auto [end, error] =
+      std::from_chars(digits.data(), digits.data() + digits.size(), magnitude, hexadecimal ? 16 : 10);
   if (error == std::errc::result_out_of_range) {
     magnitude = std::numeric_limits<std::uint64_t>::max();
   }
@@ -113,9 +114,30 @@ void ReplaceAll(std::string& text, std::string_view from, std::string_view to) {
   if (from.empty()) {
     return;
   }
-  for (std::size_t at = text.find(from); at != std::string::npos; at = text.find(from)) {
-    text.replace(at, from.size(), to);
+  const bool bringsItBack = to.find(from) != std::string_view::npos;
+  std::string done;
+  std::size_t settled = 0;  // of `done`, what is not looked at again
+  std::string next;         // put back in front of the rest of the text, first character last
+  done.reserve(text.size());
+  for (std::size_t at = 0; at < text.size() || !next.empty();) {
+    if (next.empty()) {
+      done += text[at++];
+    } else {
+      done += next.back();
+      next.pop_back();
+    }
+    if (done.size() - settled < from.size() || !done.ends_with(from)) {
+      continue;
+    }
+    done.resize(done.size() - from.size());
+    if (bringsItBack) {
+      done += to;
+      settled = done.size();
+    } else {
+      next.append(to.rbegin(), to.rend());
+    }
   }
+  text = std::move(done);
 }
 
 void Split(std::string_view text, std::vector<std::string>& out, std::string_view separators) {
@@ -139,7 +161,7 @@ wstring ToWString(std::string_view text) {
 std::string ToString(std::u16string_view text) {
   std::string narrow;
   for (const char16_t c : text) {
-    if (c > 0xFF) {
+    if (c == 0 || c > 0xFF) {
       break;
     }
     narrow.push_back(static_cast<char>(static_cast<unsigned char>(c)));
@@ -199,7 +221,12 @@ bool IsDouble(std::string_view text) {
 int ToInt(std::string_view text) { return NumberOf<std::int32_t>(text); }
 long ToLong(std::string_view text) { return NumberOf<std::int32_t>(text); }
 std::uint32_t ToUnsignedLong(std::string_view text) { return NumberOf<std::uint32_t>(text); }
-std::int64_t ToInt64(std::string_view text) { return NumberOf<std::int64_t>(text); }
+
+// Hexadecimal digits are the bits of the number: 0xFFFFFFFFFFFFFFFF is -1.
+std::int64_t ToInt64(std::string_view text) {
+  return IsHexadecimal(text) ? static_cast<std::int64_t>(NumberOf<std::uint64_t>(text))
+                             : NumberOf<std::int64_t>(text);
+}
 
 std::string EscapeXml(std::string_view text) {
   std::string escaped;
@@ -231,6 +258,19 @@ std::string EscapeXml(std::string_view text) {
     }
   }
   return escaped;
+}
+
+std::string EscapeXmlStrict(std::string_view text) {
+  constexpr std::string_view kKeptControls = "\b\f\n\r\t\v";
+  std::string printable(text);
+  for (char& c : printable) {
+    const auto byte = static_cast<unsigned char>(c);
+    const bool control = byte < 0x20 || byte == 0x7F;
+    if (byte >= 0x80 || (control && kKeptControls.find(c) == std::string_view::npos)) {
+      c = '.';
+    }
+  }
+  return Trim(EscapeXml(printable));
 }
 
 bool FileExists(std::string_view path) { return !path.empty() && platform::TheHost().files.CanRead(path); }

@@ -24,8 +24,8 @@ bool EqualIgnoreCase(std::string_view left, std::string_view right);
 /// Removes blank, backspace, form feed, line feed, carriage return, tab and vertical tab from both ends.
 std::string Trim(std::string_view text);
 
-/// Replaces `from` by `to` until `from` no longer occurs, each time from the start of the text. `to` must not contain
-/// `from`; an empty `from` changes nothing.
+/// Replaces `from` by `to`, the first one in the text each time, until `from` no longer occurs. Where `to` contains
+/// `from`, each occurrence is replaced once. An empty `from` changes nothing.
 void ReplaceAll(std::string& text, std::string_view from, std::string_view to);
 
 /// Appends the pieces of `text` between any characters of `separators`; adjacent separators give no empty piece.
@@ -36,7 +36,7 @@ void Split(std::string_view text, std::vector<std::string>& out, std::string_vie
 /// Widens each byte by itself: right for ASCII, and for Latin-1.
 wstring ToWString(std::string_view text);
 
-/// Narrows character by character; the result ends before the first one above 0xFF.
+/// Narrows character by character; the result ends before the first NUL or character above 0xFF.
 std::string ToString(std::u16string_view text);
 
 // ---- numbers to text: decimal, by the stream defaults (six significant digits for double)
@@ -75,6 +75,10 @@ std::int64_t ToInt64(std::string_view text);
 
 // ---- XML escapes, on single bytes; 146 to 148 are the curly quotation marks of code page 1252
 std::string EscapeXml(std::string_view text);
+
+/// As EscapeXml, trimmed, for texts that devices report: every byte of 128 and above, and every control character but
+/// those that Trim knows, becomes ".".
+std::string EscapeXmlStrict(std::string_view text);
 
 // ---- files, by the program's path forms
 

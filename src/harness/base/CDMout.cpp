@@ -13,11 +13,22 @@ namespace panelglow {
 namespace {
 
 // By the value of LogOptions. A value outside 1 to 15 is printed as its number.
-constexpr std::array<std::string_view, 16> kOptionWords{
-    "Unknown",      "Other",         "Results",     "Subtests",   "Actions",
-    "Warnings",     "Status",        "DeviceErrors", "ServiceErrors", "SettingData",
-    "Statistics",   "HardwareConfiguration", "SoftwareConfiguration", "References", "Debug",
-    "Invalid"};
+constexpr std::array<std::string_view, 16> kOptionWords{"Unknown",
+                                                        "Other",
+                                                        "Results",
+                                                        "Subtests",
+                                                        "Actions",
+                                                        "Warnings",
+                                                        "Status",
+                                                        "DeviceErrors",
+                                                        "ServiceErrors",
+                                                        "SettingData",
+                                                        "Statistics",
+                                                        "HardwareConfiguration",
+                                                        "SoftwareConfiguration",
+                                                        "References",
+                                                        "Debug",
+                                                        "Invalid"};
 
 // Handed in by main; made at first use, so that a line written before that is a plain one.
 struct Hooks {

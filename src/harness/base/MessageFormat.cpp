@@ -13,7 +13,8 @@ using View = std::basic_string_view<Char>;
 
 template <class Char>
 bool IsOneOf(Char c, std::string_view set) {
-  return static_cast<std::make_unsigned_t<Char>>(c) < 0x80U && set.find(static_cast<char>(c)) != std::string_view::npos;
+  return static_cast<std::make_unsigned_t<Char>>(c) < 0x80U &&
+         set.find(static_cast<char>(c)) != std::string_view::npos;
 }
 
 // A conversion behind its percent sign.

@@ -12,8 +12,8 @@ namespace panelglow {
 /// The longest result, in characters.
 inline constexpr std::size_t kLongestMessage = 1023;
 
-/// Replaces the first string conversion (%s, %S, with flags, width and precision) by `argument`. Further conversions of
-/// any known kind print nothing, "%%" prints a percent sign, any other letter behind a percent sign prints itself.
+/// Replaces the first string conversion (%s, %S, with flags, width and precision) by `argument`. Further conversions
+/// of any known kind print nothing, "%%" prints a percent sign, any other letter behind a percent sign prints itself.
 std::string FormatMessageText(std::string_view format, std::string_view argument);
 wstring FormatMessageText(std::u16string_view format, std::u16string_view argument);
 

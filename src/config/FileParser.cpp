@@ -1,0 +1,208 @@
+#include "config/FileParser.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+
+#include "harness/base/CDMUtil.h"
+#include "platform/Host.h"
+
+namespace panelglow {
+
+namespace {
+
+constexpr std::size_t kLongestPath = 1024;
+constexpr std::size_t kLineBuffer = 1024;
+constexpr std::size_t kBufferStep = 10240;
+constexpr std::size_t kMostSteps = 31;
+constexpr std::size_t kConversionBuffer = 4096;
+constexpr const char* kMutexSuffix = "_HalcyonFileParser";
+
+platform::ProfileFiles& Profiles() { return platform::TheHost().profiles; }
+
+// One name for one file, however its path is spelled.
+std::string MutexNameOf(const std::string& file) {
+  std::string name = platform::TheHost().files.FullPath(file).substr(0, kLongestPath);
+  for (char& c : name) {
+    if (c == '\\' || c == ':' || c == '.' || c == '/') {
+      c = '_';
+    }
+  }
+  return name + kMutexSuffix;
+}
+
+// The texts of a list in which each is ended by a NUL.
+std::vector<std::string> TextsOf(std::string_view list) {
+  std::vector<std::string> texts;
+  while (!list.empty()) {
+    const std::size_t end = std::min(list.find('\0'), list.size());
+    if (end == 0) {
+      break;
+    }
+    texts.emplace_back(list.substr(0, end));
+    list.remove_prefix(std::min(end + 1, list.size()));
+  }
+  return texts;
+}
+
+// A field's text: between its first and its last double quote as it stands, otherwise without blanks at both ends.
+std::string Stripped(std::string_view field) {
+  const std::size_t first = field.find('"');
+  if (first != std::string_view::npos) {
+    const std::size_t last = field.rfind('"');
+    return std::string(field.substr(first + 1, last == first ? 0 : last - first - 1));
+  }
+  const std::size_t begin = field.find_first_not_of(" \t");
+  if (begin == std::string_view::npos) {
+    return {};
+  }
+  return std::string(field.substr(begin, field.find_last_not_of(" \t") - begin + 1));
+}
+
+}  // namespace
+
+FileParser::FileParser(const std::string& file) : path(file), mutex(platform::TheHost().mutexes, MutexNameOf(file)) {}
+
+std::vector<std::string> FileParser::ReadList(const ListCall& call, bool mustHaveContent) {
+  for (std::size_t step = 1; step <= kMostSteps; ++step) {
+    std::string room(step * kBufferStep, '\xFF');
+    const std::size_t length = call(std::span<char>(room.data(), room.size()));
+    if (length == 0 && mustHaveContent) {
+      throw kCannotRead;
+    }
+    if (length != room.size() - 2 || step == kMostSteps) {
+      return TextsOf(std::string_view(room).substr(0, length));
+    }
+  }
+  return {};
+}
+
+// ---- lines and fields
+
+bool FileParser::ReadValue(const std::string& section, const std::string& key) {
+  std::array<char, kLineBuffer> line{};
+  const std::size_t length = Profiles().GetValue(section, key, "", line, path);
+  if (length == 0) {
+    buffer.clear();
+    return false;
+  }
+  SplitLine(std::string(line.data(), length));
+  return true;
+}
+
+void FileParser::SplitLine(const std::string& line) {
+  buffer = line.substr(0, kLineBuffer - 1);
+  currentValue = Stripped(std::string_view(buffer).substr(0, buffer.find(';')));
+  fields.clear();
+  std::size_t cursor = 0;
+  for (std::string field; NextField(cursor, field);) {
+    fields.push_back(field);
+  }
+  fieldCount = static_cast<int>(fields.size());
+  fieldIndex = 0;
+}
+
+// The field at the cursor, which moves behind its separator. False at an empty field, which ends the list.
+bool FileParser::NextField(std::size_t& cursor, std::string& out) const {
+  const std::size_t begin = std::min(cursor, buffer.size());
+  std::size_t at = begin;
+  while (at < buffer.size() && buffer[at] != ',' && buffer[at] != ';') {
+    if (buffer[at] == '"') {
+      at = at + 1 < buffer.size() ? buffer.find('"', at + 1) : std::string::npos;
+      if (at == std::string::npos) {
+        throw kCannotRead;
+      }
+    }
+    ++at;
+  }
+  // Behind a comment's mark, or at the end, there is nothing further.
+  cursor = at < buffer.size() && buffer[at] == ',' ? at + 1 : buffer.size();
+  if (at == begin) {
+    return false;
+  }
+  out = Stripped(std::string_view(buffer).substr(begin, at - begin));
+  return true;
+}
+
+bool FileParser::NextFieldString(std::string& out) {
+  if (fieldIndex >= fieldCount) {
+    return false;
+  }
+  out = fields[static_cast<std::size_t>(fieldIndex++)];
+  return true;
+}
+
+bool FileParser::NextFieldNumber(unsigned int& out, int base) {
+  std::string text;
+  if (!NextFieldString(text)) {
+    return false;
+  }
+  out = static_cast<unsigned int>(std::strtoul(text.c_str(), nullptr, base));
+  return true;
+}
+
+// ---- sections and keys
+
+int FileParser::CountSections() {
+  if (sectionCount < 0) {
+    sectionNames = ReadList(
+        [&](std::span<char> room) { return Profiles().GetValue(std::nullopt, std::nullopt, "", room, path); }, false);
+    sectionCount = static_cast<int>(sectionNames.size());
+  }
+  return sectionCount;
+}
+
+bool FileParser::HasSection(const std::string& name) {
+  if (sectionNames.empty()) {
+    CountSections();
+  }
+  return std::any_of(sectionNames.begin(), sectionNames.end(),
+                     [&](const std::string& section) { return CDMUtil::EqualIgnoreCase(section, name); });
+}
+
+int FileParser::CountKeys(const std::string& section) {
+  keyCount = static_cast<int>(
+      ReadList([&](std::span<char> room) { return Profiles().GetValue(section, std::nullopt, "", room, path); }, true)
+          .size());
+  return keyCount;
+}
+
+// ---- the target file
+
+bool FileParser::WriteBuffer(const std::string& section, const std::string& key) {
+  return Profiles().SetValue(section, key, buffer, targetPath);
+}
+
+bool FileParser::EraseSection(const std::string& section) {
+  return Profiles().SetValue(section, std::nullopt, std::nullopt, targetPath);
+}
+
+int FileParser::ConvertToIni(const std::string& section, const std::string& prefix, bool clear, int firstNumber) {
+  try {
+    return Convert(section, prefix, clear, firstNumber);
+  } catch (int code) {
+    platform::TheHost().console.WriteError("ConvertToIni Failed: " + CDMUtil::ToString(code) + "\n");
+    throw;
+  }
+}
+
+int FileParser::Convert(const std::string& section, const std::string& prefix, bool clear, int firstNumber) {
+  std::array<char, kConversionBuffer> room{};
+  const std::size_t length = Profiles().GetSection(section, room, path);
+  if (length == room.size() - 2) {
+    throw kCannotRead;
+  }
+  if (clear) {
+    EraseSection(section);
+  }
+  int number = firstNumber;
+  for (const std::string& line : TextsOf(std::string_view(room.data(), length))) {
+    if (!Profiles().SetValue(section, prefix + CDMUtil::ToString(number), line, targetPath)) {
+      throw kCannotWrite;
+    }
+    ++number;
+  }
+  return number - firstNumber;
+}
+
+}  // namespace panelglow

@@ -1,0 +1,41 @@
+#include "config/OrgFileParser.h"
+
+#include "harness/base/CDMUtil.h"
+#include "platform/Host.h"
+
+namespace panelglow {
+
+int OrgFileParser::ReadSection(const std::string& section) {
+  if (lineCount == 0) {
+    lines = ReadList(
+        [&](std::span<char> room) { return platform::TheHost().profiles.GetSection(section, room, path); }, false);
+    lineCount = static_cast<int>(lines.size());
+    lineIndex = 0;
+  }
+  return lineCount;
+}
+
+bool OrgFileParser::NextLine() {
+  if (lineIndex >= lines.size()) {
+    return false;
+  }
+  SplitLine(lines[lineIndex++]);
+  return true;
+}
+
+void OrgFileParser::AppendLines(const std::string& section) {
+  for (const std::string& line : lines) {
+    if (!platform::TheHost().profiles.SetValue(section, prefix + CDMUtil::ToString(nextEntry), line, targetPath)) {
+      throw kCannotRead;
+    }
+    ++nextEntry;
+  }
+}
+
+void OrgFileParser::Reset() {
+  lines.clear();
+  lineCount = 0;
+  lineIndex = 0;
+}
+
+}  // namespace panelglow
