@@ -25,6 +25,8 @@ TEST(ChipTable, EveryNameIsUniqueAndLeadsToItsOwnPlace) {
     places.insert(row.place);
     if (row.make != nullptr) {
       BoardBench bench;
+      bench.SetFiles("[Common]\nchip.codec.hdabar=0xFE5C0000\n", "", "");
+      IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
       EXPECT_EQ(row.make()->GetName(), row.name);
     }
   }
@@ -45,10 +47,11 @@ TEST(MotherBoard, TheInitialDataSelectTheClassOrNone) {
     const char* board;  // class, system id, chips; or "none"
   };
   const Case kCases[] = {
-      {"7D10", "[7D10]\nplatform=Generic\n", "generic 32016 g_iospace g_memoryspace"},  // no list: every class
-      {"7D10", "[7D10]\nplatform=undef\nchips=, g_IOSPACE ,g_sio,unknown\n", "generic 32016 g_iospace none"},
+      {"7D10", "[7D10]\nplatform=Generic\nchip.codec.hdabar=0xFE5C0000\n",
+       "generic 32016 g_iospace g_memoryspace"},  // no list: every class
+      {"7D10", "[7D10]\nplatform=undef\nchips=, g_IOSPACE ,g_siox,unknown\n", "generic 32016 g_iospace none"},
       {"7D1X", "[7D1X]\nchips=g_memoryspacex\n", "generic 2001 none none"},
-      {"7D10", "[7D10]\nchips=undef\n", "generic 32016 g_iospace g_memoryspace"},
+      {"7D10", "[7D10]\nchips=undef\nchip.codec.hdabar=0xFE5C0000\n", "generic 32016 g_iospace g_memoryspace"},
       {"7D10", "[7D10]\nplatform=generic ; note\nchips=g_iospace\n", "none"},
       {"7D10", "[7D10]\nplatform=legacy\nchips=g_iospace\n", "none"},
       {"7D10", "[7D10]\nMotherboardClass=Any\nchips=g_iospace\n", "none"},
