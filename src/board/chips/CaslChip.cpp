@@ -69,6 +69,13 @@ void CaslChip::Initialize() {
     devices.push_back(static_cast<std::uint32_t>(CDMUtil::ToInt(token)));
   }
   ReadWirelessHeader();
+  isSetUp = true;
+}
+
+void CaslChip::SetUpOnce() {
+  if (!isSetUp) {
+    Initialize();
+  }
 }
 
 // ---- wireless
@@ -84,12 +91,14 @@ void CaslChip::ReadWirelessHeader() {
 }
 
 bool CaslChip::SetWirelessPower(bool on) {
+  SetUpOnce();
   CallBios(writeCommand, methodType, {firstByte, secondByte, powerControl, on ? assertValue : deassertValue},
            kNoAnswer);
   return true;
 }
 
 bool CaslChip::SaveWirelessLedState() {
+  SetUpOnce();
   const std::vector<std::uint8_t> record = ReadWirelessRecord();
   wirelessOn =
       std::any_of(devices.begin(), devices.end(), [&](std::uint32_t wireless) { return IsOn(record, wireless); });
@@ -97,6 +106,7 @@ bool CaslChip::SaveWirelessLedState() {
 }
 
 bool CaslChip::ReadLatchedPort(std::uint16_t /*port*/, int bit, bool& value) {
+  SetUpOnce();
   const std::vector<std::uint8_t> record = ReadWirelessRecord();
   const bool wanted = bit == 1;
   value = devices.empty() || IsOn(record, devices.front()) != wanted;

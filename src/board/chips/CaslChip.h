@@ -13,9 +13,10 @@ namespace panelglow {
 /// InvalidTmbWMICallException).
 class CaslChip : public Chip {
  public:
-  /// Reads the chip's keys and the head of the wireless record.
-  CaslChip() : Chip("casl") { CaslChip::Initialize(); }
+  CaslChip() : Chip("casl") {}
 
+  /// Reads the chip's keys and the head of the wireless record. Done by itself before the first wireless operation,
+  /// so that a board can be built without a call into the firmware.
   void Initialize() override;
 
   bool ReadFanRpm(int fan, int& rpm, int multiplier) override;
@@ -36,10 +37,12 @@ class CaslChip : public Chip {
   virtual void ReadWirelessHeader();
 
  private:
+  void SetUpOnce();
   [[nodiscard]] std::vector<std::uint8_t> ReadWirelessRecord() const;
   std::uint8_t ReadByteKey(const std::string& section, const char* key, int defaultValue);
 
   std::vector<std::uint32_t> devices;  // indexes into the wireless state record
+  bool isSetUp = false;
   bool wirelessOn = false;
   std::uint8_t writeCommand = 2;
   std::uint8_t readCommand = 1;
