@@ -103,7 +103,16 @@ void Scheduler::At(Microseconds when, std::function<void()> action) {
   events_.emplace(std::max(when, now_), std::move(action));
 }
 
+void Scheduler::ReapEnded() {
+  for (const auto& [id, thread] : threads_) {
+    if (id != Current() && thread->state == State::kEnded && thread->thread.joinable()) {
+      thread->thread.join();  // it has handed the baton on: nothing keeps it
+    }
+  }
+}
+
 ThreadId Scheduler::Start(const std::string& name, std::function<void()> body) {
+  ReapEnded();
   auto owned = std::make_unique<Thread>();
   Thread& thread = *owned;
   thread.id = nextThread_++;

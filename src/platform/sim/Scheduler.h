@@ -56,6 +56,9 @@ class Scheduler {
   /// True when the thread has ended by the deadline (none: without limit).
   bool WaitForEnd(ThreadId thread, std::optional<Microseconds> deadline);
 
+  /// Gives up what the system keeps of threads that have ended. To be called by the holder of the baton.
+  void ReapEnded();
+
   /// Unwinds the thread by ThreadTerminated and returns when it has ended.
   void Terminate(ThreadId thread);
 

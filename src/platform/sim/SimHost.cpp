@@ -139,6 +139,7 @@ std::unique_ptr<Simulation> MakeSimulationFromEnvironment() {
       simulation->Time().OnStuck([raw = simulation.get(), report](const std::string&) { WriteReport(*raw, report); });
       std::atexit([] { WriteReport(CurrentSimulation(), Setting(kReportVariable)); });
     }
+    std::atexit([] { CurrentSimulation().Time().ReapEnded(); });
     return simulation;
   } catch (const MachineError& error) {
     GiveUp(error.what());
