@@ -2,7 +2,9 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdint>
 #include <cstdlib>
+#include <limits>
 
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -70,11 +72,11 @@ std::vector<std::string> FileParser::ReadList(const ListCall& call, bool mustHav
     if (length == 0 && mustHaveContent) {
       throw kCannotRead;
     }
-    if (length != room.size() - 2 || step == kMostSteps) {
+    if (length != room.size() - 2) {
       return TextsOf(std::string_view(room).substr(0, length));
     }
   }
-  return {};
+  throw kCannotRead;
 }
 
 // ---- lines and fields
@@ -94,12 +96,11 @@ void FileParser::SplitLine(const std::string& line) {
   buffer = line.substr(0, kLineBuffer - 1);
   currentValue = Stripped(std::string_view(buffer).substr(0, buffer.find(';')));
   fields.clear();
+  fieldIndex = 0;
   std::size_t cursor = 0;
   for (std::string field; NextField(cursor, field);) {
     fields.push_back(field);
   }
-  fieldCount = static_cast<int>(fields.size());
-  fieldIndex = 0;
 }
 
 // The field at the cursor, which moves behind its separator. False at an empty field, which ends the list.
@@ -125,10 +126,21 @@ bool FileParser::NextField(std::size_t& cursor, std::string& out) const {
 }
 
 bool FileParser::NextFieldString(std::string& out) {
-  if (fieldIndex >= fieldCount) {
+  if (fieldIndex >= fields.size()) {
     return false;
   }
-  out = fields[static_cast<std::size_t>(fieldIndex++)];
+  out = fields[fieldIndex++];
+  return true;
+}
+
+bool FileParser::NextFieldText(std::span<char> out) {
+  std::string text;
+  if (out.empty() || !NextFieldString(text)) {
+    return false;
+  }
+  const std::size_t length = std::min(text.size(), out.size() - 1);
+  std::copy_n(text.begin(), length, out.begin());
+  out[length] = '\0';
   return true;
 }
 
@@ -137,7 +149,13 @@ bool FileParser::NextFieldNumber(unsigned int& out, int base) {
   if (!NextFieldString(text)) {
     return false;
   }
-  out = static_cast<unsigned int>(std::strtoul(text.c_str(), nullptr, base));
+  // The program's home system has a `long` of 32 bits.
+  const unsigned long long number = std::strtoull(text.c_str(), nullptr, base);
+  const std::size_t first = text.find_first_not_of(" \t\n\v\f\r");
+  const bool isNegative = first != std::string::npos && text[first] == '-';
+  const unsigned long long magnitude = isNegative ? 0 - number : number;
+  const unsigned long long largest = std::numeric_limits<std::uint32_t>::max();
+  out = static_cast<unsigned int>(magnitude > largest ? largest : number);
   return true;
 }
 

@@ -36,17 +36,24 @@ class FileParser {
 
   /// Without regard to ASCII case.
   bool HasSection(const std::string& name);
+
+  /// Throws -1 when the section has no key or does not exist.
   int CountKeys(const std::string& section);
 
   // ---- the fields of the current line
   [[nodiscard]] std::string& GetField(std::size_t index) { return fields.at(index); }
-  [[nodiscard]] int GetFieldCount() const { return fieldCount; }
+  [[nodiscard]] int GetFieldCount() const { return static_cast<int>(fields.size()); }
 
   /// The text of the current line up to its comment, as a field.
   [[nodiscard]] const std::string& GetCurrentValue() const { return currentValue; }
 
   // Hand out the next field and move on; at the end they return false and leave `out` as it is.
+
+  /// Leading digits of the base count; a number of more than 32 bits is the largest one.
   bool NextFieldNumber(unsigned int& out, int base);
+
+  /// Ended by NUL, and cut to the room that there is.
+  bool NextFieldText(std::span<char> out);
   bool NextFieldString(std::string& out);
 
   // ---- the target file
@@ -66,7 +73,8 @@ class FileParser {
   /// A profile call that fills a buffer with a list and returns its length.
   using ListCall = std::function<std::size_t(std::span<char>)>;
 
-  /// The entries of a list, read with growing buffers. Throws -1 for an empty one when there must be some.
+  /// The entries of a list, read with growing buffers. Throws -1 for a list that is longer than the largest of them,
+  /// and for an empty one when there must be some.
   static std::vector<std::string> ReadList(const ListCall& call, bool mustHaveContent);
 
   std::vector<std::string> sectionNames;  // filled at first need
@@ -75,8 +83,7 @@ class FileParser {
   std::string path;
   std::string targetPath;
   std::vector<std::string> fields;
-  int fieldCount = 0;
-  int fieldIndex = 0;
+  std::size_t fieldIndex = 0;  // of the field to be handed out next
   int sectionCount = -1;
   int keyCount = -1;
 

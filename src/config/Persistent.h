@@ -15,10 +15,11 @@ class Persistent {
 
   virtual ~Persistent() = default;
 
-  /// Format version that this class writes.
-  [[nodiscard]] virtual unsigned int Version() const = 0;
+  /// Format version that this class writes. A stored form of a later version is refused.
+  [[nodiscard]] virtual unsigned int Version() const { return 0; }
 
-  /// Moves all fields between this object and the stream; `version` is that of the stored form.
+  /// Moves all fields between this object and the stream, an optstream or an iptstream by the direction; `version` is
+  /// that of the stored form, 0 when writing.
   virtual void ReadAndWrite(ptstream& stream, Direction direction, unsigned int version) = 0;
 
   /// Takes over the content of `other` when it is another object of the same class; otherwise changes nothing.
@@ -27,6 +28,10 @@ class Persistent {
   /// The name under which streams know the class.
   [[nodiscard]] virtual std::string GetRealClassName() const = 0;
   [[nodiscard]] virtual std::unique_ptr<Persistent> CreateCopy() const = 0;
+
+  /// As CopyFrom, of an object that goes away behind it. A class with parts that it streams as values has to take the
+  /// parts themselves: others may point at them.
+  virtual void MoveFrom(Persistent& other) { CopyFrom(&other); }
 
  protected:
   Persistent() = default;

@@ -1,11 +1,30 @@
 #include "config/XmlAttribute.h"
 
-#include <stdexcept>
+#include "config/ClassRegistration.h"
+#include "config/iptstream.h"
+#include "config/optstream.h"
 
 namespace panelglow {
 
-void XmlAttribute::ReadAndWrite(ptstream& /*stream*/, Direction /*direction*/, unsigned int /*version*/) {
-  throw std::logic_error("object streams are not available yet");
+namespace {
+
+[[maybe_unused]] const bool kIsRegistered = RegisterClass<XmlAttribute>("XmlAttribute");
+
+}  // namespace
+
+void XmlAttribute::ReadAndWrite(ptstream& stream, Direction direction, unsigned int /*version*/) {
+  if (direction == Direction::kWrite) {
+    auto& out = dynamic_cast<optstream&>(stream);
+    out.WriteString(name);
+    out.WriteString(value);
+    return;
+  }
+  auto& in = dynamic_cast<iptstream&>(stream);
+  std::string text;
+  in.ReadString(text);
+  name = text;
+  in.ReadString(text);
+  value = text;
 }
 
 void XmlAttribute::CopyFrom(const Persistent* other) {

@@ -15,7 +15,6 @@ class XmlAttribute final : public Persistent {
   XmlAttribute(std::string_view attributeName, std::string_view attributeValue)
       : name(attributeName), value(attributeValue) {}
 
-  [[nodiscard]] unsigned int Version() const override { return 0; }
   void ReadAndWrite(ptstream& stream, Direction direction, unsigned int version) override;
   void CopyFrom(const Persistent* other) override;
   [[nodiscard]] std::string GetRealClassName() const override { return "XmlAttribute"; }

@@ -142,14 +142,17 @@ XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
   return *this;
 }
 
-void XmlObject::ReadAndWrite(ptstream& /*stream*/, Direction /*direction*/, unsigned int /*version*/) {
-  throw std::logic_error("object streams are not available yet");
-}
-
 void XmlObject::CopyFrom(const Persistent* other) {
   const auto* source = dynamic_cast<const XmlObject*>(other);
   if (source != nullptr && source != this) {
     *this = *source;
+  }
+}
+
+void XmlObject::MoveFrom(Persistent& other) {
+  auto* source = dynamic_cast<XmlObject*>(&other);
+  if (source != nullptr && source != this) {
+    *this = std::move(*source);
   }
 }
 

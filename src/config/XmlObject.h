@@ -18,6 +18,9 @@
 
 namespace panelglow {
 
+class iptstream;
+class optstream;
+
 class XmlObject final : public Persistent {
  public:
   /// Elements nested deeper than this are refused with a parse error.
@@ -37,9 +40,13 @@ class XmlObject final : public Persistent {
   ~XmlObject() override = default;
 
   // ---- Persistent
-  [[nodiscard]] unsigned int Version() const override { return 0; }
+
+  /// An element that is read keeps its place in its tree, whatever the stream says of its parent and depth; what is
+  /// read into its lists stands behind what they hold. An element's parent is written only when the parent is in the
+  /// stream already: a part of a tree does not take the tree along.
   void ReadAndWrite(ptstream& stream, Direction direction, unsigned int version) override;
   void CopyFrom(const Persistent* other) override;
+  void MoveFrom(Persistent& other) override;
   [[nodiscard]] std::string GetRealClassName() const override { return "XmlObject"; }
   [[nodiscard]] std::unique_ptr<Persistent> CreateCopy() const override { return std::make_unique<XmlObject>(*this); }
 
@@ -148,6 +155,8 @@ class XmlObject final : public Persistent {
  private:
   friend class XmlParser;
 
+  void WriteTo(optstream& out);
+  void ReadFrom(iptstream& in);
   void CopyContent(const XmlObject& other);
   void LinkChildren();
   void Relink();

@@ -2,6 +2,7 @@
 
 #include <utility>
 
+#include "harness/CatalogAttribute.h"
 #include "harness/base/CDMUtil.h"
 
 namespace panelglow {
@@ -54,6 +55,34 @@ std::string CDMArgument::GetHelp() const {
   }
   help += "\n\t * Required: " + CDMUtil::ToString(required);
   return help;
+}
+
+std::string CDMArgument::GetCatalogEntry(int indent) const {
+  std::string entry(static_cast<std::size_t>(indent), ' ');
+  entry += "<ARGUMENT" + CatalogAttributeIfAny("Name", name) + CatalogAttribute("Type", WordOf(type)) +
+           CatalogAttributeIfAny("Value", defaultValue);
+  if (constraint) {
+    entry += constraint->GetCatalogAttributes();
+  }
+  entry += CatalogAttribute("Required", CDMUtil::ToString(required)) +
+           CatalogAttributeIfAny("Description", CDMUtil::EscapeXml(CDMUtil::OnOneLine(description)));
+  if (hidden) {
+    entry += CatalogAttribute("Hidden", "true");
+  }
+  if (guiHidden) {
+    entry += CatalogAttribute("GUIHidden", "true");
+  }
+  return entry + " />";
+}
+
+std::string CDMArgument::GetDictionaryEntry(const std::string& prefix) const {
+  const std::string key = prefix + "/" + name;
+  std::string entry = "\n" + key + "/Name = TBC\n";
+  entry += key + "/Description = " + CDMUtil::OnOneLine(description) + "\n";
+  if (constraint) {
+    entry += constraint->GetDictionaryEntry(key, type);
+  }
+  return entry;
 }
 
 }  // namespace panelglow

@@ -30,6 +30,12 @@ class CDMArgument {
   /// The block of this argument in the argument help.
   [[nodiscard]] std::string GetHelp() const;
 
+  /// The element of this argument in the catalogue, behind `indent` blanks.
+  [[nodiscard]] std::string GetCatalogEntry(int indent) const;
+
+  /// The keys of this argument in the dictionary, under the subtest's name `prefix`.
+  [[nodiscard]] std::string GetDictionaryEntry(const std::string& prefix) const;
+
  private:
   std::string name;
   CDMArgumentType type;

@@ -5,6 +5,7 @@
 #include <sstream>
 #include <vector>
 
+#include "harness/CatalogAttribute.h"
 #include "harness/base/CDMUtil.h"
 
 namespace panelglow {
@@ -13,15 +14,21 @@ namespace {
 
 constexpr std::array<std::string_view, 5> kTypeWords{"string", "integer", "boolean", "double", "largeinteger"};
 
-// By CDMConstraintType.
-constexpr std::array<std::string_view, 6> kComparisonHelp{
-    "\n\t - Value must be equal to ",
-    "\n\t - Value must be different than ",
-    "\n\t - Value must be greater than ",
-    "\n\t - Value must be equal to or greater than ",
-    "\n\t - Value must be equal to or less than ",
-    "\n\t - Value must be less than ",
+// By CDMConstraintType: the catalogue's attribute, and the words of the help.
+struct ComparisonTexts {
+  const char* attribute;
+  std::string_view help;
 };
+constexpr std::array<ComparisonTexts, 6> kComparisons{{
+    {"Equal", "equal to "},
+    {"DifferentThan", "different than "},
+    {"GreaterThan", "greater than "},
+    {"EqualToOrGreaterThan", "equal to or greater than "},
+    {"EqualToOrLessThan", "equal to or less than "},
+    {"LessThan", "less than "},
+}};
+
+constexpr std::string_view kHelpLine = "\n\t - Value must be ";
 
 constexpr const char* kNoNumber = "invalidString";
 
@@ -141,13 +148,38 @@ std::string CDMConstraint::GetHelp() const {
   if (!list.empty()) {
     std::string allowed = list;
     std::replace(allowed.begin(), allowed.end(), ',', '|');
-    return "\n\t - Value must be one of [" + allowed + "]";
+    return std::string(kHelpLine) + "one of [" + allowed + "]";
   }
   if (isRange) {
-    return "\n\t - Value must be between [" + GetLowText() + ".." + GetHighText() + "]";
+    return std::string(kHelpLine) + "between [" + GetLowText() + ".." + GetHighText() + "]";
   }
   const auto index = static_cast<std::size_t>(comparison);
-  return index < kComparisonHelp.size() ? std::string(kComparisonHelp[index]) + GetValueText() : std::string();
+  return index < kComparisons.size() ? std::string(kHelpLine) + std::string(kComparisons[index].help) + GetValueText()
+                                     : std::string();
+}
+
+std::string CDMConstraint::GetCatalogAttributes() const {
+  if (!list.empty()) {
+    return CatalogAttribute("List", CDMUtil::EscapeXml(list));
+  }
+  if (isRange) {
+    return CatalogAttribute("Low", GetLowText()) + CatalogAttribute("High", GetHighText());
+  }
+  const auto index = static_cast<std::size_t>(comparison);
+  return index < kComparisons.size() ? CatalogAttribute(kComparisons[index].attribute, GetValueText())
+                                     : std::string();
+}
+
+std::string CDMConstraint::GetDictionaryEntry(const std::string& prefix, CDMArgumentType type) const {
+  std::string text;
+  if (type == CDMArgumentType::String) {
+    std::vector<std::string> allowed;
+    CDMUtil::Split(list, allowed, ",");
+    for (const std::string& value : allowed) {
+      text += prefix + "/List/" + value + " = TBC\n";
+    }
+  }
+  return text;
 }
 
 }  // namespace panelglow

@@ -42,6 +42,12 @@ class CDMConstraint {
   /// One line for the argument help.
   [[nodiscard]] std::string GetHelp() const;
 
+  /// The rule as catalogue attributes, each with a blank in front.
+  [[nodiscard]] std::string GetCatalogAttributes() const;
+
+  /// One line for each allowed value under the key `prefix`, for an argument of type string; otherwise empty.
+  [[nodiscard]] std::string GetDictionaryEntry(const std::string& prefix, CDMArgumentType type) const;
+
   /// The bounds of a range as text; "invalidString" when there are no numbers.
   [[nodiscard]] std::string GetLowText() const;
   [[nodiscard]] std::string GetHighText() const;

@@ -3,6 +3,7 @@
 #include <array>
 #include <utility>
 
+#include "harness/CatalogAttribute.h"
 #include "harness/CmdLineParser.h"
 #include "harness/MessageFiles.h"
 #include "harness/base/CDMUtil.h"
@@ -10,7 +11,9 @@
 #include "prompts/CDMWindow.h"
 #include "prompts/DiagnosticConfiguration.h"
 #include "prompts/DiagnosticWindow.h"
+#include "prompts/MessageWindow.h"
 #include "prompts/PromptWindow.h"
+#include "prompts/TextWindow.h"
 
 namespace panelglow {
 
@@ -196,6 +199,27 @@ std::string CDMDiag::GetArgumentsHelp() {
   return text;
 }
 
+std::string CDMDiag::GetCatalogEntry(int indent) {
+  const std::string margin(static_cast<std::size_t>(indent), ' ');
+  std::string entry = margin + "<TEST" + CatalogAttributeIfAny("Name", name.empty() ? subtest : name) +
+                      CatalogAttributeIfAny("FileName", CmdLineParser::GetInstance().GetProgramPath()) +
+                      CatalogAttributeIfAny("Description", CDMUtil::EscapeXml(CDMUtil::OnOneLine(GetDescription()))) +
+                      " >\n";
+  for (const auto& [argumentName, argument] : arguments) {
+    entry += "  " + argument->GetCatalogEntry(indent + 2) + "\n";
+  }
+  return entry + margin + "</TEST>";
+}
+
+std::string CDMDiag::GetDictionaryEntry() {
+  std::string entry = "\n\n" + name + "/Name = TBC\n";
+  entry += name + "/Description = " + CDMUtil::OnOneLine(GetDescription()) + "\n";
+  for (const auto& [argumentName, argument] : arguments) {
+    entry += argument->GetDictionaryEntry(name);
+  }
+  return entry;
+}
+
 void CDMDiag::LogArguments(LogOptions option, unsigned int id) {
   if (arguments.empty()) {
     return;
@@ -269,6 +293,25 @@ int CDMDiag::PopWindow(const std::string& text, const std::string& title, unsign
 
 int CDMDiag::PopWindow(const wstring& text, const std::string& title, unsigned int style) {
   return PopWindow(text, CDMUtil::ToWString(title), style, nullptr, 0);
+}
+
+int CDMDiag::PopWindow(const wstring& text, const std::string& title, unsigned int style, const wstring& greenMark,
+                       const wstring& redMark) {
+  const wstring wideTitle = CDMUtil::ToWString(title);
+  if (HasWindowSettings()) {
+    return DiagnosticWindow(diagConfPath).MarkedForm(text, wideTitle, style, greenMark, redMark);
+  }
+  return MarkedPrompt(text, wideTitle, style, greenMark, redMark);
+}
+
+int CDMDiag::PopMessageWindow(const wstring& text, const wstring& title, int seconds,
+                              platform::WindowProcedure hook) {
+  return ShowMessageWindow(text, title, seconds, std::move(hook));
+}
+
+int CDMDiag::PopTextWindow(const wstring& text, const wstring& title, std::string& entered,
+                           std::uint32_t clearInterval) {
+  return ShowTextWindow(text, title, entered, clearInterval);
 }
 
 void CDMDiag::SetPromptTimeout(unsigned int seconds, int timeoutResult) {

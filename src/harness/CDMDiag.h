@@ -36,6 +36,12 @@ class CDMDiag {
   virtual std::string GetArgumentsHelp();
   virtual std::string GetDescription() { return description; }
 
+  /// The element of this subtest in the catalogue, behind `indent` blanks, without a line end.
+  std::string GetCatalogEntry(int indent);
+
+  /// The keys of this subtest in the dictionary, each line with its end.
+  std::string GetDictionaryEntry();
+
   void SetName(const std::string& registeredName) { name = registeredName; }
   [[nodiscard]] const std::string& GetName() const { return name; }
 
@@ -77,6 +83,19 @@ class CDMDiag {
                        int autoResult);
   static int PopWindow(const std::string& text, const std::string& title, unsigned int style);
   static int PopWindow(const wstring& text, const std::string& title, unsigned int style);
+
+  /// The first of each mark's occurrences in the text is shown on coloured ground.
+  static int PopWindow(const wstring& text, const std::string& title, unsigned int style, const wstring& greenMark,
+                       const wstring& redMark);
+
+  /// Shows a text for a time: 1 when `hook` ended the window, 2 when it was closed, -2 when the time was over.
+  /// `seconds` 0: no limit. `hook` sees the window's messages first, and finishes one by returning 0; empty for none.
+  static int PopMessageWindow(const wstring& text, const wstring& title, int seconds, platform::WindowProcedure hook);
+
+  /// Lets the operator enter a line, at most 256 characters; what was typed is wiped when no further character comes
+  /// within `clearInterval` ms. Ended by the button: 5; by the Enter key: 0.
+  static int PopTextWindow(const wstring& text, const wstring& title, std::string& entered,
+                           std::uint32_t clearInterval);
 
   /// Arms the next plain prompt: after `seconds` it ends with `timeoutResult`.
   static void SetPromptTimeout(unsigned int seconds, int timeoutResult);

@@ -1,5 +1,6 @@
 #include "harness/CmdLineParser.h"
 
+#include "harness/ParameterFile.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
 
@@ -29,8 +30,24 @@ CmdLineParser::CmdLineParser(int argc, const char* const* argv) {
     auto [key, value] = SplitParameter(argv[i]);
     parameters[key] = std::move(value);
   }
-  // Parameter files are not read yet: a run that names one is refused when its parameters are checked.
-  paramFileOk = GetParameter("-ParamFile", "").empty() && GetParameter("-ParamSection", "").empty();
+}
+
+void CmdLineParser::ReadParameterFile(const std::function<std::string()>& modelName) {
+  const std::string file = GetParameter("-ParamFile", "");
+  const std::string section = GetParameter("-ParamSection", "");
+  if (file.empty() && section.empty()) {
+    return;
+  }
+  paramFileOk = false;
+  if (file.empty() || section.empty()) {
+    CDMout::LogMessage(LogOptions::Debug, kParameterMessage,
+                       "ERROR! -ParamFile and -ParamSection both must be blank or both must be provided");
+    return;
+  }
+  paramFileOk = ParameterFile(file, section, modelName).Read([this](const std::string& line) {
+    const auto [key, value] = SplitParameter(line);
+    AddParameter(key, value);
+  });
 }
 
 std::pair<std::string, std::string> CmdLineParser::SplitParameter(std::string_view text) {

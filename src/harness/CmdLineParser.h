@@ -1,7 +1,9 @@
 // All parameters of a run, as name=value. Everything else asks this object and knows nothing of where a value came
-// from. Nothing writes to it once the manager is built, so any thread may read it.
+// from: the command line, or a parameter file that it names. Nothing writes to it once the manager is built, so any
+// thread may read it.
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 #include <string_view>
@@ -17,9 +19,14 @@ class CmdLineParser {
   /// The same with no arguments: the manager's call has to come first.
   static CmdLineParser& GetInstance();
 
-  /// Logs nothing: a log line asks the singleton, which would be the very object that is being built.
+  /// Logs nothing: a log line asks the singleton, which would be the very object that is being built. For the same
+  /// reason the parameter file is read by a call of its own.
   CmdLineParser(int argc, const char* const* argv);
   virtual ~CmdLineParser() = default;
+
+  /// Adds the parameters of the file that -paramfile and -paramsection name, if any; those of the command line win.
+  /// The manager calls it once, before anybody else asks for a parameter. `modelName` names this machine's model.
+  void ReadParameterFile(const std::function<std::string()>& modelName);
 
   /// The first command-line argument, unchanged.
   [[nodiscard]] std::string GetProgramPath() const { return programPath; }
@@ -36,6 +43,7 @@ class CmdLineParser {
   /// True when the value is "true" or "false", without regard to case.
   [[nodiscard]] bool IsBoolean(std::string_view name) const;
 
+  /// False when a parameter file was asked for and could not be used.
   [[nodiscard]] bool IsParamFileOk() const { return paramFileOk; }
 
   /// Cuts a parameter at its first "=": the lowered key and the value. Without one the whole text is both.

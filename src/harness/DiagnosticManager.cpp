@@ -1,6 +1,5 @@
 #include "harness/DiagnosticManager.h"
 
-#include <array>
 #include <atomic>
 #include <cstdlib>
 #include <exception>
@@ -12,6 +11,7 @@
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
+#include "hw/SMBIOSDiscovery.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
 
@@ -30,21 +30,10 @@ constexpr int kStandardException = 995205;
 
 constexpr unsigned int kNoSuchSubtestMessage = 20001;
 constexpr unsigned int kArgumentsRejectedMessage = 20002;
-constexpr unsigned int kUnknownParameterMessage = 20003;
 constexpr unsigned int kControlMessage = 1;
 
 // Set once the command line can be asked for.
 std::atomic<bool> isCommandLineRead{false};
-
-// The version's lines as one line for the log.
-std::string OnOneLine(std::string text) {
-  CDMUtil::ReplaceAll(text, "\n", ", ");
-  CDMUtil::ReplaceAll(text, "  ", " ");
-  CDMUtil::ReplaceAll(text, "(", "");
-  CDMUtil::ReplaceAll(text, ")", "");
-  CDMUtil::ReplaceAll(text, " :", ":");
-  return text;
-}
 
 }  // namespace
 
@@ -55,12 +44,15 @@ DiagnosticManager::DiagnosticManager(int argc, const char* const* argv, const st
                                      const std::string& diagnosticName)
     : version(versionText), name(diagnosticName) {
   platform::TheHost().console.SetControlHandler(HandleControl);
-  CmdLineParser::GetInstance(argc, argv);
-  isCommandLineRead = true;
-  // What the leaves of the harness need of it. A log line asks for the command line, so it must not do so before that
-  // is there: a line that is logged while it is being read is a plain one.
+  CmdLineParser& parser = CmdLineParser::GetInstance(argc, argv);
   CDMout::SetDebugQuery(
       [] { return CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter("-debug", "false"), "true"); });
+  // A parameter file may set the locale and the message files of the run: the process's own message files, which are
+  // opened once, must not be needed before it is read.
+  CDMout::SetMessageResolver([](unsigned int id, const std::string& text) {
+    return MessageFiles::OfCommandLine().ResolveLogMessage(id, text);
+  });
+  parser.ReadParameterFile([] { return SMBIOSDiscovery::Instance().GetProductText(); });
   CDMout::SetMessageResolver(
       [](unsigned int id, const std::string& text) { return MessageFiles::Instance().ResolveLogMessage(id, text); });
   CDMWindow::SetServices({[](int id, const wstring& fallback) {
@@ -69,6 +61,7 @@ DiagnosticManager::DiagnosticManager(int argc, const char* const* argv, const st
                           },
                           [] { return CmdLineParser::GetInstance().GetParameter("-locale", "en_US"); },
                           [] { return CDMDiag::ShouldTestBeTerminated() || CDMDiag::IsSignalReceived(); }});
+  isCommandLineRead = true;
 }
 
 // The handler goes first: an event that arrives while the process takes its static objects down finds nobody.
@@ -87,10 +80,14 @@ void DiagnosticManager::RegisterSubtest(const std::string& subtestName, CDMDiag*
   subtests[subtestName] = test;
 }
 
-std::string DiagnosticManager::GetSubtestNames() {
+std::map<std::string, CDMDiag*> DiagnosticManager::CopyOfSubtests() {
   const std::lock_guard<std::mutex> lock(subtestsGuard);
+  return subtests;
+}
+
+std::string DiagnosticManager::GetSubtestNames() {
   std::string names;
-  for (const auto& [subtestName, test] : subtests) {
+  for (const auto& [subtestName, test] : CopyOfSubtests()) {
     names += (names.empty() ? "" : " | ") + subtestName;
   }
   return names;
@@ -103,7 +100,11 @@ CDMDiag* DiagnosticManager::FindSubtest(const std::string& subtestName) {
 }
 
 int DiagnosticManager::Run() {
-  return RunSubtest(FindSubtest(CmdLineParser::GetInstance().GetParameter("-subtest", "")));
+  if (!AreRequestsValid()) {
+    return kFailed;
+  }
+  CDMDiag* const test = FindSubtest(CmdLineParser::GetInstance().GetParameter("-subtest", ""));
+  return AnswerRequests(test) ? kPassed : RunSubtest(test);
 }
 
 // Whatever is thrown leaves exactly one result line and one end of test.
@@ -126,8 +127,6 @@ int DiagnosticManager::RunSubtest(CDMDiag* test) const {
     CDMout::TestFailed(text);
   } catch (const char* text) {
     CDMout::TestFailed(std::atoi(text), "");
-  } catch (char* text) {
-    CDMout::TestFailed(std::atoi(text), "");
   } catch (const std::exception& failure) {
     CDMout::TestFailed(kStandardException, failure.what());
   } catch (std::exception* failure) {
@@ -145,7 +144,7 @@ int DiagnosticManager::RunGuarded(CDMDiag* test) const {
     CDMout::TestFailed(kNoSuchSubtest);
     return kFailed;
   }
-  if (!IsAccepted(*test)) {
+  if (!test->ValidateArguments()) {
     CDMout::LogMessage(LogOptions::Invalid, kArgumentsRejectedMessage, "");
     CDMout::TestFailed(kArgumentsRejected);
     return kFailed;
@@ -155,7 +154,7 @@ int DiagnosticManager::RunGuarded(CDMDiag* test) const {
     CDMout::LogMessage(LogOptions::Debug, kFreeText, "diagnostic: " + programPath);
   }
   if (!version.empty()) {
-    CDMout::LogMessage(LogOptions::Debug, kFreeText, "version: " + OnOneLine(version));
+    CDMout::LogMessage(LogOptions::Debug, kFreeText, "version: " + VersionOnOneLine());
   }
   test->LogArguments(LogOptions::Debug, kFreeText);
   platform::Clock& clock = platform::TheHost().clock;
@@ -167,22 +166,6 @@ int DiagnosticManager::RunGuarded(CDMDiag* test) const {
                        "Test execution time: " + CDMUtil::ToString(end - begin) + " milliseconds");
   }
   return passed ? kPassed : kFailed;
-}
-
-// The subtest's own check, and one more: who asks for information must not get a test of his hardware instead. Such
-// requests are not answered yet, and refused like a parameter that nobody knows.
-bool DiagnosticManager::IsAccepted(CDMDiag& test) {
-  constexpr std::array<const char*, 4> kRequests{"-catalog", "-description", "-help", "-version"};
-  if (!test.ValidateArguments()) {
-    return false;
-  }
-  for (const char* request : kRequests) {
-    if (CDMUtil::EqualIgnoreCase(CmdLineParser::GetInstance().GetParameter(request, ""), "true")) {
-      CDMout::LogMessage(LogOptions::Invalid, kUnknownParameterMessage, request);
-      return false;
-    }
-  }
-  return true;
 }
 
 // Runs on the system's control thread. A break never ends the process: the subtest has to notice it.

@@ -13,7 +13,8 @@ class CDMDiag;
 
 class DiagnosticManager {
  public:
-  /// Installs the console control handler and builds the command line's singleton.
+  /// Installs the console control handler, builds the command line's singleton and reads the parameter file: its log
+  /// lines are the first that the program prints.
   DiagnosticManager(int argc, const char* const* argv, const std::string& versionText,
                     const std::string& diagnosticName);
 
@@ -26,8 +27,15 @@ class DiagnosticManager {
   /// test is ignored.
   void RegisterSubtest(const std::string& subtestName, CDMDiag* test);
 
-  /// Runs what the command line asks for. The exit code: 0 when the subtest passed, otherwise 1.
+  /// Answers what the command line asks about the program, or else runs the subtest that it names. The exit code: 0
+  /// when something was answered or the subtest passed, otherwise 1.
   int Run();
+
+  /// The XML description of the whole diagnostic, without a line end behind it.
+  [[nodiscard]] std::string GetCatalog() const;
+
+  /// The template of a resource file with the texts of all subtests.
+  [[nodiscard]] static std::string GetDictionary();
 
   [[nodiscard]] const std::string& GetVersion() const { return version; }
 
@@ -38,9 +46,12 @@ class DiagnosticManager {
   [[nodiscard]] static CDMDiag* FindSubtest(const std::string& subtestName);
 
  private:
+  static bool AreRequestsValid();
+  bool AnswerRequests(CDMDiag* test) const;
   int RunSubtest(CDMDiag* test) const;
   int RunGuarded(CDMDiag* test) const;
-  static bool IsAccepted(CDMDiag& test);
+  [[nodiscard]] std::string VersionOnOneLine() const;
+  static std::map<std::string, CDMDiag*> CopyOfSubtests();
   static bool HandleControl(std::uint32_t type);
 
   std::string version;

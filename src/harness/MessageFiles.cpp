@@ -31,10 +31,14 @@ wstring WideIdOf(int id) { return CDMUtil::ToWString(CDMUtil::ToString(id)); }
 }  // namespace
 
 MessageFiles& MessageFiles::Instance() {
-  static MessageFiles files(CmdLineParser::GetInstance().GetProgramPath(),
-                            CmdLineParser::GetInstance().GetParameter("-integratormsgfile", ""),
-                            CmdLineParser::GetInstance().GetParameter("-locale", kDefaultLocale));
+  static MessageFiles files = OfCommandLine();
   return files;
+}
+
+MessageFiles MessageFiles::OfCommandLine() {
+  const CmdLineParser& parser = CmdLineParser::GetInstance();
+  return {parser.GetProgramPath(), parser.GetParameter("-integratormsgfile", ""),
+          parser.GetParameter("-locale", kDefaultLocale)};
 }
 
 MessageFiles::MessageFiles(const std::string& programPath, const std::string& integratorFile, std::string localeName)

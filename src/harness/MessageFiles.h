@@ -45,6 +45,9 @@ class MessageFiles {
   /// at once.
   static MessageFiles& Instance();
 
+  /// Files by what the command line says now: for as long as it may still change.
+  static MessageFiles OfCommandLine();
+
   /// `programPath` names the standard files, `integratorFile` may be empty.
   MessageFiles(const std::string& programPath, const std::string& integratorFile, std::string localeName);
 

@@ -132,6 +132,9 @@ std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandT
   if (!data) {
     throw InvalidTmbWMIException("Get Data");
   }
+  if (data->size() < method.answer_bytes) {
+    throw InvalidTmbWMIException("Return Size Discovery");
+  }
   data->resize(method.answer_bytes);
   return *data;
 }

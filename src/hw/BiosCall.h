@@ -9,8 +9,7 @@
 namespace panelglow {
 
 /// `sizeIndex` picks the size of the answer: 0, 4, 128, 1024 or 4096 bytes. Throws InvalidTmbWMIException for a step
-/// that fails, InvalidTmbWMICallException when the firmware does not sign its answer. An answer shorter than its size
-/// is filled up with zeroes.
+/// that fails, a short answer included, and InvalidTmbWMICallException when the firmware does not sign its answer.
 std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandType,
                                    const std::vector<std::uint8_t>& inputBytes, std::size_t sizeIndex);
 

@@ -14,13 +14,6 @@ using driver::DriverRecord;
 
 namespace {
 
-// Rights and kinds as the service manager's interface numbers them.
-constexpr std::uint32_t kManagerAllAccess = 0xF003F;
-constexpr std::uint32_t kServiceAllAccess = 0xF01FF;
-constexpr std::uint32_t kKernelDriver = 1;
-constexpr std::uint32_t kDemandStart = 3;
-constexpr std::uint32_t kErrorNormal = 1;
-
 // Base address register flags.
 constexpr std::uint32_t kBarIsIo = 1U << 0U;
 constexpr std::uint32_t kBarIs64Bit = 1U << 2U;
@@ -30,102 +23,24 @@ constexpr std::uint64_t kMemoryBarMask = ~std::uint64_t{15};
 // From here on a version word is in the new form.
 constexpr std::uint32_t kFirstNewVersion = 0xFFF;
 
-// Closes a service manager or service handle.
-class OpenService {
- public:
-  explicit OpenService(platform::ServiceHandle handle) : handle_(handle) {}
-  ~OpenService() {
-    if (handle_ != 0) {
-      platform::TheHost().services.Close(handle_);
-    }
-  }
-  OpenService(const OpenService&) = delete;
-  OpenService& operator=(const OpenService&) = delete;
-  [[nodiscard]] platform::ServiceHandle Get() const { return handle_; }
-
- private:
-  platform::ServiceHandle handle_;
-};
+DriverLoader Loader() { return {platform::TheHost().services, platform::TheHost().drivers}; }
 
 }  // namespace
 
-struct CDevio::NameSet {
-  std::string service;
-  std::string display;
-  std::string device;
-  std::string image;
-};
-
-CDevio::NameSet CDevio::PresentNames() {
-  const bool wide = platform::TheHost().cpu.Is64BitSystem();
-  return {"tmbhalcyon", "tmbhalcyon", "tmbhalcyon",
-          wide ? "system32\\drivers\\tmb64halcyon.sys" : "system32\\drivers\\tmb32halcyon.sys"};
-}
-
-CDevio::CDevio() {
-  SetNames(PresentNames());
-  LoadDriver();
-  if (loadState == LoadState::kNoBinary) {
-    SetNames({"Nvntsk", "Norvane Tsk", "Nvntsk", "System32\\drivers\\nvntsk.sys"});
-    LoadDriver();
-  }
-  if (loadState != LoadState::kRunning) {
-    device.reset();
-  }
-}
+CDevio::CDevio() : device(Loader().LoadPresentOrOlder(platform::TheHost().cpu.Is64BitSystem(), names, loadState)) {}
 
 CDevio::CDevio(std::string service, std::string display, std::string deviceLink, std::string image)
-    : CDevio(NameSet{std::move(service), std::move(display), std::move(deviceLink), std::move(image)}) {}
+    : CDevio(DriverNames{std::move(service), std::move(display), std::move(deviceLink), std::move(image)}) {}
 
 CDevio::CDevio(const std::string& service, const std::string& display, const std::string& deviceLink)
-    : CDevio(NameSet{service, display, deviceLink, "system32\\drivers\\" + service + ".sys"}) {}
+    : CDevio(DriverNames{service, display, deviceLink, "system32\\drivers\\" + service + ".sys"}) {}
 
-CDevio::CDevio(NameSet names) {
-  SetNames(std::move(names));
-  if (!LoadDriver()) {
-    device.reset();
-  }
-}
+CDevio::CDevio(DriverNames given) : names(std::move(given)) { LoadDriver(); }
 
-void CDevio::SetNames(NameSet names) {
-  serviceName = std::move(names.service);
-  displayName = std::move(names.display);
-  deviceName = std::move(names.device);
-  imagePath = std::move(names.image);
-}
-
-// A load that stops says nothing: callers see an object without a driver and report that in their own way.
 bool CDevio::LoadDriver() {
   device.reset();
-  platform::ServiceManager& services = platform::TheHost().services;
-  std::uint32_t error = 0;
-  const OpenService manager(services.OpenManager(kManagerAllAccess, error));
-  if (manager.Get() == 0) {
-    return false;
-  }
-  platform::ServiceHandle handle = services.OpenService(manager.Get(), serviceName, kServiceAllAccess, error);
-  if (handle == 0 && error == platform::kErrorServiceDoesNotExist) {
-    handle = services.CreateService(
-        manager.Get(),
-        {serviceName, displayName, kServiceAllAccess, kKernelDriver, kDemandStart, kErrorNormal, imagePath}, error);
-  }
-  const OpenService service(handle);
-  if (service.Get() == 0) {
-    return false;
-  }
-  error = services.Start(service.Get());
-  if (error == platform::kErrorFileNotFound) {
-    loadState = LoadState::kNoBinary;
-    services.Delete(service.Get());
-    return false;
-  }
-  if (error != 0 && error != platform::kErrorServiceAlreadyRunning) {
-    loadState = LoadState::kStartFailed;
-    return false;
-  }
-  loadState = LoadState::kRunning;
-  device = platform::TheHost().drivers.Open(deviceName, error);
-  return device != nullptr;
+  device = Loader().Load(names, loadState);
+  return IsDriverLoaded();
 }
 
 void CDevio::LogDriverVersion() {
@@ -138,7 +53,7 @@ void CDevio::LogDriverVersion() {
   std::string line;
   if (word < kFirstNewVersion) {
     std::snprintf(version.data(), version.size(), "%u.%u", word / 100, word % 100);
-    line = displayName + ".sys version " + version.data() + ".\n";
+    line = names.display + ".sys version " + version.data() + ".\n";
   } else {
     const unsigned major = word >> 24U;
     const unsigned minor = word >> 16U & 0xFFU;
@@ -151,7 +66,7 @@ void CDevio::LogDriverVersion() {
     } else {
       std::snprintf(version.data(), version.size(), "version %2u.%02u", major, minor);
     }
-    line = deviceName + ".sys " + version.data() + (build == kBuild32Bit ? " 32bit.\n" : " 64bit.\n");
+    line = names.device + ".sys " + version.data() + (build == kBuild32Bit ? " 32bit.\n" : " 64bit.\n");
   }
   CDMout::LogMessage(LogOptions::Debug, kFreeText, line);
 }

@@ -11,6 +11,7 @@
 #include <span>
 #include <string>
 
+#include "hw/DriverLoader.h"
 #include "platform/DriverDevice.h"
 
 namespace panelglow {
@@ -20,13 +21,7 @@ namespace panelglow {
 /// board library's mutex.
 class CDevio {
  public:
-  /// How the last load of the driver's service ended.
-  enum class LoadState : std::uint32_t {
-    kNotStarted = 0,   // nothing tried yet, or stopped before the start
-    kRunning = 1,      // started now, or ran already
-    kStartFailed = 2,  // for another reason than a missing file
-    kNoBinary = 3,     // the driver's file is missing; the service was deleted again
-  };
+  using LoadState = DriverLoadState;
 
   /// The answer of a mapping request: the five words of the 32-bit record.
   using MappingRecord = std::array<std::uint32_t, 5>;
@@ -46,7 +41,8 @@ class CDevio {
   [[nodiscard]] bool IsDriverLoaded() const { return device != nullptr; }
   [[nodiscard]] LoadState GetLoadState() const { return loadState; }
 
-  /// Registers the service if it is new, starts it and opens the device. True when the device is open.
+  /// Registers the service if it is new, starts it and opens the device, under the names of this object. True when
+  /// the device is open.
   bool LoadDriver();
 
   /// One debug line with the driver's name and version.
@@ -106,11 +102,7 @@ class CDevio {
   std::uint16_t ReadFirmwareWord(std::uint16_t segment, std::uint16_t offset);
 
  private:
-  struct NameSet;
-  static NameSet PresentNames();
-
-  explicit CDevio(NameSet names);
-  void SetNames(NameSet names);
+  explicit CDevio(DriverNames given);
   std::uint32_t Inport(std::uint32_t code, std::uint16_t port, std::uint32_t width);
   bool Outport(std::uint32_t code, std::uint16_t port, std::uint32_t width, std::uint32_t value,
                std::size_t answerSize);
@@ -123,12 +115,9 @@ class CDevio {
   std::uint32_t CopyTo(std::uint64_t mapped, std::uint32_t length, std::span<const std::byte> buffer);
   std::uint16_t ReadFirmware(std::uint32_t code, std::uint16_t segment, std::uint16_t offset);
 
-  std::unique_ptr<platform::DriverDevice> device;  // null: not loaded
-  std::string serviceName;
-  std::string displayName;
-  std::string deviceName;
-  std::string imagePath;  // relative to the system root
+  DriverNames names;
   LoadState loadState = LoadState::kNotStarted;
+  std::unique_ptr<platform::DriverDevice> device;  // null: not loaded
 };
 
 }  // namespace panelglow

@@ -26,6 +26,22 @@ using Color = std::uint32_t;
 
 inline constexpr Color kButtonFaceColor = 0x00F0F0F0;
 
+/// Black or white: the one that can be read on `background`.
+constexpr Color ReadableOn(Color background) {
+  constexpr std::uint32_t kMiddle = 11700;  // of 65025, where both are equally far away
+  const auto squared = [](std::uint32_t part) { return part * part; };
+  const std::uint32_t brightness = (21 * squared(background & 0xFFU) + 72 * squared(background >> 8U & 0xFFU) +
+                                    7 * squared(background >> 16U & 0xFFU)) /
+                                   100;
+  return brightness < kMiddle ? 0x00FFFFFF : 0;
+}
+
+/// A window's answer to kControlColorButton and kControlColorStatic: the control is to have this background. An
+/// answer of 0 leaves the control its usual one.
+constexpr std::intptr_t OwnControlColor(Color background) {
+  return 0x01000000 | static_cast<std::intptr_t>(background);
+}
+
 /// Message numbers (the numbers are the home system's, so that a log of messages reads as its documentation does).
 namespace message {
 inline constexpr std::uint32_t kCreate = 0x0001;
@@ -53,7 +69,7 @@ inline constexpr std::uint32_t kCommand = 0x0111;
 inline constexpr std::uint32_t kTimer = 0x0113;
 inline constexpr std::uint32_t kHorizontalScroll = 0x0114;
 inline constexpr std::uint32_t kVerticalScroll = 0x0115;
-inline constexpr std::uint32_t kControlColorButton = 0x0135;
+inline constexpr std::uint32_t kControlColorButton = 0x0135;  // asked of the parent, with the control in lParam
 inline constexpr std::uint32_t kControlColorStatic = 0x0138;
 inline constexpr std::uint32_t kSetImage = 0x0172;  // 370
 inline constexpr std::uint32_t kMouseMove = 0x0200;
@@ -62,6 +78,7 @@ inline constexpr std::uint32_t kLeftButtonUp = 0x0202;
 inline constexpr std::uint32_t kDeviceChange = 0x0219;
 inline constexpr std::uint32_t kHotKey = 0x0312;
 inline constexpr std::uint32_t kAppCommand = 0x0319;
+inline constexpr std::uint32_t kGetDefaultId = 0x0400;  // which button Enter presses; see kHasDefaultId
 }  // namespace message
 
 /// What happened to a device, in the `wParam` of kDeviceChange.
@@ -70,6 +87,10 @@ inline constexpr std::uint32_t kNodesChanged = 0x0007;
 inline constexpr std::uint32_t kArrival = 0x8000;
 inline constexpr std::uint32_t kRemoveComplete = 0x8004;
 }  // namespace device_event
+
+/// In the answer to kGetDefaultId beside the button's id; without it there is no such button. The default procedure
+/// answers with the first button of the default style.
+inline constexpr std::intptr_t kHasDefaultId = 0x534B0000;
 
 /// Window style bits.
 namespace style {
@@ -83,6 +104,7 @@ inline constexpr std::uint32_t kSizeFrame = 0x00040000;
 inline constexpr std::uint32_t kTabStop = 0x00010000;
 inline constexpr std::uint32_t kDefaultPushButton = 0x00000001;  // of a BUTTON
 inline constexpr std::uint32_t kStaticTypeMask = 0x0000001F;     // of a STATIC
+inline constexpr std::uint32_t kStaticCentred = 0x00000001;
 inline constexpr std::uint32_t kStaticIcon = 0x00000003;
 inline constexpr std::uint32_t kStaticBitmap = 0x0000000E;
 inline constexpr std::uint32_t kScrollBarVertical = 0x00000001;  // of a SCROLLBAR
@@ -295,7 +317,7 @@ class Desktop {
   // ---- painting
 
   /// Starts painting the client area, erased with the class background. The returned canvas ends the painting when it
-  /// is destroyed.
+  /// is destroyed. On a control, what is painted lies on the control's own picture until the next painting.
   virtual std::unique_ptr<Canvas> BeginPaint(WindowHandle window) = 0;
   virtual void Invalidate(WindowHandle window) = 0;
 

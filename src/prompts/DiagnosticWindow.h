@@ -17,6 +17,8 @@ class DiagnosticWindow {
   /// Each form blocks and returns a PromptResult.
   int ImageForm(const wstring& text, const wstring& title, unsigned int style, const wstring& imagePath);
   int TextForm(const wstring& text, const wstring& title, unsigned int style);
+  int MarkedForm(const wstring& text, const wstring& title, unsigned int style, const wstring& greenMark,
+                 const wstring& redMark);
 
  private:
   DiagnosticConfiguration configuration;

@@ -9,38 +9,33 @@
 #include "harness/base/CDMout.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
+#include "prompts/PromptParts.h"
 
 namespace panelglow {
 
 namespace message = platform::message;
-namespace style = platform::style;
-namespace position = platform::position;
 using platform::Rectangle;
 using platform::WindowHandle;
 
 namespace {
 
 constexpr const char* kPlainClass = "PromptWindowClassName";
-constexpr std::uint32_t kClassStyle = 3;  // redraw on horizontal and vertical resize
+constexpr const char* kPaneClass = "PromptWindowChildClassName";
 constexpr std::uint32_t kImageWindowStyle = 0x90840001;
 constexpr std::uint32_t kTextWindowStyle = 0x90800001;
 constexpr std::uint32_t kTextFieldStyle = 0x50802000;
-constexpr std::uint32_t kDefaultButtonStyle = 0x50010301;
+constexpr std::uint32_t kPaneStyle = 0x50800000;
 constexpr std::uint32_t kButtonStyle = 0x50010300;
 constexpr std::uint32_t kImageAreaStyle = 0x5000000E;
 constexpr std::uint32_t kFailedImageStyle = 0x50800000;
 constexpr std::uint32_t kHorizontalBarStyle = 0x50000004;
 constexpr std::uint32_t kVerticalBarStyle = 0x50000005;
-constexpr std::uint32_t kShowInPlace = position::kNoSize | position::kNoMove | position::kShowWindow;  // 0x43
 
-constexpr int kFirstButtonId = 1000;  // a button's id is this and its result
 constexpr int kTextFieldId = 1000;
 constexpr int kImageAreaId = 1008;
 
 // Layout, in pixels.
-constexpr int kDefaultWidth = 540;
-constexpr int kImageFormHeight = 300;
-constexpr int kTextFormHeight = 290;
+constexpr int kImageFormHeight = 300;  // of one without an image, and the least
 constexpr int kImageMarginX = 50;
 constexpr int kImageMarginY = 140;
 constexpr int kFailedImageWidth = 490;
@@ -53,7 +48,6 @@ constexpr int kColumnStep = 30;
 constexpr int kColumnTextWidth = 340;
 constexpr int kColumnTextHeight = 270;
 constexpr int kBarThickness = 20;
-constexpr platform::Font kFont{18, 600};
 
 // Timers.
 constexpr std::uint32_t kTickTimer = 0;
@@ -62,26 +56,7 @@ constexpr std::uint32_t kTicksPerSecond = 1000 / kTick_ms;
 constexpr std::uint32_t kStopTimer = 1;
 constexpr std::uint32_t kStopPeriod_ms = 5000;
 
-// Device events in wParam of the device-change message.
-constexpr std::uintptr_t kNodesChanged = 7;
-constexpr std::uintptr_t kArrival = 0x8000;
-constexpr std::uintptr_t kRemoveComplete = 0x8004;
-
 constexpr unsigned int kImageMessage = 8;
-
-// Captions by result.
-struct Caption {
-  int textId;
-  const char16_t* fallback;
-};
-constexpr std::array<Caption, 8> kCaptions{{{0, u""},
-                                            {20016, u"&Abort"},
-                                            {20012, u"&Cancel"},
-                                            {20017, u"&Ignore"},
-                                            {20015, u"&No"},
-                                            {20011, u"&OK"},
-                                            {20013, u"&Retry"},
-                                            {20014, u"&Yes"}}};
 
 // Button sets by style: the buttons in order, and the default one. Every other style has the first set.
 struct ButtonSet {
@@ -102,11 +77,6 @@ const ButtonSet& ButtonSetOf(unsigned int promptStyle) {
   return kButtonSets[promptStyle < kButtonSets.size() ? promptStyle : 0];
 }
 
-wstring CaptionOf(int result) {
-  const Caption& caption = kCaptions[static_cast<std::size_t>(result)];
-  return CDMWindow::Text(caption.textId, caption.fallback);
-}
-
 // Estimated width of a caption's character: only this changes with the language.
 int CharWidthOf(bool imageForm) {
   constexpr std::array<std::string_view, 4> kWideLocales{"zh_CN", "zh_TW", "ko_KR", "ja_JP"};
@@ -116,26 +86,6 @@ int CharWidthOf(bool imageForm) {
   }
   return imageForm ? 30 : 10;
 }
-
-wstring TitleOf(const wstring& title) {
-  return title.empty() ? CDMUtil::ToWString(platform::TheHost().files.ExecutablePath()) : title;
-}
-
-// A window class registered for the life of the object.
-class RegisteredClass {
- public:
-  RegisteredClass(platform::Desktop& desktop, const platform::WindowClass& windowClass)
-      : desktop_(desktop), name_(windowClass.name) {
-    desktop_.RegisterWindowClass(windowClass);
-  }
-  ~RegisteredClass() { desktop_.UnregisterWindowClass(name_); }
-  RegisteredClass(const RegisteredClass&) = delete;
-  RegisteredClass& operator=(const RegisteredClass&) = delete;
-
- private:
-  platform::Desktop& desktop_;
-  std::string name_;
-};
 
 }  // namespace
 
@@ -155,6 +105,13 @@ int TextPrompt(const wstring& text, const wstring& title, unsigned int promptSty
       .Run();
 }
 
+int MarkedPrompt(const wstring& text, const wstring& title, unsigned int promptStyle, const wstring& greenMark,
+                 const wstring& redMark) {
+  PromptWindow::Request request{text, title, promptStyle};
+  request.marks = {greenMark, redMark};
+  return PromptWindow({kPlainClass, platform::kButtonFaceColor, false}, std::move(request)).Run();
+}
+
 PromptWindow::PromptWindow(const Family& family, Request request)
     : family_(family), request_(std::move(request)), desktop_(platform::TheHost().desktop) {
   topmost_ = (request_.style & kPromptTopmost) != 0;
@@ -167,7 +124,7 @@ PromptWindow::PromptWindow(const Family& family, Request request)
     timeoutTicks_ = std::exchange(state.timeoutSeconds, 0U) * 1000 / kTick_ms;
   }
   charWidth_ = CharWidthOf(request_.imageForm);
-  request_.title = TitleOf(request_.title);
+  request_.title = PromptTitle(request_.title);
   MeasureImage();
 }
 
@@ -176,8 +133,8 @@ PromptWindow::~PromptWindow() { desktop_.DestroyWindow(window_); }
 
 // Window size, image size, and whether there is an image and a text.
 void PromptWindow::MeasureImage() {
-  windowWidth_ = kDefaultWidth;
-  windowHeight_ = request_.imageForm ? kImageFormHeight : kTextFormHeight;
+  windowWidth_ = kFormWidth;
+  windowHeight_ = request_.imageForm ? kImageFormHeight : kFormHeight;
   hasText_ = !request_.imageForm || !request_.text.empty();
   if (request_.imagePath.empty()) {
     return;
@@ -193,20 +150,32 @@ void PromptWindow::MeasureImage() {
   }
   imageWidth_ = size->width;
   imageHeight_ = size->height;
-  windowWidth_ = std::min(imageWidth_ + kImageMarginX, desktop_.ScreenWidth());
-  windowHeight_ = std::min(imageHeight_ + kImageMarginY, desktop_.ScreenHeight());
+  // Not below the least size that the window can be dragged to: a small picture leaves no room for buttons and text.
+  windowWidth_ = std::clamp(imageWidth_ + kImageMarginX, kFormWidth, std::max(kFormWidth, desktop_.ScreenWidth()));
+  windowHeight_ =
+      std::clamp(imageHeight_ + kImageMarginY, kImageFormHeight, std::max(kImageFormHeight, desktop_.ScreenHeight()));
 }
 
 int PromptWindow::Run() {
   const RegisteredClass registered(desktop_,
-                                   {family_.className, kClassStyle, 1, family_.background,
+                                   {family_.className, kPromptClassStyle, 1, family_.background,
                                     [this](const platform::Message& received) { return Handle(received); }});
+  std::optional<RegisteredClass> paneRegistered;
+  std::vector<TextPiece> pieces;
+  if (request_.marks) {
+    paneRegistered.emplace(
+        desktop_, platform::WindowClass{kPaneClass, kPromptClassStyle, 1, family_.background,
+                                        [this](const platform::Message& received) { return HandlePane(received); }});
+    pieces = CutAtMarks(request_.text, request_.marks->green, request_.marks->red);
+  }
   if (!Create()) {
-    CDMout::LogMessage(LogOptions::ServiceErrors, kFreeText, "A prompt cannot be shown: there is no display.");
+    LogNoWindow();
     return prompt_result::kNone;
   }
   CreateButtons();
-  if (hasText_) {
+  if (!pieces.empty()) {
+    CreateMarkedPane(pieces);
+  } else if (hasText_) {
     CreateTextField();
   }
   if (HasPictureArea()) {
@@ -239,24 +208,19 @@ void PromptWindow::CreateButtons() {
   const ButtonSet& set = ButtonSetOf(request_.style);
   std::size_t longest = 0;
   for (std::size_t i = 0; i < set.count; ++i) {
-    longest = std::max(longest, CaptionOf(set.results[i]).size());
+    longest = std::max(longest, PromptCaption(set.results[i]).size());
   }
   buttonWidth_ = std::max(kNarrowestButton, static_cast<int>(longest) * charWidth_);
+  // A column's button ends with its window, so that the middle of its caption can be seen.
+  const int width = std::min(buttonWidth_, clientWidth_ - kColumnX);
   WindowHandle defaultButton = 0;
   for (std::size_t i = 0; i < set.count; ++i) {
     const int result = set.results[i];
-    platform::WindowRequest request;
-    request.className = "BUTTON";
-    request.text = CaptionOf(result);
-    request.style = result == set.defaultResult ? kDefaultButtonStyle : kButtonStyle;
-    request.x = kColumnX;
-    request.y = kMargin + static_cast<int>(i) * kColumnStep;
-    request.width = buttonWidth_;
-    request.height = kButtonHeight;
-    request.parent = window_;
-    const WindowHandle button = desktop_.CreateWindow(request);
-    desktop_.SetControlId(button, kFirstButtonId + result);
-    desktop_.SetFont(button, kFont);
+    const WindowHandle button = CreateControl(
+        desktop_, window_,
+        {"BUTTON", result == set.defaultResult ? kDefaultButtonStyle : kButtonStyle, kFirstButtonId + result,
+         PlaceAt(kColumnX, kMargin + static_cast<int>(i) * kColumnStep, width, kButtonHeight),
+         PromptCaption(result)});
     buttons_.push_back({result, button});
     defaultButton = result == set.defaultResult ? button : defaultButton;
   }
@@ -280,67 +244,47 @@ void PromptWindow::PlaceButtonRow() {
 }
 
 Rectangle PromptWindow::TextFieldPlace() const {
-  const auto place = [](int left, int top, int width, int height) {
-    return Rectangle{left, top, left + width, top + height};
-  };
   if (!request_.imageForm) {
-    return place(kMargin, kMargin, kColumnTextWidth, kColumnTextHeight);
+    return PlaceAt(kMargin, kMargin, kColumnTextWidth, kColumnTextHeight);
   }
-  return HasPictureArea() ? place(kMargin, clientHeight_ - 90, clientWidth_ - 40, 60)
-                          : place(kMargin, kMargin, clientWidth_ - 40, clientHeight_ - 40);
+  return HasPictureArea() ? PlaceAt(kMargin, clientHeight_ - 90, clientWidth_ - 40, 60)
+                          : PlaceAt(kMargin, kMargin, clientWidth_ - 40, clientHeight_ - 40);
 }
 
 Rectangle PromptWindow::ImageAreaPlace() const {
   const int height = clientHeight_ - (hasText_ ? 130 : 50);
-  return {kMargin, kMargin, kMargin + clientWidth_ - 40, kMargin + height};
+  return PlaceAt(kMargin, kMargin, clientWidth_ - 40, height);
 }
 
 Rectangle PromptWindow::HorizontalBarPlace() const {
   const int top = clientHeight_ - (hasText_ ? 120 : 50);
-  return {kMargin, top, kMargin + clientWidth_ - 30, top + kBarThickness};
+  return PlaceAt(kMargin, top, clientWidth_ - 30, kBarThickness);
 }
 
 Rectangle PromptWindow::VerticalBarPlace() const {
-  const Rectangle area = ImageAreaPlace();
-  return {clientWidth_ - kBarThickness, kMargin, clientWidth_, area.bottom};
+  return PlaceAt(clientWidth_ - kBarThickness, kMargin, kBarThickness, ImageAreaPlace().Height());
 }
 
 void PromptWindow::CreateTextField() {
-  const Rectangle place = TextFieldPlace();
-  platform::WindowRequest request;
-  request.className = "STATIC";
-  request.text = request_.text;
-  request.style = kTextFieldStyle;
-  request.x = place.left;
-  request.y = place.top;
-  request.width = place.Width();
-  request.height = place.Height();
-  request.parent = window_;
-  textControl_ = desktop_.CreateWindow(request);
-  desktop_.SetControlId(textControl_, kTextFieldId);
-  desktop_.SetFont(textControl_, kFont);
+  textControl_ =
+      CreateControl(desktop_, window_, {"STATIC", kTextFieldStyle, kTextFieldId, TextFieldPlace(), request_.text});
+}
+
+// The pane's text is broken into lines once, and painted whenever the pane asks for it, so that it is still there
+// after the pane was covered. What lies between the marks has the pane's own ground.
+void PromptWindow::CreateMarkedPane(const std::vector<TextPiece>& pieces) {
+  markedPane_ = CreateControl(desktop_, window_, {kPaneClass, kPaneStyle, 0, TextFieldPlace(), request_.text});
+  const Rectangle client = desktop_.ClientRectangle(markedPane_);
+  markedText_ = PlacePieces(desktop_, pieces, kPromptFont, client.Width(), client.Height());
 }
 
 void PromptWindow::CreateImageArea() {
-  const auto create = [this](const char* className, std::uint32_t controlStyle, const Rectangle& place,
-                             const wstring& text) {
-    platform::WindowRequest request;
-    request.className = className;
-    request.text = text;
-    request.style = controlStyle;
-    request.x = place.left;
-    request.y = place.top;
-    request.width = place.Width();
-    request.height = place.Height();
-    request.parent = window_;
-    return desktop_.CreateWindow(request);
-  };
-  imageControl_ = create("STATIC", hasImage_ ? kImageAreaStyle : kFailedImageStyle, ImageAreaPlace(),
-                         hasImage_ ? wstring() : request_.imagePath);
-  desktop_.SetControlId(imageControl_, kImageAreaId);
-  desktop_.SetFont(imageControl_, kFont);
-  horizontalBar_ = create("SCROLLBAR", kHorizontalBarStyle, HorizontalBarPlace(), {});
-  verticalBar_ = create("SCROLLBAR", kVerticalBarStyle, VerticalBarPlace(), {});
+  imageControl_ = CreateControl(desktop_, window_,
+                                {"STATIC", hasImage_ ? kImageAreaStyle : kFailedImageStyle, kImageAreaId,
+                                 ImageAreaPlace(), hasImage_ ? wstring() : request_.imagePath});
+  horizontalBar_ =
+      CreateControl(desktop_, window_, {"SCROLLBAR", kHorizontalBarStyle, 0, HorizontalBarPlace(), wstring()});
+  verticalBar_ = CreateControl(desktop_, window_, {"SCROLLBAR", kVerticalBarStyle, 0, VerticalBarPlace(), wstring()});
   SetScrollRanges();
 }
 
@@ -399,7 +343,7 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
       break;
     case message::kGetMinMaxInfo: {
       auto* limits = reinterpret_cast<platform::TrackLimits*>(received.lParam);
-      *limits = {kDefaultWidth, kImageFormHeight, desktop_.ScreenWidth(), desktop_.ScreenHeight()};
+      *limits = {kFormWidth, kImageFormHeight, desktop_.ScreenWidth(), desktop_.ScreenHeight()};
       break;
     }
     case message::kCommand: {
@@ -422,6 +366,12 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
       return OnPaint(received);
     case message::kSyncPaint:
       return 0;
+    case message::kControlColorButton:
+    case message::kControlColorStatic:
+      if (family_.configurable) {
+        return platform::OwnControlColor(family_.background);  // buttons and texts take the configured colour
+      }
+      break;
     case message::kDeviceChange:
       if (!family_.configurable) {
         OnDeviceChange(received.wParam);
@@ -543,6 +493,7 @@ void PromptWindow::CountDown() {
   if (elapsedTicks_ > timeoutTicks_) {
     End(ThePromptState().timeoutResult);
     timeoutTicks_ = 0;
+    desktop_.Invalidate(window_);  // which stays when the result is 0, and has nothing to count any more
   }
   if (elapsedTicks_ % kTicksPerSecond == 0) {
     desktop_.Invalidate(desktop_.ForegroundWindow());
@@ -582,33 +533,97 @@ void PromptWindow::OnScroll(const platform::Message& received) {
 }
 
 std::intptr_t PromptWindow::OnPaint(const platform::Message& received) {
-  if (!hasImage_ && timeoutTicks_ == 0) {
+  if (hasImage_) {
+    PaintImage();
+  }
+  const WindowHandle former = std::exchange(countDownControl_, timeoutTicks_ == 0 ? 0 : ControlUnderCountDown());
+  if (former != 0 && former != countDownControl_) {
+    PaintControl(former);  // takes the number away
+  }
+  if (timeoutTicks_ == 0) {
     return desktop_.DefaultProcedure(received);
   }
   const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(received.window);
-  if (hasImage_) {
-    const Rectangle area = ImageAreaPlace();
-    canvas->DrawImage(area.left - horizontalPosition_, area.top - verticalPosition_, request_.imagePath, area);
+  if (countDownControl_ != 0) {
+    PaintControl(countDownControl_);
+  } else {
+    const Point place = CountDownPlace();
+    PaintCountDown(*canvas, place.x, place.y);
   }
-  if (timeoutTicks_ != 0) {
-    const Rectangle client = desktop_.ClientRectangle(received.window);
-    const std::uint32_t seconds = (timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000;
-    canvas->DrawText((client.left + client.right) / 5, client.top + client.bottom - 22,
-                     CDMUtil::ToWString(CDMUtil::ToString(seconds)), kFont, 0, std::nullopt);
+  return 0;
+}
+
+void PromptWindow::PaintImage() {
+  const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(imageControl_);
+  canvas->DrawImage(-horizontalPosition_, -verticalPosition_, request_.imagePath,
+                    desktop_.ClientRectangle(imageControl_));
+}
+
+PromptWindow::Point PromptWindow::CountDownPlace() const { return {clientWidth_ / 5, clientHeight_ - 22}; }
+
+// The count-down has a fixed place in the window. A control that stands there would cover what the window paints, as
+// the text does in the forms without an image; so the number is painted on the control then. 0 when there is none.
+WindowHandle PromptWindow::ControlUnderCountDown() const {
+  const Point place = CountDownPlace();
+  for (const WindowHandle child : desktop_.Children(window_)) {
+    if (desktop_.IsWindowVisible(child) && desktop_.WindowRectangle(child).Contains(place.x, place.y)) {
+      return child;
+    }
   }
+  return 0;
+}
+
+// What this window paints on one of its controls: the marked text, and the count-down where that lies on it.
+void PromptWindow::PaintControl(WindowHandle control) {
+  const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(control);
+  if (control == markedPane_) {
+    PaintMarkedText(*canvas);
+  }
+  if (control != countDownControl_) {
+    return;
+  }
+  const Rectangle place = desktop_.WindowRectangle(control);
+  const int frame = (place.Width() - desktop_.ClientRectangle(control).Width()) / 2;
+  int x = CountDownPlace().x - place.left - frame;
+  if (IsButton(control)) {
+    constexpr int kGap = 6;  // pixels to the caption, which can still be read
+    const Rectangle caption = desktop_.MeasureText(desktop_.WindowText(control), place.Width(), kPromptFont);
+    x = std::max(x, (place.Width() + caption.Width()) / 2 + kGap);
+  }
+  PaintCountDown(*canvas, x, CountDownPlace().y - place.top - frame);
+}
+
+void PromptWindow::PaintCountDown(platform::Canvas& canvas, int x, int y) const {
+  const std::uint32_t seconds = (timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000;
+  canvas.DrawText(x, y, CDMUtil::ToWString(CDMUtil::ToString(seconds)), kPromptFont, 0, std::nullopt);
+}
+
+void PromptWindow::PaintMarkedText(platform::Canvas& canvas) const {
+  for (const PlacedText& part : markedText_) {
+    const platform::Color ground = part.piece.background.value_or(family_.background);
+    canvas.DrawText(part.x, part.y, part.piece.text, kPromptFont, platform::ReadableOn(ground),
+                    part.piece.background);
+  }
+}
+
+std::intptr_t PromptWindow::HandlePane(const platform::Message& received) {
+  if (received.id != message::kPaint) {
+    return desktop_.DefaultProcedure(received);
+  }
+  PaintControl(received.window);
   return 0;
 }
 
 void PromptWindow::OnDeviceChange(std::uintptr_t event) {
   std::atomic<std::uint32_t>& events = ThePromptState().promptEvents;
   switch (event) {
-    case kNodesChanged:
+    case platform::device_event::kNodesChanged:
       events |= kDeviceTreeChanged;
       break;
-    case kArrival:
+    case platform::device_event::kArrival:
       events |= kDeviceArrived;
       break;
-    case kRemoveComplete:
+    case platform::device_event::kRemoveComplete:
       events |= kDeviceRemoved;
       break;
     default:
@@ -616,14 +631,16 @@ void PromptWindow::OnDeviceChange(std::uintptr_t event) {
   }
 }
 
+bool PromptWindow::IsButton(WindowHandle control) const {
+  return std::any_of(buttons_.begin(), buttons_.end(), [&](const Button& b) { return b.window == control; });
+}
+
 void PromptWindow::FocusFirstChild(bool onlyButton) {
   const std::vector<WindowHandle> children = desktop_.Children(window_);
   if (children.empty()) {
     return;
   }
-  const bool isButton =
-      std::any_of(buttons_.begin(), buttons_.end(), [&](const Button& b) { return b.window == children.front(); });
-  if (isButton || !onlyButton) {
+  if (IsButton(children.front()) || !onlyButton) {
     desktop_.SetFocus(children.front());
   }
 }

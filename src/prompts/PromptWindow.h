@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "platform/Desktop.h"
+#include "prompts/MarkedText.h"
 #include "prompts/PromptState.h"
 
 namespace panelglow {
@@ -19,6 +20,16 @@ int ImagePrompt(const wstring& text, const wstring& title, unsigned int style, c
 
 /// A text field and a column of buttons in a window of fixed size.
 int TextPrompt(const wstring& text, const wstring& title, unsigned int style, AutoWorker autoWorker, int autoResult);
+
+/// A text prompt with two words of the text on coloured ground; a plain text prompt where one of them is not in it.
+int MarkedPrompt(const wstring& text, const wstring& title, unsigned int style, const wstring& greenMark,
+                 const wstring& redMark);
+
+/// The words of a text that are marked.
+struct PromptMarks {
+  wstring green;
+  wstring red;
+};
 
 /// One prompt on its way from creation to result, of either family. Lives on the stack of the call that shows it.
 class PromptWindow {
@@ -35,9 +46,10 @@ class PromptWindow {
     wstring title;
     unsigned int style = 0;
     bool imageForm = false;
-    wstring imagePath;
-    AutoWorker autoWorker;
+    wstring imagePath = {};
+    AutoWorker autoWorker = nullptr;
     int autoResult = 0;
+    std::optional<PromptMarks> marks = std::nullopt;
   };
 
   PromptWindow(const Family& family, Request request);
@@ -53,15 +65,21 @@ class PromptWindow {
     int result;
     platform::WindowHandle window;
   };
+  struct Point {
+    int x;  // client pixels
+    int y;
+  };
 
   void MeasureImage();
   bool Create();
   void CreateButtons();
   void CreateTextField();
+  void CreateMarkedPane(const std::vector<TextPiece>& pieces);
   void CreateImageArea();
   void RunLoop();
   void End(int result);
   std::intptr_t Handle(const platform::Message& message);
+  std::intptr_t HandlePane(const platform::Message& message);
   void OnCreate(platform::WindowHandle created);
   void OnSize(const platform::Message& message);
   void OnTimer();
@@ -70,7 +88,14 @@ class PromptWindow {
   void CountDown();
   void OnScroll(const platform::Message& message);
   std::intptr_t OnPaint(const platform::Message& message);
+  void PaintImage();
+  [[nodiscard]] Point CountDownPlace() const;
+  [[nodiscard]] platform::WindowHandle ControlUnderCountDown() const;
+  void PaintControl(platform::WindowHandle control);
+  void PaintCountDown(platform::Canvas& canvas, int x, int y) const;
+  void PaintMarkedText(platform::Canvas& canvas) const;
   void OnDeviceChange(std::uintptr_t event);
+  [[nodiscard]] bool IsButton(platform::WindowHandle control) const;
   void FocusFirstChild(bool onlyButton);
   void PlaceButtonRow();
   void SetScrollRanges();
@@ -90,9 +115,12 @@ class PromptWindow {
   std::uint32_t elapsedTicks_ = 0;
   platform::WindowHandle window_ = 0;
   platform::WindowHandle textControl_ = 0;
+  platform::WindowHandle markedPane_ = 0;  // takes the text field's place
+  std::vector<PlacedText> markedText_;     // of the pane
   platform::WindowHandle imageControl_ = 0;
   platform::WindowHandle horizontalBar_ = 0;
   platform::WindowHandle verticalBar_ = 0;
+  platform::WindowHandle countDownControl_ = 0;  // the control that the count-down is painted on; 0: the window
   std::vector<Button> buttons_;
   int buttonWidth_ = 0;
   bool hasImage_ = false;

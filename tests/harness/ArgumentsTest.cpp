@@ -95,6 +95,36 @@ TEST(CDMArgument, TheHelpBlockStatesTypeRuleDefaultAndNeed) {
   EXPECT_EQ(CDMConstraint("a").GetLowText() + CDMConstraint("a").GetHighText(), "invalidStringinvalidString");
 }
 
+TEST(CDMArgument, CatalogueAndDictionaryShowADeclarationOnOneLineEachInTheirOwnSpelling) {
+  using T = CDMConstraintType;
+  using Type = CDMArgumentType;
+  const CDMArgument full("-Mode", Type::String, "a\"b", "Say \"A\" &\r\n`go`\nnow", true,
+                         std::make_unique<CDMConstraint>("A<B,,c"), true, true);
+  EXPECT_EQ(full.GetCatalogEntry(3),
+            "   <ARGUMENT Name=\"-Mode\" Type=\"string\" Value=\"a\"b\" List=\"A&lt;B,,c\" Required=\"true\" "
+            "Description=\"Say &quot;A&quot; &amp; &apos;go&apos; now\" Hidden=\"true\" GUIHidden=\"true\" />");
+  EXPECT_EQ(full.GetDictionaryEntry("T"),
+            "\nT/-Mode/Name = TBC\nT/-Mode/Description = Say \"A\" & `go` now\n"
+            "T/-Mode/List/A<B = TBC\nT/-Mode/List/c = TBC\n");
+  const CDMArgument number("-Mode", Type::Integer, "", "", false, std::make_unique<CDMConstraint>("A"), false, false);
+  EXPECT_EQ(number.GetDictionaryEntry("T"), "\nT/-Mode/Name = TBC\nT/-Mode/Description = \n");
+  const CDMArgument bare("", Type::LargeInteger, "", "", false, nullptr, false, false);
+  EXPECT_EQ(bare.GetCatalogEntry(0), "<ARGUMENT Type=\"largeinteger\" Required=\"false\" />");
+  const std::pair<CDMConstraint, const char*> kRules[] = {
+      {CDMConstraint(std::int64_t{-1}, std::int64_t{5'000'000'000}), " Low=\"-1\" High=\"5000000000\""},
+      {CDMConstraint(0.5, T::Equal), " Equal=\"0.5\""},
+      {CDMConstraint(1, T::DifferentThan), " DifferentThan=\"1\""},
+      {CDMConstraint(1, T::GreaterThan), " GreaterThan=\"1\""},
+      {CDMConstraint(1, T::EqualToOrGreaterThan), " EqualToOrGreaterThan=\"1\""},
+      {CDMConstraint(1, T::EqualToOrLessThan), " EqualToOrLessThan=\"1\""},
+      {CDMConstraint(1, T::LessThan), " LessThan=\"1\""},
+      {CDMConstraint(1, static_cast<T>(6)), ""},
+  };
+  for (const auto& [rule, attributes] : kRules) {
+    EXPECT_EQ(rule.GetCatalogAttributes(), attributes);
+  }
+}
+
 TEST(CDMDiag, AValueComesFromTheCommandLineThenTheDeclarationThenTheCaller) {
   ProbeRun run{"-subtest=Probe -mode=fast -ratio= -serial=0x1F"};
   run.prepare = [](Probe& probe) {

@@ -59,12 +59,11 @@ TEST(DiagnosticManager, WhateverARunEndsWithThereIsOneResultAtMostAndOneEndOfTes
 TEST(DiagnosticManager, ACommandLineThatIsNotAcceptedRunsNothingAndNamesTheFirstBadParameter) {
   const std::tuple<const char*, int, const char*> kCases[] = {
       {"-percent=5", 20003, "-percent"},
-      {"-dictionary=true", 20003, "-dictionary"},
+      {"-dictionary=maybe", 20003, "-dictionary"},
       {"-ZZ=1 -AA=1", 20003, "-aa"},
       {"=x", 20003, ""},
       {"-debug=", 20004, "-debug"},
-      {"-help", 20004, "-help"},
-      {"-catalog=yes", 20004, "-catalog"},
+      {"-catalog=", 20004, "-catalog"},
       {"-LOUD=1", 20004, "-loud"},
       {"-level=abc", 20005, "-level"},
       {"-level=101", 20005, "-level"},
@@ -73,14 +72,14 @@ TEST(DiagnosticManager, ACommandLineThatIsNotAcceptedRunsNothingAndNamesTheFirst
       {"-mode=fastest", 20006, "-mode"},
       {"-diagconf=.\\none.ini", 20006, "-diagconf"},
       {"-integratormsgfile=", 20006, "-integratormsgfile"},
-      {"-paramfile=.\\some.ini -paramsection=x", 20006, "-paramfile"},
+      {"-paramfile=.\\some.ini -paramsection=y", 20006, "-paramfile"},
+      {"-paramfile=.\\some.ini", 20006, "-paramfile"},
+      {"-paramfile=.\\some.ini -paramsection=x", 20005, "-level"},
       {"-paramsection=x", 20006, "-paramsection"},
-      {"-help=TRUE", 20003, "-help"},
-      {"-version=true", 20003, "-version"},
   };
   ProbeRun run;
   run.body = [] { return CDMDiag::ReportFailure("it ran"), true; };
-  run.files[".\\some.ini"] = "[x]\n-level=1\n";
+  run.files[".\\some.ini"] = "[x]\n-level=one\n";
   for (const auto& [words, message, name] : kCases) {
     run.words = "-subtest=Probe " + std::string(words);
     EXPECT_EQ(run.Lines(), "LogMessage 15 " + std::to_string(message) + " \"" + name + "\" \"\"\n" + kRefused)
@@ -109,8 +108,26 @@ TEST(DiagnosticManager, AcceptedSpellingsRun) {
 }
 
 TEST(DiagnosticManager, ASubtestIsFoundByItsExactNameOnly) {
-  for (const char* words : {"", "-subtest=probe", "-subtest=", "-subtest=Other -help=true"}) {
+  for (const char* words : {"", "-subtest=probe", "-subtest=", "-subtest=Other", "-dictionary=yes"}) {
     EXPECT_EQ(ProbeRun{words}.Lines(), "LogMessage 15 20001 \"Probe\" \"\"\nTestFailed 990521\nEndOfTest\n= 1\n");
+  }
+}
+
+// The usage, from its start, with nothing between its parentheses.
+constexpr const char* kUsageStart =
+    "Usage:\n\nC:\\suite\\probe.exe [<parameter>]*\nwhere parameter is one of the following:\n"
+    "-subtest=<testname>     Name of the test (  )\n";
+
+TEST(DiagnosticManager, TheFirstRequestWithABadValueIsNamedInFixedOrderAndNothingElseHappens) {
+  for (const auto& [words, name] : {std::pair{"-catalog=1 -version=2 -description=3 -help=4 -debug=5", "-debug"},
+                                    {"-catalog=1 -version=2 -description=3 -help=4 -debug=", "-help"},
+                                    {"-catalog=1 -version=2 -description=3 -help=true", "-description"},
+                                    {"-catalog=1 -version=2 -dictionary=true", "-version"},
+                                    {"-catalog -subtest=Probe", "-catalog"}}) {
+    const std::string output = ProbeRun{words}.Output();
+    EXPECT_THAT(output,
+                ::testing::StartsWith("Invalid value for parameter " + std::string(name) + "\n" + kUsageStart));
+    EXPECT_THAT(output, ::testing::EndsWith("if -paramfile is not blank.\n\n= 1"));
   }
 }
 

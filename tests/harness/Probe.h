@@ -41,11 +41,14 @@ struct ProbeRun {
   std::function<void(Probe&)> prepare = [](Probe&) {};
   std::map<std::string, std::string> files{};
   std::string version{};
+  std::string boardProduct{};
 
   /// Standard output with the exit code behind it, as "= 0".
   [[nodiscard]] std::string Output() const {
     return InOwnProcess([this] {
-      platform::sim::Simulation machine(platform::sim::MachineDescription{}, {});
+      platform::sim::MachineDescription description;
+      description.firmware.boardProduct = boardProduct;
+      platform::sim::Simulation machine(std::move(description), {});
       for (const auto& [path, content] : files) {
         machine.DiskFiles().Put(path, content);
       }

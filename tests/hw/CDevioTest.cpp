@@ -310,6 +310,18 @@ TEST(CDevio, LogsTheDriversVersionInItsTwoForms) {
     CDevio().LogDriverVersion();
     EXPECT_EQ(machine.Output(), std::string("LogMessage 14 20000 \"") + line + "\" \"\"\n");
   }
+  // The two forms name the driver differently; without one the version is 0.
+  for (const auto& [version, line] : {std::pair{std::uint32_t{305}, "Norvane Tsk.sys version 3.5. "},
+                                      {std::uint32_t{0x04013000}, "Nvntsk.sys version  4.01 32bit. "},
+                                      {std::uint32_t{0}, "Norvane Tsk.sys version 0.0. "}}) {
+    MachineDescription description;
+    description.driver.olderSet = true;
+    description.driver.present = version != 0;
+    description.driver.version = version;
+    Simulation machine(description, {});
+    CDevio().LogDriverVersion();
+    EXPECT_EQ(machine.Output(), std::string("LogMessage 14 20000 \"") + line + "\" \"\"\n");
+  }
 }
 
 }  // namespace

@@ -2,6 +2,10 @@
 // thread; what is to happen meanwhile is set up before, by the machine's time.
 #pragma once
 
+#include <unistd.h>
+
+#include <filesystem>
+#include <fstream>
 #include <functional>
 #include <string>
 #include <vector>
@@ -13,6 +17,32 @@
 namespace panelglow::prompttest {
 
 using platform::WindowHandle;
+
+// A file of a name of its own, gone with the object.
+class TemporaryFile {
+ public:
+  TemporaryFile(const std::string& name, const std::string& content)
+      : path_(std::filesystem::temp_directory_path() / ("panelglow-" + std::to_string(::getpid()) + "-" + name)) {
+    std::ofstream(path_, std::ios::binary) << content;
+  }
+  ~TemporaryFile() { std::filesystem::remove(path_); }
+  TemporaryFile(const TemporaryFile&) = delete;
+  TemporaryFile& operator=(const TemporaryFile&) = delete;
+  [[nodiscard]] std::string Path() const { return path_.string(); }
+  [[nodiscard]] wstring WidePath() const { return platform::WideFromUtf8(Path()); }
+
+ private:
+  std::filesystem::path path_;
+};
+
+// A picture whose left half is black and whose right half is white.
+inline std::string HalfBlack(int width, int height) {
+  std::string pixels;
+  for (int i = 0; i < width * height; ++i) {
+    pixels += i % width < width / 2 ? '\0' : '\xFF';
+  }
+  return "P5\n" + std::to_string(width) + " " + std::to_string(height) + "\n255\n" + pixels;
+}
 
 class Desk {
  public:
@@ -49,24 +79,26 @@ class Desk {
     return all.empty() ? 0 : all.back();
   }
 
-  /// "<text> <x>,<y> <width>x<height>" in client pixels, with "hidden" where it is.
-  [[nodiscard]] std::string Describe(WindowHandle window) {
-    const platform::Rectangle place = windows.WindowRectangle(window);
-    return platform::Utf8FromWide(windows.WindowText(window)) + " " + std::to_string(place.left) + "," +
-           std::to_string(place.top) + " " + std::to_string(place.Width()) + "x" + std::to_string(place.Height()) +
-           (windows.IsWindowVisible(window) ? "" : " hidden");
+  /// "<x>,<y> <width>x<height>" in client pixels, with "hidden" where it is.
+  [[nodiscard]] static std::string Describe(const platform::Rectangle& place, bool visible = true) {
+    return std::to_string(place.left) + "," + std::to_string(place.top) + " " + std::to_string(place.Width()) + "x" +
+           std::to_string(place.Height()) + (visible ? "" : " hidden");
   }
 
-  /// The buttons of the front window, or all else in it, separated by " | ".
-  [[nodiscard]] std::string Controls(bool buttons) {
-    std::string text;
+  /// The same behind the window's text.
+  [[nodiscard]] std::string Describe(WindowHandle window) {
+    return platform::Utf8FromWide(windows.WindowText(window)) + " " +
+           Describe(windows.WindowRectangle(window), windows.IsWindowVisible(window));
+  }
+
+  /// Id and place of every control of the front window, in the order of their creation.
+  [[nodiscard]] std::vector<std::string> Layout() {
+    std::vector<std::string> lines;
     for (const WindowHandle child : windows.Children(Top())) {
-      const int id = windows.ControlId(child);
-      if ((id > 1000 && id <= 1007) == buttons) {
-        text += (text.empty() ? "" : " | ") + Describe(child);
-      }
+      lines.push_back(std::to_string(windows.ControlId(child)) + ": " +
+                      Describe(windows.WindowRectangle(child), windows.IsWindowVisible(child)));
     }
-    return text;
+    return lines;
   }
 
   /// What windows have painted of one kind.

@@ -149,6 +149,18 @@ void Split(std::string_view text, std::vector<std::string>& out, std::string_vie
   }
 }
 
+std::string OnOneLine(std::string_view text) {
+  std::string line;
+  line.reserve(text.size());
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    if (text[i] == '\r' && i + 1 < text.size() && text[i + 1] == '\n') {
+      ++i;
+    }
+    line += text[i] == '\r' || text[i] == '\n' ? ' ' : text[i];
+  }
+  return line;
+}
+
 wstring ToWString(std::string_view text) {
   wstring wide;
   wide.reserve(text.size());

@@ -31,6 +31,9 @@ void ReplaceAll(std::string& text, std::string_view from, std::string_view to);
 /// Appends the pieces of `text` between any characters of `separators`; adjacent separators give no empty piece.
 void Split(std::string_view text, std::vector<std::string>& out, std::string_view separators);
 
+/// The text on one line: each line end (CR LF, LF or CR) becomes a blank.
+std::string OnOneLine(std::string_view text);
+
 // ---- narrow and wide text
 
 /// Widens each byte by itself: right for ASCII, and for Latin-1.

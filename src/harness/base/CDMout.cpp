@@ -49,18 +49,6 @@ void WriteLine(std::string line) {
 
 std::string Quoted(std::string_view text) { return "\"" + std::string(text) + "\""; }
 
-std::string OneLine(std::string_view text) {
-  std::string line;
-  line.reserve(text.size());
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    if (text[i] == '\r' && i + 1 < text.size() && text[i + 1] == '\n') {
-      ++i;
-    }
-    line += text[i] == '\r' || text[i] == '\n' ? ' ' : text[i];
-  }
-  return line;
-}
-
 std::string WordOf(LogOptions option) {
   const auto number = static_cast<int>(option);
   if (number >= 1 && number < static_cast<int>(kOptionWords.size())) {
@@ -88,7 +76,7 @@ void CDMout::TestFailed(int code, std::string_view text) {
 void CDMout::EndOfTest() { WriteLine("EndOfTest"); }
 
 void CDMout::LogMessage(LogOptions option, unsigned int id, std::string_view text) {
-  const std::string line = OneLine(text);
+  const std::string line = CDMUtil::OnOneLine(text);
   const Hooks& hooks = TheHooks();
   if (hooks.debug && hooks.debug()) {
     WriteLine("LogMessage " + WordOf(option) + " " + ResolveLogMessage(id, line) + " \"\"");

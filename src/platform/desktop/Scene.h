@@ -54,6 +54,8 @@ struct SceneWindow {
   bool border = false;
   bool raisedFrame = false;
   Color background = kButtonFaceColor;
+  std::optional<Color> ownBackground;  // of a control whose parent wants it so
+  bool centred = false;                // static text
   std::u16string text;
   std::u16string iconPath;
   Font font;

@@ -124,6 +124,7 @@ struct WindowSystem::Window {
   std::vector<std::intptr_t> extra;
   wstring text;
   wstring iconPath;
+  std::optional<Color> ownBackground;
   Font font;
   ScrollState scroll;
   std::vector<DrawOperation> operations;
@@ -247,6 +248,8 @@ WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
       return 0;
     }
     SendSize(handle);
+  } else {
+    AskForColor(handle);
   }
   // Not before: a window whose creation waits for something is not there for anybody yet.
   if (visible) {
@@ -388,6 +391,20 @@ void WindowSystem::SendSize(WindowHandle handle) {
   const auto packed = static_cast<std::intptr_t>((static_cast<std::uint32_t>(client.Height() & 0xFFFF) << 16U) |
                                                  static_cast<std::uint32_t>(client.Width() & 0xFFFF));
   Call({handle, message::kSize, 0, packed});
+}
+
+// Asked once, when a button or a text is created: the windows of this program do not change their colours.
+void WindowSystem::AskForColor(WindowHandle control) {
+  const Window* window = Find(control);
+  if (window->kind != WindowKind::kButton && window->kind != WindowKind::kStatic) {
+    return;
+  }
+  const std::uint32_t question =
+      window->kind == WindowKind::kButton ? message::kControlColorButton : message::kControlColorStatic;
+  const std::intptr_t answer = Send({window->parent, question, 0, static_cast<std::intptr_t>(control)});
+  if (Window* asked = Find(control); asked != nullptr && answer != 0) {
+    asked->ownBackground = static_cast<Color>(answer & 0x00FFFFFF);
+  }
 }
 
 void WindowSystem::ShowWindow(WindowHandle handle, bool visible) {
@@ -909,6 +926,11 @@ std::intptr_t WindowSystem::DefaultProcedure(const Message& message) {
     case message::kPaint:
       BeginPaint(message.window);
       return 0;
+    case message::kGetDefaultId:
+      if (const Window* button = Find(DefaultButton(message.window))) {
+        return kHasDefaultId | (button->id & 0xFFFF);
+      }
+      return 0;
     default:
       return 0;
   }
@@ -1068,6 +1090,7 @@ std::intptr_t WindowSystem::ControlProcedure(const Message& message) {
         } else if (message.wParam >= 32 && window->text.size() < kLimitEditCharacters) {
           window->text.push_back(static_cast<char16_t>(message.wParam));
         }
+        Changed();
       }
       return 0;
     default:
@@ -1162,10 +1185,14 @@ bool WindowSystem::IsDialogMessage(WindowHandle dialog, const Message& message) 
       case kEnterKey:
         if (focused != nullptr && focused->kind == WindowKind::kButton && IsDescendant(dialog, focus)) {
           PressButton(focus);
-        } else if (const WindowHandle button = DefaultButton(dialog); button != 0) {
-          PressButton(button);
         } else {
-          Send({dialog, message::kCommand, kOkCommand, 0});
+          const std::intptr_t answer = Send({dialog, message::kGetDefaultId, 0, 0});
+          const WindowHandle button = FindControl(dialog, static_cast<int>(answer & 0xFFFF));
+          if ((answer & ~std::intptr_t{0xFFFF}) == kHasDefaultId && button != 0) {
+            PressButton(button);
+          } else {
+            Send({dialog, message::kCommand, kOkCommand, 0});
+          }
         }
         return true;
       case kEscapeKey:
@@ -1288,6 +1315,12 @@ void WindowSystem::AddToScene(Scene& scene, const Window& window, const Rectangl
       picture.background = parent->windowClass->background;
     }
   }
+  if (window.ownBackground) {
+    picture.background = *window.ownBackground;
+  }
+  picture.ownBackground = window.ownBackground;
+  picture.centred =
+      window.kind == WindowKind::kStatic && (window.style & style::kStaticTypeMask) == style::kStaticCentred;
   picture.text = window.text;
   picture.iconPath = window.iconPath;
   picture.font = window.font;

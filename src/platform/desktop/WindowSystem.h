@@ -169,6 +169,7 @@ class WindowSystem : public Desktop {
   bool PressMnemonic(WindowHandle dialog, char16_t letter);
   [[nodiscard]] WindowHandle DefaultButton(WindowHandle dialog) const;
   void SendSize(WindowHandle window);
+  void AskForColor(WindowHandle control);
   [[nodiscard]] Rectangle ClientOnScreen(const Window& window) const;
   void AddToScene(Scene& scene, const Window& window, const Rectangle& clip) const;
 

@@ -13,8 +13,14 @@ namespace {
 using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
 using Description = std::unique_ptr<PangoFontDescription, Deleter<pango_font_description_free>>;
 
-constexpr int kIconSize = 32;             // pixels
-constexpr int kLargestImageSide = 16384;  // pixels; larger pictures are treated as unreadable
+constexpr int kIconSize = 32;  // pixels
+// Larger pictures are treated as unreadable: a small file can claim a size that takes all memory.
+constexpr int kLargestImageSide = 16384;         // pixels
+constexpr long long kMostImagePixels = 1 << 26;  // 64 million: 256 MB of memory
+constexpr Color kButtonColor = 0x00E8E8E8;
+constexpr Color kPressedColor = 0x00D0D0D0;
+constexpr Color kWhite = 0x00FFFFFF;
+constexpr Color kFaintText = 0x00808080;
 
 std::string Utf8(std::u16string_view text) {
   glong length = 0;
@@ -57,6 +63,16 @@ void FillRectangle(cairo_t* cr, const Rectangle& area, Color color) {
   SetColor(cr, color);
   cairo_rectangle(cr, area.left, area.top, area.Width(), area.Height());
   cairo_fill(cr);
+}
+
+// The dark side of what stands on a ground; a light grey where the ground is dark itself.
+Color ShadowOn(Color ground) {
+  constexpr Color kOnDark = 0x00808080;
+  if (ReadableOn(ground) != 0) {
+    return kOnDark;
+  }
+  const auto part = [&](unsigned shift) { return (ground >> shift & 0xFFU) * 3 / 8 << shift; };
+  return part(0) | part(8) | part(16);
 }
 
 // A one pixel frame, light and dark as if lit from the top left.
@@ -118,11 +134,12 @@ std::string FilePath(std::u16string_view path) {
   return name;
 }
 
-void DrawCaption(cairo_t* cr, const SceneWindow& window, std::u16string_view source, bool marks, bool centred) {
-  Caption caption{std::u16string(source), std::u16string::npos};
-  if (marks) {
-    caption = ReadCaption(source);
-  }
+Color TextColor(const SceneWindow& window, Color ground) { return window.enabled ? ReadableOn(ground) : kFaintText; }
+
+// A caption on one line in the middle of a button; what is too long ends in an ellipsis.
+void DrawButtonCaption(cairo_t* cr, const SceneWindow& window, Color ground) {
+  constexpr int kMargin = 4;  // pixels
+  const Caption caption = ReadCaption(window.text);
   const Layout layout = MakeLayout(cr, Utf8(caption.text), window.font);
   if (caption.underlined != std::u16string::npos) {
     const std::size_t begin = Utf8(std::u16string_view(caption.text).substr(0, caption.underlined)).size();
@@ -135,37 +152,84 @@ void DrawCaption(cairo_t* cr, const SceneWindow& window, std::u16string_view sou
     pango_layout_set_attributes(layout.get(), attributes);
     pango_attr_list_unref(attributes);
   }
-  int width = 0;
+  pango_layout_set_single_paragraph_mode(layout.get(), TRUE);
+  pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
+  pango_layout_set_width(layout.get(), std::max(0, window.frame.Width() - 2 * kMargin) * PANGO_SCALE);
+  pango_layout_set_alignment(layout.get(), PANGO_ALIGN_CENTER);
   int height = 0;
-  if (centred) {
-    pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
-    pango_layout_set_width(layout.get(), std::max(0, window.frame.Width() - 8) * PANGO_SCALE);
-    pango_layout_set_alignment(layout.get(), PANGO_ALIGN_CENTER);
-    pango_layout_get_pixel_size(layout.get(), &width, &height);
-    cairo_move_to(cr, window.frame.left + 4, window.frame.top + (window.frame.Height() - height) / 2.0);
-  } else {
-    pango_layout_set_width(layout.get(), window.client.Width() * PANGO_SCALE);
-    pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
-    cairo_move_to(cr, window.client.left + 2, window.client.top + 1);
-  }
-  SetColor(cr, window.enabled ? 0x000000 : 0x808080);
+  pango_layout_get_pixel_size(layout.get(), nullptr, &height);
+  cairo_move_to(cr, window.frame.left + kMargin, window.frame.top + (window.frame.Height() - height) / 2.0);
+  SetColor(cr, TextColor(window, ground));
   pango_cairo_show_layout(cr, layout.get());
 }
 
+// The lines of a static control. A line that does not fit as a whole is left out, and an ellipsis says so.
+void DrawStaticText(cairo_t* cr, const SceneWindow& window) {
+  constexpr int kMargin = 2;  // pixels, left and right
+  const Layout layout = MakeLayout(cr, Utf8(window.text), window.font);
+  pango_layout_set_width(layout.get(), std::max(0, window.client.Width() - 2 * kMargin) * PANGO_SCALE);
+  pango_layout_set_height(layout.get(), std::max(0, window.client.Height() - 1) * PANGO_SCALE);
+  pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
+  pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
+  pango_layout_set_alignment(layout.get(), window.centred ? PANGO_ALIGN_CENTER : PANGO_ALIGN_LEFT);
+  cairo_move_to(cr, window.client.left + kMargin, window.client.top + 1);
+  SetColor(cr, TextColor(window, window.background));
+  pango_cairo_show_layout(cr, layout.get());
+}
+
+// An entry field: one line that is moved so that its end can be seen, with the caret behind it.
+void DrawEdit(cairo_t* cr, const SceneWindow& window) {
+  constexpr int kMargin = 4;  // pixels, left and right
+  FillRectangle(cr, window.frame, kWhite);
+  DrawBevel(cr, window.frame, 0x00606060, kWhite);
+  const Layout layout = MakeLayout(cr, Utf8(window.text), window.font);
+  pango_layout_set_single_paragraph_mode(layout.get(), TRUE);
+  int width = 0;
+  int height = 0;
+  pango_layout_get_pixel_size(layout.get(), &width, &height);
+  const int x = window.client.left + kMargin - std::max(0, width - (window.client.Width() - 2 * kMargin));
+  const double y = window.client.top + (window.client.Height() - height) / 2.0;
+  cairo_save(cr);
+  cairo_rectangle(cr, window.client.left, window.client.top, window.client.Width(), window.client.Height());
+  cairo_clip(cr);
+  cairo_move_to(cr, x, y);
+  SetColor(cr, TextColor(window, kWhite));
+  pango_cairo_show_layout(cr, layout.get());
+  if (window.focused) {
+    FillRectangle(cr, {x + width + 1, static_cast<int>(y), x + width + 2, static_cast<int>(y) + height}, 0);
+  }
+  cairo_restore(cr);
+}
+
+// A colour of its own makes a button that colour, darker while it is pressed.
+Color ButtonColor(const SceneWindow& window) {
+  if (!window.ownBackground) {
+    return window.pressed ? kPressedColor : kButtonColor;
+  }
+  const auto part = [&](unsigned shift) {
+    const Color full = *window.ownBackground >> shift & 0xFFU;
+    return (window.pressed ? full * 7 / 8 : full) << shift;
+  };
+  return part(0) | part(8) | part(16);
+}
+
 void DrawButton(cairo_t* cr, const SceneWindow& window) {
-  FillRectangle(cr, window.frame, window.pressed ? 0x00D0D0D0 : 0x00E8E8E8);
-  DrawBevel(cr, window.frame, 0x00FFFFFF, 0x00606060);
+  const Color ground = ButtonColor(window);
+  const Color line = ReadableOn(ground);
+  FillRectangle(cr, window.frame, ground);
+  DrawBevel(cr, window.frame, kWhite, ShadowOn(ground));
   if (window.defaultButton || window.focused) {
     cairo_set_line_width(cr, 1);
-    SetColor(cr, 0x00000000);
+    SetColor(cr, line);
     cairo_rectangle(cr, window.frame.left + 0.5, window.frame.top + 0.5, window.frame.Width() - 1,
                     window.frame.Height() - 1);
     cairo_stroke(cr);
   }
-  DrawCaption(cr, window, window.text, true, true);
+  DrawButtonCaption(cr, window, ground);
   if (window.focused) {
     const double dashes[] = {1, 1};
     cairo_set_dash(cr, dashes, 2, 0);
+    SetColor(cr, line);
     cairo_rectangle(cr, window.frame.left + 3.5, window.frame.top + 3.5, window.frame.Width() - 7,
                     window.frame.Height() - 7);
     cairo_stroke(cr);
@@ -247,7 +311,7 @@ const GdkPixbuf* CairoDrawing::Load(const std::string& path) {
   int height = 0;
   Pixbuf image;
   if (gdk_pixbuf_get_file_info(path.c_str(), &width, &height) != nullptr && width <= kLargestImageSide &&
-      height <= kLargestImageSide) {
+      height <= kLargestImageSide && static_cast<long long>(width) * height <= kMostImagePixels) {
     image.reset(gdk_pixbuf_new_from_file(path.c_str(), nullptr));
   }
   return images_.emplace(path, std::move(image)).first->second.get();
@@ -338,18 +402,16 @@ void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
       DrawIcon(cr, window);
       break;
     case WindowKind::kEdit:
-      FillRectangle(cr, window.frame, 0x00FFFFFF);
-      DrawBevel(cr, window.frame, 0x00606060, 0x00FFFFFF);
-      DrawCaption(cr, window, window.text, false, false);
+      DrawEdit(cr, window);
       break;
     case WindowKind::kStatic:
     case WindowKind::kImageArea:
       FillRectangle(cr, window.frame, window.background);
       if (window.border) {
-        DrawBevel(cr, window.frame, 0x00606060, 0x00606060);
+        DrawBevel(cr, window.frame, ShadowOn(window.background), ShadowOn(window.background));
       }
       if (window.kind == WindowKind::kStatic) {
-        DrawCaption(cr, window, window.text, false, false);
+        DrawStaticText(cr, window);
       }
       break;
     case WindowKind::kPlain:
@@ -357,7 +419,7 @@ void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
       if (window.raisedFrame) {
         DrawBevel(cr, window.frame, 0x00FFFFFF, 0x00404040);
       } else if (window.border) {
-        DrawBevel(cr, window.frame, 0x00606060, 0x00606060);
+        DrawBevel(cr, window.frame, ShadowOn(window.background), ShadowOn(window.background));
       }
       break;
   }

@@ -8,6 +8,8 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/sim/Scheduler.h"
+
 namespace panelglow::platform::sim {
 
 /// A range of addresses on one of the buses.
@@ -33,6 +35,13 @@ class Device {
 
   /// Level of one of the device's output pins, by its name in the machine's file; nothing when it has no such pin.
   [[nodiscard]] virtual std::optional<bool> Signal(std::string_view pin) const = 0;
+
+  /// When the device next does something by itself that can move a pin (its firmware takes a byte, a lamp blinks);
+  /// nothing for a device that only answers accesses.
+  [[nodiscard]] virtual std::optional<Microseconds> NextEvent() const { return {}; }
+
+  /// Lets the device do what it has had to do by now. It is called when NextEvent() has come, not before each access.
+  virtual void Advance() {}
 
   /// The address (port or memory) whose writes move a pin, for the fault "a write that lies".
   [[nodiscard]] virtual std::optional<std::uint64_t> RegisterOf(std::string_view /*pin*/) const { return {}; }

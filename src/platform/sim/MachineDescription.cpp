@@ -1,139 +1,15 @@
 #include "platform/sim/MachineDescription.h"
 
-#include <toml++/toml.h>
-
-#include <algorithm>
 #include <charconv>
-#include <set>
 #include <sstream>
 
 #include "platform/Text.h"
+#include "platform/sim/ChipReader.h"
+#include "platform/sim/DescriptionSection.h"
 
 namespace panelglow::platform::sim {
 
 namespace {
-
-// A table of the file that knows which of its keys were asked for, so that a misspelt key is an error and not
-// silence.
-class Section {
- public:
-  Section(const toml::table& table, std::string_view source, std::string path)
-      : table_(table), source_(source), path_(std::move(path)) {}
-
-  [[noreturn]] void Fail(const toml::node& at, const std::string& problem) const {
-    std::ostringstream text;
-    text << source_ << ":" << at.source().begin.line << ": " << problem;
-    throw MachineError(text.str());
-  }
-
-  template <class T>
-  T Get(std::string_view key, T fallback) {
-    const toml::node* node = Node(key);
-    if (node == nullptr) {
-      return fallback;
-    }
-    const std::optional<T> value = node->value<T>();
-    if (!value) {
-      Fail(*node, "\"" + path_ + std::string(key) + "\" has the wrong type or is out of range");
-    }
-    return *value;
-  }
-
-  [[noreturn]] void Refuse(std::string_view key, const std::string& rule) {
-    Fail(*Node(key), "\"" + path_ + std::string(key) + "\" " + rule);
-  }
-
-  // A number that has to be there.
-  template <class T>
-  T Number(std::string_view key) {
-    if (Node(key) == nullptr) {
-      Fail(table_, "\"" + path_ + std::string(key) + "\" is missing");
-    }
-    return Get<T>(key, {});
-  }
-
-  std::string Required(std::string_view key) {
-    if (Node(key) == nullptr) {
-      Fail(table_, "\"" + path_ + std::string(key) + "\" is missing");
-    }
-    return Get<std::string>(key, {});
-  }
-
-  std::vector<std::uint8_t> Bytes(std::string_view key) {
-    std::vector<std::uint8_t> bytes;
-    if (const toml::node* node = Node(key)) {
-      const toml::array* array = node->as_array();
-      if (array == nullptr) {
-        Fail(*node, "\"" + path_ + std::string(key) + "\" must be a list of bytes");
-      }
-      for (const toml::node& element : *array) {
-        const std::optional<std::uint8_t> byte = element.value<std::uint8_t>();
-        if (!byte) {
-          Fail(element, "\"" + path_ + std::string(key) + "\" holds a value that is no byte");
-        }
-        bytes.push_back(*byte);
-      }
-    }
-    return bytes;
-  }
-
-  // Calls `use` with each table of a list of tables, or with the one table under `key`.
-  template <class Use>
-  void Each(std::string_view key, Use use) {
-    const toml::node* node = Node(key);
-    if (node == nullptr) {
-      return;
-    }
-    if (const toml::table* single = node->as_table()) {
-      Open(*single, key, use);
-      return;
-    }
-    const toml::array* array = node->as_array();
-    if (array == nullptr) {
-      Fail(*node, "\"" + path_ + std::string(key) + "\" must be a table");
-    }
-    for (const toml::node& element : *array) {
-      const toml::table* entry = element.as_table();
-      if (entry == nullptr) {
-        Fail(element, "\"" + path_ + std::string(key) + "\" must hold tables");
-      }
-      Open(*entry, key, use);
-    }
-  }
-
-  [[nodiscard]] const toml::table& Raw() {
-    for (const auto& [key, node] : table_) {
-      used_.emplace(key.str());
-    }
-    return table_;
-  }
-
-  void RefuseUnknownKeys() const {
-    for (const auto& [key, node] : table_) {
-      if (used_.find(key.str()) == used_.end()) {
-        Fail(node, "\"" + path_ + std::string(key.str()) + "\" is not a key of a machine's file");
-      }
-    }
-  }
-
- private:
-  const toml::node* Node(std::string_view key) {
-    used_.emplace(key);
-    return table_.get(key);
-  }
-
-  template <class Use>
-  void Open(const toml::table& entry, std::string_view key, Use use) {
-    Section section(entry, source_, path_ + std::string(key) + ".");
-    use(section);
-    section.RefuseUnknownKeys();
-  }
-
-  const toml::table& table_;
-  std::string source_;
-  std::string path_;
-  std::set<std::string, std::less<>> used_;
-};
 
 Microseconds Milliseconds(Section& section, std::string_view key) {
   return Microseconds{section.Get<std::uint32_t>(key, 0)} * 1000;
@@ -300,16 +176,8 @@ MachineDescription ParseMachine(std::string_view text, std::string_view source) 
   root.Each("firmware", [&](Section& section) { ReadFirmware(section, machine.firmware); });
   root.Each("driver", [&](Section& section) { ReadDriver(section, machine.driver); });
   root.Each("pci", [&](Section& section) { ReadPci(section, machine); });
-  root.Each("chip", [&](Section& section) {
-    ChipDescription chip;
-    chip.name = section.Required("name");
-    chip.kind = section.Required("kind");
-    chip.base = section.Get("base", chip.base);
-    chip.outputs = section.Get("outputs", chip.outputs);
-    chip.inputs = section.Get("inputs", chip.inputs);
-    chip.initial = section.Bytes("initial");
-    machine.chips.push_back(std::move(chip));
-  });
+  root.Each("chip", [&](Section& section) { machine.chips.push_back(ReadChip(section)); });
+  root.Each("firmware_call", [&](Section& section) { machine.firmwareCall = ReadFirmwareCall(section); });
   root.Each("led", [&](Section& section) { ReadLed(section, machine); });
   root.Each("event", [&](Section& section) { ReadEvent(section, machine); });
   root.Each("peer", [&](Section& section) {

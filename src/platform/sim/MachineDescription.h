@@ -8,10 +8,16 @@
 #include <stdexcept>
 #include <string>
 #include <string_view>
+#include <variant>
 #include <vector>
 
 #include "platform/Management.h"
+#include "platform/sim/EmbeddedController.h"
+#include "platform/sim/FirmwareCall.h"
 #include "platform/sim/FrontPanel.h"
+#include "platform/sim/HdaCodec.h"
+#include "platform/sim/MailboxController.h"
+#include "platform/sim/SuperIo.h"
 
 namespace panelglow::platform::sim {
 
@@ -23,7 +29,11 @@ class MachineError : public std::runtime_error {
 
 struct ChipDescription {
   std::string name;
-  std::string kind;  // "gpio-block", "memory-registers", "legacy-panel"
+  std::string kind;
+
+  // Of a kind that has a setup of its own; the others are told by the keys below.
+  std::variant<std::monostate, SuperIoSetup, EmbeddedControllerSetup, MailboxControllerSetup, HdaCodecSetup> setup;
+
   std::uint64_t base = 0;
   std::uint8_t outputs = 0xFF;
   std::uint8_t inputs = 0;
@@ -105,6 +115,7 @@ struct MachineDescription {
   DriverDescription driver;
   std::vector<PciFunction> pci;
   std::vector<ChipDescription> chips;
+  std::optional<FirmwareCallSetup> firmwareCall;
   std::vector<Led> leds;
   std::vector<ScriptedEvent> events;
   std::vector<Peer> peers;

@@ -16,9 +16,9 @@ constexpr Microseconds kGlance = 50 * kMillisecond;        // how often the pers
 constexpr Microseconds kReaction = 300 * kMillisecond;     // from knowing to pressing
 constexpr Microseconds kReading = 800 * kMillisecond;      // of a prompt
 constexpr Microseconds kBlindPause = 3000 * kMillisecond;  // between presses of one who does not look
-// A LED blinks when it has changed four times and not long ago: a LED that is put back after its turn changes up to
-// three times more. The slowest blink has phases of 1.5 s.
-constexpr std::size_t kEdgesOfABlink = 4;
+// A LED blinks when it has changed five times and not long ago: a LED that is put back after its turn, or that blinks
+// by itself until then, changes up to four times more. The slowest blink has phases of 1.5 s.
+constexpr std::size_t kEdgesOfABlink = 5;
 constexpr Microseconds kLongestPhase = 1600 * kMillisecond;
 constexpr Microseconds kDarkness = 6000 * kMillisecond;  // nothing has changed for so long: no LED blinks
 

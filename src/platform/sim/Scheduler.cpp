@@ -33,6 +33,12 @@ Scheduler::Scheduler(const Options& options)
 }
 
 Scheduler::~Scheduler() {
+  EndThreads();
+  ReapEnded();
+  t_current = {};
+}
+
+void Scheduler::EndThreads() {
   std::vector<ThreadId> alive;
   for (const auto& [id, thread] : threads_) {
     if (id != Current() && thread->state != State::kEnded) {
@@ -42,12 +48,6 @@ Scheduler::~Scheduler() {
   for (const ThreadId id : alive) {
     Terminate(id);
   }
-  for (auto& [id, thread] : threads_) {
-    if (thread->thread.joinable()) {
-      thread->thread.join();
-    }
-  }
-  t_current = {};
 }
 
 ThreadId Scheduler::Current() const { return t_current.scheduler == this ? t_current.id : 0; }

@@ -56,6 +56,9 @@ class Scheduler {
   /// True when the thread has ended by the deadline (none: without limit).
   bool WaitForEnd(ThreadId thread, std::optional<Microseconds> deadline);
 
+  /// Unwinds every thread but the calling one. What they use must still be there; the destructor does it otherwise.
+  void EndThreads();
+
   /// Gives up what the system keeps of threads that have ended. To be called by the holder of the baton.
   void ReapEnded();
 

@@ -1,19 +1,24 @@
 // The management instrumentation of a simulated machine: tables by namespace and class.
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
 
 #include "platform/Management.h"
+#include "platform/sim/FirmwareCall.h"
 #include "platform/sim/MachineDescription.h"
+#include "platform/sim/Scheduler.h"
 
 namespace panelglow::platform::sim {
 
 class SimManagement : public Management {
  public:
-  /// The described tables, and the raw firmware table in the namespace where the genuine service has it.
-  explicit SimManagement(const MachineDescription& machine);
+  /// The described tables, and the raw firmware table in the namespace where the genuine service has it. `firmware`
+  /// answers calls, null where there is nobody to; `moved` is called after a call.
+  SimManagement(const MachineDescription& machine, Scheduler& scheduler, FirmwareCall* firmware,
+                std::function<void()> moved);
 
   std::unique_ptr<ManagementConnection> Connect(std::string_view nameSpace, ManagementError& error) override;
 
@@ -21,6 +26,9 @@ class SimManagement : public Management {
   class Connection;
   using Tables = std::map<std::string, std::vector<ManagementRow>>;  // by lowered class name
 
+  Scheduler& scheduler_;
+  FirmwareCall* firmware_;
+  std::function<void()> moved_;
   std::map<std::string, Tables> nameSpaces_;  // by lowered name
 };
 

@@ -15,8 +15,10 @@
 #include "platform/posix/LazyXmlDocuments.h"
 #include "platform/posix/PosixFiles.h"
 #include "platform/profile/ProfileFilesOnFiles.h"
+#include "platform/sim/FintekSuperIo.h"
 #include "platform/sim/FirmwareTable.h"
 #include "platform/sim/GpioBlock.h"
+#include "platform/sim/IteSuperIo.h"
 #include "platform/sim/KeyboardDevice.h"
 #include "platform/sim/LegacyPanelBlock.h"
 #include "platform/sim/MemoryRegisters.h"
@@ -32,6 +34,7 @@ namespace panelglow::platform::sim {
 namespace {
 
 constexpr const char* kKeyboard = "keyboard";
+constexpr const char* kFirmware = "firmware";
 
 class SimClock : public Clock {
  public:
@@ -234,7 +237,36 @@ class SimWindowHost : public desktop::WindowHost {
   Scheduler& scheduler_;
 };
 
-std::unique_ptr<Device> MakeDevice(const ChipDescription& chip) {
+// Builds the chips that have a setup of their own; null for the others.
+struct DeviceMaker {
+  const Scheduler& time;
+
+  std::unique_ptr<Device> operator()(std::monostate /*none*/) const { return nullptr; }
+  std::unique_ptr<Device> operator()(const SuperIoSetup& setup) const {
+    switch (setup.family) {
+      case SuperIoFamily::kIte:
+        return std::make_unique<IteSuperIo>(setup, time);
+      case SuperIoFamily::kFintek:
+        return std::make_unique<FintekSuperIo>(setup, time);
+      default:
+        return std::make_unique<SuperIo>(setup, time);
+    }
+  }
+  std::unique_ptr<Device> operator()(const EmbeddedControllerSetup& setup) const {
+    return std::make_unique<EmbeddedController>(setup, time);
+  }
+  std::unique_ptr<Device> operator()(const MailboxControllerSetup& setup) const {
+    return std::make_unique<MailboxController>(setup, time);
+  }
+  std::unique_ptr<Device> operator()(const HdaCodecSetup& setup) const {
+    return std::make_unique<HdaCodec>(setup, time);
+  }
+};
+
+std::unique_ptr<Device> MakeDevice(const ChipDescription& chip, const Scheduler& time) {
+  if (std::unique_ptr<Device> device = std::visit(DeviceMaker{time}, chip.setup)) {
+    return device;
+  }
   if (chip.kind == "gpio-block") {
     return std::make_unique<GpioBlock>(static_cast<std::uint16_t>(chip.base), chip.outputs, chip.inputs,
                                        chip.initial.empty() ? std::uint8_t{0} : chip.initial.front());
@@ -246,7 +278,8 @@ std::unique_ptr<Device> MakeDevice(const ChipDescription& chip) {
     return std::make_unique<LegacyPanelBlock>(static_cast<std::uint16_t>(chip.base));
   }
   throw MachineError("chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
-                     "\" (gpio-block, memory-registers, legacy-panel)");
+                     "\" (gpio-block, memory-registers, legacy-panel, super-io, embedded-controller, "
+                     "mailbox-controller, hda-codec)");
 }
 
 Simulation* g_current = nullptr;
@@ -263,22 +296,23 @@ struct Simulation::Parts {
         description(std::move(machine)),
         scheduler({simulationOptions.seed, simulationOptions.realTime, simulationOptions.timeLimit_us}),
         buses(description.pci),
-        keyboardDevice(AttachAll(buses, description)),
+        keyboardDevice(AttachKeyboard(buses)),
+        firmwareCall(AttachFirmwareCall(buses, description)),
         panel(description.leds,
               [this](const std::string& device, const std::string& pin) {
                 const Device* found = buses.Find(device);
                 return found == nullptr ? std::optional<bool>() : found->Signal(pin);
               }),
-        driver(description.driver, buses, scheduler, trace, [this] { panel.Update(scheduler.Now()); }),
-        management(description),
+        driver(description.driver, buses, scheduler, trace, [this] { LookAtPanel(); }),
+        management(description, scheduler, firmwareCall, [this] { LookAtPanel(); }),
         mutexes(scheduler, description.peers),
         clock(scheduler, description.startTime + static_cast<std::time_t>(simulationOptions.seed * 7919 % 86400)),
         threads(scheduler),
         console(scheduler, simulationOptions.captureOutput),
         environment(description.environment),
         cpu(description),
-        keyboard(scheduler, buses, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
-        touchpad(description.touchpad, scheduler, buses, keyboardDevice, [this] { panel.Update(scheduler.Now()); }),
+        keyboard(scheduler, buses, keyboardDevice, [this] { LookAtPanel(); }),
+        touchpad(description.touchpad, scheduler, buses, keyboardDevice, [this] { LookAtPanel(); }),
         files(simulationOptions.realFiles ? &posixFiles : nullptr, scheduler),
         profiles(files),
         windowHost(scheduler),
@@ -287,14 +321,59 @@ struct Simulation::Parts {
         host{clock,    console,    cpu,     windows,  driver, environment, files,    images,
              keyboard, management, mutexes, profiles, driver, threads,     touchpad, xmlDocuments} {}
 
-  static KeyboardDevice& AttachAll(Buses& buses, const MachineDescription& machine) {
+  static KeyboardDevice& AttachKeyboard(Buses& buses) {
     auto keyboard = std::make_unique<KeyboardDevice>();
     KeyboardDevice& device = *keyboard;
     buses.Attach(kKeyboard, std::move(keyboard));
-    for (const ChipDescription& chip : machine.chips) {
-      buses.Attach(chip.name, MakeDevice(chip));
-    }
     return device;
+  }
+
+  // Null on a machine whose firmware has no such interface.
+  static FirmwareCall* AttachFirmwareCall(Buses& buses, const MachineDescription& machine) {
+    if (!machine.firmwareCall) {
+      return nullptr;
+    }
+    auto firmware = std::make_unique<FirmwareCall>(*machine.firmwareCall);
+    FirmwareCall* device = firmware.get();
+    buses.Attach(kFirmware, std::move(firmware));
+    return device;
+  }
+
+  void AttachChips() {
+    for (const ChipDescription& chip : description.chips) {
+      std::unique_ptr<Device> device = MakeDevice(chip, scheduler);
+      chips.push_back(device.get());
+      buses.Attach(chip.name, std::move(device));
+    }
+  }
+
+  // To be called after everything that may have moved a pin.
+  void LookAtPanel() {
+    panel.Update(scheduler.Now());
+    AwaitNextEvent();
+  }
+
+  // Keeps one event ahead for the chip that acts first; what an access changes in the meantime is looked at then.
+  void AwaitNextEvent() {
+    std::optional<Microseconds> next;
+    for (const Device* chip : chips) {
+      if (const std::optional<Microseconds> event = chip->NextEvent()) {
+        next = std::min(next.value_or(*event), *event);
+      }
+    }
+    if (!next || (awaited && *awaited <= *next)) {
+      return;
+    }
+    awaited = next;
+    scheduler.At(*next, [this, when = *next] {
+      if (awaited == when) {
+        awaited.reset();
+        for (Device* chip : chips) {
+          chip->Advance();
+        }
+        LookAtPanel();
+      }
+    });
   }
 
   SimulationOptions options;
@@ -302,6 +381,9 @@ struct Simulation::Parts {
   Scheduler scheduler;
   Buses buses;
   KeyboardDevice& keyboardDevice;
+  FirmwareCall* firmwareCall;
+  std::vector<Device*> chips;
+  std::optional<Microseconds> awaited;  // the chips' next event, when one is ahead
   DriverTrace trace;
   FrontPanel panel;
   SimDriver driver;
@@ -336,6 +418,7 @@ Simulation::Simulation(std::string_view toml, const SimulationOptions& options)
 Simulation::Simulation(MachineDescription description, const SimulationOptions& options)
     : parts_(std::make_unique<Parts>(std::move(description), options)) {
   Parts& p = *parts_;
+  p.AttachChips();
   for (const Led& led : p.description.leds) {
     const Device* device = p.buses.Find(led.device);
     if (device == nullptr || !device->Signal(led.pin)) {
@@ -397,7 +480,7 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
       }
     });
   }
-  p.panel.Update(0);
+  p.LookAtPanel();
   p.initialState = p.buses.State();
   if (!options.operatorPolicy.empty()) {
     p.person = std::make_unique<Operator>(*this, options.operatorPolicy);
@@ -406,7 +489,10 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
   g_current = this;
 }
 
-Simulation::~Simulation() { g_current = parts_->former; }
+Simulation::~Simulation() {
+  parts_->scheduler.EndThreads();  // while their windows and locks are still there
+  g_current = parts_->former;
+}
 
 platform::Host& Simulation::TheMachine() { return parts_->host; }
 Scheduler& Simulation::Time() { return parts_->scheduler; }
@@ -446,7 +532,7 @@ void Simulation::Break(std::string_view led, std::string_view fault) {
       parts_->buses.IgnoreWrites(broken.device, *address);
     }
   }
-  parts_->panel.Update(parts_->scheduler.Now());
+  parts_->LookAtPanel();
 }
 
 void Simulation::Screenshot(std::string_view what) {

@@ -1,0 +1,99 @@
+// Reads objects from a byte stream, which may hold anything: whatever is wrong with it is thrown as
+// std::runtime_error, no more memory is taken than what its bytes stand for, and nesting is bounded.
+#pragma once
+
+#include <cstdint>
+#include <istream>
+#include <memory>
+#include <string>
+#include <variant>
+#include <vector>
+
+#include "config/PersistentByProxy.h"
+#include "config/ptstream.h"
+
+namespace panelglow {
+
+/// Whose objects are whose: the stream owns what it makes for pointers, until it is taken or finds its place as a
+/// value; the rest ends with the stream. Objects that are read into, taken objects, and pointers that were filled
+/// have to stay where they are as long as the stream is used. After a failure the stream reads nothing more. For one
+/// thread.
+class iptstream final : public ptstream {
+ public:
+  /// The byte stream belongs to the caller and outlives this object.
+  explicit iptstream(std::istream& input) : bytes(input) {}
+  ~iptstream() override = default;
+
+  std::uint32_t ReadUnsigned();
+  std::int32_t ReadInteger() { return static_cast<std::int32_t>(ReadUnsigned()); }
+  void ReadString(std::string& text);
+
+  /// Reads a value record into an object. An object that was made for a pointer before moves here, and all pointers
+  /// that were filled with it follow. Returns the object's number.
+  std::uint32_t ReadValue(Persistent& target);
+  std::uint32_t ReadValue(PersistentByProxy& target);
+
+  /// Reads a pointer record; the pointer follows its object from then on.
+  void ReadPointer(Persistent*& pointer);
+  void ReadPointer(PersistentByProxy*& pointer);
+
+  /// The same for a look at the object: nothing follows it.
+  Persistent* LookAtPointer();
+
+  /// Gives an object that the stream made to the caller; null when the stream does not own it.
+  std::unique_ptr<Persistent> Take(const Persistent* object);
+  std::unique_ptr<PersistentByProxy> Take(const PersistentByProxy* object);
+
+  /// For a class that keeps its parts in a list: the part that was read at `from` is at `to` now.
+  void Moved(std::uint32_t number, const Persistent* from, Persistent* to);
+
+ private:
+  using Location = std::variant<Persistent**, PersistentByProxy**>;
+
+  // An object that the stream has seen; its index in the table is its number.
+  struct indexed_pointer {
+    Persistent* object = nullptr;     // of a PersistentByProxy: its proxy
+    std::uint32_t height = 0;         // levels of objects nested in it
+    bool complete = false;            // its payload has been read
+    bool isPart = false;              // it has its place inside another object
+    std::vector<Location> locations;  // pointers that were filled with the object
+    std::unique_ptr<Persistent> owned;
+    std::unique_ptr<PersistentByProxy> ownedByProxy;
+  };
+
+  class Reading;
+
+  template <class Object>
+  std::uint32_t ReadValueRecord(Object& target);
+  template <class Object>
+  void PlaceAt(Object& target, std::uint32_t number);
+  template <class Object>
+  Object* ReadPointerRecord(std::uint32_t& number);
+  template <class Object>
+  void FillPointer(Object*& pointer);
+  template <class Object>
+  Object* Make(const std::string& className, std::uint32_t number);
+  template <class Object>
+  static Object* ObjectOf(const indexed_pointer& entry);
+  template <class Object>
+  static std::unique_ptr<Object>& OwnedOf(indexed_pointer& entry);
+  template <class Object>
+  void ReadPayload(Object& object, std::uint32_t number);
+  template <class Object>
+  std::unique_ptr<Object> TakeOwned(const Object* object);
+
+  std::uint32_t ReadNewNumber();
+  void CheckDepth(std::uint32_t level) const;
+  indexed_pointer& EntryOf(std::uint32_t number);
+  std::uint8_t ReadByte();
+  void Read(void* data, std::size_t size);
+  [[noreturn]] static void Fail(const std::string& message);
+
+  std::istream& bytes;
+  std::vector<indexed_pointer> table;  // by number
+  std::uint32_t depth = 0;             // of the objects being read
+  std::uint32_t deepest = 0;           // level that was reached since the innermost of them began
+  bool broken = false;
+};
+
+}  // namespace panelglow
