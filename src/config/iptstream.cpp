@@ -22,7 +22,8 @@ Persistent* IdentityOf(PersistentByProxy& object) { return &object.GetProxy(); }
 
 }  // namespace
 
-// Around each call from outside: a call that fails leaves objects half read, so that nothing may follow it.
+// Around each call: one that fails leaves objects half read and on their way out, so that nothing may follow it, and
+// no pointer may lead to them.
 class iptstream::Reading {
  public:
   explicit Reading(iptstream& stream) : stream_(stream), before_(std::uncaught_exceptions()) {
@@ -30,7 +31,11 @@ class iptstream::Reading {
       Fail("The stream has failed before");
     }
   }
-  ~Reading() { stream_.broken = stream_.broken || std::uncaught_exceptions() > before_; }
+  ~Reading() {
+    if (std::uncaught_exceptions() > before_ && !std::exchange(stream_.broken, true)) {
+      stream_.EmptyPointers();
+    }
+  }
   Reading(const Reading&) = delete;
   Reading& operator=(const Reading&) = delete;
 
@@ -159,7 +164,7 @@ void iptstream::ReadPayload(Object& object, std::uint32_t number) {
   --depth;
 }
 
-void iptstream::CheckDepth(std::uint32_t level) const {
+void iptstream::CheckDepth(std::uint32_t level) {
   if (level > kDeepestObject) {
     Fail("Objects are nested deeper than " + std::to_string(kDeepestObject) + " levels");
   }
@@ -276,6 +281,14 @@ std::unique_ptr<Object> iptstream::TakeOwned(const Object* object) {
     return object != nullptr && OwnedOf<Object>(candidate).get() == object;
   });
   return entry == table.end() ? nullptr : std::move(OwnedOf<Object>(*entry));
+}
+
+void iptstream::EmptyPointers() {
+  for (const indexed_pointer& entry : table) {
+    for (const Location& location : entry.locations) {
+      std::visit([](auto* pointer) { *pointer = nullptr; }, location);
+    }
+  }
 }
 
 void iptstream::Moved(std::uint32_t number, const Persistent* from, Persistent* to) {

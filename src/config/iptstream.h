@@ -16,8 +16,8 @@ namespace panelglow {
 
 /// Whose objects are whose: the stream owns what it makes for pointers, until it is taken or finds its place as a
 /// value; the rest ends with the stream. Objects that are read into, taken objects, and pointers that were filled
-/// have to stay where they are as long as the stream is used. After a failure the stream reads nothing more. For one
-/// thread.
+/// have to stay where they are as long as the stream is used. After a failure the stream reads nothing more, and the
+/// pointers that it has filled are null. For one thread.
 class iptstream final : public ptstream {
  public:
   /// The byte stream belongs to the caller and outlives this object.
@@ -83,7 +83,8 @@ class iptstream final : public ptstream {
   std::unique_ptr<Object> TakeOwned(const Object* object);
 
   std::uint32_t ReadNewNumber();
-  void CheckDepth(std::uint32_t level) const;
+  static void CheckDepth(std::uint32_t level);
+  void EmptyPointers();
   indexed_pointer& EntryOf(std::uint32_t number);
   std::uint8_t ReadByte();
   void Read(void* data, std::size_t size);
