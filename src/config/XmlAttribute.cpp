@@ -14,12 +14,12 @@ namespace {
 
 void XmlAttribute::ReadAndWrite(ptstream& stream, Direction direction, unsigned int /*version*/) {
   if (direction == Direction::kWrite) {
-    auto& out = dynamic_cast<optstream&>(stream);
+    auto& out = static_cast<optstream&>(stream);
     out.WriteString(name);
     out.WriteString(value);
     return;
   }
-  auto& in = dynamic_cast<iptstream&>(stream);
+  auto& in = static_cast<iptstream&>(stream);
   std::string text;
   in.ReadString(text);
   name = text;

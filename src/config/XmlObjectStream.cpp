@@ -1,5 +1,5 @@
 // XmlObject in object streams.
-#include <deque>
+#include <algorithm>
 #include <utility>
 
 #include "config/ClassRegistration.h"
@@ -21,23 +21,34 @@ void WriteItems(optstream& out, std::vector<Item>& items) {
   }
 }
 
-// Reads `count` items behind those of the list. They are read where they can stay until all are there, and the stream
-// is told where each of them has gone: it may refer to them later.
+// A list of so many items has its room at once; a longer one only as its items come in.
+constexpr std::size_t kFirstRoom = 64;
+
+// Reads `count` items behind those of the list. Where the list outgrows its room the stream is told where each of
+// them has gone: it may refer to them later.
 template <class Item, class Prepare>
 void ReadItems(iptstream& in, std::uint32_t count, std::vector<Item>& items, Prepare prepare) {
-  if (count == 0) {
-    return;
-  }
-  std::deque<std::pair<std::uint32_t, Item>> read;
+  const std::size_t before = items.size();
+  items.reserve(before + std::min<std::size_t>(count, kFirstRoom));
+  std::vector<std::uint32_t> numbers;
   for (std::uint32_t i = 0; i < count; ++i) {
-    auto& [number, item] = read.emplace_back();
+    if (items.size() == items.capacity()) {
+      std::vector<Item> larger;
+      larger.reserve(std::min<std::size_t>(before + count, 2 * items.size()));
+      for (std::size_t place = 0; place < items.size(); ++place) {
+        larger.push_back(std::move(items[place]));
+        if (place >= before) {
+          in.Moved(numbers[place - before], &items[place], &larger.back());
+        }
+      }
+      items = std::move(larger);
+    }
+    Item& item = items.emplace_back();
     prepare(item);
-    number = in.ReadValue(item);
-  }
-  items.reserve(items.size() + read.size());
-  for (auto& [number, item] : read) {
-    items.push_back(std::move(item));
-    in.Moved(number, &item, &items.back());
+    const std::uint32_t number = in.ReadValue(item);
+    if (count > kFirstRoom) {
+      numbers.push_back(number);
+    }
   }
 }
 
@@ -45,9 +56,9 @@ void ReadItems(iptstream& in, std::uint32_t count, std::vector<Item>& items, Pre
 
 void XmlObject::ReadAndWrite(ptstream& stream, Direction direction, unsigned int /*version*/) {
   if (direction == Direction::kWrite) {
-    WriteTo(dynamic_cast<optstream&>(stream));
+    WriteTo(static_cast<optstream&>(stream));
   } else {
-    ReadFrom(dynamic_cast<iptstream&>(stream));
+    ReadFrom(static_cast<iptstream&>(stream));
   }
 }
 

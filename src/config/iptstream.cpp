@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <array>
-#include <exception>
 #include <limits>
 #include <stdexcept>
 #include <type_traits>
@@ -21,28 +20,6 @@ Persistent* IdentityOf(Persistent& object) { return &object; }
 Persistent* IdentityOf(PersistentByProxy& object) { return &object.GetProxy(); }
 
 }  // namespace
-
-// Around each call: one that fails leaves objects half read and on their way out, so that nothing may follow it, and
-// no pointer may lead to them.
-class iptstream::Reading {
- public:
-  explicit Reading(iptstream& stream) : stream_(stream), before_(std::uncaught_exceptions()) {
-    if (stream_.broken) {
-      Fail("The stream has failed before");
-    }
-  }
-  ~Reading() {
-    if (std::uncaught_exceptions() > before_ && !std::exchange(stream_.broken, true)) {
-      stream_.EmptyPointers();
-    }
-  }
-  Reading(const Reading&) = delete;
-  Reading& operator=(const Reading&) = delete;
-
- private:
-  iptstream& stream_;
-  int before_;
-};
 
 // ---- integers and texts
 
@@ -74,7 +51,9 @@ std::uint8_t iptstream::ReadByte() {
 }
 
 void iptstream::Read(void* data, std::size_t size) {
-  const Reading reading(*this);
+  if (broken) {
+    throw std::runtime_error("The stream has failed before");
+  }
   const auto length = static_cast<std::streamsize>(size);
   if (!bytes.good() || bytes.rdbuf()->sgetn(static_cast<char*>(data), length) != length) {
     bytes.setstate(std::ios::eofbit | std::ios::failbit);
@@ -82,16 +61,50 @@ void iptstream::Read(void* data, std::size_t size) {
   }
 }
 
-void iptstream::Fail(const std::string& message) { throw std::runtime_error(message); }
+// What failed leaves objects half read and on their way out: nothing may follow it, and no pointer may lead to them.
+void iptstream::Fail(const std::string& message) {
+  Break();
+  throw std::runtime_error(message);
+}
+
+void iptstream::Break() {
+  broken = true;
+  for (const indexed_pointer& entry : table) {
+    if (entry.links == nullptr) {
+      continue;
+    }
+    for (const Location& location : entry.links->locations) {
+      std::visit([](auto* pointer) { *pointer = nullptr; }, location);
+    }
+    entry.links->locations.clear();
+  }
+}
+
+// Runs a call from outside. What a class throws breaks the stream as well.
+template <class Call>
+auto iptstream::Guarded(Call call) {
+  if (depth > 0) {
+    return call();
+  }
+  try {
+    return call();
+  } catch (...) {
+    Break();
+    throw;
+  }
+}
 
 // ---- values
 
-std::uint32_t iptstream::ReadValue(Persistent& target) { return ReadValueRecord(target); }
-std::uint32_t iptstream::ReadValue(PersistentByProxy& target) { return ReadValueRecord(target); }
+std::uint32_t iptstream::ReadValue(Persistent& target) {
+  return Guarded([&] { return ReadValueRecord(target); });
+}
+std::uint32_t iptstream::ReadValue(PersistentByProxy& target) {
+  return Guarded([&] { return ReadValueRecord(target); });
+}
 
 template <class Object>
 std::uint32_t iptstream::ReadValueRecord(Object& target) {
-  const Reading reading(*this);
   const std::uint8_t tag = ReadByte();
   if (tag == kReference) {
     const std::uint32_t number = ReadUnsigned();
@@ -132,20 +145,28 @@ void iptstream::PlaceAt(Object& target, std::uint32_t number) {
     CheckDepth(reached);
     deepest = std::max(deepest, reached);
   }
-  if (OwnedOf<Object>(entry) == nullptr) {
+  if (entry.links == nullptr || OwnedOf<Object>(*entry.links) == nullptr) {
     target.CopyFrom(object);
     return;
   }
   target.MoveFrom(*object);
-  for (const Location& location : entry.locations) {
-    if (Object** const* pointer = std::get_if<Object**>(&location)) {
-      **pointer = &target;
+  PutAt(entry, IdentityOf(target));
+  OwnedOf<Object>(*entry.links).reset();
+}
+
+// The object of the entry is at another place now; the pointers that were filled with it follow.
+void iptstream::PutAt(indexed_pointer& entry, Persistent* place) {
+  entry.object = place;
+  if (entry.links == nullptr) {
+    return;
+  }
+  for (const Location& location : entry.links->locations) {
+    if (Persistent** const* pointer = std::get_if<Persistent**>(&location)) {
+      **pointer = place;
     } else {
-      Fail("Indexed object was read through another kind of pointer.");
+      *std::get<PersistentByProxy**>(location) = ObjectOf<PersistentByProxy>(entry);
     }
   }
-  entry.object = IdentityOf(target);
-  OwnedOf<Object>(entry).reset();
 }
 
 template <class Object>
@@ -176,19 +197,21 @@ void iptstream::ReadPointer(Persistent*& pointer) { FillPointer(pointer); }
 void iptstream::ReadPointer(PersistentByProxy*& pointer) { FillPointer(pointer); }
 
 Persistent* iptstream::LookAtPointer() {
-  const Reading reading(*this);
-  std::uint32_t number = 0;
-  return ReadPointerRecord<Persistent>(number);
+  return Guarded([this] {
+    std::uint32_t number = 0;
+    return ReadPointerRecord<Persistent>(number);
+  });
 }
 
 template <class Object>
 void iptstream::FillPointer(Object*& pointer) {
-  const Reading reading(*this);
-  std::uint32_t number = 0;
-  pointer = ReadPointerRecord<Object>(number);
-  if (pointer != nullptr) {
-    table[number].locations.emplace_back(&pointer);
-  }
+  Guarded([&] {
+    std::uint32_t number = 0;
+    pointer = ReadPointerRecord<Object>(number);
+    if (pointer != nullptr) {
+      LinksOf(number).locations.emplace_back(&pointer);
+    }
+  });
 }
 
 template <class Object>
@@ -226,8 +249,9 @@ Object* iptstream::Make(const std::string& className, std::uint32_t number) {
     Fail("Attempting to stream ungegistered class: " + className);
   }
   table.emplace_back().object = IdentityOf(*object);
-  OwnedOf<Object>(table[number]) = std::move(object);
-  return OwnedOf<Object>(table[number]).get();
+  std::unique_ptr<Object>& owned = OwnedOf<Object>(LinksOf(number));
+  owned = std::move(object);
+  return owned.get();
 }
 
 // ---- the table
@@ -263,12 +287,20 @@ Object* iptstream::ObjectOf(const indexed_pointer& entry) {
   }
 }
 
+iptstream::Links& iptstream::LinksOf(std::uint32_t number) {
+  std::unique_ptr<Links>& links = table[number].links;
+  if (links == nullptr) {
+    links = std::make_unique<Links>();
+  }
+  return *links;
+}
+
 template <class Object>
-std::unique_ptr<Object>& iptstream::OwnedOf(indexed_pointer& entry) {
+std::unique_ptr<Object>& iptstream::OwnedOf(Links& links) {
   if constexpr (std::is_same_v<Object, Persistent>) {
-    return entry.owned;
+    return links.owned;
   } else {
-    return entry.ownedByProxy;
+    return links.ownedByProxy;
   }
 }
 
@@ -277,32 +309,18 @@ std::unique_ptr<PersistentByProxy> iptstream::Take(const PersistentByProxy* obje
 
 template <class Object>
 std::unique_ptr<Object> iptstream::TakeOwned(const Object* object) {
-  const auto entry = std::find_if(table.begin(), table.end(), [&](indexed_pointer& candidate) {
-    return object != nullptr && OwnedOf<Object>(candidate).get() == object;
-  });
-  return entry == table.end() ? nullptr : std::move(OwnedOf<Object>(*entry));
-}
-
-void iptstream::EmptyPointers() {
-  for (const indexed_pointer& entry : table) {
-    for (const Location& location : entry.locations) {
-      std::visit([](auto* pointer) { *pointer = nullptr; }, location);
+  for (indexed_pointer& entry : table) {
+    if (object != nullptr && entry.links != nullptr && OwnedOf<Object>(*entry.links).get() == object) {
+      return std::move(OwnedOf<Object>(*entry.links));
     }
   }
+  return nullptr;
 }
 
 void iptstream::Moved(std::uint32_t number, const Persistent* from, Persistent* to) {
   indexed_pointer& entry = EntryOf(number);
-  if (entry.object != from) {
-    return;
-  }
-  entry.object = to;
-  for (const Location& location : entry.locations) {
-    if (Persistent** const* pointer = std::get_if<Persistent**>(&location)) {
-      **pointer = to;
-    } else {
-      *std::get<PersistentByProxy**>(location) = ObjectOf<PersistentByProxy>(entry);
-    }
+  if (entry.object == from) {
+    PutAt(entry, to);
   }
 }
 

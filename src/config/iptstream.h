@@ -50,18 +50,21 @@ class iptstream final : public ptstream {
  private:
   using Location = std::variant<Persistent**, PersistentByProxy**>;
 
-  // An object that the stream has seen; its index in the table is its number.
-  struct indexed_pointer {
-    Persistent* object = nullptr;     // of a PersistentByProxy: its proxy
-    std::uint32_t height = 0;         // levels of objects nested in it
-    bool complete = false;            // its payload has been read
-    bool isPart = false;              // it has its place inside another object
+  // What belongs to an object that was read through pointers.
+  struct Links {
     std::vector<Location> locations;  // pointers that were filled with the object
     std::unique_ptr<Persistent> owned;
     std::unique_ptr<PersistentByProxy> ownedByProxy;
   };
 
-  class Reading;
+  // An object that the stream has seen; its index in the table is its number.
+  struct indexed_pointer {
+    Persistent* object = nullptr;  // of a PersistentByProxy: its proxy
+    std::uint32_t height = 0;      // levels of objects nested in it
+    bool complete = false;         // its payload has been read
+    bool isPart = false;           // it has its place inside another object
+    std::unique_ptr<Links> links;  // null for an object that nothing points at
+  };
 
   template <class Object>
   std::uint32_t ReadValueRecord(Object& target);
@@ -74,21 +77,25 @@ class iptstream final : public ptstream {
   template <class Object>
   Object* Make(const std::string& className, std::uint32_t number);
   template <class Object>
-  static Object* ObjectOf(const indexed_pointer& entry);
+  Object* ObjectOf(const indexed_pointer& entry);
   template <class Object>
-  static std::unique_ptr<Object>& OwnedOf(indexed_pointer& entry);
+  static std::unique_ptr<Object>& OwnedOf(Links& links);
+  template <class Call>
+  auto Guarded(Call call);
   template <class Object>
   void ReadPayload(Object& object, std::uint32_t number);
   template <class Object>
   std::unique_ptr<Object> TakeOwned(const Object* object);
 
   std::uint32_t ReadNewNumber();
-  static void CheckDepth(std::uint32_t level);
-  void EmptyPointers();
+  void CheckDepth(std::uint32_t level);
+  void PutAt(indexed_pointer& entry, Persistent* place);
+  Links& LinksOf(std::uint32_t number);
+  void Break();
   indexed_pointer& EntryOf(std::uint32_t number);
   std::uint8_t ReadByte();
   void Read(void* data, std::size_t size);
-  [[noreturn]] static void Fail(const std::string& message);
+  [[noreturn]] void Fail(const std::string& message);
 
   std::istream& bytes;
   std::vector<indexed_pointer> table;  // by number

@@ -5,7 +5,7 @@
 #include <ostream>
 #include <string>
 #include <string_view>
-#include <unordered_map>
+#include <vector>
 
 #include "config/PersistentByProxy.h"
 #include "config/ptstream.h"
@@ -33,17 +33,28 @@ class optstream final : public ptstream {
   void WritePointer(PersistentByProxy* object);
 
   /// True when the object has been written, or is being written.
-  [[nodiscard]] bool HasSeen(const Persistent* object) const { return numbers.contains(object); }
+  [[nodiscard]] bool HasSeen(const Persistent* object) const;
 
  private:
   template <class Object>
   void WriteObject(std::uint8_t tag, Object& object);
-  void WriteByte(std::uint8_t value) { Write(&value, 1); }
-  void Write(const void* data, std::size_t size);
+  void WriteNull();
+  void Append(std::uint32_t value);
+  void Flush();
+  [[nodiscard]] std::size_t SlotOf(const Persistent* object) const;
+  void MakeRoom();
+
+  // A place of the table of objects, which is open-addressed: a stream of a large tree is mostly look-ups.
+  struct Slot {
+    const Persistent* object = nullptr;  // by identity; null: free
+    std::uint32_t number = 0;
+  };
 
   std::ostream& bytes;
-  std::unordered_map<const Persistent*, std::uint32_t> numbers;  // by identity
-  std::size_t depth = 0;                                         // of the objects being written
+  std::string waiting;  // bytes of the record being written
+  std::vector<Slot> slots;
+  std::uint32_t count = 0;  // of objects in the table
+  std::size_t depth = 0;    // of the objects being written
 };
 
 }  // namespace panelglow

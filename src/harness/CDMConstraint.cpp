@@ -176,7 +176,7 @@ std::string CDMConstraint::GetDictionaryEntry(const std::string& prefix, CDMArgu
     std::vector<std::string> allowed;
     CDMUtil::Split(list, allowed, ",");
     for (const std::string& value : allowed) {
-      text += prefix + "/List/" + value + " = TBC\n";
+      text.append(prefix).append("/List/").append(value).append(" = TBC\n");
     }
   }
   return text;

@@ -69,7 +69,7 @@ wstring MessageFiles::GetResourceString(int id, const wstring& text) const {
 wstring MessageFiles::LookUpMedia(const WIniFile& file, const wstring& key) const {
   std::array<char16_t, kMediaBuffer> buffer{};
   platform::TheHost().profiles.GetValue(kMediaSection, key, key, buffer, file.GetPath());
-  const wstring value = buffer.data();
+  wstring value = buffer.data();
   if (!value.empty() && CDMUtil::FileExists(platform::Utf8FromWide(value))) {
     return value;
   }

@@ -20,6 +20,9 @@ const SmbiosScanner& TheScanner() {
   static const SmbiosScanner scanner = [] {
     CDevio devio;
     SmbiosScanner scan;
+    if (!devio.IsDriverLoaded()) {
+      return scan;  // every byte would read as 0: there is nothing to look for
+    }
     scan.Scan({[&](std::uint16_t segment, std::uint16_t offset) { return devio.ReadFirmwareByte(segment, offset); },
                [&](std::uint16_t segment, std::uint16_t offset) { return devio.ReadFirmwareWord(segment, offset); }});
     return scan;

@@ -9,6 +9,10 @@
 #include "FuzzTarget.h"
 
 namespace panelglow::fuzz {
+
+// Printed as it is, a target would put addresses of this build into the tests' names.
+static void PrintTo(const Target& target, std::ostream* out) { *out << target.name; }
+
 namespace {
 
 namespace fs = std::filesystem;

@@ -92,7 +92,6 @@ TEST(DriverLoader, TakesEachStepOnceAndClosesItsHandlesOnEveryWayOut) {
        false},
       {{{"start #2", 2}}, kOpen + std::string(kStart) + "delete #2\n" + kClose, State::kNoBinary, false},
       {{{"start #2", 3}}, kOpen + std::string(kStart) + kClose, State::kStartFailed, false},
-      {{{"start #2", 5}}, kOpen + std::string(kStart) + kClose, State::kStartFailed, false},
       {{{"link link", 2}}, kOpen + std::string(kStart) + kLink + kClose, State::kRunning, false},
   };
   for (const auto& c : kCases) {
@@ -123,11 +122,6 @@ TEST(DriverLoader, TriesTheOlderNamesOnlyWhenThePresentBinaryIsMissing) {
   } kCases[] = {
       {{}, present + "link tmbhalcyon\nclose #2\nclose #1\n", State::kRunning, "tmbhalcyon", true},
       {{{"start #2", 3}}, present + "close #2\nclose #1\n", State::kStartFailed, "tmbhalcyon", false},
-      {{{"link tmbhalcyon", 2}},
-       present + "link tmbhalcyon\nclose #2\nclose #1\n",
-       State::kRunning,
-       "tmbhalcyon",
-       false},
       {{{"start #2", 2}},
        present + removed + older + "start #4\nlink Nvntsk\nclose #4\nclose #3\n",
        State::kRunning,
