@@ -31,6 +31,9 @@ std::optional<Span> FindMark(const wstring& text, const wstring& mark, std::size
   return std::nullopt;
 }
 
+// The second of the two units of a character beyond 16 bits.
+bool IsSecondHalf(char16_t unit) { return unit >= 0xDC00 && unit <= 0xDFFF; }
+
 // The font's average width of a character, by the letters of the Latin alphabet.
 int AverageCharWidth(platform::Desktop& desktop, const platform::Font& font) {
   constexpr std::u16string_view kLetters = u"ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz";
@@ -57,8 +60,7 @@ class LineBreaker {
       rest.remove_prefix(count);
       if (!rest.empty()) {
         NextLine();
-        const bool blankAtBreak = rest.front() == u' ' || rest.front() == u'\n';
-        rest.remove_prefix(blankAtBreak ? 1 : 0);
+        rest.remove_prefix(rest.front() == u'\n' ? 1 : 0);
       }
     }
   }
@@ -73,14 +75,22 @@ class LineBreaker {
   }
 
   // How many characters go on the rest of the line: as many as the average width lets through, and fewer where that
-  // guess would let letters run over the pane's edge. An empty line takes one in any case.
+  // guess would let letters run over the pane's edge. An empty line takes one in any case. A character of two units
+  // stays whole: a half of it cannot be drawn, nor what is on the line with it.
   std::size_t FittingCount(std::u16string_view text) {
     const int room = right_ - x_;
+    const bool emptyLine = x_ == kMargin;
     std::size_t count = std::min(text.size(), static_cast<std::size_t>(std::max(0, room / charWidth_)));
     while (count > 0 && WidthOf(text.substr(0, count)) > room) {
       --count;
     }
-    return x_ == kMargin && !text.empty() ? std::max<std::size_t>(count, 1) : count;
+    if (emptyLine && !text.empty()) {
+      count = std::max<std::size_t>(count, 1);
+    }
+    if (count > 0 && count < text.size() && IsSecondHalf(text[count])) {
+      return emptyLine && count == 1 ? 2 : count - 1;
+    }
+    return count;
   }
 
   platform::Desktop& desktop_;

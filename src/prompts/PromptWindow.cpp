@@ -365,6 +365,9 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
     case message::kPaint:
       return OnPaint(received);
     case message::kSyncPaint:
+      if (hasImage_) {
+        PaintImage();
+      }
       return 0;
     case message::kControlColorButton:
     case message::kControlColorStatic:

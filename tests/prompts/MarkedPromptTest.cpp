@@ -50,8 +50,10 @@ TEST(MarkedPrompt, PaintsItsMarksOnGreenAndRed) {
 }
 
 TEST(MarkedPrompt, BreaksItsLinesInsideThePane) {
-  const wstring wide(30, u'W');  // wider than the average letter says
-  for (const wstring& text : {wstring(u"some words and "), wide + wide, wstring(40, u'漢'), wstring(10'000, u'i')}) {
+  const wstring wide(30, u'W');                   // wider than the average letter says
+  const wstring pairs = u"😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀😀";  // two units each, which stay together
+  for (const wstring& text : {wstring(u"some words and "), wstring(40, u' '), wide + wide, wstring(40, u'漢'),
+                              pairs + pairs, wstring(10'000, u'i')}) {
     Desk desk;
     desk.At(100, [&] {
       int y = 11;
@@ -67,6 +69,7 @@ TEST(MarkedPrompt, BreaksItsLinesInsideThePane) {
         right += desk.windows.MeasureText(piece.text, 10'000, piece.font).Width();
         EXPECT_LE(right, 338);
         EXPECT_LT(y, 268);
+        EXPECT_NE(piece.text.front() & 0xFC00, 0xDC00);
         whole += piece.text;
       }
       EXPECT_EQ(whole.substr(0, 60), (text + u"YES or NO" + text).substr(0, 60));

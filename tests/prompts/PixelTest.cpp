@@ -77,6 +77,16 @@ TEST(Pixels, AScrolledPictureMovesInsideItsAreaOnly) {
   ImagePrompt(u"text", u"title", 0, picture.WidePath(), nullptr, 0);
 }
 
+TEST(Pixels, APictureThatHasBeenPutRightIsReadAnew) {
+  platform::posix::LazyDrawing drawing;
+  const TemporaryFile picture("renewed.pgm", "");
+  EXPECT_EQ(drawing.Get()->ImageSize(picture.Path()), std::nullopt);
+  for (const int width : {20, 300}) {
+    std::ofstream(picture.Path(), std::ios::binary) << HalfBlack(width, 10);
+    EXPECT_EQ(drawing.Get()->ImageSize(picture.Path()), std::pair(width, 10));
+  }
+}
+
 TEST(Pixels, TheCountDownIsSeenInEveryFormWhatEverIsUnderIt) {
   for (const bool image : {false, true}) {
     for (const bool counting : {false, true}) {

@@ -301,11 +301,14 @@ std::pair<int, int> CairoDrawing::MeasureText(std::u16string_view text, int widt
   return {w, h};
 }
 
-// Null when the file does not decode. An image stays in memory for the next drawing.
+// Null when the file does not decode. An image stays in memory for the next drawing, as long as its file is the same.
 const GdkPixbuf* CairoDrawing::Load(const std::string& path) {
+  std::error_code missing;
+  const std::filesystem::file_time_type written = std::filesystem::last_write_time(path, missing);
+  const std::uintmax_t fileSize = std::filesystem::file_size(path, missing);
   const auto known = images_.find(path);
-  if (known != images_.end()) {
-    return known->second.get();
+  if (known != images_.end() && known->second.written == written && known->second.fileSize == fileSize) {
+    return known->second.pixels.get();
   }
   int width = 0;
   int height = 0;
@@ -314,7 +317,7 @@ const GdkPixbuf* CairoDrawing::Load(const std::string& path) {
       height <= kLargestImageSide && static_cast<long long>(width) * height <= kMostImagePixels) {
     image.reset(gdk_pixbuf_new_from_file(path.c_str(), nullptr));
   }
-  return images_.emplace(path, std::move(image)).first->second.get();
+  return images_.insert_or_assign(path, Image{written, fileSize, std::move(image)}).first->second.pixels.get();
 }
 
 void CairoDrawing::DrawOperations(cairo_t* cr, const SceneWindow& window) {

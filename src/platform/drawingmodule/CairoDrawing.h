@@ -4,6 +4,8 @@
 #include <cairo.h>
 #include <gdk-pixbuf/gdk-pixbuf.h>
 
+#include <cstdint>
+#include <filesystem>
 #include <map>
 #include <memory>
 #include <string>
@@ -42,7 +44,12 @@ class CairoDrawing : public SceneDrawing {
   void Draw(cairo_t* cr, const TextOperation& text);
   void Draw(cairo_t* cr, const ImageOperation& operation);
 
-  std::map<std::string, Pixbuf> images_;  // null for a file that does not decode
+  struct Image {
+    std::filesystem::file_time_type written;  // of the file that was read
+    std::uintmax_t fileSize = 0;
+    Pixbuf pixels;  // null for a file that does not decode
+  };
+  std::map<std::string, Image> images_;
 };
 
 }  // namespace panelglow::platform::desktop

@@ -167,9 +167,7 @@ void X11Screen::Show(const Scene& scene) {
     }
     order_ = order;
   }
-  for (const auto& [handle, shown] : windows_) {
-    Paint(shown, {0, 0, shown.frame.Width(), shown.frame.Height()});
-  }
+  // Before it is painted: whoever sees the window may type.
   const auto front = windows_.find(scene.foreground);
   if (front != windows_.end() && foreground_ != scene.foreground) {
     XSetInputFocus(display_, front->second.window, RevertToParent, CurrentTime);
@@ -183,6 +181,9 @@ void X11Screen::Show(const Scene& scene) {
     }
   }
   foreground_ = front == windows_.end() ? 0 : scene.foreground;
+  for (const auto& [handle, shown] : windows_) {
+    Paint(shown, {0, 0, shown.frame.Width(), shown.frame.Height()});
+  }
   XFlush(display_);
 }
 

@@ -91,17 +91,18 @@ void LinuxDesktop::Inject(const desktop::ScreenEvent& event) {
 void LinuxDesktop::RunScreen() {
   DeviceEvents devices;
   std::uint64_t shown = 0;
+  bool isNew = false;
   while (screen_->IsAlive()) {
     std::array<pollfd, 3> watched{
         {{screen_->Descriptor(), POLLIN, 0}, {changed_, POLLIN, 0}, {devices.Descriptor(), POLLIN, 0}}};
-    ::poll(watched.data(), watched.size(), -1);
+    // Showing may have taken events off the connection that wait to be looked at.
+    ::poll(watched.data(), watched.size(), isNew ? 0 : -1);
     std::uint64_t count = 0;
     if (watched[1].revents != 0 && ::read(changed_, &count, sizeof count) < 0) {
       continue;
     }
     const std::vector<desktop::ScreenEvent> events = screen_->TakeEvents();
     desktop::Scene scene;
-    bool isNew = false;
     {
       const LinuxWindowHost::Guard guard(host_);
       for (const desktop::ScreenEvent& event : events) {
