@@ -32,8 +32,8 @@ class BoardBench {
     return MotherBoard::Instantiate(".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini", "platform", systemId);
   }
 
-  /// What an action does on the hardware, in order: "0A20<-31" and "0A21->30" for ports and memory, "30ms" for a
-  /// wait.
+  /// What an action does on the hardware, in order: "0A20<-31" and "0A21->30" for ports and memory (its bytes in the
+  /// order of their addresses), "30ms" for a wait.
   template <class Action>
   std::string Traffic(Action action) {
     machine.Trace().Clear();
@@ -49,7 +49,10 @@ class BoardBench {
       std::vector<std::string> words;  // simulated, time, us, thread, number, kind, address, direction, value
       CDMUtil::Split(Describe(request), words, " ");
       if (words[5] != "request") {  // mapping and unmapping say nothing here
-        text += words[6] + words[7] + words[8] + " ";
+        for (std::size_t i = 6; i < words.size(); ++i) {
+          text += words[i];
+        }
+        text += " ";
       }
     }
     wait(machine.Time().Now());

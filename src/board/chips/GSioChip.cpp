@@ -82,6 +82,15 @@ std::uint16_t GSioChip::FindBar(const BarKeys& keys) {
 
 // ---- the part's protocol
 
+GSioChip::ConfigMode::~ConfigMode() noexcept(false) {
+  try {
+    chip_.ExitConfigMode();
+  } catch (const platform::ThreadTerminated&) {
+    chip_.ExitConfigMode();  // undisturbed now
+    throw;
+  }
+}
+
 void GSioChip::EnterConfigMode() {
   for (const std::uint8_t key : enterSequence) {
     devio.OutportByte(indexPort, key);

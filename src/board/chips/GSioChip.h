@@ -51,7 +51,8 @@ class GSioChip : public GChip {
   class ConfigMode {
    public:
     explicit ConfigMode(GSioChip& chip) : chip_(chip) { chip_.EnterConfigMode(); }
-    ~ConfigMode() { chip_.ExitConfigMode(); }
+    /// Throws platform::ThreadTerminated when the thread is told to end on the way out; the mode is left then, too.
+    ~ConfigMode() noexcept(false);
     ConfigMode(const ConfigMode&) = delete;
     ConfigMode& operator=(const ConfigMode&) = delete;
 
