@@ -23,10 +23,10 @@ int main(int argc, char** argv) {
   // Subtests live to the end of the process and are never destroyed: what is to be left behind is written during Run.
   // These pointers own them.
   static LEDTest* const ledTest = new LEDTest;
-  static CustomLEDTest* const customLedTest = new CustomLEDTest;
-  static LEDStatusIndicator* const ledStatusIndicator = new LEDStatusIndicator;
   manager.RegisterSubtest("LEDTest", ledTest);
+  static CustomLEDTest* const customLedTest = new CustomLEDTest;
   manager.RegisterSubtest("CustomLEDTest", customLedTest);
+  static LEDStatusIndicator* const ledStatusIndicator = new LEDStatusIndicator;
   manager.RegisterSubtest("LEDStatusIndicator", ledStatusIndicator);
   return manager.Run();
 }

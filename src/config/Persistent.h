@@ -15,7 +15,7 @@ class Persistent {
 
   virtual ~Persistent() = default;
 
-  /// Format version that this class writes. A stored form of a later version is refused.
+  /// Format version that this class writes. Whether it can read a stored form of another one is its own to say.
   [[nodiscard]] virtual unsigned int Version() const { return 0; }
 
   /// Moves all fields between this object and the stream, an optstream or an iptstream by the direction; `version` is

@@ -172,9 +172,6 @@ void iptstream::PutAt(indexed_pointer& entry, Persistent* place) {
 template <class Object>
 void iptstream::ReadPayload(Object& object, std::uint32_t number) {
   const std::uint32_t version = ReadUnsigned();
-  if (version > object.Version()) {
-    Fail("Version " + std::to_string(version) + " of class " + object.GetRealClassName() + " is not known");
-  }
   const std::uint32_t deepestBefore = std::exchange(deepest, depth + 1);
   CheckDepth(++depth);
   object.ReadAndWrite(*this, Persistent::Direction::kRead, version);

@@ -195,6 +195,7 @@ struct TrackLimits {
 struct TextLayout {
   bool wordBreak = false;
   bool editControl = false;  // break as a multi-line edit field does: a partly visible last line is left out
+  bool operator==(const TextLayout&) const = default;
 };
 
 /// What a window draws on while it handles a paint message. Coordinates are client pixels.
@@ -221,6 +222,7 @@ struct ScrollState {
   int maximum = 0;
   int page = 0;
   int position = 0;
+  bool operator==(const ScrollState&) const = default;
 };
 
 enum class ZOrder { kTop, kTopmost };

@@ -108,10 +108,9 @@ bool CaslChip::SaveWirelessLedState() {
 bool CaslChip::ReadLatchedPort(std::uint16_t /*port*/, int bit, bool& value) {
   SetUpOnce();
   const std::vector<std::uint8_t> record = ReadWirelessRecord();
-  const bool wanted = bit == 1;
-  value = devices.empty() || IsOn(record, devices.front()) != wanted;
+  value = devices.empty() || static_cast<int>(IsOn(record, devices.front())) != bit;
   if (value) {
-    SetWirelessPower(wanted);
+    SetWirelessPower(bit == 1);
   }
   return true;
 }

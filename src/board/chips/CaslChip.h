@@ -30,7 +30,7 @@ class CaslChip : public Chip {
   bool AssertWirelessLed() override { return SetWirelessPower(true); }
   bool DeassertWirelessLed() override { return SetWirelessPower(false); }
 
-  /// Here: switches the radio when it is not as wanted (`bit` 1: on); `value` says whether that was needed.
+  /// Here: switches the radio when it is not as wanted (`bit` 1: on, 0: off); `value` says whether that was needed.
   bool ReadLatchedPort(std::uint16_t port, int bit, bool& value) override;
 
   virtual bool SetWirelessPower(bool on);

@@ -14,6 +14,7 @@ namespace panelglow::platform::desktop {
 struct FillOperation {
   Rectangle area;
   Color color = 0;
+  bool operator==(const FillOperation&) const = default;
 };
 
 struct TextOperation {
@@ -24,6 +25,7 @@ struct TextOperation {
   Font font;
   Color color = 0;
   std::optional<Color> background;
+  bool operator==(const TextOperation&) const = default;
 };
 
 struct ImageOperation {
@@ -31,12 +33,14 @@ struct ImageOperation {
   int y = 0;
   std::u16string path;
   Rectangle clip;
+  bool operator==(const ImageOperation&) const = default;
 };
 
 /// A filled disc that touches all sides of `area`.
 struct DiscOperation {
   Rectangle area;
   Color color = 0;
+  bool operator==(const DiscOperation&) const = default;
 };
 
 using DrawOperation = std::variant<FillOperation, TextOperation, ImageOperation, DiscOperation>;
@@ -66,6 +70,7 @@ struct SceneWindow {
   bool vertical = false;  // scroll bar
   ScrollState scroll;
   std::vector<DrawOperation> operations;  // in client coordinates
+  bool operator==(const SceneWindow&) const = default;
 };
 
 struct Scene {

@@ -10,6 +10,7 @@
 #include <cstdlib>
 #include <utility>
 
+#include "platform/desktop/Damage.h"
 #include "platform/desktop/WindowSystem.h"
 
 namespace panelglow::platform::desktop {
@@ -113,88 +114,116 @@ int X11Screen::Height() const { return DisplayHeight(display_, DefaultScreen(dis
 int X11Screen::Descriptor() const { return ConnectionNumber(display_); }
 
 void X11Screen::Place(ShownWindow& shown, WindowHandle handle, const Rectangle& frame) {
-  const auto width = static_cast<unsigned>(std::max(1, frame.Width()));
-  const auto height = static_cast<unsigned>(std::max(1, frame.Height()));
-  if (shown.window == 0) {
+  const int width = std::max(1, frame.Width());
+  const int height = std::max(1, frame.Height());
+  const bool isNew = shown.window == 0;
+  if (isNew) {
     XSetWindowAttributes attributes{};
     attributes.override_redirect = True;
     attributes.event_mask = ExposureMask | ButtonPressMask | ButtonReleaseMask | PointerMotionMask | KeyPressMask;
-    shown.window =
-        XCreateWindow(display_, DefaultRootWindow(display_), frame.left, frame.top, width, height, 0, CopyFromParent,
-                      InputOutput, CopyFromParent, CWOverrideRedirect | CWEventMask, &attributes);
+    shown.window = XCreateWindow(display_, DefaultRootWindow(display_), frame.left, frame.top,
+                                 static_cast<unsigned>(width), static_cast<unsigned>(height), 0, CopyFromParent,
+                                 InputOutput, CopyFromParent, CWOverrideRedirect | CWEventMask, &attributes);
     XStoreName(display_, shown.window, ("panelglow " + std::to_string(handle)).c_str());
     XMapRaised(display_, shown.window);
+    shown.target.reset(cairo_xlib_surface_create(display_, shown.window,
+                                                 DefaultVisual(display_, DefaultScreen(display_)), width, height));
   } else if (!(shown.frame == frame)) {
-    XMoveResizeWindow(display_, shown.window, frame.left, frame.top, width, height);
+    XMoveResizeWindow(display_, shown.window, frame.left, frame.top, static_cast<unsigned>(width),
+                      static_cast<unsigned>(height));
+    cairo_xlib_surface_set_size(shown.target.get(), width, height);
+  }
+  if (isNew || shown.frame.Width() != frame.Width() || shown.frame.Height() != frame.Height()) {
+    shown.picture.reset(cairo_image_surface_create(CAIRO_FORMAT_RGB24, width, height));
   }
   shown.frame = frame;
+}
+
+void X11Screen::RemoveAllBut(const std::vector<WindowHandle>& windows) {
+  for (auto shown = windows_.begin(); shown != windows_.end();) {
+    if (std::find(windows.begin(), windows.end(), shown->first) != windows.end()) {
+      ++shown;
+      continue;
+    }
+    if (inputContext_ != nullptr && inputWindow_ == shown->second.window) {
+      XDestroyIC(std::exchange(inputContext_, nullptr));
+    }
+    shown->second.target.reset();
+    XDestroyWindow(display_, shown->second.window);
+    shown = windows_.erase(shown);
+  }
+}
+
+void X11Screen::FocusOn(WindowHandle foreground) {
+  const auto front = windows_.find(foreground);
+  const WindowHandle before = std::exchange(foreground_, front == windows_.end() ? 0 : foreground);
+  if (foreground_ == 0 || foreground_ == before) {
+    return;
+  }
+  XSetInputFocus(display_, front->second.window, RevertToParent, CurrentTime);
+  if (inputMethod_ != nullptr) {
+    if (inputContext_ != nullptr) {
+      XDestroyIC(inputContext_);
+    }
+    inputWindow_ = front->second.window;
+    inputContext_ = XCreateIC(inputMethod_, XNInputStyle, XIMPreeditNothing | XIMStatusNothing, XNClientWindow,
+                              inputWindow_, XNFocusWindow, inputWindow_, nullptr);
+  }
 }
 
 void X11Screen::Show(const Scene& scene) {
   if (!alive_) {
     return;
   }
+  const std::map<WindowHandle, Rectangle> damage = DamageBetween(shown_, scene);
   std::vector<WindowHandle> order;
   for (const SceneWindow& window : scene.windows) {
     if (window.topLevel == window.handle) {
       order.push_back(window.handle);
-      ShownWindow& shown = windows_[window.handle];
-      Place(shown, window.handle, window.frame);
-      shown.picture.reset(cairo_image_surface_create(CAIRO_FORMAT_RGB24, std::max(1, window.frame.Width()),
-                                                     std::max(1, window.frame.Height())));
+      Place(windows_[window.handle], window.handle, window.frame);
     }
   }
-  for (auto shown = windows_.begin(); shown != windows_.end();) {
-    if (std::find(order.begin(), order.end(), shown->first) == order.end()) {
-      if (inputContext_ != nullptr && inputWindow_ == shown->second.window) {
-        XDestroyIC(std::exchange(inputContext_, nullptr));
-      }
-      XDestroyWindow(display_, shown->second.window);
-      shown = windows_.erase(shown);
-    } else {
-      ++shown;
-    }
-  }
-  for (const SceneWindow& window : scene.windows) {
-    const ShownWindow& shown = windows_.at(window.topLevel);
-    const Context context(cairo_create(shown.picture.get()));
-    cairo_translate(context.get(), -shown.frame.left, -shown.frame.top);
-    drawing_.DrawWindow(context.get(), window);
-  }
+  RemoveAllBut(order);
   if (order != order_) {
     for (const WindowHandle handle : order) {
       XRaiseWindow(display_, windows_.at(handle).window);
     }
     order_ = order;
   }
-  // Before it is painted: whoever sees the window may type.
-  const auto front = windows_.find(scene.foreground);
-  if (front != windows_.end() && foreground_ != scene.foreground) {
-    XSetInputFocus(display_, front->second.window, RevertToParent, CurrentTime);
-    if (inputMethod_ != nullptr) {
-      if (inputContext_ != nullptr) {
-        XDestroyIC(inputContext_);
-      }
-      inputWindow_ = front->second.window;
-      inputContext_ = XCreateIC(inputMethod_, XNInputStyle, XIMPreeditNothing | XIMStatusNothing, XNClientWindow,
-                                inputWindow_, XNFocusWindow, inputWindow_, nullptr);
-    }
-  }
-  foreground_ = front == windows_.end() ? 0 : scene.foreground;
-  for (const auto& [handle, shown] : windows_) {
-    Paint(shown, {0, 0, shown.frame.Width(), shown.frame.Height()});
-  }
+  FocusOn(scene.foreground);  // before it is painted: whoever sees the window may type
+  Draw(scene, damage);
+  shown_ = scene;
   XFlush(display_);
 }
 
+void X11Screen::Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage) {
+  for (const SceneWindow& window : scene.windows) {
+    const auto damaged = damage.find(window.topLevel);
+    if (damaged == damage.end() || Common(damaged->second, window.clip) == Rectangle{}) {
+      continue;
+    }
+    const ShownWindow& shown = windows_.at(window.topLevel);
+    const Rectangle& area = damaged->second;
+    const Context context(cairo_create(shown.picture.get()));
+    cairo_translate(context.get(), -shown.frame.left, -shown.frame.top);
+    cairo_rectangle(context.get(), area.left, area.top, area.Width(), area.Height());
+    cairo_clip(context.get());
+    drawing_.DrawWindow(context.get(), window);
+  }
+  for (const auto& [handle, area] : damage) {
+    const ShownWindow& shown = windows_.at(handle);
+    Paint(shown, {area.left - shown.frame.left, area.top - shown.frame.top, area.right - shown.frame.left,
+                  area.bottom - shown.frame.top});
+  }
+}
+
+// Copies a part of the picture, in the window's pixels, onto the display.
 void X11Screen::Paint(const ShownWindow& shown, const Rectangle& area) {
-  const Surface target(cairo_xlib_surface_create(display_, shown.window,
-                                                 DefaultVisual(display_, DefaultScreen(display_)),
-                                                 shown.frame.Width(), shown.frame.Height()));
-  const Context context(cairo_create(target.get()));
+  const Context context(cairo_create(shown.target.get()));
   cairo_set_source_surface(context.get(), shown.picture.get(), 0, 0);
   cairo_rectangle(context.get(), area.left, area.top, area.Width(), area.Height());
   cairo_fill(context.get());
+  cairo_surface_flush(shown.target.get());
 }
 
 std::vector<ScreenEvent> X11Screen::TakeEvents() {

@@ -7,6 +7,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "platform/desktop/Screen.h"
 #include "platform/drawingmodule/CairoDrawing.h"
@@ -34,12 +35,16 @@ class X11Screen : public Screen {
     ::Window window = 0;
     Rectangle frame;
     Surface picture;  // what the window shows, for exposures
+    Surface target;   // the window itself
   };
 
   explicit X11Screen(::Display* display);
 
   void Place(ShownWindow& shown, WindowHandle handle, const Rectangle& frame);
-  void Paint(const ShownWindow& shown, const Rectangle& area);
+  void RemoveAllBut(const std::vector<WindowHandle>& windows);
+  void FocusOn(WindowHandle foreground);
+  void Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage);
+  static void Paint(const ShownWindow& shown, const Rectangle& area);
   void TakeKey(XEvent& event, std::vector<ScreenEvent>& events);
   static int OnError(::Display* display, XErrorEvent* event);
   static void OnGone(::Display* display, void* screen);
@@ -51,7 +56,8 @@ class X11Screen : public Screen {
   bool alive_ = true;
   std::map<WindowHandle, ShownWindow> windows_;
   std::vector<WindowHandle> order_;
-  WindowHandle foreground_ = 0;
+  WindowHandle foreground_ = 0;  // of the windows that are shown
+  Scene shown_;
   CairoDrawing drawing_;
 };
 

@@ -68,8 +68,8 @@ ManagementValue ArrayOf(const Container& bytes) {
 }
 
 Bytes CountedRecord(const Bytes& items) {
-  Bytes record{static_cast<std::uint8_t>(items.size())};
-  record.insert(record.end(), items.begin(), items.end());
+  Bytes record(items.size() + 1, static_cast<std::uint8_t>(items.size()));
+  std::copy(items.begin(), items.end(), record.begin() + 1);
   return record;
 }
 

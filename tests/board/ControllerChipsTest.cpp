@@ -1,0 +1,575 @@
+// What the controller chips (embedded controllers, the mailbox, the audio codec, the firmware's call) do on their
+// ports for each operation, and what they give back when the part hangs.
+#include <gmock/gmock.h>
+
+#include <functional>
+
+#include "board/BoardBench.h"
+#include "board/base/mblib_exception.h"
+#include "board/chips/CaslChip.h"
+#include "board/chips/EcIt8512Chip.h"
+#include "board/chips/EcIt8518Chip.h"
+#include "board/chips/EcWpc8763Chip.h"
+#include "board/chips/GCodecChip.h"
+#include "board/chips/GEcIt8519Chip.h"
+#include "board/chips/SmscKbc1126Chip.h"
+#include "board/chips/SmscMec1322Chip.h"
+#include "harness/base/CDMException.h"
+
+namespace panelglow {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::StartsWith;
+using ::testing::ThrowsMessage;
+using Operation = bool (Chip::*)();
+
+// A controller that always has room for a byte and always has an answer, 0x2A.
+constexpr const char* kReady =
+    "chip = [{name = \"s\", kind = \"gpio-block\", base = 0x65, outputs = 0, inputs = 0x01},\n"
+    "{name = \"d\", kind = \"gpio-block\", base = 0x61, outputs = 0, inputs = 0x2A}]\n";
+
+std::string Controller(const std::string& more) {
+  return "chip = [{name = \"ec\", kind = \"embedded-controller\", take_us = 0, answer_us = 0" + more + "}]\n";
+}
+
+// Traffic on the ports 0x66 and 0x62, with "?" for a look at the status and "?*4096" for so many in a row.
+std::string Terse(const std::string& traffic) {
+  std::vector<std::string> words;
+  CDMUtil::Split(traffic, words, " ");
+  std::string text;
+  std::size_t looks = 0;
+  for (const std::string& word : words) {
+    const bool isLook = word.rfind("0066->", 0) == 0;
+    if (!isLook && looks > 0) {
+      text += looks == 1 ? "? " : "?*" + std::to_string(looks) + " ";
+    }
+    looks = isLook ? looks + 1 : 0;
+    text += isLook ? "" : word.substr(word.rfind("006", 0) == 0 ? 2 : 0) + " ";
+  }
+  return text + (looks == 0 ? "" : "?*" + std::to_string(looks) + " ");
+}
+
+class ChipBench : public BoardBench {
+ public:
+  explicit ChipBench(const std::string& hardware, const std::string& detect = "", const std::string& chip = "")
+      : BoardBench(hardware) {
+    Use(detect, chip);
+  }
+  void Use(const std::string& detect, const std::string& chip) {
+    SetFiles("[7D10]\n" + detect, "", chip);
+    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+  }
+  std::string Ec(const std::function<void()>& action) { return Terse(Traffic(action)); }
+};
+
+TEST(EcChips, ThePowerLampIsTheClassesOwnCommandsEachByteBehindAWait) {
+  ChipBench bench(kReady);
+  EcChip ec;
+  EcWpc8763Chip wpc;
+  EcIt8512Chip it8512;
+  EcIt8518Chip it8518;
+  SmscKbc1126Chip kbc;
+  const char* const kEcGreen = "? 66<-8E ? 62<-03 ? 66<-EE ? 62<-00 ";
+  const char* const kEcRed = "? 66<-8E ? 62<-04 ? 66<-EE ? 62<-00 ";
+  const char* const kEcOff = "? 66<-8E ? 62<-00 ? 66<-EE ? 62<-00 ";
+  const char* const kEcRestore = "? 66<-8E ? 62<-05 ? 66<-EE ? 62<-01 ";
+  const char* const kA2Green = "? 66<-A2 ? 62<-02 ? 66<-EE ? 62<-00 ";
+  const char* const kKbcGreen = "?*2 66<-81 ? 62<-3D ? 62<-F3 ";
+  struct Case {
+    Chip& chip;
+    const char* green;
+    const char* red;
+    const char* off;
+    const char* restore;
+  };
+  const Case kCases[] = {
+      {ec, kEcGreen, kEcRed, kEcOff, kEcRestore},
+      {wpc, kEcGreen, kEcRed, kEcOff, kEcRestore},
+      {it8512, "? 66<-C0 ", "? 66<-C2 ", "? 66<-C1 ? 66<-C3 ", "? 66<-C0 "},
+      {it8518, kA2Green, "? 66<-A2 ? 62<-01 ? 66<-EE ? 62<-00 ", "? 66<-A2 ? 62<-00 ? 66<-EE ? 62<-00 ", kA2Green},
+      {kbc, kKbcGreen, kEcRed, "?*2 66<-81 ? 62<-3D ? 62<-F0 ", kKbcGreen},
+  };
+  for (const Case& c : kCases) {
+    SCOPED_TRACE(c.chip.GetName());
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(c.chip.SavePowerLedState()); }), "");
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(c.chip.AssertPowerLedGreen()); }), c.green);
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(c.chip.AssertPowerLedRed()); }), c.red);
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(c.chip.DeassertPowerLed()); }), c.off);
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(c.chip.RestorePowerLedState()); }), c.restore);
+    bool red = false;
+    EXPECT_FALSE(c.chip.IsPowerLedRedSupported(red) || c.chip.BlinkPowerLedGreen() || c.chip.BlinkPowerLedRed());
+  }
+}
+
+TEST(EcChips, FansAndSensorsAreReadAndSetByTheClassesOwnAddresses) {
+  ChipBench bench(kReady);
+  EcChip ec;
+  EcWpc8763Chip wpc;
+  EcIt8512Chip it8512;
+  EcIt8518Chip it8518;
+  SmscKbc1126Chip kbc;
+  int value = 0;
+  const auto tach = [&](Chip& chip, int fan) {
+    const std::string traffic = bench.Traffic([&] { value = static_cast<int>(chip.ReadFanTach(fan, 0)); });
+    return Terse(traffic) + std::to_string(value);
+  };
+  const auto degrees = [&](Chip& chip, int zone) {
+    bool known = false;
+    const std::string traffic = bench.Traffic([&] { known = chip.ReadTemperature(zone, value); });
+    return Terse(traffic) + (known ? "" : "no ") + std::to_string(value);
+  };
+  const auto read = [](const std::string& address) {
+    return "? 66<-80 ? 62<-" + address + " ? 62->2A ";  // six requests, when the controller is ready
+  };
+  const std::string manual = "?*2 66<-C1 ? 62<-04 ? 62<-61 ? 62<-04 ";
+  EXPECT_EQ(tach(ec, 1), read("66") + read("67") + "?*2 66<-C1 ? 62<-04 ? 62<-61 ? 62<-00 10794");
+  EXPECT_EQ(tach(ec, 3), "65535");
+  EXPECT_EQ(tach(wpc, 2), read("B5") + "42");
+  EXPECT_EQ(tach(wpc, 0), "255");
+  EXPECT_EQ(tach(it8512, 2), read("8A") + read("8B") + "? 66<-71 ? 62<-01 ? 66<-71 ? 62<-02 10794");
+  EXPECT_EQ(tach(it8518, 1), read("54") + read("53") + "10794");
+  EXPECT_EQ(tach(it8518, 2), "65535");
+  EXPECT_EQ(tach(kbc, 2), "?*2 66<-80 ? 62<-3A ?*2 62->2A 42");
+  EXPECT_EQ(tach(kbc, 3), "255");
+  EXPECT_EQ(degrees(ec, 1), read("58") + "42");
+  EXPECT_EQ(degrees(ec, 2), "no 255");
+  EXPECT_EQ(degrees(it8512, 2), read("94") + "42");
+  EXPECT_EQ(degrees(it8518, 2), read("41") + "42");
+  EXPECT_EQ(degrees(kbc, 3), "?*2 66<-81 ? 62<-22 ? 62<-03 ?*2 66<-80 ? 62<-26 ?*2 62->2A 42");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(ec.SetFanPwm(1, 0x180) && !ec.SetFanPwm(3, 7)); }),
+            manual + "?*2 66<-C1 ? 62<-04 ? 62<-57 ? 62<-80 ");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(it8518.SetFanPwm(2, 7)); }),
+            manual + "?*2 66<-C1 ? 62<-04 ? 62<-DE ? 62<-07 ");
+  EXPECT_EQ(bench.Ec([&] { it8512.SetFanFullSpeed(2); }),
+            "? 66<-70 ? 62<-01 ? 66<-70 ? 62<-02 ? 66<-9B ? 62<-18 ? 62<-05 ? 62<-F0 ");
+  EXPECT_EQ(bench.Ec([&] {
+    kbc.SetFanPwmPercent(1, 25);
+    kbc.SetFanFullSpeed(2);
+    EXPECT_TRUE(kbc.SetManualFanMode(false) && kbc.SetManualFanMode(true) && kbc.SetManualFanMode(false));
+  }),
+            "?*2 66<-81 ? 62<-2F ? 62<-BF ?*2 66<-81 ? 62<-3A ? 62<-01 "
+            "?*2 66<-81 ? 62<-2F ? 62<-FF ?*2 66<-81 ? 62<-3A ? 62<-00 ");
+  EXPECT_EQ(kbc.TachToRpm(42, 1), 5851);
+  EXPECT_TRUE(kbc.ReadFanRpmRaw(2, value, 1) && value == 5849);
+  EXPECT_EQ(wpc.TachToRpm(42, 2), 16071);
+  EXPECT_EQ(ec.TachToRpm(0xFFFE, 1), 32);
+  EXPECT_EQ(ec.TachToRpm(0xFFFF, 1), 0);
+  // 0x2A: bits 1, 3 and 5 are set.
+  EXPECT_EQ(bench.Ec([&] { EXPECT_EQ(it8518.ReadLineByNames(0x21, "0x3", "2"), Chip::kAsserted); }),
+            "66<-21 62<-04 10ms 66<-21 62<-00 " + read("21"));
+  EXPECT_EQ(it8518.ReadLineByNames(0x21, "2", ""), Chip::kNotAsserted);
+}
+
+TEST(EcChips, ATachometersHighByteIsWhereTheClassHasIt) {
+  ChipBench bench(Controller(", memory = {\"66\" = 2, \"67\" = 1, \"88\" = 4, \"89\" = 3, \"54\" = 6, \"53\" = 5}"));
+  EXPECT_EQ(EcChip().ReadFanTach(1, 0), 0x0102U);
+  EXPECT_EQ(EcIt8512Chip().ReadFanTach(1, 0), 0x0304U);
+  EXPECT_EQ(EcIt8518Chip().ReadFanTach(1, 0), 0x0506U);
+}
+
+TEST(SmscKbc1126Chip, TheRunningAverageDropsTheLowestAndTheHighestOfTenSamples) {
+  ChipBench bench(Controller(", memory = {\"3A\" = 0x10}"), "chip.smsc_kbc1126.runningaverage=true\n", "");
+  SmscKbc1126Chip chip;
+  const platform::sim::Microseconds began = bench.machine.Time().Now();
+  for (const auto& [at_ms, value] : {std::pair{500U, 0x20U}, {8500U, 0xFFU}}) {
+    bench.machine.Time().At(began + at_ms * 1000, [&bench, changed = value] {
+      bench.machine.Hardware().WritePort(0x66, 1, 0x81);
+      bench.machine.Hardware().WritePort(0x62, 1, 0x3A);
+      bench.machine.Hardware().WritePort(0x62, 1, changed);
+    });
+  }
+  EXPECT_EQ(chip.ReadFanTach(2, 0), 0x20U);
+  EXPECT_EQ((bench.machine.Time().Now() - began) / 1'000'000, 10U);
+  EXPECT_THAT(bench.machine.Output(), HasSubstr("LogMessage 6 20000 \"Fan Tach for fan index: 2 = 0xff "));
+}
+
+TEST(SmscKbc1126Chip, AZoneWithoutSensorReads255) {
+  for (const auto& [answer, zone, degrees] :
+       {std::tuple{"0x00", 1, 255}, {"0x55", 2, 255}, {"0x55", 3, 0x55}, {"0x14", 5, 255}, {"0x14", 2, 0x14}}) {
+    ChipBench bench(Controller(std::string(", memory = {\"26\" = ") + answer + "}"));
+    int value = 0;
+    EXPECT_TRUE(SmscKbc1126Chip().ReadTemperature(zone, value));
+    EXPECT_EQ(value, degrees) << answer << zone;
+  }
+}
+
+// ---- the generic embedded controller
+
+constexpr const char* kGenericEc =
+    "[g_ec]\nec.set_pwm.cmd=0x44\npowerled.red.assert.sequence=0x1A2:0x01.0x03,0xEE:undef\n"
+    "powerled.green.assert.sequence=0xA2:2\npowerled.deassert.sequence=0xC1:undef,0xC3:undef\n"
+    "powerled.state.save.sequence=undef\npowerled.state.restore.sequence=0xEE:1\n"
+    "fan.manual_mode.set.sequence=0x70:1\nfan.manual_mode.reset.sequence=0x71:1\n"
+    "fan.1.tach.reg=0x0150\nfan.2.tach.reg=0x12345678\nfan.full_speed.data=200\n"
+    "temp.1.read.reg=0xFF\ntemp.2.read.reg=0x100\ntemp.1.limit.reg=0x134\n[g_ec_it8519]\nbase=g_ec\n";
+
+std::unique_ptr<GEcChip> GenericEc(ChipBench& bench, const std::string& settings = "") {
+  bench.Use(settings, kGenericEc);
+  auto chip = std::make_unique<GEcChip>();
+  chip->Initialize();
+  return chip;
+}
+
+TEST(GEcChip, EachOperationIsItsSequenceBehindOneWaitForTheOutputBuffer) {
+  ChipBench bench(kReady);
+  const std::unique_ptr<GEcChip> ec = GenericEc(bench);
+  const std::pair<Operation, const char*> kOperations[] = {
+      {&Chip::SavePowerLedState, ""},
+      {&Chip::AssertPowerLedGreen, "?*2 66<-A2 ? 62<-02 "},
+      {&Chip::AssertPowerLedRed, "?*2 66<-A2 ? 62<-01 ? 62<-03 ? 66<-EE "},
+      {&Chip::DeassertPowerLed, "?*2 66<-C1 ? 66<-C3 "},
+      {&Chip::RestorePowerLedState, "?*2 66<-EE ? 62<-01 "},
+  };
+  for (const auto& [operation, wanted] : kOperations) {
+    EXPECT_EQ(bench.Ec([&, run = operation] { EXPECT_TRUE(((*ec).*run)()); }), wanted);
+  }
+  bool red = false;
+  EXPECT_TRUE(ec->IsPowerLedRedSupported(red) && red);
+  EXPECT_FALSE(ec->BlinkPowerLedGreen() || ec->BlinkPowerLedRed());
+  EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(ec->SetManualFanMode(true) && ec->SetManualFanMode(false)); }),
+            "?*2 66<-70 ? 62<-01 ?*2 66<-71 ? 62<-01 ");
+  const auto slow = GenericEc(bench, "chip.g_ec.ec.ibf.sleeptime=3\nchip.g_ec.ec.obf.sleeptime=20\n");
+  EXPECT_EQ(bench.Ec([&] { slow->AssertPowerLedGreen(); }), "20ms ? 3ms ? 66<-A2 3ms ? 62<-02 ");
+}
+
+TEST(GEcChip, FansAndSensorsGoByTheRegistersOfTheFile) {
+  ChipBench bench(kReady);
+  const std::unique_ptr<GEcChip> ec = GenericEc(bench);
+  int value = 0;
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(ec->ReadEc(0x10), 0x2A); }),
+            "0066->01 0066<-80 0066->01 0062<-10 0066->01 0062->2A ");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_EQ(ec->ReadFanTach(1, 0), 0x2A2AU); }),
+            "? 66<-80 ? 62<-01 ? 62->2A ? 66<-80 ? 62<-50 ? 62->2A ");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_EQ(ec->ReadFanTach(2, 0), 0x2A2AU); }),
+            "? 66<-80 ? 62<-12 ? 62<-34 ? 62->2A ? 66<-80 ? 62<-56 ? 62<-78 ? 62->2A ");
+  EXPECT_EQ(bench.Ec([&] {
+    for (const int zone : {1, 2}) {
+      EXPECT_TRUE(ec->ReadTemperature(zone, value));
+    }
+    EXPECT_TRUE(ec->ReadLowLimitTemperature(1, value) && value == 0x2A);
+  }),
+            "? 66<-80 ? 62<-FF ? 62->2A ? 66<-80 ? 62<-01 ? 62<-00 ? 62->2A ? 66<-80 ? 62<-34 ? 62->2A ");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(ec->SetFanPwm(5, 10) && ec->SetFanPwm(0, 201)); }),
+            "?*2 66<-44 ? 62<-0A ?*2 66<-44 ? 62<-C8 ");
+  const auto two = GenericEc(bench, "chip.g_ec.fan.1.pwm.reg=0x34\nchip.g_ec.fan.2.pwm.reg=0x134\n");
+  EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(two->SetFanPwm(1, -1) && two->SetFanPwm(2, 1)); }),
+            "?*2 66<-44 ? 62<-34 ? 62<-00 ?*2 66<-44 ? 62<-01 ? 62<-34 ? 62<-01 ");
+  const std::pair<std::function<void()>, const char*> kOutOfRange[] = {
+      {[&] { ec->ReadFanTach(3, 0); }, "read fan tach: invalid fan index 3 (must be 1..2 +1)"},
+      {[&] { two->SetFanPwm(0, 1); }, "set fan PWM: invalid pwm index 0 (must be 1..2)"},
+      {[&] { ec->ReadTemperature(3, value); }, "read temperature: invalid zone 3 (must be 1..2 +1)"},
+      {[&] { ec->ReadLowLimitTemperature(2, value); },
+       "read low limit temperature: invalid zone 2 (must be 1..1 +1)"},
+      {[&] { GenericEc(bench, "chip.g_ec.ec.set_pwm.cmd=undef\n"); },
+       "chip.ini missing mandatory entry for EC: ec.set_pwm.cmd"},
+  };
+  for (const auto& [action, text] : kOutOfRange) {
+    EXPECT_THAT(action, ThrowsMessage<mblib_exception>(text));
+  }
+  EXPECT_EQ(ec->TachToRpm(1000, 1), 2156);
+  EXPECT_EQ(GEcIt8519Chip().TachToRpm(0xFFFE, 1), 0xFFFE);
+  EXPECT_EQ(GEcIt8519Chip().TachToRpm(0xFFFF, 1), 0);
+}
+
+TEST(EcChips, AHangingControllerIsGivenUpAfterItsLooksAndTheOperationGoesOn) {
+  struct Case {
+    const char* fault;
+    const char* read;   // of the generic class, which looks 4095 times
+    const char* green;  // of an older one, which looks 4096 times
+    int answer;
+    unsigned requests;
+  };
+  const Case kCases[] = {
+      {"", "? 66<-80 ? 62<-10 ? 62->07 ", "?*4097 66<-81 ? 62<-3D ? 62<-F3 ", 7, 6 + 4102},
+      {", fault = \"stuck-obf\"", "? 66<-80 ? 62<-10 ?*4095 62->00 ", "?*4097 66<-81 ? 62<-3D ? 62<-F3 ", 0,
+       4100 + 4102},
+      {", fault = \"stuck-ibf\"", "?*4095 66<-80 ?*4095 62<-10 ?*4095 62->00 ",
+       "?*8192 66<-81 ?*4096 62<-3D ?*4096 62<-F3 ", 0, 12288 + 16387},
+  };
+  for (const Case& c : kCases) {
+    ChipBench bench(Controller(c.fault + std::string(", memory = {\"10\" = 7}")));
+    const std::unique_ptr<GEcChip> chip = GenericEc(bench);
+    SmscKbc1126Chip older;
+    if (c.requests > 20'000) {
+      bench.machine.Hardware().WritePort(0x66, 1, 0);  // what the firmware hangs on
+    }
+    constexpr unsigned kRequest_us = 2;
+    const platform::sim::Microseconds began = bench.machine.Time().Now();
+    EXPECT_EQ(bench.Ec([&] { EXPECT_EQ(chip->ReadEc(0x10), c.answer); }), c.read);
+    EXPECT_EQ(bench.Ec([&] { EXPECT_TRUE(older.AssertPowerLedGreen()); }), c.green);
+    EXPECT_EQ(bench.machine.Time().Now() - began, c.requests * kRequest_us);
+  }
+}
+
+// ---- the mailbox
+
+constexpr const char* kMailbox =
+    "chip = [{name = \"m\", kind = \"mailbox-controller\", step_us = 0, configuration_port = 0x4E,"
+    " memory = {\"10\" = 0x5C, \"20\" = 0x3D, \"4000A002\" = 0xA5, \"4000A00F\" = 0x2C}}]\n";
+
+constexpr const char* kMailboxRead = "0200<-82 0201<-01 50ms 0200<-86 0201->";  // then the byte and 50 ms
+constexpr const char* kMailboxWritten = " 50ms 0200<-82 0201<-02 50ms ";        // behind the byte
+
+TEST(SmscMec1322Chip, LampsAreListsOfPortsAndTheirMultiplexersGoThroughTheMailbox) {
+  ChipBench bench(
+      kMailbox, "chip.smsc_mec1322.data=box\ntest.panelglow.waittime=7\n",
+      "[box]\npowerled.green.assert.sequence=0xA0:1,0xA1:2\npowerled.green.deassert.sequence=0xA0:0\n"
+      "powerled.green.savemux.sequence=0x200:0x84,0x201:0x10\npowerled.green.enablemux.sequence=0xB1:4\n"
+      "chargeled.green.assert.sequence=0xC0:1\nchargeled.green.deassert.sequence=0xC0:0\n"
+      "chargeled.green.savemux.sequence=0x200:0x84,0x201:0x10\nchargeled.green.enablemux.sequence=0xC1:5\n"
+      "chargeled.red.assert.sequence=0xD0:1\nchargeled.red.deassert.sequence=undef\n"
+      "chargeled.red.savemux.sequence=0x200:0x84,0x201:0x20\nchargeled.red.enablemux.sequence=0xD1:6\n");
+  std::unique_ptr<SmscMec1322Chip> chip;
+  EXPECT_THAT(bench.Traffic([&] { chip = std::make_unique<SmscMec1322Chip>(); }),
+              StartsWith("002E<-55 002F->FF 004E<-55 "));
+  const std::string at10 = "0200<-84 7ms 0201<-10 7ms ";
+  const std::string at20 = "0200<-84 7ms 0201<-20 7ms ";
+  const std::string read = kMailboxRead;
+  const std::string write = "0200<-86 0201<-";
+  const std::string written = kMailboxWritten;
+  const std::tuple<Operation, bool, std::string> kOperations[] = {
+      {&Chip::SavePowerLedState, true, at10 + read + "5C 50ms 00B1<-04 7ms "},
+      {&Chip::AssertPowerLedGreen, true, "00A0<-01 7ms 00A1<-02 7ms "},
+      {&Chip::DeassertPowerLed, true, "00A0<-00 7ms "},
+      {&Chip::RestorePowerLedState, true, at10 + write + "5C" + written + "00A0<-01 7ms 00A1<-02 7ms "},
+      {&Chip::SaveChargeLedState, true,
+       at20 + read + "3D 50ms 00D1<-06 7ms " + at10 + read + "5C 50ms 00C1<-05 7ms "},
+      {&Chip::AssertChargeLedWhite, true, "00C0<-01 7ms "},
+      {&Chip::DeassertChargeLedWhite, true, "00C0<-00 7ms "},
+      {&Chip::AssertChargeLedRed, true, "00D0<-01 7ms "},
+      {&Chip::DeassertChargeLedRed, false, ""},
+      {&Chip::RestoreChargeLedState, true, at10 + write + "5C" + written + at20 + write + "3D" + written},
+  };
+  for (const auto& [operation, done, traffic] : kOperations) {
+    EXPECT_EQ(bench.Traffic([&, run = operation, wanted = done] { EXPECT_EQ((*chip.*run)(), wanted); }), traffic);
+  }
+}
+
+TEST(SmscMec1322Chip, TheFanIsBehindAPageOfTheMailbox) {
+  const auto at = [](const std::string& low) {
+    return "0200<-85 0201<-40 50ms 0200<-84 0201<-00 50ms 0200<-82 0201<-1D 50ms "
+           "0200<-85 0201<-A0 50ms 0200<-84 0201<-" +
+           low + " 50ms ";
+  };
+  const std::string read = kMailboxRead;
+  const std::string written = kMailboxWritten;
+  ChipBench bench(kMailbox);
+  SmscMec1322Chip chip;
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.ReadFanTach(1, 0), 0x2CU); }), at("0F") + read + "2C 50ms ");
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.SetFanPwm(1, 0x80) && !chip.SetFanPwm(2, 0x80)); }),
+            at("02") + read + "A5 50ms " + at("02") + "0200<-86 0201<-25" + written + at("00") + "0200<-86 0201<-80" +
+                written);
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.SetManualFanMode(false) && chip.SetManualFanMode(false)); }),
+            at("02") + read + "25 50ms " + at("02") + "0200<-86 0201<-A5" + written);
+  EXPECT_EQ(chip.TachToRpm(0x2C, 1), 2792);
+}
+
+TEST(SmscMec1322Chip, AHangingMailboxIsAskedElevenTimesAndAMalformedListIsRefused) {
+  ChipBench bench(
+      "chip = [{name = \"m\", kind = \"mailbox-controller\", fault = \"stuck-busy\"},\n"
+      "{name = \"c\", kind = \"gpio-block\", base = 0x2E, outputs = 0, inputs = 0x00}]\n");
+  std::unique_ptr<SmscMec1322Chip> chip;
+  EXPECT_THAT(bench.Traffic([&] { chip = std::make_unique<SmscMec1322Chip>(); }),
+              StartsWith("002E<-55 002F->00 002E<-55 "));
+  const platform::sim::Microseconds began = bench.machine.Time().Now();
+  EXPECT_EQ(chip->ReadFanTach(1, 0), 0x48U);
+  EXPECT_EQ((bench.machine.Time().Now() - began) / 1000, 11U * 350);
+  bench.Use("", "[smsc_mec1322]\nchargeled.red.savemux.sequence=0xA5D\n");
+  EXPECT_THAT([] { SmscMec1322Chip(); },
+              ThrowsMessage<mblib_exception>("malformed sequence entry: '0xA5D'. should be: 'cmd:data[.data]*,...'"));
+}
+
+// ---- the audio codec
+
+constexpr const char* kVerbs =
+    "[g_codec]\ncodecgpio.state.set.sequence=0x00171600 0x00171700,0x00171500\n"
+    "codecgpio.state.save.sequence=0x001F1600,0x001F1700,0x001F1500\n"
+    "codecgpio.state.restore.sequence=0x00271600,0x00271700,0x00271500\n";
+constexpr const char* kCodec = "chip = [{name = \"codec\", kind = \"hda-codec\", base = 0xFE0F0000, enable = 5}]\n";
+
+TEST(GCodecChip, AVerbIsSentThroughTheImmediateCommandRegisters) {
+  ChipBench bench(kCodec, "chip.codec.hdabar=0xFE0F000F\n", kVerbs);
+  GCodecChip chip;
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(0x001F1600), 5U); }),
+            "FE0F0060<-00000000 FE0F0068->0000 FE0F0060<-00161F00 10ms FE0F0068<-0100 FE0F0068->0100 "
+            "10ms FE0F0068->0200 FE0F0064->05000000 ");
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(0x201F1600), 0U); }),  // nobody there
+            "FE0F0060<-00000000 FE0F0068->0200 FE0F0068<-0200 FE0F0060<-00161F20 10ms FE0F0068<-0100 "
+            "FE0F0068->0100 10ms FE0F0068->0000 ");
+}
+
+TEST(GCodecChip, ABusyControllerCostsFourMoreLooksAtTheStatusInAll) {
+  const std::string busy = "10ms FE0F0068->0100 ";
+  const std::string begin = "FE0F0060<-00000000 FE0F0068->0100 ";
+  // Memory in the controller's place: its start bit stays as it is written.
+  ChipBench bench("", "chip.codec.hdabar=0xFE0F0000\n", kVerbs);
+  GCodecChip chip;
+  bench.machine.Hardware().WriteMemory(0xFE0F0068, 1);
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(1), 0U); }), begin + busy + busy + busy + busy);
+  bench.machine.Time().At(bench.machine.Time().Now() + 25'000,
+                          [&] { bench.machine.Hardware().WriteMemory(0xFE0F0068, 0); });
+  EXPECT_EQ(
+      bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(1), 0U); }),
+      begin + busy + busy + "10ms FE0F0068->0000 FE0F0060<-01000000 10ms FE0F0068<-0100 FE0F0068->0100 " + busy);
+}
+
+TEST(GCodecChip, WithoutADriverALampTakesItsTimeAndDoesNothing) {
+  ChipBench bench("driver = {present = false}\n", "chip.codec.hdabar=0xFE0F0000\n", kVerbs);
+  GCodecChip chip;
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.SaveSpeakerLedState() && chip.AssertSpeakerLed()); }), "70ms ");
+}
+
+TEST(GCodecChip, ALampIsThreeVerbsWithTheSavedPinsAndItsOwn) {
+  // Registers that never change: always idle, always with the answer 0xABCD0004.
+  ChipBench bench(
+      "chip = [{name = \"hda\", kind = \"memory-registers\", base = 0xFE0F0000,"
+      " initial = [0, 0, 0, 0, 0x04, 0x00, 0xCD, 0xAB, 2, 0]}]\n",
+      "chip.codec.hdabar=0xFE0F0000\nchip.g_codec.codec.icw.reg=0\nchip.g_codec.codec.irr.reg=4\n"
+      "chip.g_codec.codec.ics.reg=8\n",
+      kVerbs);
+  bench.machine.Hardware().IgnoreWrites("hda", 0xFE0F0008);
+  GCodecChip chip;
+  // The verbs, low byte first, and the waits.
+  const auto verbs = [&](Operation operation) {
+    std::vector<std::string> words;
+    CDMUtil::Split(bench.Traffic([&] { EXPECT_TRUE((chip.*operation)()); }), words, " ");
+    std::string text;
+    for (const std::string& word : words) {
+      const bool isVerb = word.rfind("FE0F0000<-", 0) == 0 && word != "FE0F0000<-00000000";
+      text += isVerb ? word.substr(10) + " " : word.find("ms") != std::string::npos ? word + " " : "";
+    }
+    return text;
+  };
+  std::string blink = "0C161700 10ms 0C171700 10ms ";
+  for (int round = 0; round < 51; ++round) {
+    blink += round % 2 == 0 ? "04151700 10ms 500ms " : "0C151700 10ms 500ms ";
+  }
+  const std::pair<Operation, std::string> kOperations[] = {
+      {&Chip::SaveSpeakerLedState, "00161F00 10ms 00171F00 10ms 00151F00 10ms "},
+      {&Chip::AssertSpeakerLed, "05161700 10ms 05171700 10ms 04151700 10ms 10ms "},
+      {&Chip::DeassertSpeakerLed, "05161700 10ms 05171700 10ms 05151700 10ms 10ms "},
+      {&Chip::AssertMicrophoneLed, "0C161700 10ms 0C171700 10ms 04151700 10ms 10ms "},
+      {&Chip::DeassertMicrophoneLed, "0C161700 10ms 0C171700 10ms 0C151700 10ms 10ms "},
+      {&Chip::BlinkMicrophoneLed, blink},
+      {&Chip::RestoreSpeakerLedState, "0416EFAB 10ms 0417EFAB 10ms 0415EFAB 10ms "},
+  };
+  for (const auto& [operation, traffic] : kOperations) {
+    EXPECT_EQ(verbs(operation), traffic);
+  }
+}
+
+TEST(GCodecChip, AListWithoutExactlyThreeVerbsServesNoLamp) {
+  for (const std::string list : {"0x1,0x2", "1,2,3,4", "undef"}) {
+    ChipBench bench(kCodec, "chip.codec.hdabar=0xFE0F0000\n",
+                    "[g_codec]\ncodecgpio.state.set.sequence=" + list + "\ncodecgpio.state.save.sequence=" + list +
+                        "\ncodecgpio.state.restore.sequence=" + list + "\n");
+    GCodecChip chip;
+    EXPECT_EQ(bench.Traffic([&] {
+      EXPECT_FALSE(chip.SaveSpeakerLedState() || chip.RestoreSpeakerLedState() || chip.AssertSpeakerLed() ||
+                   chip.DeassertSpeakerLed() || chip.AssertMicrophoneLed() || chip.DeassertMicrophoneLed() ||
+                   chip.BlinkSpeakerLed() || chip.BlinkMicrophoneLed());
+    }),
+              "")
+        << list;
+  }
+}
+
+TEST(GCodecChip, ItsControllerIsFoundByPlaceOrByTheFilesBase) {
+  const auto base = [](const std::string& settings) {
+    ChipBench bench("pci = [{device = 0x1B, function = 2, registers = {\"10\" = 0xF7F10004, \"14\" = 0}}]\n",
+                    settings, "");
+    GCodecChip chip;
+    return bench.Traffic([&] { chip.SendVerb(1); }).substr(0, 8);
+  };
+  EXPECT_EQ(base("chip.codec.pciloc=0x001B0210\nchip.codec.hdabar=0xFE0F0000\n"), "F7F10060");
+  EXPECT_EQ(base("chip.codec.pciloc=0x001B0110\nchip.codec.hdabar=0xF0000000\n"), "F0000060");  // nothing there
+  for (const char* settings : {"", "chip.codec.hdabar=15\n", "chip.codec.pciloc=0x001B0110\n"}) {
+    EXPECT_THAT([&] { base(settings); },
+                ThrowsMessage<mblib_exception>("mbdetec.ini missing mandatory entry for codec: chip.codec.hdabar"));
+  }
+}
+
+// ---- the firmware's call
+
+constexpr const char* kFirmware =
+    "[firmware_call]\nheader = [2, 9]\nradio = [{number = 1, offset = 6, on = true}, {number = 2, offset = 18, on ="
+    " false}]\nfan = [{speed = 24, duty = 0x60}, {speed = 0, duty = 0x61}]\ntemperatures = [41, 38]\n";
+
+TEST(CaslChip, TheRadiosGoBackToWhatTheListedDevicesWere) {
+  const std::pair<std::string, bool> kDevices[] = {
+      {"6", true}, {"18, 6", true}, {"18", false}, {"undef", false}, {"4000", false}};
+  for (const auto& [devices, on] : kDevices) {
+    ChipBench bench(kFirmware, "", "[casl]\nwireless.devices.buffer=" + devices + "\n");
+    CaslChip chip;
+    EXPECT_TRUE(chip.SaveWirelessLedState());  // the first operation reads the keys and the header, too
+    EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.DeassertWirelessLed()); }), "2ms ");
+    EXPECT_THAT(bench.machine.HardwareState(), HasSubstr("radio 01 = off\nradio 02 = off\n"));
+    EXPECT_TRUE(chip.AssertWirelessLed());
+    EXPECT_THAT(bench.machine.HardwareState(), HasSubstr("radio 01 = on\nradio 02 = on\n"));
+    EXPECT_TRUE(chip.RestoreWirelessLedState());
+    EXPECT_THAT(bench.machine.HardwareState(), HasSubstr(on ? "radio 01 = on" : "radio 01 = off")) << devices;
+  }
+}
+
+TEST(CaslChip, ALatchedReadSwitchesTheRadiosWhenTheFirstDeviceIsNotAsWanted) {
+  ChipBench bench(kFirmware, "", "[casl]\nwireless.devices.buffer=6\nwireless.powercontrol=1\n");
+  CaslChip chip;
+  const std::tuple<int, bool, const char*> kSteps[] = {
+      {1, false, "on"}, {0, true, "off"}, {0, false, "off"}, {2, true, "off"}, {1, true, "on"}};
+  for (const auto& [wanted, isChanged, state] : kSteps) {
+    bool changed = !isChanged;
+    EXPECT_TRUE(chip.ReadLatchedPort(0, wanted, changed));
+    EXPECT_EQ(changed, isChanged) << wanted;
+    EXPECT_THAT(bench.machine.HardwareState(), HasSubstr(std::string("radio 01 = ") + state + "\nradio 02 = off\n"));
+  }
+}
+
+TEST(CaslChip, FansAndTemperaturesAreItemsOfCountedRecords) {
+  ChipBench bench(kFirmware);
+  CaslChip chip;
+  int value = 7;
+  EXPECT_FALSE(chip.ReadFanRpm(1, value, 100) || chip.ReadFanRpm(2, value, 100) || value != 7);
+  EXPECT_TRUE(chip.ReadFanRpm(0, value, 100) && value == 2400);
+  EXPECT_TRUE(chip.ReadVirtualTemperature(1, false, value) && value == 38);
+  EXPECT_FALSE(chip.ReadVirtualTemperature(3, false, value));
+  const std::pair<std::function<bool()>, const char*> kDuties[] = {
+      {[&] { return chip.SetFanPwm(1, 300); }, "fan 0 duty = 60\nfan 1 duty = FE\n"},
+      {[&] { return chip.SetFanPwm(0, -3); }, "fan 0 duty = 01\nfan 1 duty = FE\n"},
+      {[&] { return chip.SetFanPwmPercent(1, 50); }, "fan 0 duty = 01\nfan 1 duty = 7F\n"},
+      {[&] { return chip.SetFanFullSpeed(0); }, "fan 0 duty = FE\nfan 1 duty = 7F\n"}};
+  for (const auto& [set, duties] : kDuties) {
+    EXPECT_TRUE(set());
+    EXPECT_THAT(bench.machine.HardwareState(), HasSubstr(duties));
+  }
+}
+
+TEST(CaslChip, AFailingCallSaysAtWhichStep) {
+  const std::pair<const char*, const char*> kFaults[] = {{"wrong-signature", "tmbWMI call (1,27)"},
+                                                         {"short-data", "WMI call Return Size Discovery"},
+                                                         {"get-method", "WMI call GetMethod"},
+                                                         {"get-class", "WMI call Get tmbBIntM"},
+                                                         {"spawn-parameters", "WMI call Spawn Parameters"},
+                                                         {"get-input-class", "WMI call Get tmbBDataIn"},
+                                                         {"spawn-input", "WMI call Spawn tmbBDataIn"},
+                                                         {"populate-input", "WMI call Populate tmbBDataIn"},
+                                                         {"put-input", "WMI call Put tmbBDataIn"},
+                                                         {"execute", "WMI call Execute Method"},
+                                                         {"get-output", "WMI call Get OutData"},
+                                                         {"query-output", "WMI call Query OutData"},
+                                                         {"", "WMI call tmbBIntM Query"}};  // no such interface
+  for (const auto& [fault, text] : kFaults) {
+    ChipBench bench(*fault == '\0' ? "" : kFirmware + ("fault = \"" + std::string(fault) + "\"\n"));
+    try {
+      CaslChip().AssertWirelessLed();
+      ADD_FAILURE() << text;
+    } catch (const CDMException& failure) {
+      failure.Report();
+    }
+    EXPECT_EQ(bench.machine.Output(),
+              "LogMessage 8 995174 \"" + std::string(text) + " failed.\" \"\"\nTestFailed 995174 \"\"\n");
+  }
+}
+
+}  // namespace
+}  // namespace panelglow
