@@ -20,6 +20,7 @@
 #include "harness/DiagnosticManager.h"
 #include "ledtests/CustomLEDTest.h"
 #include "platform/posix/LazyDrawing.h"
+#include "platform/sim/SimScreen.h"
 #include "platform/sim/Simulation.h"
 #include "prompts/PromptState.h"
 
@@ -93,7 +94,7 @@ class Installation {
 
 // The visible windows of a moment, moved so that the upper left corner of them all is at the margin.
 desktop::Scene Cropped(desktop::Scene scene) {
-  Rectangle all{scene.width, scene.height, 0, 0};
+  Rectangle all = scene.windows.empty() ? Rectangle{} : scene.windows.front().clip;
   for (const desktop::SceneWindow& window : scene.windows) {
     all = {std::min(all.left, window.clip.left), std::min(all.top, window.clip.top),
            std::max(all.right, window.clip.right), std::max(all.bottom, window.clip.bottom)};
@@ -161,28 +162,37 @@ class Studio {
     std::printf("%s\n", path.c_str());
   }
 
-  /// Runs the LED test, confirms its prompts, and notes the dialog.
+  /// Runs the LED test, confirms its prompts, and notes the dialog, and the front panel while a LED of the test is
+  /// lit.
   void TakeDialog(const std::vector<const char*>& arguments) {
     panelglow::DiagnosticManager manager(static_cast<int>(arguments.size()), arguments.data(), "", "");
     panelglow::BoardDevio().LoadDriver();
     panelglow::g_objDriverObjectCustom.LoadDriver();
     static auto* const test = new panelglow::CustomLEDTest;  // lives to the end of the process, as in the product
     manager.RegisterSubtest("CustomLEDTest", test);
-    for (unsigned second = 1; second < 60; ++second) {
-      sim_.Time().At(sim::Microseconds{second} * 1'000'000, [this] {
+    std::vector<desktop::Scene> panel;
+    for (unsigned tenth = 10; tenth < 600; ++tenth) {
+      sim_.Time().At(sim::Microseconds{tenth} * 100'000, [&, tenth] {
         constexpr std::size_t kDialogsControls = 50;
-        const WindowHandle top = Top();
-        if (sim_.Windows().Children(top).size() < kDialogsControls) {
-          End();
-        } else if (scenes_.empty()) {
+        if (sim_.Windows().Children(Top()).size() < kDialogsControls) {
+          tenth % 10 == 0 ? End() : void();
+        } else if (panel.empty() && !sim_.Panel().TimeLine().empty() && sim_.Panel().TimeLine().back().lit) {
+          panel.push_back(Cropped(sim::SimScreen::PanelScene(sim_.Panel(), "Simulated desktop")));
           scenes_.push_back(Cropped(Scene()));
         }
       });
     }
     manager.Run();
     if (scenes_.empty()) {
-      throw std::runtime_error("the test showed no dialog:\n" + sim_.Output());
+      throw std::runtime_error("the test showed no dialog in which a LED was lit:\n" + sim_.Output());
     }
+    panel_ = std::move(panel);
+  }
+
+  /// The front panel of the last test.
+  void SavePanel(const std::string& name) {
+    scenes_ = panel_;
+    Save(name);
   }
 
   WindowHandle Top() {
@@ -208,6 +218,7 @@ class Studio {
   sim::Simulation& sim_;
   panelglow::platform::posix::LazyDrawing drawing_;
   std::vector<desktop::Scene> scenes_;
+  std::vector<desktop::Scene> panel_;
 };
 
 constexpr unsigned kButtonSets = 6;
@@ -314,6 +325,9 @@ void TakeAll(const fs::path& folder, const std::string& locale) {
     Studio studio(folder, machine);
     studio.TakeDialog(arguments);
     studio.Save(english ? "dialog" : "dialog-" + locale.substr(0, 2));
+    if (english) {
+      studio.SavePanel("front-panel");
+    }
   }
   sim::Simulation machine("", options);
   Studio studio(folder, machine);
