@@ -342,6 +342,7 @@ std::intptr_t PromptWindow::Handle(const platform::Message& received) {
       desktop_.SetActiveWindow(received.window);
       break;
     case message::kGetMinMaxInfo: {
+      // A message carries the address as a number. NOLINTNEXTLINE(performance-no-int-to-ptr)
       auto* limits = reinterpret_cast<platform::TrackLimits*>(received.lParam);
       *limits = {kFormWidth, kImageFormHeight, desktop_.ScreenWidth(), desktop_.ScreenHeight()};
       break;

@@ -80,7 +80,7 @@ IniReader::Result IniReader::LookUp(const Sources& from, const std::string& key)
 
 IniReader::Result IniReader::LookUpChip(const std::string& chipSection, const std::string& key) {
   const Sources from = GetSources();
-  const Result layered = LookUp(from, "chip." + chipSection + "." + key);
+  Result layered = LookUp(from, "chip." + chipSection + "." + key);
   if (layered.status != kNotFound || !from.chipIniPresent) {
     return layered;
   }

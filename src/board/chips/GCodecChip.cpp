@@ -38,7 +38,7 @@ GCodecChip::GCodecChip() : GChip("g_codec") {
   icsReg = static_cast<std::uint16_t>(ReadChipInt(section, "codec.ics.reg", icsReg));
   speakerBit = static_cast<std::uint16_t>(ReadChipInt(section, "speakerled.gpio.ldn", speakerBit));
   microphoneBit = static_cast<std::uint16_t>(ReadChipInt(section, "microphoneled.gpio.ldn", microphoneBit));
-  LoadVerbLists();
+  GCodecChip::LoadVerbLists();
 }
 
 // By the controller's PCI function (bus, device, function and register in one number), or as the file says.
@@ -63,9 +63,9 @@ std::uint32_t GCodecChip::FindController() {
 }
 
 void GCodecChip::LoadVerbLists() {
-  ParseVerbList(ReadChipValue(section, "codecgpio.state.set.sequence", ""), stateSetVerbs);
-  ParseVerbList(ReadChipValue(section, "codecgpio.state.save.sequence", ""), stateSaveVerbs);
-  ParseVerbList(ReadChipValue(section, "codecgpio.state.restore.sequence", ""), stateRestoreVerbs);
+  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.set.sequence", ""), stateSetVerbs);
+  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.save.sequence", ""), stateSaveVerbs);
+  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.restore.sequence", ""), stateRestoreVerbs);
 }
 
 void GCodecChip::ParseVerbList(const std::string& text, std::vector<std::uint32_t>& list) {

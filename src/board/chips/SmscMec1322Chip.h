@@ -21,6 +21,7 @@ class SmscMec1322Chip : public EcChip {
   int TachToRpm(std::uint32_t raw, int multiplier) override;
   bool SetManualFanMode(bool on) override;
   bool SetFanPwm(int fan, int value) override;
+  // As a chip without zones: those of the base are another part's. NOLINTNEXTLINE(bugprone-parent-virtual-call)
   bool ReadTemperature(int zone, int& value) override { return Chip::ReadTemperature(zone, value); }
 
   bool AssertPowerLedGreen() override { return RunList(kPowerGreenAssert); }

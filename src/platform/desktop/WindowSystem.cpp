@@ -204,6 +204,10 @@ void WindowSystem::UnregisterWindowClass(std::string_view name) {
 }
 
 WindowHandle WindowSystem::CreateWindow(const WindowRequest& request) {
+  if (!HasScreen()) {
+    host_.Spend();
+    return 0;
+  }
   const WindowKind kind = KindOf(request.className, request.style);
   const auto found = classes_.find(request.className);
   if (kind == WindowKind::kPlain && found == classes_.end()) {
@@ -721,6 +725,10 @@ void WindowSystem::PostQuit() { OwnQueue().quit = true; }
 
 bool WindowSystem::GetMessage(Message& message) {
   host_.Spend();
+  if (!HasScreen()) {
+    message = {0, message::kQuit, 0, 0};
+    return false;
+  }
   const std::uint32_t thread = host_.CurrentThread();
   Queue& queue = QueueOf(thread);
   for (;;) {
@@ -1213,29 +1221,25 @@ bool WindowSystem::IsDialogMessage(WindowHandle dialog, const Message& message) 
 // ---- the screen's side
 
 WindowHandle WindowSystem::WindowAt(int x, int y) const {
-  for (auto top = order_.rbegin(); top != order_.rend(); ++top) {
-    const Window* window = Find(*top);
-    if (!window->visible || !ScreenRectangle(*top).Contains(x, y)) {
-      continue;
-    }
-    // The deepest child that takes clicks; labels and disabled controls leave them to their parent.
-    bool deeper = true;
-    while (deeper) {
-      deeper = false;
-      for (auto child = window->children.rbegin(); child != window->children.rend(); ++child) {
-        const Window* candidate = Find(*child);
-        const bool takesClicks = candidate->kind == WindowKind::kPlain || candidate->kind == WindowKind::kButton ||
-                                 candidate->kind == WindowKind::kEdit || candidate->kind == WindowKind::kScrollBar;
-        if (candidate->visible && candidate->enabled && takesClicks && ScreenRectangle(*child).Contains(x, y)) {
-          window = candidate;
-          deeper = true;
-          break;
-        }
-      }
-    }
-    return window->handle;
+  const auto isThere = [&](WindowHandle window) {
+    return Find(window)->visible && ScreenRectangle(window).Contains(x, y);
+  };
+  // Labels and disabled controls leave clicks to their parent.
+  const auto takesClick = [&](WindowHandle window) {
+    const WindowKind kind = Find(window)->kind;
+    return Find(window)->enabled && isThere(window) &&
+           (kind == WindowKind::kPlain || kind == WindowKind::kButton || kind == WindowKind::kEdit ||
+            kind == WindowKind::kScrollBar);
+  };
+  const auto top = std::find_if(order_.rbegin(), order_.rend(), isThere);
+  WindowHandle deepest = top == order_.rend() ? 0 : *top;
+  for (bool deeper = deepest != 0; deeper;) {
+    const std::vector<WindowHandle>& children = Find(deepest)->children;
+    const auto child = std::find_if(children.rbegin(), children.rend(), takesClick);
+    deeper = child != children.rend();
+    deepest = deeper ? *child : deepest;
   }
-  return 0;
+  return deepest;
 }
 
 void WindowSystem::Click(int x, int y) {

@@ -22,6 +22,7 @@ class WindowSystem : public Desktop {
   /// Our own key code: Tab with the Shift key.
   static constexpr std::uint32_t kShiftTabKey = 0x0109;
 
+  /// A screen without pixels is no screen: no window can be made on it, and every message loop ends at once.
   WindowSystem(WindowHost& host, int screenWidth, int screenHeight);
   ~WindowSystem() override;
 
@@ -137,6 +138,7 @@ class WindowSystem : public Desktop {
   };
   class PaintCanvas;
 
+  [[nodiscard]] bool HasScreen() const { return screenWidth_ > 0; }
   [[nodiscard]] Window* Find(WindowHandle window) const;
   Queue& QueueOf(std::uint32_t thread);
   Queue& OwnQueue() { return QueueOf(host_.CurrentThread()); }

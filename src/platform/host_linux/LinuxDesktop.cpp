@@ -27,6 +27,7 @@ void LinuxDesktop::Open() {
   if (!screen_) {
     const std::string line = "panelglow-diags: windows cannot be shown: " + error + "\n";
     std::fputs(line.c_str(), stderr);
+    windows_ = std::make_unique<desktop::WindowSystem>(host_, 0, 0);
     return;
   }
   windows_ = std::make_unique<desktop::WindowSystem>(host_, screen_->Width(), screen_->Height());
@@ -44,8 +45,9 @@ void LinuxDesktop::Open() {
 template <class Use>
 auto LinuxDesktop::With(Use use) {
   std::call_once(once_, [this] { Open(); });
-  if (!windows_) {
-    return use(static_cast<Desktop&>(none_));
+  if (!screen_) {
+    const LinuxWindowHost::Guard guard(host_);
+    return use(static_cast<Desktop&>(*windows_));
   }
   CurrentThread::AtEnd(this, [this] {
     const LinuxWindowHost::Guard guard(host_);

@@ -10,7 +10,6 @@
 #include "platform/desktop/Screen.h"
 #include "platform/desktop/WindowSystem.h"
 #include "platform/host_linux/LinuxWindowHost.h"
-#include "platform/host_linux/NoDesktop.h"
 #include "platform/posix/LazyDrawing.h"
 
 namespace panelglow::platform::host_linux {
@@ -72,7 +71,7 @@ class LinuxDesktop : public Desktop {
   ScrollState Scroll(WindowHandle bar) override;
 
  private:
-  /// Calls `use` with the window logic under its lock, or with the desktop that has no display.
+  /// Calls `use` with the window logic under its lock.
   template <class Use>
   auto With(Use use);
 
@@ -83,10 +82,9 @@ class LinuxDesktop : public Desktop {
 
   posix::LazyDrawing& drawing_;
   std::once_flag once_;
-  NoDesktop none_;
   LinuxWindowHost host_;
-  std::unique_ptr<desktop::Screen> screen_;         // the screen thread's, once that runs
-  std::unique_ptr<desktop::WindowSystem> windows_;  // null: no display
+  std::unique_ptr<desktop::Screen> screen_;         // the screen thread's, once that runs; null: no display
+  std::unique_ptr<desktop::WindowSystem> windows_;  // made by the first call
   int changed_ = -1;                                // event: the scene may have changed
   std::uint64_t noted_ = 0;                         // revision that the screen thread was told of; under the lock
 };
