@@ -11,8 +11,6 @@
 #include <cstring>
 #include <stdexcept>
 
-extern "C" char** environ;
-
 namespace panelglow::controller {
 
 namespace {
@@ -36,6 +34,7 @@ void PassSignalsOn() {
 
 std::vector<char*> Pointers(std::vector<std::string>& texts) {
   std::vector<char*> pointers;
+  pointers.reserve(texts.size() + 1);
   for (std::string& text : texts) {
     pointers.push_back(text.data());
   }

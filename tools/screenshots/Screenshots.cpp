@@ -164,7 +164,7 @@ class Studio {
 
   /// Runs the LED test, confirms its prompts, and notes the dialog, and the front panel while a LED of the test is
   /// lit.
-  void TakeDialog(const std::vector<const char*>& arguments) {
+  void TakeDialog(const std::vector<const char*>& arguments, const std::string& machineName) {
     panelglow::DiagnosticManager manager(static_cast<int>(arguments.size()), arguments.data(), "", "");
     panelglow::BoardDevio().LoadDriver();
     panelglow::g_objDriverObjectCustom.LoadDriver();
@@ -177,7 +177,7 @@ class Studio {
         if (sim_.Windows().Children(Top()).size() < kDialogsControls) {
           tenth % 10 == 0 ? End() : void();
         } else if (panel.empty() && !sim_.Panel().TimeLine().empty() && sim_.Panel().TimeLine().back().lit) {
-          panel.push_back(Cropped(sim::SimScreen::PanelScene(sim_.Panel(), "Simulated desktop")));
+          panel.push_back(Cropped(sim::SimScreen::PanelScene(sim_.Panel(), machineName)));
           scenes_.push_back(Cropped(Scene()));
         }
       });
@@ -323,7 +323,7 @@ void TakeAll(const fs::path& folder, const std::string& locale) {
         "driver = {older_set = true}\n" + ReadFile(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / "desktop.toml");
     sim::Simulation machine(machineText, options);
     Studio studio(folder, machine);
-    studio.TakeDialog(arguments);
+    studio.TakeDialog(arguments, sim::ParseMachine(machineText, "desktop.toml").name);
     studio.Save(english ? "dialog" : "dialog-" + locale.substr(0, 2));
     if (english) {
       studio.SavePanel("front-panel");

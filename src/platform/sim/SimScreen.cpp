@@ -22,6 +22,7 @@ constexpr int kPanelWidth = 330;
 constexpr int kHeading = 44;
 constexpr int kRow = 34;
 constexpr int kLed = 18;
+constexpr Font kHeadingFont{15, 600};
 constexpr Font kNameFont{17, 600};
 constexpr Font kDriverFont{13, 400};
 constexpr Color kPanelColor = 0x00302C2A;
@@ -87,7 +88,11 @@ desktop::Scene SimScreen::PanelScene(const FrontPanel& panel, const std::string&
   window.clip = window.frame;
   window.background = kPanelColor;
   window.raisedFrame = true;
-  window.operations.emplace_back(Line(14, 12, machineName, kNameFont, kText));
+  desktop::TextOperation heading = Line(14, 6, machineName, kHeadingFont, kText);
+  heading.area = {14, 6, kPanelWidth - 14, kHeading};  // room for two lines
+  heading.boxed = true;
+  heading.layout.wordBreak = true;
+  window.operations.emplace_back(std::move(heading));
   for (int row = 0; row < rows; ++row) {
     const Led& led = panel.Leds()[static_cast<std::size_t>(row)];
     const int y = kHeading + row * kRow;
