@@ -35,7 +35,7 @@ std::string MemoryRegisters::State() const {
   std::string text;
   for (std::size_t offset = 0; offset < bytes_.size(); ++offset) {
     char line[48];
-    std::snprintf(line, sizeof line, "memory %08llX = %02X\n", static_cast<unsigned long long>(base_ + offset),
+    std::snprintf(line, sizeof line, "memory %08llX = %02X\n", static_cast<unsigned long long>(base_) + offset,
                   bytes_[offset]);
     text += line;
   }

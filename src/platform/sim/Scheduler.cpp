@@ -32,7 +32,7 @@ Scheduler::Scheduler(const Options& options)
   threads_.emplace(main->id, std::move(main));
 }
 
-Scheduler::~Scheduler() {
+Scheduler::~Scheduler() {  // NOLINT(bugprone-exception-escape)
   EndThreads();
   ReapEnded();
   t_current = {};

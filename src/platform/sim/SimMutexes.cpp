@@ -6,7 +6,7 @@ namespace panelglow::platform::sim {
 
 SimMutexes::SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers) : scheduler_(scheduler) {
   for (const Peer& peer : peers) {
-    const MutexHandle handle = Create(peer.mutex);
+    const MutexHandle handle = SimMutexes::Create(peer.mutex);
     scheduler_.At(peer.from, [this, handle] {
       Mutex& mutex = mutexes_[handle];
       if (mutex.count == 0) {
