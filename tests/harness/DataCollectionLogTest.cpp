@@ -94,6 +94,8 @@ TEST(DataCollectionLog, ARunIsAddedWithItsTimesResultsAndParameters) {
         "LogMessage 14 8 \"DataCollection XML log written successfully\" \"\"\n"}) {
     EXPECT_THAT(log, ::testing::HasSubstr(part));
   }
+  EXPECT_THAT(LogOf("log.xml", "<DiagnosticsData><Older/></DiagnosticsData>"),
+              ::testing::HasSubstr("<DiagnosticsData Version=\"4.15.0\">\n  <Older/>\n"));
 }
 
 TEST(DataCollectionLog, ADamagedFileStaysAsItIsAlsoWithBlanksAroundItsPath) {

@@ -131,38 +131,6 @@ TEST(DiagnosticManager, TheFirstRequestWithABadValueIsNamedInFixedOrderAndNothin
   }
 }
 
-TEST(DiagnosticManager, TheRunIsDescribedInDebugLinesWithTheirTextsInDebugMode) {
-  ProbeRun run{"-subtest=Probe -debug=True -level=7"};
-  run.version = "1.2, of today\n   (cdm: 3)\n   (mb : 4)";
-  run.files["C:\\bench\\nonui_probe.msg"] = "[en_US]\n20000=free: %s\n";
-  std::string expected;
-  for (const char* text : {"diagnostic: C:.suite.probe.exe",
-                           "version: 1.2, of today, cdm: 3, mb: 4",
-                           "-subtest=Probe",
-                           "-locale=en_US",
-                           "-debug=True",
-                           "-version=false",
-                           "-description=false",
-                           "-help=false",
-                           "-catalog=false",
-                           "-diagconf=..diagconf.ini",
-                           "-paramfile=",
-                           "-paramsection=",
-                           "-DataCollectionFile=",
-                           "-Level=7",
-                           "-Loud=TRUE",
-                           "-Mode=Default",
-                           "-Ratio=",
-                           "-Serial=",
-                           "-integratormsgfile=",
-                           "-paramfile=",
-                           "-paramsection=",
-                           "Test execution time: [0-9]+ milliseconds"}) {
-    expected += "LogMessage Debug free: " + std::string(text) + " \"\"\n";
-  }
-  EXPECT_THAT(run.Output(), ::testing::MatchesRegex(expected + "EndOfTest\n= 0"));
-}
-
 TEST(DiagnosticManager, ABreakIsNotedForTheSubtestLoggedWithoutOneAndIgnoredBehindTheManager) {
   for (const auto& [words, output] : {std::pair{"-subtest=Probe", "noted"}, {"", "LogMessage 6 1 \"\" \"\"\n"}}) {
     EXPECT_EQ(InOwnProcess([words = words] {

@@ -91,19 +91,6 @@ TEST(ParameterFile, TheSetOfTheModelGoesBeforeTheGeneralOneAndASetMayLieElsewher
   }
 }
 
-TEST(ParameterFile, TheCommandLineWinsAndAParameterWithoutEqualsSignIsItsOwnValue) {
-  ProbeRun run{std::string(kNames) + " -LEVEL=7"};
-  run.files[".\\sets.ini"] = "[Set]\n-level=101\n-Mode=FAST\n-Locale\n";
-  const std::string output = run.Output();
-  EXPECT_THAT(
-      output,
-      HasSubstr(Logged({"Read from INI file: -level=101", "Ignored! Already exists on the command line: -level"})));
-  for (const char* parameter : {"-locale=-Locale", "-Level=7", "-Mode=FAST"}) {
-    EXPECT_THAT(output, HasSubstr("\"" + std::string(parameter) + "\""));
-  }
-  EXPECT_THAT(output, ::testing::EndsWith("EndOfTest\n= 0"));
-}
-
 TEST(ParameterFile, WithoutFileOrSectionNothingIsReadAndInformationIsGivenAllTheSame) {
   const std::string both = "ERROR! -ParamFile and -ParamSection both must be blank or both must be provided";
   const std::pair<const char*, std::string> kCases[] = {

@@ -52,6 +52,7 @@ class Firmware : public testing::Test {
 
 TEST_F(Firmware, TakesFourCharactersOfTheBoardsProduct) {
   const std::vector<std::string> strings{"Maker", "2A78 Bd.", "SN1"};
+  const Bytes many = Structure(11, {0}, std::vector<std::string>(300, "x"));
   const struct {
     const char* name;
     Bytes table;
@@ -65,6 +66,7 @@ TEST_F(Firmware, TakesFourCharactersOfTheBoardsProduct) {
       {"the last board wins", Joined({BaseBoard(strings), BaseBoard({"M", "3C01", "T"})}), "3C01", "T"},
       {"behind structures without strings", Joined({Structure(9, {1, 2}, {}), BaseBoard(strings)}), "2A78", "SN1"},
       {"behind a single closing NUL", Joined({{9, 4, 0, 0, 0}, BaseBoard(strings)}), "2A78", "SN1"},
+      {"behind more strings than a field can name", Joined({many, BaseBoard(strings)}), "2A78", "SN1"},
       {"a short board", Structure(2, {1}, strings), "", ""},
       {"an empty table", {}, "", ""},
   };
@@ -73,11 +75,6 @@ TEST_F(Firmware, TakesFourCharactersOfTheBoardsProduct) {
     EXPECT_EQ(found.GetProductText(), c.product) << c.name;
     EXPECT_EQ(found.boardSerial, c.serial) << c.name;
   }
-}
-
-TEST_F(Firmware, PassesOverMoreStringsThanAFieldCanName) {
-  const Bytes many = Structure(11, {0}, std::vector<std::string>(300, "x"));
-  EXPECT_EQ(SMBIOSDiscovery(Joined({many, BaseBoard({"M", "2A78", "S"})})).GetProductText(), "2A78");
 }
 
 TEST_F(Firmware, ReadsTheOtherStructures) {
@@ -223,18 +220,9 @@ TEST(SmbiosScanner, WalksTheTableBehindTheEntryPoint) {
   EXPECT_EQ(Memory(Joined({Structure(1, {1}, {}), board}), 0x0102, 0x0102).Product(), "2A78 Board");
   EXPECT_EQ(Memory(Joined({Structure(1, {1}, {}), board}), 0x0101, 0x0102).Product(), "none");  // a count of one byte
   EXPECT_EQ(Memory(Bytes{}, 1).Product(), "none");
+  EXPECT_EQ(Memory(Joined({BaseBoard({"M", "P"}, 4), Structure(1, {1}, {"x"})}), 2).Product(), "");  // no such string
+  EXPECT_EQ(Memory(Bytes{2, 8, 0, 0, 1, 1, 0, 3, 'P'}, 1).Product(), "P");                           // never closed
   EXPECT_EQ(Memory(Joined({board, BaseBoard({"M", "other", "S"})}), 2).Product(), "2A78 Board");
-}
-
-TEST(SmbiosScanner, FindsStringsByNumber) {
-  const Bytes board = Joined({BaseBoard({"one", "two", "three"}), Structure(3, {1}, {"next"})});
-  const char* kTexts[] = {"", "one", "two", "three", "", "", ""};
-  for (std::uint8_t number = 0; number < 7; ++number) {
-    EXPECT_EQ(SmbiosScanner::StringOf(board, number), kTexts[number]) << int{number};
-  }
-  EXPECT_EQ(SmbiosScanner::StringOf({}, 1), "");
-  EXPECT_EQ(SmbiosScanner::StringOf(Bytes{2, 200, 0, 0}, 1), "");
-  EXPECT_EQ(SmbiosScanner::StringOf(Bytes{2, 4, 0, 0, 'a'}, 1), "a");  // never closed
 }
 
 TEST(SmbiosScanner, FindsNothingWithoutAnEntryPoint) {

@@ -73,6 +73,20 @@ class Desk {
     At(time_ms, [this, message, wParam] { windows.Post({Top(), message, wParam, 0}); });
   }
 
+  /// Another program that brings its window up at 500 ms, and lives until `end_ms`.
+  void StartOther(const wstring& title, unsigned end_ms) {
+    platform::TheHost().threads.Start("another program", [this, title, end_ms] {
+      platform::TheHost().clock.Sleep(500);
+      windows.RegisterWindowClass({"other", 0, 0, 0, nullptr});
+      platform::WindowRequest request;
+      request.className = "other";
+      request.text = title;
+      request.style = platform::style::kPopup | platform::style::kVisible;
+      windows.CreateWindow(request);
+      platform::TheHost().clock.Sleep(end_ms - 500);
+    });
+  }
+
   /// The window in front; 0 when there is none.
   [[nodiscard]] WindowHandle Top() {
     const std::vector<WindowHandle> all = windows.TopLevelWindows();
@@ -91,14 +105,14 @@ class Desk {
            Describe(windows.WindowRectangle(window), windows.IsWindowVisible(window));
   }
 
-  /// Id and place of every control of the front window, in the order of their creation.
-  [[nodiscard]] std::vector<std::string> Layout() {
-    std::vector<std::string> lines;
+  /// The front window, and behind it id and place of every control in the order of their creation.
+  [[nodiscard]] std::string Layout() {
+    std::string text = Describe(Top());
     for (const WindowHandle child : windows.Children(Top())) {
-      lines.push_back(std::to_string(windows.ControlId(child)) + ": " +
-                      Describe(windows.WindowRectangle(child), windows.IsWindowVisible(child)));
+      text += "; " + std::to_string(windows.ControlId(child)) + ": " +
+              Describe(windows.WindowRectangle(child), windows.IsWindowVisible(child));
     }
-    return lines;
+    return text;
   }
 
   /// What windows have painted of one kind.

@@ -29,30 +29,16 @@ int Show(Form form, unsigned style) {
 }
 
 TEST(DiagnosticConfiguration, TakesTheBackgroundFromTheFileOrFromTheSystem) {
-  struct Case {
-    const char* content;
-    platform::Color background;
-  };
-  for (const Case& c : {Case{"[WindowSettings]\nBackgroundColor=255\n", 0x0000FF},
-                        Case{"[WindowSettings]\nBackgroundColor=0x00FF00 ; green\n", 0x00FF00},
-                        Case{"[WindowSettings]\nBackgroundColor=\n", platform::kButtonFaceColor},
-                        Case{"[WindowSettings]\nBackgroundColor=4294967295\n", platform::kButtonFaceColor},
-                        Case{"[WindowSettings]\nBackgroundColor=red\n", 0},
-                        Case{"[Others]\nBackgroundColor=255\n", platform::kButtonFaceColor}}) {
+  constexpr platform::Color kSystem = platform::kButtonFaceColor;
+  for (const auto& [value, background] : {std::pair<const char*, platform::Color>{"255", 0x0000FF},
+                                          {"0x00FF00 ; green", 0x00FF00},
+                                          {"", kSystem},
+                                          {"4294967295", kSystem},
+                                          {"red", 0}}) {
     Desk desk;
-    desk.sim.DiskFiles().Put(".\\diagconf.ini", c.content);
-    EXPECT_EQ(DiagnosticConfiguration(".\\diagconf.ini").GetBackgroundBrush(), c.background) << c.content;
-    EXPECT_EQ(DiagnosticConfiguration(".\\none.ini").GetBackgroundBrush(), platform::kButtonFaceColor);
-  }
-}
-
-TEST(DiagnosticWindow, EndsWithinFiveSecondsWhenTheRunIsToldToStop) {
-  for (const Form form : kForms) {
-    Desk desk;
-    desk.At(7000, [&] { desk.stopRequested = true; });
-    EXPECT_EQ(Show(form, 0), prompt_result::kTerminated);
-    EXPECT_NEAR(desk.Now_ms(), 10'000, 10);  // it asks every five seconds
-    EXPECT_FALSE(desk.sim.IsMutexOwned("_HalcyonPromptLock"));
+    desk.sim.DiskFiles().Put(kFile, std::string("[WindowSettings]\nBackgroundColor=") + value + "\n");
+    EXPECT_EQ(DiagnosticConfiguration(kFile).GetBackgroundBrush(), background) << value;
+    EXPECT_EQ(DiagnosticConfiguration(".\\none.ini").GetBackgroundBrush(), kSystem);
   }
 }
 
@@ -75,13 +61,15 @@ TEST(DiagnosticWindow, GivesItsColorToItsControlsAndAPlainPromptDoesNot) {
   }
 }
 
-TEST(DiagnosticWindow, HasItsOwnTopmostFlagAndNeitherTimeOutNorDeviceEvents) {
+TEST(DiagnosticWindow, HasItsOwnTopmostFlagAndNeitherTimeOutNorDeviceEventsAndEndsWhenTheRunIsToldToStop) {
   for (const Form form : kForms) {
     Desk desk;
     ThePromptState().timeoutSeconds = 1;
     desk.PostAt(500, message::kDeviceChange, 0x8000);
-    desk.ClickAt(4000, 1002);
-    EXPECT_EQ(Show(form, 1 | kPromptTopmost), prompt_result::kCancel);
+    desk.At(7000, [&] { desk.stopRequested = true; });
+    EXPECT_EQ(Show(form, 1 | kPromptTopmost), prompt_result::kTerminated);
+    EXPECT_NEAR(desk.Now_ms(), 10'000, 10);  // it asks every five seconds
+    EXPECT_FALSE(desk.sim.IsMutexOwned("_HalcyonPromptLock"));
     EXPECT_EQ(ThePromptState().promptEvents, 0U);
     EXPECT_FALSE(ThePromptState().topmost);
     EXPECT_EQ(ThePromptState().timeoutSeconds, 1U);  // still armed for the next plain one
@@ -106,15 +94,7 @@ TEST(DiagnosticWindow, LeavesTheFocusOnItsControls) {
 TEST(DiagnosticWindow, TakesTheForegroundBackWithinFiveSecondsWhenItIsTopmost) {
   for (const bool topmost : {false, true}) {
     Desk desk;
-    const auto other = platform::TheHost().threads.Start("another program", [&] {
-      platform::TheHost().clock.Sleep(500);
-      desk.windows.RegisterWindowClass({"other", 0, 0, 0, nullptr});
-      platform::WindowRequest request;
-      request.className = "other";
-      request.style = platform::style::kPopup | platform::style::kVisible;
-      desk.windows.CreateWindow(request);
-      platform::TheHost().clock.Sleep(9000);
-    });
+    desk.StartOther(u"", 9000);
     WindowHandle own = 0;
     desk.At(400, [&] { own = desk.Top(); });
     desk.At(4900, [&] { EXPECT_NE(desk.windows.ForegroundWindow(), own); });
@@ -123,7 +103,6 @@ TEST(DiagnosticWindow, TakesTheForegroundBackWithinFiveSecondsWhenItIsTopmost) {
       desk.windows.Post({own, message::kCommand, 1005, 0});
     });
     EXPECT_EQ(Show(Form::kText, topmost ? kPromptTopmost : 0), prompt_result::kOk);
-    platform::TheHost().threads.Wait(other, platform::Threads::kNoLimit);
   }
 }
 

@@ -3,6 +3,7 @@
 
 #include "prompts/Desk.h"
 #include "prompts/MessageWindow.h"
+#include "prompts/PromptWindow.h"
 #include "prompts/TextWindow.h"
 
 namespace panelglow::prompttest {
@@ -89,14 +90,6 @@ TEST(MessageWindow, IsEndedByItsHookWhichFinishesWhatItAnswersWithZero) {
   EXPECT_NEAR(desk.Now_ms(), 2000, 10);
 }
 
-TEST(MessageWindow, IsNotSeenBeforeThePromptOfAnotherProcessIsGone) {
-  Desk desk("[[peer]]\nmutex = '_HalcyonPromptLock'\nuntil_ms = 3000\n");
-  desk.At(2900, [&] { EXPECT_EQ(desk.Top(), 0U); });
-  desk.At(3050, [&] { EXPECT_NE(desk.Top(), 0U); });
-  EXPECT_EQ(ShowMessageWindow(u"text", u"title", 1, nullptr), -2);
-  EXPECT_NEAR(desk.Now_ms(), 4100, 10);
-}
-
 // Types a line at a time, one character each 100 ms.
 void TypeAt(Desk& desk, unsigned time_ms, const char* line) {
   for (const char* at = line; *at != 0; ++at, time_ms += 100) {
@@ -108,35 +101,29 @@ void PressEnterAt(Desk& desk, unsigned time_ms) {
 }
 
 TEST(TextWindow, GivesTheLineToItsButtonAndToTheEnterKey) {
-  for (const bool button : {false, true}) {
+  enum class Way { kEnter, kClick, kEnterOnButton };
+  for (const Way way : {Way::kEnter, Way::kClick, Way::kEnterOnButton}) {
     Desk desk;
     desk.At(50, [&] {
-      EXPECT_EQ(desk.Describe(desk.Top()), "title 370,367 540x290");
-      EXPECT_THAT(desk.Layout(), ElementsAre("1005: 245,255 50x25", "1100: 120,190 300x25", "0: 10,10 520x140"));
+      EXPECT_EQ(desk.Layout(), "title 370,367 540x290; 1005: 245,255 50x25; 1100: 120,190 300x25; 0: 10,10 520x140");
       EXPECT_EQ(desk.windows.ControlId(desk.windows.Focus()), 1100);
       EXPECT_TRUE(desk.sim.IsMutexOwned(kPromptLock));
     });
     TypeAt(desk, 100, "AB-12");
     desk.At(700, [&] { desk.windows.Key(0x1B, 0, false); });  // Escape ends nothing
     desk.PostAt(800, message::kClose);
-    button ? desk.ClickAt(1000, 1005) : PressEnterAt(desk, 1000);
+    if (way == Way::kEnterOnButton) {
+      desk.At(900, [&] { desk.windows.Key(0x09, 0, false); });  // Tab
+    }
+    way == Way::kClick ? desk.ClickAt(1000, 1005) : PressEnterAt(desk, 1000);
     std::string entered = "before";
-    EXPECT_EQ(ShowTextWindow(u"text", u"title", entered, 2000), button ? prompt_result::kOk : prompt_result::kNone);
+    EXPECT_EQ(ShowTextWindow(u"text", u"title", entered, 2000),
+              way == Way::kEnter ? prompt_result::kNone : prompt_result::kOk);
     EXPECT_EQ(entered, "AB-12");
     EXPECT_NEAR(desk.Now_ms(), 1000, 10);
     EXPECT_EQ(desk.Top(), 0U);
     EXPECT_FALSE(desk.sim.IsMutexOwned(kPromptLock));
   }
-}
-
-TEST(TextWindow, IsLeftByTheEnterKeyOnItsButtonToo) {
-  Desk desk;
-  TypeAt(desk, 100, "AB");
-  desk.At(400, [&] { desk.windows.Key(0x09, 0, false); });  // Tab
-  PressEnterAt(desk, 500);
-  std::string entered;
-  EXPECT_EQ(ShowTextWindow(u"text", u"title", entered, 2000), prompt_result::kOk);
-  EXPECT_EQ(entered, "AB");
 }
 
 TEST(TextWindow, WipesWhatIsNotGoneOnWithInTime) {
@@ -176,17 +163,25 @@ TEST(TextWindow, GivesTheFocusToItsFieldAndLeavesTheLineAloneWhenTheThreadIsToQu
   EXPECT_EQ(entered, "before");
 }
 
-TEST(MessageAndTextWindow, EndAtOnceWhereNoWindowCanBeHad) {
+TEST(EachWindow, EndsAtOnceWhereNoWindowCanBeHad) {
   Desk desk;
   const auto refuse = [](const platform::Message&) -> std::intptr_t { return -1; };
-  desk.windows.RegisterWindowClass({"MessageWindowClassName", 0, 0, 0, refuse});
-  desk.windows.RegisterWindowClass({"TextWindowClassName", 0, 0, 0, refuse});
   std::string entered = "before";
-  EXPECT_EQ(ShowMessageWindow(u"text", u"title", 0, nullptr), 1);
-  EXPECT_EQ(ShowTextWindow(u"text", u"title", entered, 500), prompt_result::kNone);
+  const std::tuple<const char*, std::function<int()>, int> kCases[] = {
+      {"MessageWindowClassName", [] { return ShowMessageWindow(u"text", u"title", 0, nullptr); }, 1},
+      {"TextWindowClassName", [&] { return ShowTextWindow(u"text", u"title", entered, 500); }, prompt_result::kNone},
+      {"PromptWindowClassName", [] { return TextPrompt(u"", u"", kPromptTopmost, nullptr, 0); },
+       prompt_result::kNone},
+  };
+  for (const auto& [className, show, result] : kCases) {
+    desk.windows.RegisterWindowClass({className, 0, 0, 0, refuse});
+    desk.sim.ClearOutput();
+    EXPECT_EQ(show(), result);
+    EXPECT_THAT(desk.sim.Output(), HasSubstr("LogMessage 8 20000 \"A prompt cannot be shown"));
+    EXPECT_EQ(desk.Top(), 0U);
+    EXPECT_FALSE(desk.sim.IsMutexOwned(kPromptLock));
+  }
   EXPECT_EQ(entered, "before");
-  EXPECT_THAT(desk.sim.Output(), HasSubstr("LogMessage 8 20000 \"A prompt cannot be shown"));
-  EXPECT_EQ(desk.Top(), 0U);
 }
 
 }  // namespace

@@ -39,21 +39,17 @@ TEST(SystemCampaign, EveryRunKeepsItsPromises) {
     std::mt19937 dice(seed);
     const auto pick = [&](const auto& list) { return list[dice() % list.size()]; };
     const Panel panel = pick(kPanels);
-    SimulatedRun run;
-    run.person = pick(kPersons);
-    run.machine = installation.Machine(panel.machine, pick(kEvents) + "\n");
-    run.seed = seed;
-    const bool healthy = dice() % 2 == 0;
-    if (!healthy) {
+    SimulatedRun run =
+        LedRun(installation.Machine(panel.machine, pick(kEvents) + "\n"), panel.section,
+               {"-Retries=" + std::to_string(dice() % 3), "-DataCollectionFile=log.xml"}, pick(kPersons), seed);
+    if (dice() % 2 == 0) {
       run.faults = {pick(panel.leds) + "=" + pick(kFaults)};
     }
-    run.arguments = {"-subtest=CustomLEDTest", std::string("-SectionID=") + panel.section,
-                     "-Retries=" + std::to_string(dice() % 3), "-DataCollectionFile=log.xml"};
     SCOPED_TRACE(run.Describe() + "\nmachine:\n" + installation.Read("machine.toml"));
     const Outcome outcome = run.In(installation);
     EXPECT_TRUE(outcome.exitCode == 0 || outcome.exitCode == 1) << outcome.errors;
     EXPECT_TRUE(outcome.IsOrderly()) << outcome.output;
-    EXPECT_TRUE(outcome.reported) << outcome.errors;  // no deadlock
+    EXPECT_TRUE(outcome.end_us > 0) << outcome.errors;  // no deadlock
     EXPECT_EQ(outcome.exitCode == 0, outcome.Tagged("TestFailed").empty() && outcome.Tagged("ReportFailure").empty());
     if (panel.restoresRegisters) {
       EXPECT_THAT(outcome.leftBehind, ::testing::IsEmpty());

@@ -33,7 +33,7 @@ TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
       {{"--machine", machine, "--seed", "many"}, 2, "--seed"},
       {{"--machine", "none.toml"}, 3, "none.toml cannot be read"},
       {{"--machine", "broken.toml"}, 3, "broken.toml:1: \"chip.name\" is missing"},
-      {{"--machine", machine, "--", "-subtest=None"}, 1, ""},
+      {{"--machine", machine, "--raw", "--", "-subtest=None"}, 1, ""},
       {{"--machine", machine, "--", "-subtest=CustomLEDTest"}, 0, ""},
   };
   for (const Case& c : kCases) {
@@ -41,18 +41,6 @@ TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
     EXPECT_EQ(outcome.exitCode, c.exitCode) << ::testing::PrintToString(c.arguments);
     EXPECT_THAT(outcome.errors, HasSubstr(c.error));
   }
-}
-
-TEST(SystemController, RawPassesTheProgramsLinesThroughUnchanged) {
-  const Installation installation;
-  const std::string machine = installation.Machine("desktop.toml");
-  const std::vector<std::string> run = {"-subtest=CustomLEDTest", "-Retries=0"};
-  const Outcome direct = SimulatedRun{machine, "wrong:2", 3, {}, run}.In(installation);
-  const Outcome raw = Controller(
-      installation, {"--machine", machine, "--operator", "wrong:2", "--seed", "3", "--raw", "--", run[0], run[1]});
-  // All but the first line, which names the program.
-  EXPECT_EQ(raw.output.substr(raw.output.find('\n')), direct.output.substr(direct.output.find('\n')));
-  EXPECT_EQ(raw.exitCode, 1);
 }
 
 TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
@@ -86,7 +74,7 @@ TEST(SystemController, TheProductWithoutItsDriverSaysSoWhateverTheEnvironmentHol
       {{"PANELGLOW_SIM_MACHINE", installation.Machine("desktop.toml")}, {"PANELGLOW_SIM_OPERATOR", "perfect"}});
   EXPECT_EQ(outcome.exitCode, 1);
   EXPECT_TRUE(outcome.IsOrderly());
-  EXPECT_THAT(outcome.output, HasSubstr("TestFailed 020472 \"\"\n"));
+  EXPECT_THAT(outcome.output, HasSubstr("LogMessage 7 17 \"\" \"\"\nTestFailed 020472 \"\"\n"));
 }
 
 TEST(SystemController, TheWholeOutputOfARun) {

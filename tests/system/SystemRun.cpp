@@ -62,7 +62,7 @@ void ReadReport(const fs::path& path, Outcome& outcome) {
     } else if (word == "before" || word == "after" || word == "owned") {
       outcome.leftBehind.push_back(line);
     } else if (word == "end") {
-      outcome.reported = true;
+      words >> outcome.end_us;
     }
   }
 }
@@ -109,6 +109,22 @@ std::size_t Outcome::TimesLit(const std::string& led) const {
       edges.begin(), edges.end(), [&](const Edge& edge) { return edge.led == led && edge.lit && edge.time_us > 0; }));
 }
 
+std::set<std::string> Outcome::LeftChanged() const {
+  std::map<std::string, bool> before;
+  std::set<std::string> changed;
+  for (const Edge& edge : edges) {
+    if (edge.time_us == 0) {
+      before[edge.led] = edge.lit;
+    }
+    if (edge.lit == before[edge.led]) {
+      changed.erase(edge.led);
+    } else {
+      changed.insert(edge.led);
+    }
+  }
+  return changed;
+}
+
 bool Outcome::IsOrderly() const {
   return std::count(lines.begin(), lines.end(), "EndOfTest") == 1 && lines.back() == "EndOfTest" &&
          output.back() == '\n' && Tagged("ReportFailure").size() <= 1 && Tagged("TestFailed").size() <= 1;
@@ -150,6 +166,13 @@ Outcome SimulatedRun::In(const Installation& installation) const {
                                 {"PANELGLOW_SIM_REPORT", report.string()}});
   ReadReport(report, outcome);
   return outcome;
+}
+
+SimulatedRun LedRun(const std::string& machine, const std::string& section, const std::vector<std::string>& more,
+                    const std::string& person, unsigned seed) {
+  SimulatedRun run{machine, person, seed, {}, {"-subtest=CustomLEDTest", "-SectionID=" + section}};
+  run.arguments.insert(run.arguments.end(), more.begin(), more.end());
+  return run;
 }
 
 std::string SimulatedRun::Describe() const {

