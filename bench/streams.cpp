@@ -3,6 +3,7 @@
 
 #include <sstream>
 #include <string>
+#include <utility>
 
 #include "config/OrgFileParser.h"
 #include "config/XmlObject.h"
@@ -38,7 +39,7 @@ XmlObject Tree() {
 std::string StreamOf(XmlObject& tree) {
   std::ostringstream bytes;
   panelglow::optstream(bytes).WriteValue(tree);
-  return bytes.str();
+  return std::move(bytes).str();
 }
 
 void SetRates(benchmark::State& state, std::size_t bytes) {

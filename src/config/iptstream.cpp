@@ -4,6 +4,7 @@
 #include <array>
 #include <limits>
 #include <stdexcept>
+#include <streambuf>
 #include <type_traits>
 #include <utility>
 
@@ -19,45 +20,71 @@ constexpr std::uint32_t kLargestStep = 1U << 16U;
 Persistent* IdentityOf(Persistent& object) { return &object; }
 Persistent* IdentityOf(PersistentByProxy& object) { return &object.GetProxy(); }
 
+// What a stream buffer holds ready, without a virtual call for each few bytes.
+class ReadyBytes : public std::streambuf {
+ public:
+  static const char* Take(std::streambuf& source, std::size_t size) {
+    const char* const here = (source.*&ReadyBytes::gptr)();
+    const auto ready = static_cast<std::size_t>((source.*&ReadyBytes::egptr)() - here);
+    if (here == nullptr || size > ready || size > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
+      return nullptr;
+    }
+    (source.*&ReadyBytes::gbump)(static_cast<int>(size));
+    return here;
+  }
+};
+
 }  // namespace
 
-// ---- integers and texts
+// ---- bytes, integers and texts
+
+// The next `size` bytes where the source holds them, which moves behind them; null when it has not so many ready.
+const char* iptstream::TakeReady(std::size_t size) {
+  if (broken) {
+    throw std::runtime_error("The stream has failed before");
+  }
+  return bytes.good() ? ReadyBytes::Take(*bytes.rdbuf(), size) : nullptr;
+}
+
+void iptstream::Read(char* data, std::size_t size) {
+  if (const char* ready = TakeReady(size)) {
+    std::copy_n(ready, size, data);
+    return;
+  }
+  const auto length = static_cast<std::streamsize>(size);
+  if (!bytes.good() || bytes.rdbuf()->sgetn(data, length) != length) {
+    bytes.setstate(std::ios::eofbit | std::ios::failbit);
+    Fail("The stream ends too early");
+  }
+}
+
+inline std::uint8_t iptstream::ReadByte() {
+  char value = 0;
+  Read(&value, 1);
+  return static_cast<std::uint8_t>(value);
+}
 
 std::uint32_t iptstream::ReadUnsigned() {
-  std::array<unsigned char, 4> raw{};
+  std::array<char, 4> raw;
   Read(raw.data(), raw.size());
-  std::uint32_t value = 0;
-  for (std::size_t i = 0; i < raw.size(); ++i) {
-    value |= static_cast<std::uint32_t>(raw[i]) << (8 * i);
-  }
-  return value;
+  const auto byte = [&](std::size_t i) { return std::uint32_t{static_cast<std::uint8_t>(raw[i])} << (8 * i); };
+  return byte(0) | byte(1) | byte(2) | byte(3);
 }
 
 void iptstream::ReadString(std::string& text) {
+  const std::uint32_t length = ReadUnsigned();
+  if (const char* ready = TakeReady(length)) {
+    text.assign(ready, length);
+    return;
+  }
+  // Piece by piece: a length that lies takes no more memory than the stream has bytes.
   text.clear();
-  for (std::uint32_t left = ReadUnsigned(); left > 0;) {
+  for (std::uint32_t left = length; left > 0;) {
     const std::uint32_t step = std::min(left, kLargestStep);
     const std::size_t had = text.size();
     text.resize(had + step);
     Read(text.data() + had, step);
     left -= step;
-  }
-}
-
-std::uint8_t iptstream::ReadByte() {
-  std::uint8_t value = 0;
-  Read(&value, 1);
-  return value;
-}
-
-void iptstream::Read(void* data, std::size_t size) {
-  if (broken) {
-    throw std::runtime_error("The stream has failed before");
-  }
-  const auto length = static_cast<std::streamsize>(size);
-  if (!bytes.good() || bytes.rdbuf()->sgetn(static_cast<char*>(data), length) != length) {
-    bytes.setstate(std::ios::eofbit | std::ios::failbit);
-    Fail("The stream ends too early");
   }
 }
 
@@ -69,14 +96,11 @@ void iptstream::Fail(const std::string& message) {
 
 void iptstream::Break() {
   broken = true;
-  for (const indexed_pointer& entry : table) {
-    if (entry.links == nullptr) {
-      continue;
-    }
-    for (const Location& location : entry.links->locations) {
+  for (auto& [number, linked] : links) {
+    for (const Location& location : linked.locations) {
       std::visit([](auto* pointer) { *pointer = nullptr; }, location);
     }
-    entry.links->locations.clear();
+    linked.locations.clear();
   }
 }
 
@@ -145,26 +169,28 @@ void iptstream::PlaceAt(Object& target, std::uint32_t number) {
     CheckDepth(reached);
     deepest = std::max(deepest, reached);
   }
-  if (entry.links == nullptr || OwnedOf<Object>(*entry.links) == nullptr) {
+  const auto linked = links.find(number);
+  if (linked == links.end() || OwnedOf<Object>(linked->second) == nullptr) {
     target.CopyFrom(object);
     return;
   }
   target.MoveFrom(*object);
-  PutAt(entry, IdentityOf(target));
-  OwnedOf<Object>(*entry.links).reset();
+  PutAt(number, IdentityOf(target));
+  OwnedOf<Object>(linked->second).reset();
 }
 
-// The object of the entry is at another place now; the pointers that were filled with it follow.
-void iptstream::PutAt(indexed_pointer& entry, Persistent* place) {
-  entry.object = place;
-  if (entry.links == nullptr) {
+// The object is at another place now; the pointers that were filled with it follow.
+void iptstream::PutAt(std::uint32_t number, Persistent* place) {
+  table[number].object = place;
+  const auto linked = links.find(number);
+  if (linked == links.end()) {
     return;
   }
-  for (const Location& location : entry.links->locations) {
+  for (const Location& location : linked->second.locations) {
     if (Persistent** const* pointer = std::get_if<Persistent**>(&location)) {
       **pointer = place;
     } else {
-      *std::get<PersistentByProxy**>(location) = ObjectOf<PersistentByProxy>(entry);
+      *std::get<PersistentByProxy**>(location) = ObjectOf<PersistentByProxy>(table[number]);
     }
   }
 }
@@ -176,7 +202,7 @@ void iptstream::ReadPayload(Object& object, std::uint32_t number) {
   CheckDepth(++depth);
   object.ReadAndWrite(*this, Persistent::Direction::kRead, version);
   indexed_pointer& entry = table[number];
-  entry.height = deepest - depth;
+  entry.height = static_cast<std::uint16_t>(deepest - depth);  // no more than kDeepestObject
   entry.complete = true;
   deepest = std::max(deepest, deepestBefore);
   --depth;
@@ -206,7 +232,7 @@ void iptstream::FillPointer(Object*& pointer) {
     std::uint32_t number = 0;
     pointer = ReadPointerRecord<Object>(number);
     if (pointer != nullptr) {
-      LinksOf(number).locations.emplace_back(&pointer);
+      links[number].locations.emplace_back(&pointer);
     }
   });
 }
@@ -246,7 +272,7 @@ Object* iptstream::Make(const std::string& className, std::uint32_t number) {
     Fail("Attempting to stream ungegistered class: " + className);
   }
   table.emplace_back().object = IdentityOf(*object);
-  std::unique_ptr<Object>& owned = OwnedOf<Object>(LinksOf(number));
+  std::unique_ptr<Object>& owned = OwnedOf<Object>(links[number]);
   owned = std::move(object);
   return owned.get();
 }
@@ -284,20 +310,12 @@ Object* iptstream::ObjectOf(const indexed_pointer& entry) {
   }
 }
 
-iptstream::Links& iptstream::LinksOf(std::uint32_t number) {
-  std::unique_ptr<Links>& links = table[number].links;
-  if (links == nullptr) {
-    links = std::make_unique<Links>();
-  }
-  return *links;
-}
-
 template <class Object>
-std::unique_ptr<Object>& iptstream::OwnedOf(Links& links) {
+std::unique_ptr<Object>& iptstream::OwnedOf(Links& linked) {
   if constexpr (std::is_same_v<Object, Persistent>) {
-    return links.owned;
+    return linked.owned;
   } else {
-    return links.ownedByProxy;
+    return linked.ownedByProxy;
   }
 }
 
@@ -306,18 +324,17 @@ std::unique_ptr<PersistentByProxy> iptstream::Take(const PersistentByProxy* obje
 
 template <class Object>
 std::unique_ptr<Object> iptstream::TakeOwned(const Object* object) {
-  for (indexed_pointer& entry : table) {
-    if (object != nullptr && entry.links != nullptr && OwnedOf<Object>(*entry.links).get() == object) {
-      return std::move(OwnedOf<Object>(*entry.links));
+  for (auto& [number, linked] : links) {
+    if (object != nullptr && OwnedOf<Object>(linked).get() == object) {
+      return std::move(OwnedOf<Object>(linked));
     }
   }
   return nullptr;
 }
 
 void iptstream::Moved(std::uint32_t number, const Persistent* from, Persistent* to) {
-  indexed_pointer& entry = EntryOf(number);
-  if (entry.object == from) {
-    PutAt(entry, to);
+  if (EntryOf(number).object == from) {
+    PutAt(number, to);
   }
 }
 

@@ -6,6 +6,7 @@
 #include <istream>
 #include <memory>
 #include <string>
+#include <unordered_map>
 #include <variant>
 #include <vector>
 
@@ -60,10 +61,9 @@ class iptstream final : public ptstream {
   // An object that the stream has seen; its index in the table is its number.
   struct indexed_pointer {
     Persistent* object = nullptr;  // of a PersistentByProxy: its proxy
-    std::uint32_t height = 0;      // levels of objects nested in it
+    std::uint16_t height = 0;      // levels of objects nested in it
     bool complete = false;         // its payload has been read
     bool isPart = false;           // it has its place inside another object
-    std::unique_ptr<Links> links;  // null for an object that nothing points at
   };
 
   template <class Object>
@@ -79,7 +79,7 @@ class iptstream final : public ptstream {
   template <class Object>
   Object* ObjectOf(const indexed_pointer& entry);
   template <class Object>
-  static std::unique_ptr<Object>& OwnedOf(Links& links);
+  static std::unique_ptr<Object>& OwnedOf(Links& linked);
   template <class Call>
   auto Guarded(Call call);
   template <class Object>
@@ -89,18 +89,19 @@ class iptstream final : public ptstream {
 
   std::uint32_t ReadNewNumber();
   void CheckDepth(std::uint32_t level);
-  void PutAt(indexed_pointer& entry, Persistent* place);
-  Links& LinksOf(std::uint32_t number);
+  void PutAt(std::uint32_t number, Persistent* place);
   void Break();
   indexed_pointer& EntryOf(std::uint32_t number);
   std::uint8_t ReadByte();
-  void Read(void* data, std::size_t size);
+  void Read(char* data, std::size_t size);
+  const char* TakeReady(std::size_t size);
   [[noreturn]] void Fail(const std::string& message);
 
   std::istream& bytes;
-  std::vector<indexed_pointer> table;  // by number
-  std::uint32_t depth = 0;             // of the objects being read
-  std::uint32_t deepest = 0;           // level that was reached since the innermost of them began
+  std::vector<indexed_pointer> table;              // by number
+  std::unordered_map<std::uint32_t, Links> links;  // of the objects that were read through pointers, by number
+  std::uint32_t depth = 0;                         // of the objects being read
+  std::uint32_t deepest = 0;                       // level that was reached since the innermost of them began
   bool broken = false;
 };
 

@@ -1,45 +1,69 @@
 #include "config/optstream.h"
 
 #include <algorithm>
-#include <array>
 #include <stdexcept>
+#include <utility>
 
 namespace panelglow {
 
 namespace {
 
-constexpr std::size_t kLargePiece = std::size_t{1} << 16U;
+constexpr std::size_t kPiece = std::size_t{1} << 16U;
 constexpr std::size_t kFirstSlots = 64;  // a power of two
 
-// Neighbours in memory are neighbours in the table, page by page, since they are written one behind the other; the
-// pages are scattered.
-std::size_t HashOf(const Persistent* object) {
-  const std::uint64_t address = reinterpret_cast<std::uintptr_t>(object);
-  const std::uint64_t page = (address >> 12U) * 0x9E3779B97F4A7C15U >> 32U;
-  return static_cast<std::size_t>(page << 9U | (address >> 3U & 0x1FFU));
-}
+// Neighbours in memory are neighbours in the table: they are written one behind the other. No two objects are closer
+// together than a pointer's size, and most are twice that.
+std::size_t HashOf(const Persistent* object) { return reinterpret_cast<std::uintptr_t>(object) / 16; }
 
 const Persistent* IdentityOf(const Persistent& object) { return &object; }
 const Persistent* IdentityOf(const PersistentByProxy& object) { return &object.GetProxy(); }
 
 }  // namespace
 
-// ---- bytes: gathered, and handed on in large pieces and at the end of each call from outside
+// ---- bytes: gathered, and handed on in pieces and at the end of each call from outside
 
-void optstream::Append(std::uint32_t value) {
-  const std::array<char, sizeof(value)> raw{static_cast<char>(value), static_cast<char>(value >> 8U),
-                                            static_cast<char>(value >> 16U), static_cast<char>(value >> 24U)};
-  waiting.append(raw.data(), raw.size());
+// Room for a few bytes behind those that wait.
+inline char* optstream::RoomFor(std::size_t size) {
+  if (size > waiting.size() - filled) {
+    HandOn();
+  }
+  return waiting.data() + std::exchange(filled, filled + size);
 }
 
-void optstream::Flush() {
-  if (depth > 0 && waiting.size() < kLargePiece) {
-    return;
+void optstream::Append(std::string_view text) {
+  if (text.size() > kPiece) {
+    HandOn();
+    Put(text);
+  } else {
+    std::copy(text.begin(), text.end(), RoomFor(text.size()));
   }
-  const auto length = static_cast<std::streamsize>(waiting.size());
-  const bool written = bytes.good() && bytes.rdbuf()->sputn(waiting.data(), length) == length;
-  waiting.clear();
-  if (!written) {
+}
+
+inline void optstream::Append(std::uint8_t value) { *RoomFor(1) = static_cast<char>(value); }
+
+inline void optstream::Append(std::uint32_t value) {
+  char* const room = RoomFor(sizeof(value));
+  for (std::size_t i = 0; i < sizeof(value); ++i) {
+    room[i] = static_cast<char>(value >> (8 * i));
+  }
+}
+
+inline void optstream::EndCall() {
+  if (depth == 0) {
+    HandOn();
+  }
+}
+
+void optstream::HandOn() {
+  if (waiting.empty()) {
+    waiting.resize(kPiece);
+  }
+  Put(std::string_view(waiting.data(), std::exchange(filled, 0)));
+}
+
+void optstream::Put(std::string_view text) {
+  const auto length = static_cast<std::streamsize>(text.size());
+  if (!bytes.good() || bytes.rdbuf()->sputn(text.data(), length) != length) {
     bytes.setstate(std::ios::badbit);
     throw std::runtime_error("The stream cannot be written");
   }
@@ -47,7 +71,7 @@ void optstream::Flush() {
 
 void optstream::WriteUnsigned(std::uint32_t value) {
   Append(value);
-  Flush();
+  EndCall();
 }
 
 void optstream::WriteString(std::string_view text) {
@@ -56,8 +80,8 @@ void optstream::WriteString(std::string_view text) {
     throw std::runtime_error("A text of more than 4 GB");
   }
   Append(length);
-  waiting += text;
-  Flush();
+  Append(text);
+  EndCall();
 }
 
 // ---- objects
@@ -72,26 +96,28 @@ void optstream::WritePointer(PersistentByProxy* object) {
 }
 
 void optstream::WriteNull() {
-  waiting += static_cast<char>(kNull);
-  Flush();
+  Append(kNull);
+  EndCall();
 }
 
 template <class Object>
 void optstream::WriteObject(std::uint8_t tag, Object& object) {
   MakeRoom();
-  Slot& slot = slots[SlotOf(IdentityOf(object))];
-  if (slot.object != nullptr) {
-    waiting += static_cast<char>(kReference);
-    Append(slot.number);
-    Flush();
+  std::uint32_t& slot = slots[SlotOf(IdentityOf(object))];
+  if (slot != 0) {
+    Append(kReference);
+    Append(slot - 1);
+    EndCall();
     return;
   }
   if (depth >= kDeepestObject) {
     throw std::runtime_error("Objects are nested deeper than " + std::to_string(kDeepestObject) + " levels");
   }
-  slot = {IdentityOf(object), count++};
-  waiting += static_cast<char>(tag);
-  Append(slot.number);
+  const auto number = static_cast<std::uint32_t>(objects.size());
+  objects.push_back(IdentityOf(object));
+  slot = number + 1;
+  Append(tag);
+  Append(number);
   ++depth;
   if (tag == kPointer) {
     WriteString(object.GetRealClassName());
@@ -99,20 +125,20 @@ void optstream::WriteObject(std::uint8_t tag, Object& object) {
   Append(object.Version());
   object.ReadAndWrite(*this, Persistent::Direction::kWrite, 0);
   --depth;
-  Flush();
+  EndCall();
 }
 
 // ---- the table of objects
 
 bool optstream::HasSeen(const Persistent* object) const {
-  return object != nullptr && !slots.empty() && slots[SlotOf(object)].object != nullptr;
+  return object != nullptr && !slots.empty() && slots[SlotOf(object)] != 0;
 }
 
 // The slot that holds the object, or the free one where it would go.
 std::size_t optstream::SlotOf(const Persistent* object) const {
   const std::size_t mask = slots.size() - 1;
   std::size_t slot = HashOf(object) & mask;
-  while (slots[slot].object != nullptr && slots[slot].object != object) {
+  while (slots[slot] != 0 && objects[slots[slot] - 1] != object) {
     slot = (slot + 1) & mask;
   }
   return slot;
@@ -120,15 +146,12 @@ std::size_t optstream::SlotOf(const Persistent* object) const {
 
 // Keeps half of the slots free.
 void optstream::MakeRoom() {
-  if (2 * (std::size_t{count} + 1) <= slots.size()) {
+  if (2 * (objects.size() + 1) <= slots.size()) {
     return;
   }
-  std::vector<Slot> before(std::max(kFirstSlots, 2 * slots.size()));
-  before.swap(slots);
-  for (const Slot& slot : before) {
-    if (slot.object != nullptr) {
-      slots[SlotOf(slot.object)] = slot;
-    }
+  slots.assign(std::max(kFirstSlots, 4 * slots.size()), 0);
+  for (std::size_t number = 0; number < objects.size(); ++number) {
+    slots[SlotOf(objects[number])] = static_cast<std::uint32_t>(number + 1);
   }
 }
 

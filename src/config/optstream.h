@@ -39,22 +39,24 @@ class optstream final : public ptstream {
   template <class Object>
   void WriteObject(std::uint8_t tag, Object& object);
   void WriteNull();
+  char* RoomFor(std::size_t size);
+  void Append(std::uint8_t value);
   void Append(std::uint32_t value);
-  void Flush();
+  void Append(std::string_view text);
+  void EndCall();
+  void HandOn();
+  void Put(std::string_view text);
   [[nodiscard]] std::size_t SlotOf(const Persistent* object) const;
   void MakeRoom();
 
-  // A place of the table of objects, which is open-addressed: a stream of a large tree is mostly look-ups.
-  struct Slot {
-    const Persistent* object = nullptr;  // by identity; null: free
-    std::uint32_t number = 0;
-  };
-
   std::ostream& bytes;
-  std::string waiting;  // bytes of the record being written
-  std::vector<Slot> slots;
-  std::uint32_t count = 0;  // of objects in the table
-  std::size_t depth = 0;    // of the objects being written
+  std::vector<char> waiting;  // room for a piece, of which so much is filled
+  std::size_t filled = 0;
+  std::vector<const Persistent*> objects;  // by number; those of proxies by their identity
+
+  // Finds them: an open-addressed table, since a stream of a large tree is mostly look-ups. Number and 1; 0: free.
+  std::vector<std::uint32_t> slots;
+  std::size_t depth = 0;  // of the objects being written
 };
 
 }  // namespace panelglow
