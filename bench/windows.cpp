@@ -182,25 +182,46 @@ double ProcessorSeconds() {
   return seconds(usage.ru_utime) + seconds(usage.ru_stime);
 }
 
-// A topmost prompt (the others have no 10 ms tick) that nobody answers: the share of a core that the process takes.
-void PromptWaits(benchmark::State& state) {
-  constexpr unsigned kSeconds = 5;
+// A topmost prompt (the others have no 10 ms tick) that nobody answers.
+void ShowPrompt(unsigned seconds) {
+  panelglow::ThePromptState().timeoutSeconds = seconds;
+  panelglow::ThePromptState().timeoutResult = panelglow::prompt_result::kCancel;
+  panelglow::TextPrompt(u"Wait.", u"title", panelglow::kPromptTopmost, nullptr, 0);
+}
+
+// The share of a core that the process takes during a wait.
+template <class Wait>
+void CountProcessor(benchmark::State& state, Wait wait) {
   for (auto _ : state) {
-    panelglow::ThePromptState().timeoutSeconds = kSeconds;
-    panelglow::ThePromptState().timeoutResult = panelglow::prompt_result::kCancel;
     const double before = ProcessorSeconds();
     const Clock::time_point begin = Clock::now();
-    panelglow::TextPrompt(u"Wait.", u"title", panelglow::kPromptTopmost, nullptr, 0);
+    wait();
     const double waited = std::chrono::duration<double>(Clock::now() - begin).count();
     state.SetIterationTime(waited);
     state.counters["percent of a core"] = 100 * (ProcessorSeconds() - before) / waited;
   }
 }
 
+// The first prompt of a process loads the drawing library.
+void PromptWaits(benchmark::State& state) {
+  ShowPrompt(1);
+  CountProcessor(state, [] { ShowPrompt(5); });
+}
+
+// The peer: a thread that wakes up as often and does nothing.
+void BareWakeUps(benchmark::State& state) {
+  CountProcessor(state, [] {
+    for (int tick = 0; tick < 500; ++tick) {
+      std::this_thread::sleep_for(10ms);
+    }
+  });
+}
+
 BENCHMARK(DialogToFirstPaint)->UseManualTime()->Iterations(10)->Unit(benchmark::kMillisecond);
 BENCHMARK(MovedButton)->UseManualTime()->Iterations(200)->Unit(benchmark::kMillisecond);
 BENCHMARK(MovedDialog)->UseManualTime()->Iterations(200)->Unit(benchmark::kMillisecond);
 BENCHMARK(PromptWaits)->UseManualTime()->Iterations(1)->Unit(benchmark::kMillisecond);
+BENCHMARK(BareWakeUps)->UseManualTime()->Iterations(1)->Unit(benchmark::kMillisecond);
 
 }  // namespace
 

@@ -20,11 +20,8 @@ void XmlAttribute::ReadAndWrite(ptstream& stream, Direction direction, unsigned 
     return;
   }
   auto& in = static_cast<iptstream&>(stream);
-  std::string text;
-  in.ReadString(text);
-  name = text;
-  in.ReadString(text);
-  value = text;
+  name = in.ReadText();
+  value = in.ReadText();
 }
 
 void XmlAttribute::CopyFrom(const Persistent* other) {

@@ -79,11 +79,8 @@ void XmlObject::WriteTo(optstream& out) {
 }
 
 void XmlObject::ReadFrom(iptstream& in) {
-  std::string text;
-  in.ReadString(text);
-  name = text;
-  in.ReadString(text);
-  value = text;
+  name = in.ReadText();
+  value = in.ReadText();
   in.LookAtPointer();  // parent and depth are those of the place that this element is read into
   in.ReadInteger();
   const auto asItIs = [](XmlAttribute& /*attribute*/) {};
@@ -92,8 +89,7 @@ void XmlObject::ReadFrom(iptstream& in) {
     ReadItems(in, count, GetProlog().declaration, asItIs);
   }
   for (std::uint32_t count = in.ReadUnsigned(); count > 0; --count) {
-    in.ReadString(text);
-    GetProlog().instructions.push_back(text);
+    GetProlog().instructions.emplace_back(in.ReadText());
   }
   ReadItems(in, in.ReadUnsigned(), children, [this](XmlObject& child) {
     child.parent = this;

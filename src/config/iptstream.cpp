@@ -71,21 +71,21 @@ std::uint32_t iptstream::ReadUnsigned() {
   return byte(0) | byte(1) | byte(2) | byte(3);
 }
 
-void iptstream::ReadString(std::string& text) {
+std::string_view iptstream::ReadText() {
   const std::uint32_t length = ReadUnsigned();
   if (const char* ready = TakeReady(length)) {
-    text.assign(ready, length);
-    return;
+    return {ready, length};
   }
   // Piece by piece: a length that lies takes no more memory than the stream has bytes.
-  text.clear();
+  pieces.clear();
   for (std::uint32_t left = length; left > 0;) {
     const std::uint32_t step = std::min(left, kLargestStep);
-    const std::size_t had = text.size();
-    text.resize(had + step);
-    Read(text.data() + had, step);
+    const std::size_t had = pieces.size();
+    pieces.resize(had + step);
+    Read(pieces.data() + had, step);
     left -= step;
   }
+  return pieces;
 }
 
 // What failed leaves objects half read and on their way out: nothing may follow it, and no pointer may lead to them.

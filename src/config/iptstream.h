@@ -6,6 +6,7 @@
 #include <istream>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <unordered_map>
 #include <variant>
 #include <vector>
@@ -27,7 +28,10 @@ class iptstream final : public ptstream {
 
   std::uint32_t ReadUnsigned();
   std::int32_t ReadInteger() { return static_cast<std::int32_t>(ReadUnsigned()); }
-  void ReadString(std::string& text);
+  void ReadString(std::string& text) { text = ReadText(); }
+
+  /// The same, good until the next call.
+  std::string_view ReadText();
 
   /// Reads a value record into an object. An object that was made for a pointer before moves here, and all pointers
   /// that were filled with it follow. Returns the object's number.
@@ -103,6 +107,7 @@ class iptstream final : public ptstream {
   std::uint32_t depth = 0;                         // of the objects being read
   std::uint32_t deepest = 0;                       // level that was reached since the innermost of them began
   bool broken = false;
+  std::string pieces;  // of the last ReadText, when its bytes came in pieces
 };
 
 }  // namespace panelglow

@@ -85,10 +85,9 @@ void LinuxWindowHost::Block(const void* key, const std::string& /*what*/, std::o
   };
   const Listed listed{waiters_, waiters_.insert(waiters_.end(), {key, OwnEvent()})};
   const Outside outside(*this);
-  host_linux::CurrentThread::Await(OwnEvent(), deadline);
   std::uint64_t count = 0;
-  if (::read(OwnEvent(), &count, sizeof count) < 0) {
-    return;  // nobody woke this thread: the deadline has come
+  if (host_linux::CurrentThread::Await(OwnEvent(), deadline) && ::read(OwnEvent(), &count, sizeof count) < 0) {
+    return;  // the descriptor is at its end, with its thread
   }
 }
 
