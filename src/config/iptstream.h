@@ -101,7 +101,7 @@ class iptstream final : public ptstream {
   const char* TakeReady(std::size_t size);
   [[noreturn]] void Fail(const std::string& message);
 
-  std::istream& bytes;
+  std::ios& bytes;                                 // buffer and state of the byte stream
   std::vector<indexed_pointer> table;              // by number
   std::unordered_map<std::uint32_t, Links> links;  // of the objects that were read through pointers, by number
   std::uint32_t depth = 0;                         // of the objects being read

@@ -15,6 +15,13 @@ constexpr std::size_t kFirstSlots = 64;  // a power of two
 // together than a pointer's size, and most are twice that.
 std::size_t HashOf(const Persistent* object) { return reinterpret_cast<std::uintptr_t>(object) / 16; }
 
+// Little-endian.
+void PutNumber(char* room, std::uint32_t value) {
+  for (std::size_t i = 0; i < sizeof(value); ++i) {
+    room[i] = static_cast<char>(value >> (8 * i));
+  }
+}
+
 const Persistent* IdentityOf(const Persistent& object) { return &object; }
 const Persistent* IdentityOf(const PersistentByProxy& object) { return &object.GetProxy(); }
 
@@ -30,23 +37,9 @@ inline char* optstream::RoomFor(std::size_t size) {
   return waiting.data() + std::exchange(filled, filled + size);
 }
 
-void optstream::Append(std::string_view text) {
-  if (text.size() > kPiece) {
-    HandOn();
-    Put(text);
-  } else {
-    std::copy(text.begin(), text.end(), RoomFor(text.size()));
-  }
-}
-
 inline void optstream::Append(std::uint8_t value) { *RoomFor(1) = static_cast<char>(value); }
 
-inline void optstream::Append(std::uint32_t value) {
-  char* const room = RoomFor(sizeof(value));
-  for (std::size_t i = 0; i < sizeof(value); ++i) {
-    room[i] = static_cast<char>(value >> (8 * i));
-  }
-}
+inline void optstream::Append(std::uint32_t value) { PutNumber(RoomFor(sizeof(value)), value); }
 
 inline void optstream::EndCall() {
   if (depth == 0) {
@@ -56,7 +49,7 @@ inline void optstream::EndCall() {
 
 void optstream::HandOn() {
   if (waiting.empty()) {
-    waiting.resize(kPiece);
+    waiting.resize(kPiece + sizeof(std::uint32_t));  // a text of a piece, behind its length
   }
   Put(std::string_view(waiting.data(), std::exchange(filled, 0)));
 }
@@ -79,8 +72,15 @@ void optstream::WriteString(std::string_view text) {
   if (length != text.size()) {
     throw std::runtime_error("A text of more than 4 GB");
   }
-  Append(length);
-  Append(text);
+  if (text.size() > kPiece) {
+    Append(length);
+    HandOn();
+    Put(text);
+  } else {
+    char* const room = RoomFor(sizeof(length) + text.size());
+    PutNumber(room, length);
+    std::copy(text.begin(), text.end(), room + sizeof(length));
+  }
   EndCall();
 }
 
@@ -95,6 +95,17 @@ void optstream::WritePointer(PersistentByProxy* object) {
   object == nullptr ? WriteNull() : WriteObject(kPointer, *object);
 }
 
+void optstream::WritePointerIfSeen(const Persistent* object) {
+  const std::uint32_t slot = object == nullptr || slots.empty() ? 0 : slots[SlotOf(object)];
+  slot == 0 ? WriteNull() : WriteReference(slot - 1);
+}
+
+void optstream::WriteReference(std::uint32_t number) {
+  Append(kReference);
+  Append(number);
+  EndCall();
+}
+
 void optstream::WriteNull() {
   Append(kNull);
   EndCall();
@@ -105,9 +116,7 @@ void optstream::WriteObject(std::uint8_t tag, Object& object) {
   MakeRoom();
   std::uint32_t& slot = slots[SlotOf(IdentityOf(object))];
   if (slot != 0) {
-    Append(kReference);
-    Append(slot - 1);
-    EndCall();
+    WriteReference(slot - 1);
     return;
   }
   if (depth >= kDeepestObject) {
@@ -129,10 +138,6 @@ void optstream::WriteObject(std::uint8_t tag, Object& object) {
 }
 
 // ---- the table of objects
-
-bool optstream::HasSeen(const Persistent* object) const {
-  return object != nullptr && !slots.empty() && slots[SlotOf(object)] != 0;
-}
 
 // The slot that holds the object, or the free one where it would go.
 std::size_t optstream::SlotOf(const Persistent* object) const {

@@ -32,24 +32,24 @@ class optstream final : public ptstream {
   void WritePointer(Persistent* object);
   void WritePointer(PersistentByProxy* object);
 
-  /// True when the object has been written, or is being written.
-  [[nodiscard]] bool HasSeen(const Persistent* object) const;
+  /// A pointer to an object that has been written, or is being written; the null pointer for any other.
+  void WritePointerIfSeen(const Persistent* object);
 
  private:
   template <class Object>
   void WriteObject(std::uint8_t tag, Object& object);
   void WriteNull();
+  void WriteReference(std::uint32_t number);
   char* RoomFor(std::size_t size);
   void Append(std::uint8_t value);
   void Append(std::uint32_t value);
-  void Append(std::string_view text);
   void EndCall();
   void HandOn();
   void Put(std::string_view text);
   [[nodiscard]] std::size_t SlotOf(const Persistent* object) const;
   void MakeRoom();
 
-  std::ostream& bytes;
+  std::ios& bytes;            // buffer and state of the byte stream
   std::vector<char> waiting;  // room for a piece, of which so much is filled
   std::size_t filled = 0;
   std::vector<const Persistent*> objects;  // by number; those of proxies by their identity
