@@ -65,7 +65,7 @@ inline std::uint8_t iptstream::ReadByte() {
 }
 
 std::uint32_t iptstream::ReadUnsigned() {
-  std::array<char, 4> raw;
+  std::array<char, 4> raw{};
   Read(raw.data(), raw.size());
   const auto byte = [&](std::size_t i) { return std::uint32_t{static_cast<std::uint8_t>(raw[i])} << (8 * i); };
   return byte(0) | byte(1) | byte(2) | byte(3);

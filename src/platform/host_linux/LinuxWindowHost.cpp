@@ -87,7 +87,7 @@ void LinuxWindowHost::Block(const void* key, const std::string& /*what*/, std::o
   const Outside outside(*this);
   std::uint64_t count = 0;
   if (host_linux::CurrentThread::Await(OwnEvent(), deadline) && ::read(OwnEvent(), &count, sizeof count) < 0) {
-    return;  // the descriptor is at its end, with its thread
+    return;  // cannot be: nobody but this thread empties its event
   }
 }
 
