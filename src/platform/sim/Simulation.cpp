@@ -98,7 +98,13 @@ class SimConsole : public Console {
       bytes.remove_prefix(static_cast<std::size_t>(written));
     }
   }
-  void WriteError(std::string_view bytes) override { std::fwrite(bytes.data(), 1, bytes.size(), stderr); }
+  void WriteError(std::string_view bytes) override {
+    if (capture_) {
+      errors_ += bytes;
+    } else {
+      std::fwrite(bytes.data(), 1, bytes.size(), stderr);
+    }
+  }
   void SetControlHandler(std::function<bool(std::uint32_t)> handler) override { handler_ = std::move(handler); }
 
   void Raise(std::uint32_t type) {
@@ -107,12 +113,17 @@ class SimConsole : public Console {
     }
   }
   [[nodiscard]] const std::string& Output() const { return output_; }
-  void Clear() { output_.clear(); }
+  [[nodiscard]] const std::string& Errors() const { return errors_; }
+  void Clear() {
+    output_.clear();
+    errors_.clear();
+  }
 
  private:
   Scheduler& scheduler_;
   bool capture_;
   std::string output_;
+  std::string errors_;
   std::function<bool(std::uint32_t)> handler_;
 };
 
@@ -504,6 +515,7 @@ desktop::WindowSystem& Simulation::Windows() { return parts_->windows; }
 Operator* Simulation::Person() { return parts_->person.get(); }
 const MachineDescription& Simulation::Description() const { return parts_->description; }
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
+const std::string& Simulation::Errors() const { return parts_->console.Errors(); }
 void Simulation::ClearOutput() { parts_->console.Clear(); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
 std::string Simulation::HardwareState() { return parts_->buses.State(); }

@@ -28,7 +28,7 @@ struct SimulationOptions {
   bool realTime = false;
   bool window = false;        // windows and front panel are shown on a display, for a person to take the test
   bool realFiles = false;     // the current directory's files are the machine's; otherwise all files live in memory
-  bool captureOutput = true;  // standard output is kept instead of written
+  bool captureOutput = true;  // standard output and standard error are kept instead of written
   std::string operatorPolicy = {};                                  // empty: nobody sits at the machine
   std::string screenshots = {};                                     // folder for PNG pictures, empty for none
   Microseconds timeLimit_us = Microseconds{25} * 3600 * 1'000'000;  // a little over the longest planned run, a day
@@ -59,6 +59,8 @@ class Simulation {
 
   /// What the program has written to standard output, when it is captured.
   [[nodiscard]] const std::string& Output() const;
+  /// What it has written to standard error, likewise.
+  [[nodiscard]] const std::string& Errors() const;
   void ClearOutput();
 
   /// A console control event, delivered on a thread of its own.

@@ -9,6 +9,7 @@
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMout.h"
 #include "harness/base/MessageFormat.h"
+#include "harness/base/Notices.h"
 #include "platform/sim/Simulation.h"
 
 namespace panelglow {
@@ -50,6 +51,15 @@ TEST_F(Output, LogsOnOneLineWithoutEscaping) {
   EXPECT_EQ(Lines(),
             "LogMessage 6 20000 \"one two three  \"four\"\" \"\"\nLogMessage 0 4294967295 \"\" \"\"\n"
             "LogMessage 14 1 \"-5\" \"\"\nLogMessage 14 1 \"false\" \"\"\n");
+}
+
+TEST_F(Output, TellsPeopleASentenceOnceAndTheControllerNothing) {
+  Notices::Forget();
+  Notices::Tell("The key \"a\nb\" has no value.");
+  Notices::Tell("Another.");
+  Notices::Tell("The key \"a\nb\" has no value.");
+  EXPECT_EQ(machine_.Errors(), "panelglow-diags: The key \"a b\" has no value.\npanelglow-diags: Another.\n");
+  EXPECT_EQ(Lines(), "");
 }
 
 TEST_F(Output, NamesTheClassAndResolvesTheTextInDebugMode) {
