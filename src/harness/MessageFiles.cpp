@@ -22,8 +22,10 @@ std::string BaseNameOf(const std::string& programPath) {
   return file.substr(0, file.find(".exe"));
 }
 
+// In the current folder; by that name when its path is too long for CurrentDirectoryPath.
 std::string MessageFilePath(const std::string& prefix, const std::string& programPath) {
-  return CDMUtil::CurrentDirectoryPath() + "\\" + prefix + BaseNameOf(programPath) + ".msg";
+  const std::string folder = CDMUtil::CurrentDirectoryPath();
+  return (folder.empty() ? "." : folder) + "\\" + prefix + BaseNameOf(programPath) + ".msg";
 }
 
 wstring WideIdOf(int id) { return CDMUtil::ToWString(CDMUtil::ToString(id)); }

@@ -3,6 +3,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <filesystem>
+
 #include "harness/CmdLineParser.h"
 #include "harness/OwnProcess.h"
 #include "platform/Host.h"
@@ -87,6 +90,27 @@ TEST_F(MessageFilesTest, AFileIsOpenedAtItsFirstUseAndReadAtEachLookUp) {
   EXPECT_EQ(TextOf(files, 1), "in time");
   Put("C:\\bench\\probe.msg", "[en_US]\n1=edited\n");
   EXPECT_EQ(TextOf(files, 1), "edited");
+}
+
+TEST(MessageFiles, AFolderOfAnyDepthMayHoldThem) {
+  EXPECT_EQ(InOwnProcess([] {
+              std::string top = (std::filesystem::temp_directory_path() / "panelglow-deep-XXXXXX").string();
+              std::filesystem::current_path(::mkdtemp(top.data()));
+              for (int i = 0; i < 3; ++i) {
+                const std::string folder(100, 'f');
+                std::filesystem::create_directory(folder);
+                std::filesystem::current_path(folder);
+              }
+              platform::sim::SimulationOptions options;
+              options.realFiles = true;
+              const Simulation machine(MachineDescription{}, options);
+              platform::TheHost().files.Write(".\\probe.msg", "[en_US]\n1=deep\n");
+              const std::string text = TextOf(MessageFiles("probe.exe", "", "en_US"), 1);
+              std::filesystem::current_path("/");
+              std::filesystem::remove_all(top);
+              return text;
+            }),
+            "deep");
 }
 
 TEST(MessageFiles, TwoThreadsMayReachThemFirstAtTheSameTime) {
