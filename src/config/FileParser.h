@@ -13,7 +13,8 @@
 #include <string_view>
 #include <vector>
 
-#include "platform/NamedMutexes.h"
+#include "config/FileLock.h"
+
 
 namespace panelglow {
 
@@ -91,7 +92,7 @@ class FileParser {
   int Convert(const std::string& section, const std::string& prefix, bool clear, int firstNumber);
 
   std::optional<std::vector<std::string>> sectionNames;  // read at first need
-  platform::NamedMutexLock mutex;
+  FileLock lock;
 };
 
 }  // namespace panelglow
