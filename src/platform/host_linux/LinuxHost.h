@@ -35,7 +35,7 @@ struct LinuxHost {
   LinuxMutexes mutexes;
   profile::ProfileFilesOnFiles profiles{files};
   LinuxThreads threads;
-  posix::LazyXmlDocuments xmlDocuments;
+  posix::LazyXmlDocuments xmlDocuments{files};
   Host host{clock,  console,    cpu,     desktop,  driver, environment, files,  images,
             inputs, management, mutexes, profiles, driver, threads,     inputs, xmlDocuments};
 };

@@ -414,7 +414,7 @@ struct Simulation::Parts {
   desktop::WindowSystem windows;
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
-  posix::LazyXmlDocuments xmlDocuments;
+  posix::LazyXmlDocuments xmlDocuments{files};
   Host host;
   std::unique_ptr<Operator> person;
   std::unique_ptr<SimScreen> screen;
