@@ -4,6 +4,7 @@
 #include "harness/CDMArgument.h"
 #include "harness/CmdLineParser.h"
 #include "harness/Probe.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
 namespace {
@@ -119,6 +120,32 @@ TEST(CDMDiag, AValueComesFromTheCommandLineThenTheDeclarationThenTheCaller) {
   };
   EXPECT_THAT(run.Lines(), StartsWith("LogMessage 1 1 \"30 fast caller true true 31 0\" \"\"\n"
                                       "LogMessage 1 2 \"true\" \"\"\n"));  // a hidden one is not explained
+}
+
+TEST(CDMDiag, ANumberThatIsNoneOrDoesNotFitIsToldWithWhatItCountsAs) {
+  for (const auto& [text, counts] :
+       std::initializer_list<std::pair<const char*, const char*>>{{"2147483647", nullptr},
+                                                                  {"-0x80000000", nullptr},
+                                                                  {"7FFF", "0"},
+                                                                  {"OxF9", "0"},
+                                                                  {"-", "0"},
+                                                                  {"2147483648", "2147483647"},
+                                                                  {"0xFFFFFFFF", "2147483647"},
+                                                                  {"0xFFFFFFFFFFFFFFFFF", "2147483647"}}) {
+    ProbeRun run{"-subtest=Probe -mode=" + std::string(text)};
+    run.prepare = [](Probe& probe) {
+      Notices::Forget();
+      probe.Declare("-Mode", CDMArgumentType::String, "");
+      static_cast<void>(probe.GetArgument("-Mode", 5));
+    };
+    EXPECT_EQ(run.Errors(),
+              counts == nullptr
+                  ? std::string()
+                  : "panelglow-diags: The parameter -Mode is \"" + std::string(text) +
+                        "\", which is no number of 32 bits, decimal or hexadecimal behind 0x: it counts "
+                        "as " +
+                        counts + ".\n");
+  }
 }
 
 TEST(CDMDiag, TheConfigurationFileOfThePromptsIsTheOneThatIsNamed) {

@@ -282,6 +282,6 @@ class LibXmlDocuments : public XmlDocuments {
 }  // namespace panelglow::platform
 
 /// The caller owns what is returned; `files` has to outlive it.
-extern "C" panelglow::platform::XmlDocuments* PanelglowXmlDocuments(panelglow::platform::Files& files) {
+extern "C" panelglow::platform::XmlDocuments* PanelglowXmlDocumentsOnFiles(panelglow::platform::Files& files) {
   return new panelglow::platform::LibXmlDocuments(files);
 }
