@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <optional>
 #include <stdexcept>
+#include <utility>
 
 #include "config/XmlObject.h"
 #include "harness/CmdLineParser.h"
@@ -109,16 +110,22 @@ struct OldLog {
   std::string problem;
 };
 
-// Comments come as instructions; they are written back as what they were.
-void RestoreComments(XmlObject& element) {
+// A comment that came as an instruction, as what it was; anything else as it is.
+std::string CommentOf(const std::string& instruction) {
   const std::string mark = "<?" + std::string(platform::kXmlComment);
-  for (std::string& instruction : element.GetProlog().instructions) {
-    if (instruction.starts_with(mark)) {
-      std::string_view content = std::string_view(instruction).substr(mark.size());
-      content.remove_prefix(content.starts_with(' ') ? 1 : 0);
-      content.remove_suffix(std::string_view("?>").size());
-      instruction = "<!--" + std::string(content) + "-->";
-    }
+  if (!instruction.starts_with(mark)) {
+    return instruction;
+  }
+  std::string_view content = std::string_view(instruction).substr(mark.size());
+  content.remove_prefix(content.starts_with(' ') ? 1 : 0);
+  content.remove_suffix(std::string_view("?>").size());
+  return "<!--" + std::string(content) + "-->";
+}
+
+void RestoreComments(XmlObject& element) {
+  if (!std::as_const(element).GetProlog().instructions.empty()) {
+    std::vector<std::string>& instructions = element.GetProlog().instructions;
+    std::transform(instructions.begin(), instructions.end(), instructions.begin(), CommentOf);
   }
   for (XmlObject& child : element.children) {
     RestoreComments(child);

@@ -158,9 +158,7 @@ TEST(SystemBadInput, OutputThatNobodyGetsIsNoPass) {
     installation.Write("run.sh", "{ " + program.string() +
                                      " -subtest=CustomLEDTest -SectionID=Desktop -DataCollectionFile=log.xml; "
                                      "echo $? >code; } " +
-                                     redirection + "
-exit "$(cat code)"
-");
+                                     redirection + "\nexit \"$(cat code)\"\n");
     const Outcome outcome = RunProgram("/bin/sh", {"run.sh"}, installation.Path(""),
                                        {{"PANELGLOW_SIM_MACHINE", machine}, {"PANELGLOW_SIM_OPERATOR", "perfect"}});
     EXPECT_EQ(outcome.exitCode, 1) << redirection;

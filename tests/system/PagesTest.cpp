@@ -55,7 +55,11 @@ std::vector<Block> BlocksOf(const fs::path& page) {
       const bool continues = goesOn && !commands.empty();
       goesOn = line.ends_with('\\');
       line.resize(line.size() - (goesOn ? 1 : 0));
-      continues ? void(commands.back() += line) : commands.push_back(line);
+      if (continues) {
+        commands.back() += line;
+      } else {
+        commands.push_back(line);
+      }
     } else if (line.starts_with("    ")) {
       blocks.push_back({page.filename(), "indented", {line}});
     }
