@@ -125,7 +125,12 @@ TEST(DataCollectionLog, WhateverTheStrictCheckTakesIsAddedToAndKept) {
 }
 
 TEST(DataCollectionLog, AFileThatCannotBeAddedToWithoutALossStaysAsItIsAndPeopleAreToldWhy) {
-  const std::pair<const char*, const char*> kCases[] = {
+  std::string deep = "<a>";
+  for (int i = 0; i < 300; ++i) {
+    deep = "<a>" + deep + "</a>";
+  }
+  const std::pair<std::string, const char*> kCases[] = {
+      {deep + "</a>", "elements are nested deeper than 256 levels"},
       {"<a><b></a>", "Opening and ending tag mismatch"},
       {"<a>\n<b/>text</a>", "line 2: text stands behind an element."},
       {"<a><b c='1' C='2'/></a>", "line 1: two attributes differ in the case of their names only (C)."},
@@ -137,7 +142,7 @@ TEST(DataCollectionLog, AFileThatCannotBeAddedToWithoutALossStaysAsItIsAndPeople
   for (const auto& [before, reason] : kCases) {
     const std::string log = LogOf(" log.xml ", before);
     EXPECT_THAT(log,
-                ::testing::StartsWith(std::string(before) +
+                ::testing::StartsWith(before +
                                       "LogMessage 14 8 \"XML file is corrupted! The subtest will continue "
                                       "without writing data to the XML file.\" \"\"\npanelglow-diags: The "
                                       "structured log log.xml is left as it is, without a record of this run: "));

@@ -24,7 +24,8 @@ std::string Qualified(const xmlNs* space, const xmlChar* name) {
   return (prefix.empty() ? std::string() : std::string(prefix) + ":") + std::string(Plain(name));
 }
 
-// Writes one document, remembering the first thing that has no place in the form. No deeper than the parser allows.
+// Writes one document, remembering the first thing that has no place in the form. It recurses once a level of
+// elements, of which documents have few hundred at most.
 class Writer {
  public:
   void WriteDocument(const xmlDoc& document) {
