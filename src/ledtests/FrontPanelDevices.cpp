@@ -53,7 +53,7 @@ void FrontPanelTest::AddDevice(std::int32_t deviceId, std::uint8_t address, cons
 void FrontPanelTest::AddDevice(const ArrayRow& row, MotherBoard* board) {
   const LedKind* const kind = FindLedKindByFunction(row.function);
   if (kind != nullptr && IsSupported(board, row.question)) {
-    const bool isDrive = kind->deviceId == kHdRed;
+    const bool isDrive = kind->deviceId == kHdRed || kind->deviceId == kIdeDrive || kind->deviceId == kScsiDrive;
     AddDevice(kind->deviceId, isDrive ? std::uint8_t{0} : static_cast<std::uint8_t>(kind->deviceId), "");
   }
 }

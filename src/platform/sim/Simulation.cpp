@@ -10,6 +10,7 @@
 #include <ctime>
 #include <map>
 
+#include "platform/AbsentDevices.h"
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
@@ -329,8 +330,28 @@ struct Simulation::Parts {
         windowHost(scheduler),
         windows(windowHost, description.screenWidth, description.screenHeight),
         images(drawing),
-        host{clock,    console,    cpu,     windows,  driver, environment, files,    images,
-             keyboard, management, mutexes, profiles, driver, threads,     touchpad, xmlDocuments} {}
+        host{.cameras = devices,
+             .clock = clock,
+             .connections = devices,
+             .console = console,
+             .cpu = cpu,
+             .desktop = windows,
+             .deviceTree = devices,
+             .drivers = driver,
+             .environment = environment,
+             .files = files,
+             .images = images,
+             .keyboard = keyboard,
+             .management = management,
+             .modules = devices,
+             .mutexes = mutexes,
+             .profiles = profiles,
+             .rawDisks = devices,
+             .registry = devices,
+             .services = driver,
+             .threads = threads,
+             .touchpad = touchpad,
+             .xmlDocuments = xmlDocuments} {}
 
   static KeyboardDevice& AttachKeyboard(Buses& buses) {
     auto keyboard = std::make_unique<KeyboardDevice>();
@@ -415,6 +436,7 @@ struct Simulation::Parts {
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
   posix::LazyXmlDocuments xmlDocuments;
+  AbsentDevices devices;
   Host host;
   std::unique_ptr<Operator> person;
   std::unique_ptr<SimScreen> screen;
