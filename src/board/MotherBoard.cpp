@@ -63,7 +63,7 @@ constexpr const char* kLegacyPorts = "the ports of the oldest desktops are used 
 [[noreturn]] void RefuseNotBuilt(const std::string& what, const Setting& setting, const std::string& served) {
   const std::string text = setting.place + ": " + what + " \"" + setting.text +
                            "\" is not built into this version, which cannot drive " + served;
-  Notices::Tell(text);
+  Notices::Tell(text + ".");
   throw NotBuiltException(text);
 }
 
@@ -86,11 +86,11 @@ Setting SelectClass(const std::string& classKey, const std::string& systemId) {
   if (ReadIniValue("chips", kNotFound) != kNotFound) {
     return "generic";
   }
-  Notices::Tell("this machine's board is not known: " +
+  Notices::Tell("This machine's board is not known: " +
                 (systemId.empty() ? "the firmware tables name no base board product"
                                   : "its system id is \"" + systemId + "\"") +
                 ", and " + IniReader::Instance().DescribeSections() + "; without \"" + classKey +
-                "\" or \"chips\" there, " + kLegacyPorts);
+                "\" or \"chips\" there, " + kLegacyPorts + ".");
   return {};
 }
 
@@ -284,7 +284,7 @@ bool MotherBoard::SwitchOn(ChipChoice& choice, bool (Chip::*operation)()) {
   const bool done = (ChipOf(choice).*operation)();
   choice.wasLit = choice.wasLit || done;
   if (!done) {
-    Notices::Tell(std::string("the ") + choice.what + " cannot be lit: " + WhyNothing(choice));
+    Notices::Tell(std::string("The ") + choice.what + " cannot be lit: " + WhyNothing(choice) + ".");
   }
   return done;
 }
@@ -292,7 +292,7 @@ bool MotherBoard::SwitchOn(ChipChoice& choice, bool (Chip::*operation)()) {
 bool MotherBoard::SwitchOff(ChipChoice& choice, bool (Chip::*operation)()) {
   const bool done = (ChipOf(choice).*operation)();
   if (!done && choice.wasLit) {
-    Notices::Tell(std::string("the ") + choice.what + " cannot be darkened: " + WhyNothing(choice));
+    Notices::Tell(std::string("The ") + choice.what + " cannot be darkened: " + WhyNothing(choice) + ".");
   }
   return done;
 }

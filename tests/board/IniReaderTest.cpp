@@ -114,7 +114,7 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
       {[&] { ParseByteList(ReadChipSetting("g_ec", "j", "")); }, chip + "\"j\": \"x\"" + none},
       {[&] { ParseByteList("x"); }, ""},  // of no file
       {[&] { ParseSequence(ReadChipSetting("g_ec", "list", ""), sequence, 16); },
-       chip + "\"list\": \"B40\"" + none + "\npanelglow-diags: " + chip +
+       chip + "\"list\": \"B40\"" + none + ".\npanelglow-diags: " + chip +
            "\"list\": \"300\" does not fit into 8 bits and counts as 0x2C"},
       {[&] { EXPECT_THROW(ParsePairs<std::uint8_t>(ReadChipSetting("g_ec", "i", "")), mblib_exception); },
        chip + "\"i\": malformed sequence entry: '0xFFFF'. should be: 'cmd:data[.data]*,...'"},
@@ -125,7 +125,7 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
   for (const auto& [read, told] : kReads) {
     bench.machine.ClearOutput();
     read();
-    EXPECT_EQ(bench.machine.Errors(), told.empty() ? "" : "panelglow-diags: " + told + "\n");
+    EXPECT_EQ(bench.machine.Errors(), told.empty() ? "" : "panelglow-diags: " + told + ".\n");
   }
 }
 

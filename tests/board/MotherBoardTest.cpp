@@ -201,7 +201,7 @@ TEST(MotherBoard, AClassOrChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
   const std::string noClass = refusal([] { BoardBench::Board(); });
   EXPECT_EQ(noClass, ".\\mbdetect.ini, section [7D10], key \"platform\": the board class \"cbb\" " + end +
                          "this machine's LEDs");
-  EXPECT_EQ(bench.machine.Errors(), "panelglow-diags: " + noClass + "\n");
+  EXPECT_EQ(bench.machine.Errors(), "panelglow-diags: " + noClass + ".\n");
   for (const char* oldest : {"Lantern", "Orchard"}) {
     bench.SetFiles(std::string("[7D10]\nMotherboardClass=") + oldest + "\n", "", "");
     EXPECT_EQ(BoardBench::Board(), nullptr);
@@ -246,7 +246,7 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
       {generic,
        "",
        "",
-       {"the power LED cannot be lit: the key \"test.powerled.chip\" names no chip for it; section [7D10] is in "
+       {"The power LED cannot be lit: the key \"test.powerled.chip\" names no chip for it; section [7D10] is in "
         ".\\mbdetect.ini, not in .\\mbtest.ini"}},
       {generic,
        "[7D10]\ntest.powerled.chip=g_iospce\n",
@@ -261,7 +261,7 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
       {generic,
        "[7D10]\ntest.powerled.chip=g_iospace\n",
        "[g_iospace]\npowerled.green.assert.sequence=0xA20:1\n",
-       {"the power LED cannot be darkened: the chip \"g_iospace\""}},
+       {"The power LED cannot be darkened: the chip \"g_iospace\""}},
       {generic,
        "[7D10]\ntest.powerled.chip=g_iospace\ntest.powerled.redled.support=maybe\ntest.panelglow.uselegacy=1\n",
        lamp,

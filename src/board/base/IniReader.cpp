@@ -126,7 +126,7 @@ IniReader::Result IniReader::LookUpChip(const std::string& chipSection, const st
 void IniReader::TellOfMissingBase(const IniFile& file, const std::string& from, const std::string& path,
                                   const std::string& base) const {
   if (IniFile(file).GetSection(base, "").empty()) {
-    Notices::Tell(PlaceOf(path, from, kBaseKey) + ": there is no section [" + base + "]");
+    Notices::Tell(PlaceOf(path, from, kBaseKey) + ": there is no section [" + base + "].");
   }
 }
 

@@ -18,7 +18,7 @@ struct Setting {
   std::string place;  // as in messages: file, section, key; empty for a default
 };
 
-/// Tells people `what` of a setting that has a place.
+/// Tells people `what` (a sentence without its full stop) of a setting that has a place.
 void TellOf(const Setting& setting, const std::string& what);
 
 /// Tells people when a token of a setting is no number, or one that does not fit into `bits`; `counted` is what it
