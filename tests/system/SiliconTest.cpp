@@ -110,6 +110,21 @@ TEST(SystemSilicon, AWrongWordInTheIniFilesShowsOnThePanelOrInWhatIsLeftBehind) 
   }
 }
 
+// A board that this version cannot drive is no unknown one: the ports of other boards are left alone.
+TEST(SystemSilicon, ABoardClassThatIsNotBuiltEndsTheRunBeforeAnyPortIsTouched) {
+  for (const char* words : {"platform=cbb", "MotherboardClass=Orchard"}) {
+    const Installation installation;
+    installation.Write("mbdetect.ini", std::string("[7E40]\n") + words + "\n");
+    const Outcome outcome = LedRun(installation.Machine("unknown-board.toml"), "Desktop").In(installation);
+    EXPECT_TRUE(outcome.IsOrderly());
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_THAT(outcome.errors, HasSubstr("is not built into this version, which cannot drive this machine's LEDs."));
+    EXPECT_THAT(outcome.Tagged("ReportFailure"), IsEmpty());  // no LED is blamed
+    EXPECT_THAT(outcome.leftBehind, IsEmpty());
+    EXPECT_EQ(outcome.TimesLit("power-green") + outcome.TimesLit("power-red") + outcome.TimesLit("drive-red"), 0U);
+  }
+}
+
 // Standard error is for what is odd: a machine with its sections is not, a board without them is.
 TEST(SystemSilicon, AGoodRunTellsPeopleNothing) {
   const std::pair<const char*, const char*> kMachines[] = {

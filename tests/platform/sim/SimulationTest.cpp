@@ -3,6 +3,7 @@
 
 #include <gmock/gmock.h>
 
+#include <csignal>
 #include <filesystem>
 
 #include "platform/sim/Operator.h"
@@ -128,6 +129,24 @@ TEST(Simulation, ASimulatedDriveRootNeverReachesTheRealSystem) {
   EXPECT_EQ(files.Read("\\panelglow-test.ctl"), "x");
   EXPECT_FALSE(std::filesystem::exists("/panelglow-test.ctl"));
   EXPECT_FALSE(files.CanRead("C:\\ProgramData\\x"));
+}
+
+TEST(Simulation, AnInterruptThatComesBeforeTheProgramListensIsHeardOnceItDoes) {
+  std::vector<std::uint32_t> heard;
+  {
+    Simulation machine("", {.captureOutput = false});
+    std::raise(SIGINT);
+    machine.Time().SleepFor(1000);
+    machine.TheMachine().console.SetControlHandler([&](std::uint32_t type) {
+      heard.push_back(type);
+      return true;
+    });
+    machine.Time().SleepFor(1000);
+  }
+  for (const int number : {SIGINT, SIGTERM}) {
+    std::signal(number, SIG_DFL);
+  }
+  EXPECT_EQ(heard, std::vector<std::uint32_t>{kControlC});
 }
 
 }  // namespace
