@@ -17,9 +17,12 @@ namespace {
 
 volatile std::sig_atomic_t g_childPid = 0;
 
-// A terminal sends its interrupt to both processes at once; a termination reaches this one alone.
+constexpr int kPassedOn[] = {SIGINT, SIGTERM, SIGHUP, SIGQUIT};
+
+// The child has a process group of its own, so that what a terminal sends reaches this process alone, and the child
+// gets it once.
 extern "C" void PassOn(int number) {
-  if (g_childPid > 0 && number == SIGTERM) {
+  if (g_childPid > 0) {
     ::kill(g_childPid, number);
   }
 }
@@ -28,8 +31,9 @@ void PassSignalsOn() {
   struct sigaction action {};
   action.sa_handler = PassOn;
   action.sa_flags = SA_RESTART;
-  ::sigaction(SIGINT, &action, nullptr);
-  ::sigaction(SIGTERM, &action, nullptr);
+  for (const int number : kPassedOn) {
+    ::sigaction(number, &action, nullptr);
+  }
 }
 
 std::vector<char*> Pointers(std::vector<std::string>& texts) {
@@ -63,8 +67,13 @@ ChildProcess::ChildProcess(const Command& command) {
   posix_spawn_file_actions_t actions;
   ::posix_spawn_file_actions_init(&actions);
   ::posix_spawn_file_actions_adddup2(&actions, pipe[1], STDOUT_FILENO);
-  const int error = ::posix_spawn(&pid_, command.program.c_str(), &actions, nullptr, Pointers(arguments).data(),
+  posix_spawnattr_t attributes;
+  ::posix_spawnattr_init(&attributes);
+  ::posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);
+  ::posix_spawnattr_setpgroup(&attributes, 0);
+  const int error = ::posix_spawn(&pid_, command.program.c_str(), &actions, &attributes, Pointers(arguments).data(),
                                   Pointers(environment).data());
+  ::posix_spawnattr_destroy(&attributes);
   ::posix_spawn_file_actions_destroy(&actions);
   ::close(pipe[1]);
   output_ = pipe[0];

@@ -35,7 +35,8 @@ class ChildProcess {
   /// The next piece of the child's standard output as soon as there is one; nothing at its end.
   std::optional<std::string> Read();
 
-  /// Waits for the end. Interrupts and terminations that reach this process meanwhile go to the child, which decides.
+  /// Waits for the end. Interrupts, terminations and the loss of the terminal that reach this process meanwhile go to
+  /// the child, which decides.
   End Wait();
 
  private:

@@ -2,7 +2,22 @@
 
 #include <cstdlib>
 
+#include "controller/ResultWords.h"
+
 namespace panelglow::controller {
+
+namespace {
+
+// "the red power LED was not recognised [ReportFailure 770134]".
+std::string InWords(const std::string& result) {
+  const std::size_t code = result.find(' ') + 1;
+  const std::string words = WordsFor(result.substr(code, result.find(' ', code) - code));
+  const bool isReport = result.rfind("ReportFailure ", 0) == 0;
+  const std::string plain = isReport ? "the test failed" : "the code that the installation gives this button";
+  return (words.empty() ? plain : words) + " [" + result + "]";
+}
+
+}  // namespace
 
 ProtocolFollower::Kind ProtocolFollower::Take(const std::string& line) {
   linesBehindEnd_ = linesBehindEnd_ || ends_ > 0;
@@ -31,8 +46,10 @@ std::string ProtocolFollower::Verdict(int exitCode) const {
     return exitCode == 0 ? "ANSWERED: nothing was tested" : "REFUSED: nothing was tested";
   }
   std::string text = exitCode == 0 ? "PASSED" : "FAILED";
+  const char* separator = ": ";
   for (const std::string& result : results_) {
-    text += ": " + result;
+    text += separator + InWords(result);
+    separator = "; ";
   }
   return text + " (exit code " + std::to_string(exitCode) + ")";
 }

@@ -23,7 +23,7 @@ class ProtocolFollower {
   /// "ReportFailure" and one "TestFailed". A run that answers a question prints none of them.
   [[nodiscard]] bool IsOrderly() const { return ends_ <= 1 && !linesBehindEnd_ && failures_ <= 1 && faults_ <= 1; }
 
-  /// One line for people: passed or failed, with the codes.
+  /// One line for people: passed or failed, why in words, and the codes behind them.
   [[nodiscard]] std::string Verdict(int exitCode) const;
 
  private:

@@ -291,6 +291,7 @@ int main(int argc, char** argv) {
   app.add_flag("--raw", options.raw, "pass the program's lines through unchanged, and nothing else");
   app.add_option("ARGS", options.arguments, "parameters of the program, behind --: -subtest=CustomLEDTest ...");
   app.positionals_at_end();
+  app.footer("\nOperators:\n" + sim::Operator::PolicyHelp() + "\nFaults of a LED:\n" + sim::LedFaultHelp());
   try {
     app.parse(argc, argv);
   } catch (const CLI::ParseError& error) {

@@ -51,7 +51,10 @@ TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
                                 "-Retries=0", "-SectionID=Desktop"});
   EXPECT_THAT(outcome.output, HasSubstr("  50 %\n"));
   EXPECT_THAT(outcome.output, HasSubstr("green, power-gpio.0, lit 0 times, FAULT: dead\n"));
-  EXPECT_THAT(outcome.output, EndsWith("FAILED: ReportFailure 770133: TestFailed 771017 \"\" (exit code 1)\n"));
+  EXPECT_THAT(outcome.output,
+              EndsWith("FAILED: the green power LED was not recognised [ReportFailure 770133]; the code that the "
+                       "installation gives this button [TestFailed 771017 \"\"] (exit code 1)\n"));
+  EXPECT_THAT(outcome.output, HasSubstr(" presses \"N&um Lock\" (1003)\n"));
   EXPECT_THAT(outcome.output, Not(HasSubstr("\x1B")));  // no colour where no terminal is
   EXPECT_THAT(installation.Read("trace.txt"), HasSubstr("0A20"));
   EXPECT_THAT(installation.Read("pictures/01-prompt.png"), StartsWith("\x89PNG"));

@@ -170,6 +170,7 @@ TEST(SystemVerdict, TheStatusIndicatorBlinksUntilItsTimeIsUpOrItIsStoppedAndPuts
   const Case kCases[] = {{{subtest, "-BlinkTime=1"}, "", "power-green", 57},
                          {{subtest, "-BlinkTime=1", "-BlinkType=RedPower|HardDrive"}, "", "power-red", 57},
                          {{subtest, "-BlinkTime=1", "-BlinkSpeed=5000"}, "", "power-green", 6},
+                         {{subtest, "-BlinkTime=1", "-BlinkType=HardDrive"}, "", "power-green", 0},
                          {{subtest}, Event("console = 1"), "power-green", 5},
                          {{subtest}, Event("write_file = '\\kill.ctl'"), "power-green", 5}};
   for (const Case& c : kCases) {
@@ -180,6 +181,10 @@ TEST(SystemVerdict, TheStatusIndicatorBlinksUntilItsTimeIsUpOrItIsStoppedAndPuts
     EXPECT_EQ(outcome.exitCode, 0);
     EXPECT_TRUE(outcome.IsOrderly());
     EXPECT_NEAR(static_cast<double>(outcome.TimesLit(c.led)), static_cast<double>(c.blinks), 2);
+    const bool changes = std::any_of(outcome.edges.begin(), outcome.edges.end(),
+                                    [&](const Edge& edge) { return edge.time_us > 0 && edge.led == c.led; });
+    EXPECT_EQ(changes, c.blinks != 0);  // a type without a power colour leaves the lamp as it is, and is told
+    EXPECT_EQ(outcome.errors.find("names neither") != std::string::npos, c.blinks == 0) << outcome.errors;
     EXPECT_EQ(PercentagesOf(outcome), " 1 100");
     EXPECT_THAT(outcome.leftBehind, IsEmpty());
   }

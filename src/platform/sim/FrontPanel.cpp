@@ -11,16 +11,19 @@ namespace {
 struct FaultName {
   std::string_view name;
   LedFault fault;
+  std::string_view help;
 };
 
-constexpr std::array<FaultName, 8> kFaultNames{{{"dead", LedFault::kDead},
-                                                {"stuck", LedFault::kStuck},
-                                                {"wrong-color", LedFault::kWrongColor},
-                                                {"swapped", LedFault::kSwapped},
-                                                {"shorted", LedFault::kShorted},
-                                                {"inverted", LedFault::kInverted},
-                                                {"lying-write", LedFault::kLyingWrite},
-                                                {"absent-chip", LedFault::kAbsentChip}}};
+constexpr std::array<FaultName, 8> kFaultNames{{
+    {"dead", LedFault::kDead, "never lights"},
+    {"stuck", LedFault::kStuck, "is always lit"},
+    {"wrong-color", LedFault::kWrongColor, "glows in another colour: green where it should be red, else red"},
+    {"swapped", LedFault::kSwapped, "swapped:OTHER lights in the place of the LED OTHER, and OTHER in its place"},
+    {"shorted", LedFault::kShorted, "shorted:OTHER lights whenever it or the LED OTHER does, and so does OTHER"},
+    {"inverted", LedFault::kInverted, "is dark where it should be lit; a blink looks the same"},
+    {"lying-write", LedFault::kLyingWrite, "writes to its register are lost"},
+    {"absent-chip", LedFault::kAbsentChip, "the part that drives it is not there"},
+}};
 
 // The colour that a wrongly fitted LED has instead.
 std::string WrongColor(const std::string& color) { return color == "red" ? "green" : "red"; }
@@ -39,6 +42,15 @@ std::string LedFaultNames() {
     names += (names.empty() ? "" : ", ") + std::string(fault.name);
   }
   return names;
+}
+
+std::string LedFaultHelp() {
+  std::string text;
+  for (const FaultName& fault : kFaultNames) {
+    text +=
+        "  " + std::string(fault.name) + std::string(13 - fault.name.size(), ' ') + std::string(fault.help) + "\n";
+  }
+  return text;
 }
 
 FrontPanel::FrontPanel(std::vector<Led> leds, PinReader reader)

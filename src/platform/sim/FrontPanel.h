@@ -69,4 +69,7 @@ std::optional<LedFault> LedFaultByName(std::string_view name);
 /// All names of faults, separated by ", ".
 std::string LedFaultNames();
 
+/// What each fault does, a line each.
+std::string LedFaultHelp();
+
 }  // namespace panelglow::platform::sim

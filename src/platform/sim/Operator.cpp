@@ -51,26 +51,48 @@ constexpr std::array<Knowledge, 14> kKnowledge{{
     {"microphone-mute", {"amber", "white", "red"}, 1027},
 }};
 
-struct PolicyName {
+struct PolicyRow {
   std::string_view name;
   unsigned number;  // when the policy does not say
+  std::string_view help;
 };
 
-constexpr std::array<PolicyName, 9> kPolicies{{{"perfect", 0},
-                                               {"wrong", 1},
-                                               {"slow", 5},
-                                               {"cancel", 1},
-                                               {"silent", 0},
-                                               {"random", 0},
-                                               {"first", 0},
-                                               {"elimination", 0},
-                                               {"script", 0}}};
+constexpr std::array<PolicyRow, 9> kPolicies{{
+    {"perfect", 0, "presses the button of the LED that blinks, \"no LED\" when none does"},
+    {"wrong", 1, "wrong:N is wrong once, at the N-th answer (1), and perfect otherwise, also at a retry"},
+    {"slow", 5, "slow:S answers rightly S seconds late (5)"},
+    {"cancel", 1, "cancel:N presses the cancel button once, at the N-th answer (1), and is perfect otherwise"},
+    {"silent", 0, "confirms prompts and never answers a LED"},
+    {"random", 0, "never looks, presses any LED button"},
+    {"first", 0, "never looks, always presses the first LED button"},
+    {"elimination", 0, "never looks, presses each LED button once, in a random order"},
+    {"script", 0, "script:FILE clicks at given times; each line of FILE is \"<milliseconds> <control id>\""},
+}};
+
+// A caption as it is read: "&&" is an ampersand, a single one marks a letter.
+std::string CaptionOf(const std::u16string& text) {
+  std::u16string caption;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    i += text[i] == u'&' && i + 1 < text.size() ? 1 : 0;
+    caption += text[i];
+  }
+  return Utf8FromWide(caption);
+}
 
 }  // namespace
 
+std::string Operator::PolicyHelp() {
+  std::string text;
+  for (const PolicyRow& policy : kPolicies) {
+    text +=
+        "  " + std::string(policy.name) + std::string(13 - policy.name.size(), ' ') + std::string(policy.help) + "\n";
+  }
+  return text;
+}
+
 std::string Operator::PolicyNames() {
   std::string names;
-  for (const PolicyName& policy : kPolicies) {
+  for (const PolicyRow& policy : kPolicies) {
     names += (names.empty() ? "" : ", ") + std::string(policy.name);
   }
   return names;
@@ -82,7 +104,7 @@ Operator::Operator(Simulation& simulation, const std::string& policy)
   const std::string name = policy.substr(0, colon);
   const std::string detail = colon == std::string::npos ? "" : policy.substr(colon + 1);
   const auto found =
-      std::find_if(kPolicies.begin(), kPolicies.end(), [&](const PolicyName& p) { return p.name == name; });
+      std::find_if(kPolicies.begin(), kPolicies.end(), [&](const PolicyRow& p) { return p.name == name; });
   if (found == kPolicies.end()) {
     throw MachineError("there is no operator \"" + name + "\" (" + PolicyNames() + ")");
   }
@@ -112,7 +134,8 @@ std::vector<Operator::Button> Operator::ButtonsOnTop(desktop::WindowSystem& wind
       continue;
     }
     const Rectangle area = windows.ScreenRectangle(child);
-    buttons.push_back({windows.ControlId(child), (area.left + area.right) / 2, (area.top + area.bottom) / 2});
+    buttons.push_back({windows.ControlId(child), (area.left + area.right) / 2, (area.top + area.bottom) / 2,
+                       CaptionOf(windows.WindowText(child))});
   }
   return buttons;
 }
@@ -247,7 +270,7 @@ void Operator::Press(const std::vector<Button>& buttons, int id) {
     return;
   }
   simulation_.Screenshot(id == kOkButton ? "prompt" : "press-" + std::to_string(id));
-  actions_.push_back({simulation_.Time().Now(), "presses " + std::to_string(id)});
+  actions_.push_back({simulation_.Time().Now(), "presses \"" + button->caption + "\" (" + std::to_string(id) + ")"});
   pressed_.push_back(id);
   turnBegan_ = simulation_.Time().Now();
   judged_.reset();

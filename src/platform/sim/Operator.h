@@ -25,22 +25,15 @@ struct OperatorAction {
 
 class Operator {
  public:
-  /// Policies, each with what follows a colon:
-  ///   perfect          presses the button of the LED that blinks, "no LED" when none does
-  ///   wrong[:N]        perfect, but wrong at the N-th answer (1)
-  ///   slow[:SECONDS]   perfect, but so many seconds late (5)
-  ///   cancel[:N]       perfect, but the cancel button at the N-th answer (1)
-  ///   silent           confirms prompts and never answers a LED
-  ///   random           never looks, presses any LED button
-  ///   first            never looks, always presses the first LED button
-  ///   elimination      never looks, presses each LED button once, in a random order
-  ///   script:FILE      timed clicks: lines of "<milliseconds> <control id>"
-  /// Throws MachineError for anything else.
+  /// `policy` is a name of PolicyHelp, with what follows a colon. Throws MachineError for anything else.
   Operator(Simulation& simulation, const std::string& policy);
 
   [[nodiscard]] const std::vector<OperatorAction>& Actions() const { return actions_; }
 
   static std::string PolicyNames();
+
+  /// What each policy does, a line each.
+  static std::string PolicyHelp();
 
  private:
   enum class Policy { kPerfect, kWrong, kSlow, kCancel, kSilent, kRandom, kFirst, kElimination, kScript };
@@ -49,6 +42,7 @@ class Operator {
     int id = 0;
     int x = 0;  // centre, on the screen
     int y = 0;
+    std::string caption = {};
   };
 
   void LookAgain();

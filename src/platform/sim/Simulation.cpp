@@ -492,8 +492,9 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
   }
   if (!options.captureOutput) {
     // The simulated console is the real one: an interrupt from outside is a control event of the machine.
-    std::signal(SIGINT, NoteSignal);
-    std::signal(SIGTERM, NoteSignal);
+    for (const int number : {SIGINT, SIGTERM, SIGHUP, SIGQUIT}) {
+      std::signal(number, NoteSignal);
+    }
     std::signal(SIGPIPE, SIG_IGN);
   }
   if (options.window) {

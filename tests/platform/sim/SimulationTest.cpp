@@ -1,7 +1,13 @@
 // The simulated machine: its file, its buses, its panel.
+#include "platform/posix/OwnedName.h"
 #include "platform/sim/Simulation.h"
 
 #include <gmock/gmock.h>
+#include <poll.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <thread>
 
 #include <csignal>
 #include <filesystem>
@@ -147,6 +153,33 @@ TEST(Simulation, AnInterruptThatComesBeforeTheProgramListensIsHeardOnceItDoes) {
     std::signal(number, SIG_DFL);
   }
   EXPECT_EQ(heard, std::vector<std::uint32_t>{kControlC});
+}
+
+// The files of the current folder are real, and so are the other processes that use them.
+TEST(SimulatedMachine, LocksOfRealFilesHoldAmongProcesses) {
+  SimulationOptions options;
+  options.realFiles = true;
+  Simulation machine(MachineDescription{}, options);
+  platform::NamedMutexes& mutexes = machine.TheMachine().mutexes;
+  const std::string name = "test" + std::to_string(::getpid()) + "_HalcyonFileParser";
+  const posix::OwnedName other(name);
+  posix::Descriptor owned = other.TryToOwn();
+  ASSERT_TRUE(owned);
+  std::atomic<bool> released{false};
+  std::thread otherProcess([&] {
+    pollfd waiter{owned.Get(), POLLIN, 0};
+    ::poll(&waiter, 1, -1);  // until the machine waits for it
+    released = true;
+    owned.Close();
+  });
+  {
+    const platform::NamedMutexLock lock(mutexes, name);
+    EXPECT_TRUE(released);
+    EXPECT_FALSE(other.TryToOwn());
+    const platform::NamedMutexLock again(mutexes, name);
+  }
+  otherProcess.join();
+  EXPECT_TRUE(other.TryToOwn());
 }
 
 }  // namespace

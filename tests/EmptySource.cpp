@@ -1,0 +1,1 @@
+// The source of the target that owns the precompiled headers.
