@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <span>
+#include <stdexcept>
 
 namespace panelglow::platform::driver {
 
@@ -65,8 +66,16 @@ inline constexpr std::size_t kMsrIndex = 4;
 inline constexpr std::size_t kFirmwareSize = 6;
 inline constexpr std::size_t kFirmwareAnswerSize = 2;
 
+/// Throws std::out_of_range for a field that a record does not have: the numbers above are wrong then.
+inline void RequireField(std::span<const std::byte> record, std::size_t offset, std::size_t width) {
+  if (offset + width > record.size()) {
+    throw std::out_of_range("a field behind the end of a driver's record");
+  }
+}
+
 /// The number of `width` bytes at `offset` of a record.
 inline std::uint64_t NumberAt(std::span<const std::byte> record, std::size_t offset, std::size_t width) {
+  RequireField(record, offset, width);
   std::uint64_t value = 0;
   for (std::size_t i = 0; i < width; ++i) {
     value |= std::to_integer<std::uint64_t>(record[offset + i]) << (8 * i);
@@ -76,6 +85,7 @@ inline std::uint64_t NumberAt(std::span<const std::byte> record, std::size_t off
 
 /// Stores the low `width` bytes of `value` there.
 inline void PutNumber(std::span<std::byte> record, std::size_t offset, std::size_t width, std::uint64_t value) {
+  RequireField(record, offset, width);
   for (std::size_t i = 0; i < width; ++i) {
     record[offset + i] = static_cast<std::byte>(value >> (8 * i));
   }

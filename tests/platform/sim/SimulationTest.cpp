@@ -7,10 +7,9 @@
 #include <unistd.h>
 
 #include <atomic>
-#include <thread>
-
 #include <csignal>
 #include <filesystem>
+#include <thread>
 
 #include "platform/sim/Operator.h"
 
@@ -149,7 +148,7 @@ TEST(Simulation, AnInterruptThatComesBeforeTheProgramListensIsHeardOnceItDoes) {
     });
     machine.Time().SleepFor(1000);
   }
-  for (const int number : {SIGINT, SIGTERM}) {
+  for (const int number : {SIGINT, SIGTERM, SIGHUP, SIGQUIT}) {
     std::signal(number, SIG_DFL);
   }
   EXPECT_EQ(heard, std::vector<std::uint32_t>{kControlC});
