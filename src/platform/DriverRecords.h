@@ -54,7 +54,8 @@ inline constexpr std::size_t kSearchIndex = 8;      // u16
 inline constexpr std::size_t kSearchLocation = 10;  // u16, answer
 inline constexpr std::size_t kSearchStatus = 12;    // u8, preset; 0 is success
 
-// ---- physical memory mapping request, by word size of the system: address, length, mapped address, each a word of it
+// ---- physical memory mapping request, by word size of the system: address, length, mapped address, each a word of
+// it
 inline constexpr std::size_t kMapSize32 = 20;
 inline constexpr std::size_t kMapSize64 = 40;
 
