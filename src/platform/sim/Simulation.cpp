@@ -113,6 +113,7 @@ class SimConsole : public Console {
       scheduler_.Start("console control", [handler = handler_, type] { handler(type); });
     }
   }
+  [[nodiscard]] bool IsHeard() const { return handler_ != nullptr; }
   [[nodiscard]] const std::string& Output() const { return output_; }
   [[nodiscard]] const std::string& Errors() const { return errors_; }
   void Clear() {
@@ -408,6 +409,26 @@ struct Simulation::Parts {
     });
   }
 
+  // Lets all chips come to the end of what they have under way. One can set the next one going only a few times.
+  void Settle() {
+    constexpr int kMostSteps = 100;
+    for (int step = 0; step < kMostSteps; ++step) {
+      std::optional<Microseconds> end;
+      for (const Device* chip : chips) {
+        if (const std::optional<Microseconds> until = chip->UnderWayUntil()) {
+          end = std::min(end.value_or(*until), *until);
+        }
+      }
+      if (!end) {
+        return;
+      }
+      scheduler.PassTo(*end);
+      for (Device* chip : chips) {
+        chip->Advance();
+      }
+    }
+  }
+
   SimulationOptions options;
   MachineDescription description;
   Scheduler scheduler;
@@ -506,7 +527,8 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
       if (parts_->screen) {
         parts_->screen->Look();
       }
-      for (std::uint32_t type = 0; type < 2; ++type) {
+      // What comes before the program listens waits for that, as it does between two hand-overs.
+      for (std::uint32_t type = 0; type < 2 && parts_->console.IsHeard(); ++type) {
         if (g_pendingSignals[type] != 0) {
           g_pendingSignals[type] = 0;
           RaiseConsole(type);
@@ -542,6 +564,10 @@ const std::string& Simulation::Errors() const { return parts_->console.Errors();
 void Simulation::ClearOutput() { parts_->console.Clear(); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
 std::string Simulation::HardwareState() { return parts_->buses.State(); }
+std::string Simulation::SettledState() {
+  parts_->Settle();
+  return HardwareState();
+}
 const std::string& Simulation::InitialState() const { return parts_->initialState; }
 bool Simulation::IsMutexOwned(std::string_view name) const { return parts_->mutexes.IsOwned(name); }
 

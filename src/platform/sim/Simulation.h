@@ -69,8 +69,12 @@ class Simulation {
   /// Saves a picture of the screen as "<number>-<what>.png" when there is a folder for it.
   void Screenshot(std::string_view what);
 
-  /// All registers and lock keys as text; for comparing before and after.
+  /// All registers and lock keys as text, as they are at this moment.
   [[nodiscard]] std::string HardwareState();
+
+  /// The same once the silicon has finished what is under way; for comparing before and after. Time passes for it,
+  /// but no thread runs.
+  [[nodiscard]] std::string SettledState();
 
   /// The same at the very start of the machine.
   [[nodiscard]] const std::string& InitialState() const;
