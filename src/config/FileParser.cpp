@@ -13,25 +13,12 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::size_t kLongestPath = 1024;
 constexpr std::size_t kLineBuffer = 1024;
 constexpr std::size_t kBufferStep = 10240;
 constexpr std::size_t kMostSteps = 31;
 constexpr std::size_t kConversionBuffer = 4096;
-constexpr const char* kMutexSuffix = "_HalcyonFileParser";
 
 platform::ProfileFiles& Profiles() { return platform::TheHost().profiles; }
-
-// One name for one file, however its path is spelled.
-std::string MutexNameOf(const std::string& file) {
-  std::string name = platform::TheHost().files.FullPath(file).substr(0, kLongestPath);
-  for (char& c : name) {
-    if (c == '\\' || c == ':' || c == '.' || c == '/') {
-      c = '_';
-    }
-  }
-  return name + kMutexSuffix;
-}
 
 // The texts of a list in which each is ended by a NUL.
 std::vector<std::string> TextsOf(std::string_view list) {
@@ -63,7 +50,7 @@ std::string Stripped(std::string_view field) {
 
 }  // namespace
 
-FileParser::FileParser(const std::string& file) : path(file), mutex(platform::TheHost().mutexes, MutexNameOf(file)) {}
+FileParser::FileParser(const std::string& file) : path(file), lock(file) {}
 
 std::vector<std::string> FileParser::ReadList(const ListCall& call, bool mustHaveContent) {
   for (std::size_t step = 1; step <= kMostSteps; ++step) {

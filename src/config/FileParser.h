@@ -12,7 +12,8 @@
 #include <string_view>
 #include <vector>
 
-#include "platform/NamedMutexes.h"
+#include "config/FileLock.h"
+
 
 namespace panelglow {
 
@@ -91,7 +92,7 @@ class FileParser {
   bool NextField(std::size_t& cursor, std::string& out) const;
   int Convert(const std::string& section, const std::string& prefix, bool clear, int firstNumber);
 
-  platform::NamedMutexLock mutex;
+  FileLock lock;
 };
 
 }  // namespace panelglow

@@ -1,35 +1,44 @@
-// The blink workers of CustomLEDTest: thread functions without arguments that make one LED blink until the operator
-// has answered or 50 cycles are over, and leave it as they found it. They talk to the dialog through the flags of
-// their entry in the device array; a LED that cannot blink fails in the operator's eyes.
+// The blink workers: thread functions that make one LED blink until the operator has answered or 50 cycles are over,
+// and leave it as they found it. They talk to the dialog through the flags of their entry in the device array; a LED
+// that cannot blink fails in the operator's eyes.
 #pragma once
 
 #include <cstdint>
 
 namespace panelglow {
 
-using BlinkWorker = void (*)();
+class FrontPanelTest;
+struct LEDStruct;
 
-void CustomBlinkNoLED();
-void CustomBlinkNumLockLED();
-void CustomBlinkCapsLockLED();
-void CustomBlinkScrollLockLED();
-void CustomBlinkRedPowerLED();
-void CustomBlinkGreenPowerLED();
-void CustomBlinkRedPowerLED_Legacy();
-void CustomBlinkGreenPowerLED_Legacy();
-void CustomBlinkRedHDLED();
-void CustomBlinkChargeLED();
-void CustomBlinkChargeRedLED();
-void CustomBlinkTouchpadLED();
+/// The entry is one of the test's device array and stays where it is for as long as the worker runs.
+using BlinkWorker = void (*)(FrontPanelTest& test, LEDStruct& entry);
+
+void CustomBlinkNoLED(FrontPanelTest& test, LEDStruct& entry);
+
+// Lock keys, by full presses: both on and off of a lock key are a toggle.
+void CustomBlinkNumLockLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkCapsLockLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkScrollLockLED(FrontPanelTest& test, LEDStruct& entry);
+
+// LEDs of the board library; the power LEDs and the red drive LED fall back to fixed registers without a board.
+void CustomBlinkRedPowerLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkGreenPowerLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkRedHDLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkChargeLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkChargeRedLED(FrontPanelTest& test, LEDStruct& entry);
 
 /// True when they blinked; false when there is no board.
-bool CustomBlinkSpeakerLed();
-bool CustomBlinkMicrophoneLed();
+bool CustomBlinkSpeakerLed(FrontPanelTest& test, LEDStruct& entry);
+bool CustomBlinkMicrophoneLed(FrontPanelTest& test, LEDStruct& entry);
 
-/// The worker of a LED kind; null for a kind that has none yet.
-BlinkWorker FindBlinkWorker(std::int32_t deviceId);
+// The fixed registers of machines whose board the INI files do not know.
+void CustomBlinkRedPowerLED_Legacy(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkGreenPowerLED_Legacy(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkRedHDLED_Legacy(FrontPanelTest& test, LEDStruct& entry);
+
+void CustomBlinkTouchpadLED(FrontPanelTest& test, LEDStruct& entry);
 
 /// Runs a worker as a thread's body: what ends it by an exception is logged, since nobody waits for its result.
-void RunBlinkWorker(BlinkWorker worker);
+void RunBlinkWorker(BlinkWorker worker, FrontPanelTest& test, LEDStruct& entry);
 
 }  // namespace panelglow

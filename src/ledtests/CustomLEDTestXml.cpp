@@ -1,7 +1,10 @@
 // The button files of CustomLEDTest: checked against their schemas, read, and merged into the list of buttons.
+#include <map>
 #include <stdexcept>
 
+#include "config/FileLock.h"
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "ledtests/CustomLEDTest.h"
 #include "ledtests/LedKind.h"
 #include "platform/Host.h"
@@ -100,28 +103,11 @@ std::unique_ptr<platform::XmlDocument> CustomLEDTest::LoadXMLForValidation(const
 }
 
 // The check runs on a copy beside the file, whose root names the schema; the file itself is never changed. A copy
-// that does not fit stays for the integrator to look at.
+// that does not fit stays for the integrator to look at. Two runs in one folder take turns at the copy.
 bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::string& inputXsd) {
   const std::string workFile = inputXml + ".modif";
-  std::string componentError;
-  std::vector<platform::XmlProblem> problems;
-  try {
-    const std::unique_ptr<platform::XmlDocument> document = LoadXMLForValidation(inputXml);
-    document->SetRootAttribute("xmlns:xsi", kSchemaInstance);
-    document->SetRootAttribute("xsi:noNamespaceSchemaLocation", inputXsd);
-    // Without a new copy there is nothing to check; one from an earlier run is not to be taken for it.
-    if (!platform::TheHost().files.Write(workFile, document->Text())) {
-      throw platform::XmlComponentError("The work file " + workFile + " cannot be written.");
-    }
-    problems = document->LoadAndValidate(workFile);
-  } catch (const platform::XmlComponentError& error) {
-    Fail({.attemptNumber = attemptNumber,
-          .recordedCode = CDMUtil::ToString(kComponentFailed),
-          .exceptionCode = kComponentFailed,
-          .option = LogOptions::ServiceErrors,
-          .messageId = kTextMessage,
-          .text = error.what()});
-  }
+  const FileLock turn(workFile);
+  const std::vector<platform::XmlProblem> problems = FindProblems(inputXml, inputXsd, workFile);
   if (problems.empty()) {
     platform::TheHost().files.Remove(workFile);
     return true;
@@ -142,6 +128,26 @@ bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::stri
         .text = blocks});
 }
 
+// Where the copy cannot be written, in a folder for reading only, the document is judged as it stands in memory.
+std::vector<platform::XmlProblem> CustomLEDTest::FindProblems(const std::string& inputXml,
+                                                              const std::string& inputXsd,
+                                                              const std::string& workFile) {
+  try {
+    const std::unique_ptr<platform::XmlDocument> document = LoadXMLForValidation(inputXml);
+    document->SetRootAttribute("xmlns:xsi", kSchemaInstance);
+    document->SetRootAttribute("xsi:noNamespaceSchemaLocation", inputXsd);
+    return platform::TheHost().files.Write(workFile, document->Text()) ? document->LoadAndValidate(workFile)
+                                                                       : document->Validate();
+  } catch (const platform::XmlComponentError& error) {
+    Fail({.attemptNumber = attemptNumber,
+          .recordedCode = CDMUtil::ToString(kComponentFailed),
+          .exceptionCode = kComponentFailed,
+          .option = LogOptions::ServiceErrors,
+          .messageId = kTextMessage,
+          .text = error.what()});
+  }
+}
+
 void CustomLEDTest::ParseXMLConfigurationFiles() {
   XmlObject* section = uiXml.FindFirstMatch("Section", "@ID=" + Quoted(sectionId));
   const auto refuse = [this](const std::string& text) {
@@ -155,6 +161,7 @@ void CustomLEDTest::ParseXMLConfigurationFiles() {
            ": name one of its sections with -SectionID.");
   }
   buttons.clear();
+  TellOddities(*section);
   for (XmlObject& child : section->children) {
     ButtonDefStruct button;
     if (const XmlObject* config = child.FindFirstMatch("Config", "")) {
@@ -172,6 +179,9 @@ void CustomLEDTest::ParseXMLConfigurationFiles() {
     button.messageId = child.GetAttributeValue("MessageID", "");
     const XmlObject* definition = buttonXml.FindFirstMatch("Button", "@ID=" + Quoted(CDMUtil::ToLower(button.id)));
     if (definition == nullptr) {
+      Notices::Tell("The button with the ID \"" + button.id + "\" in the section \"" + sectionId + "\" of " + uiFile +
+                    " is left out: " + buttonDefinitionFile + " has no Button with the ID \"" +
+                    CDMUtil::ToLower(button.id) + "\".");
       continue;
     }
     button.function = definition->GetAttributeValue("Function", "");
@@ -215,7 +225,30 @@ void CustomLEDTest::InitializeButtonArray() {
   }
 }
 
-std::string CustomLEDTest::GetErrorCodeFromButtonFunctions(const std::string& key) const {
+// What the format allows and an integrator hardly means.
+void CustomLEDTest::TellOddities(const XmlObject& section) const {
+  const std::string place = "the section \"" + sectionId + "\" of " + uiFile;
+  std::map<std::string, int> timesOf;
+  for (const XmlObject& child : section.children) {
+    const std::string id = child.GetAttributeValue("ID", "");
+    ++timesOf[id];
+    if (id.empty()) {
+      Notices::Tell("A button of " + place + " has no ID: give it the ID of a Button of " + buttonDefinitionFile +
+                    ".");
+    }
+    if (child.name != "Button") {
+      Notices::Tell("The element \"" + std::string(child.name) + "\" of " + place +
+                    " is taken for a button: the usual name is Button.");
+    }
+  }
+  for (const auto& [id, times] : timesOf) {
+    if (times > 1 && !id.empty()) {
+      Notices::Tell("The button \"" + id + "\" stands " + CDMUtil::ToString(times) + " times in " + place + ".");
+    }
+  }
+}
+
+std::string CustomLEDTest::GetErrorCodeFromButtonFunctions(std::string_view key) const {
   for (const ButtonDefStruct& button : buttons) {
     if (CDMUtil::ToLower(button.function) == key) {
       return button.errorCode;

@@ -2,6 +2,8 @@
 
 #include "board/MotherBoard.h"
 #include "harness/base/CDMException.h"
+#include "harness/base/Notices.h"
+#include "ledtests/PutBack.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -13,18 +15,6 @@ constexpr const char* kBlinkTypes = "RedPower,GreenPower,HardDrive,RedPower|Hard
 constexpr std::time_t kSecondsPerMinute = 60;
 
 using BoardCall = bool (MotherBoard::*)();
-
-// Restores the power LED however the blink ends.
-class SavedPowerLed {
- public:
-  explicit SavedPowerLed(MotherBoard& board) : board_(board) { board_.SavePowerLedState(); }
-  ~SavedPowerLed() { board_.RestorePowerLedState(); }
-  SavedPowerLed(const SavedPowerLed&) = delete;
-  SavedPowerLed& operator=(const SavedPowerLed&) = delete;
-
- private:
-  MotherBoard& board_;
-};
 
 }  // namespace
 
@@ -54,13 +44,17 @@ bool LEDStatusIndicator::Run() {
   const std::string blinkType = GetArgument("-BlinkType", "Green");
   const auto blinkSpeed_ms = static_cast<std::uint32_t>(GetArgument("-BlinkSpeed", 500));
   UpdatePercentage(1);
-  // A type without a power colour blinks nothing: the steps around it stay the same.
+  // A type without a power colour blinks nothing, and leaves the lamp as it is: the steps around it stay the same.
   BoardCall assertLed = nullptr;
   if (blinkType.find("GreenPower") != std::string::npos) {
     assertLed = &MotherBoard::AssertPowerLedGreen;
   }
   if (blinkType.find("RedPower") != std::string::npos) {
     assertLed = &MotherBoard::AssertPowerLedRed;
+  }
+  if (assertLed == nullptr) {
+    Notices::Tell("-BlinkType=" + blinkType + " names neither GreenPower nor RedPower in this very spelling: no LED is "
+                  "blinked.");
   }
   std::unique_ptr<MotherBoard> board = MotherBoard::Instantiate(
       GetArgument("-INIFile", ""), GetArgument("-TestIni", ""), GetArgument("-ChipIni", ""), "platform", "");
@@ -72,7 +66,8 @@ bool LEDStatusIndicator::Run() {
     throw failure.release();  // owned by whoever catches it
   }
   {
-    const SavedPowerLed saved(*board);
+    const PutBack restore([&] { board->RestorePowerLedState(); });
+    board->SavePowerLedState();
     const std::time_t begin = clock.WallTime();
     const std::time_t duration_s = blinkTime_min * kSecondsPerMinute;
     while ((blinkTime_min == 0 || clock.WallTime() - begin < duration_s) && !ShouldTestBeTerminated() &&
@@ -81,7 +76,9 @@ bool LEDStatusIndicator::Run() {
         (board.get()->*assertLed)();
       }
       clock.Sleep(blinkSpeed_ms);
-      board->DeassertPowerLed();
+      if (assertLed != nullptr) {
+        board->DeassertPowerLed();
+      }
       clock.Sleep(blinkSpeed_ms);
     }
   }

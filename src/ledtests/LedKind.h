@@ -1,9 +1,11 @@
-// The kinds of front-panel LED that CustomLEDTest knows, each with its fixed ids and codes.
+// The kinds of front-panel LED, each with its fixed ids, its code and its worker.
 #pragma once
 
 #include <cstdint>
 #include <span>
 #include <string_view>
+
+#include "ledtests/BlinkWorkers.h"
 
 namespace panelglow {
 
@@ -14,6 +16,7 @@ struct LedKind {
   std::uint32_t buttonCommand;  // what the button's ButtonLParam holds
   std::string_view errorCode;
   std::string_view logName;  // of the worker in log lines
+  BlinkWorker worker;        // null: this version has none
 };
 
 // Device ids that code refers to.
@@ -36,12 +39,13 @@ inline constexpr std::int32_t kFirstHdGreen = 90;  // one id per drive controlle
 inline constexpr std::uint32_t kHdGreenCommand = 777;
 inline constexpr std::uint32_t kHdButtonCommand = 1013;
 
-/// All kinds but hdgreen's, which has one entry per controller, and hdgreen as the last row.
 std::span<const LedKind> LedKinds();
 
 /// Null when there is none.
 const LedKind* FindLedKindByFunction(std::string_view function);
 const LedKind* FindLedKindByStartCommand(std::uint32_t command);
-const LedKind* FindLedKindByButton(std::uint32_t command);
+
+/// The kind of an entry; that of all ids from kFirstHdGreen on is hdgreen.
+const LedKind* FindLedKindByDevice(std::int32_t deviceId);
 
 }  // namespace panelglow

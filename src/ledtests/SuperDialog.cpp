@@ -7,7 +7,7 @@
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
 #include "ledtests/BlinkWorkers.h"
-#include "ledtests/CustomLEDTest.h"
+#include "ledtests/FrontPanelTest.h"
 #include "ledtests/LedKind.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
@@ -84,7 +84,7 @@ bool IsLockKey(std::int32_t deviceId) {
 
 }  // namespace
 
-SuperDialog::SuperDialog(CustomLEDTest& test) : test_(test), desktop_(platform::TheHost().desktop) {}
+SuperDialog::SuperDialog(FrontPanelTest& test) : test_(test), desktop_(platform::TheHost().desktop) {}
 
 // The window's messages are handled by this object, so it does not outlive it.
 SuperDialog::~SuperDialog() { desktop_.DestroyWindow(window_); }
@@ -97,14 +97,22 @@ void SuperDialog::CreateSuperDialog() {
   CDMout::UpdatePercentage(40);
   if (!CreateMainWindow()) {
     CDMout::LogMessage(LogOptions::ServiceErrors, kFreeText, "The test dialog cannot be shown: there is no display.");
+    test_.dialogLost = true;
     desktop_.UnregisterWindowClass(kClassName);
     return;
   }
   CreateControls();
   test_.exitDialog = false;
   CDMout::UpdatePercentage(50);
-  BeginTest(window_);
+  if (test_.rules.startsByItself) {
+    BeginTest(window_);
+  }
   RunLoop();
+  if (!test_.exitDialog) {
+    CDMout::LogMessage(LogOptions::ServiceErrors, kFreeText, "The test dialog was lost: the display is gone.");
+    test_.dialogLost = true;
+    Leave(window_);
+  }
   EndWorkers();
   desktop_.UnregisterWindowClass(kClassName);
   CDMout::UpdatePercentage(80);
@@ -153,17 +161,16 @@ void SuperDialog::CreateIcon(const std::string& file, int x, int y) {
 void SuperDialog::CreateControls() {
   CreateIcon("super.ico", kLeftLogoX, kLogoY);
   CreateIcon("diags.ico", kRightLogoX, kLogoY);
-  const std::vector<ButtonDefStruct>& buttons = test_.buttons;
+  const std::vector<DialogButton>& buttons = test_.rules.buttons;
   const auto column = [](std::size_t i) { return static_cast<int>(i) % kColumns; };
   const auto top = [](std::size_t i) { return kGridY + static_cast<int>(i) / kColumns * kRowStep; };
   for (std::size_t i = 0; i < buttons.size(); ++i) {
-    CreateIcon(buttons[i].buttonIco, kIconX + column(i) * kIconStep, top(i));
+    CreateIcon(buttons[i].icon, kIconX + column(i) * kIconStep, top(i));
   }
   for (std::size_t i = 0; i < buttons.size(); ++i) {
     const int left = kButtonX + column(i) * kButtonStep;
-    CreateControl("BUTTON", kLedButtonStyle, CustomLEDTest::_sButtonArr[i],
-                  {left, top(i), left + kButtonWidth, top(i) + kButtonHeight},
-                  CDMUtil::ToInt(buttons[i].buttonLParam));
+    CreateControl("BUTTON", kLedButtonStyle, buttons[i].caption,
+                  {left, top(i), left + kButtonWidth, top(i) + kButtonHeight}, buttons[i].command);
   }
   const WindowHandle start = CreateControl("BUTTON", kStartButtonStyle, CDMDiag::GetResourceString(kStartText, u""),
                                            kStartPlace, static_cast<int>(kNextCommand));
@@ -184,19 +191,19 @@ void SuperDialog::RunLoop() {
 
 // ---- the sequence of LEDs
 
-void SuperDialog::EnableCustomWindowCtrls(WindowHandle window, const std::vector<ButtonDefStruct>& buttonInfo) {
-  const auto enable = [&](std::uint32_t id, bool enabled) {
-    const WindowHandle control = desktop_.FindControl(window, static_cast<int>(id));
+void SuperDialog::EnableCustomWindowCtrls(WindowHandle window) {
+  const auto enable = [&](int id, bool enabled) {
+    const WindowHandle control = desktop_.FindControl(window, id);
     if (control != 0) {
       desktop_.EnableWindow(control, enabled);
     }
     return control;
   };
-  enable(kCancelCommand, true);
-  enable(kNextCommand, false);
+  enable(static_cast<int>(kCancelCommand), true);
+  enable(static_cast<int>(kNextCommand), false);
   bool focused = false;
-  for (const ButtonDefStruct& button : buttonInfo) {
-    const WindowHandle control = enable(static_cast<std::uint32_t>(CDMUtil::ToInt(button.buttonLParam)), true);
+  for (const DialogButton& button : test_.rules.buttons) {
+    const WindowHandle control = enable(button.command, true);
     if (control != 0 && !std::exchange(focused, true)) {
       desktop_.SetFocus(control);
     }
@@ -205,7 +212,7 @@ void SuperDialog::EnableCustomWindowCtrls(WindowHandle window, const std::vector
 
 // Starts the next LED that is not confirmed, or leaves the dialog when there is none.
 void SuperDialog::BeginTest(WindowHandle window) {
-  EnableCustomWindowCtrls(window, std::vector<ButtonDefStruct>(test_.buttons));
+  EnableCustomWindowCtrls(window);
   if (!test_.testStarted) {
     test_.timerCounting = true;
   }
@@ -311,14 +318,15 @@ void SuperDialog::CustomTimerProc(WindowHandle window) {
 }
 
 void SuperDialog::KeepFocusInside(WindowHandle window) {
-  if (desktop_.Parent(desktop_.Focus()) == window) {
-    return;
+  if (desktop_.Parent(desktop_.Focus()) != window) {
+    desktop_.SetFocus(desktop_.FindControl(window, FirstButton()));
   }
-  int id = static_cast<int>(kNextCommand);
-  if (test_.testStarted && !test_.buttons.empty()) {
-    id = CDMUtil::ToInt(test_.buttons.front().buttonLParam);
-  }
-  desktop_.SetFocus(desktop_.FindControl(window, id));
+}
+
+// Of the grid once the test has started; before that the start button.
+int SuperDialog::FirstButton() const {
+  const std::vector<DialogButton>& buttons = test_.rules.buttons;
+  return test_.testStarted && !buttons.empty() ? buttons.front().command : static_cast<int>(kNextCommand);
 }
 
 std::intptr_t SuperDialog::OnTimer(WindowHandle window) {
@@ -326,7 +334,7 @@ std::intptr_t SuperDialog::OnTimer(WindowHandle window) {
     return 1;
   }
   if (test_.secondsElapsed >= test_.ledTimeout) {
-    test_.testResult = CustomLEDTest::kTimedOut;
+    test_.testResult = FrontPanelTest::kTimedOut;
     PostCommand(window, kLeaveCommand);
   } else {
     ++test_.secondsElapsed;
@@ -348,30 +356,36 @@ std::intptr_t SuperDialog::OnCommand(const platform::Message& received) {
       return Leave(received.window);
     case kCancelCommand:
       test_.failureCode = kCancelledCode;
-      test_.testResult = CustomLEDTest::kCancelled;
+      test_.testResult = FrontPanelTest::kCancelled;
       SendCommand(received.window, kLeaveCommand);
       return 1;
     case kNextCommand:
       BeginTest(received.window);
       return 1;
-    case kHdButtonCommand:
-      return AnswerDrive(received.window);
     default:
       break;
   }
   if (const LedKind* kind = FindLedKindByStartCommand(command)) {
-    StartWorker(*kind);
-    return 0;
+    if (LEDStruct* entry = EntryFor(*kind)) {
+      StartWorker(*kind, *entry);
+      return 0;
+    }
   }
-  if (const LedKind* kind = FindLedKindByButton(command)) {
-    return Answer(received.window, kind->deviceId);
+  if (const ButtonAnswer* answer = FindAnswer(command)) {
+    return Answer(received.window, *answer);
   }
   return desktop_.DefaultProcedure(received);
 }
 
-void SuperDialog::StartWorker(const LedKind& kind) {
+// The drive entries share a start command: the one whose turn it is was chosen just before it was sent.
+LEDStruct* SuperDialog::EntryFor(const LedKind& kind) {
+  return kind.deviceId == kFirstHdGreen ? &test_.devices[static_cast<std::size_t>(test_.currentIndex)]
+                                        : test_.FindDevice(kind.deviceId);
+}
+
+void SuperDialog::StartWorker(const LedKind& kind, LEDStruct& entry) {
   constexpr std::uint32_t kAfterLockKey_ms = 100;
-  const BlinkWorker worker = FindBlinkWorker(kind.deviceId);
+  const BlinkWorker worker = kind.worker;
   if (worker == nullptr) {
     CDMout::LogMessage(LogOptions::Warnings, kFreeText,
                        "This version cannot blink the LED of the function " + std::string(kind.function) + ".");
@@ -381,19 +395,27 @@ void SuperDialog::StartWorker(const LedKind& kind) {
     overrunning_.push_back(test_.workerThread);
   }
   test_.workerThread =
-      platform::TheHost().threads.Start("worker " + std::string(kind.function), [worker] { RunBlinkWorker(worker); });
+      platform::TheHost().threads.Start("worker " + std::string(kind.function),
+                                        [this, worker, owned = &entry] { RunBlinkWorker(worker, test_, *owned); });
   if (IsLockKey(kind.deviceId)) {
     TheClock().Sleep(kAfterLockKey_ms);
   }
-  CDMout::LogMessage(LogOptions::Status, kFreeText, std::string(kind.logName) + " Thread Exited.\n");
+  if (test_.rules.writesLines) {
+    CDMout::LogMessage(LogOptions::Status, kFreeText, std::string(kind.logName) + " Thread Exited.\n");
+  }
 }
 
-// A worker that has not ended by now is ended: the device array is about to be filled anew.
+// Every worker has been told to stop by now. One that is still putting its LED back is let do it; one that does not
+// come to an end is ended: the device array is about to be filled anew.
 void SuperDialog::EndWorkers() {
+  constexpr std::uint32_t kLongestWait_ms = 3000;
   platform::Threads& threads = platform::TheHost().threads;
+  test_.ResetAllParameters();
   overrunning_.push_back(std::exchange(test_.workerThread, 0));
   for (const platform::ThreadHandle worker : overrunning_) {
-    threads.Terminate(worker);
+    if (!threads.Wait(worker, kLongestWait_ms)) {
+      threads.Terminate(worker);
+    }
     threads.Close(worker);
   }
   overrunning_.clear();
@@ -401,36 +423,32 @@ void SuperDialog::EndWorkers() {
 
 // ---- answers
 
-std::intptr_t SuperDialog::Answer(WindowHandle window, std::int32_t deviceId) {
-  if (!test_.ResetDeviceParameters(deviceId)) {
-    return WrongAnswer(window);
-  }
-  test_.WaitForThreadToFinish(deviceId);
-  test_.testResult = CustomLEDTest::kRightAnswer;
-  PostCommand(window, kNextCommand);
-  return 0;
+const ButtonAnswer* SuperDialog::FindAnswer(std::uint32_t button) const {
+  const std::vector<ButtonAnswer>& answers = test_.rules.answers;
+  const auto found =
+      std::find_if(answers.begin(), answers.end(), [&](const ButtonAnswer& row) { return row.button == button; });
+  return found == answers.end() ? nullptr : &*found;
 }
 
-// One button serves all drive LEDs.
-std::intptr_t SuperDialog::AnswerDrive(WindowHandle window) {
-  bool matched = false;
-  for (std::int32_t id = kFirstHdGreen; id < kFirstHdGreen + test_.hdCount; ++id) {
-    if (test_.ResetDeviceParameters(id)) {
-      test_.WaitForThreadToFinish(id);
-      test_.testResult = CustomLEDTest::kRightAnswer;
-      matched = true;
+// Right when one of the button's LEDs is the one that blinks. One button may serve several drive LEDs.
+std::intptr_t SuperDialog::Answer(WindowHandle window, const ButtonAnswer& answer) {
+  for (const std::int32_t kind : answer.kinds) {
+    const std::int32_t count = kind == kFirstHdGreen ? test_.hdCount : 1;
+    for (std::int32_t id = kind; id < kind + count; ++id) {
+      if (test_.ResetDeviceParameters(id)) {
+        test_.WaitForThreadToFinish(id);
+        test_.testResult = FrontPanelTest::kRightAnswer;
+        PostCommand(window, kNextCommand);
+        return 0;
+      }
     }
   }
-  if (!matched) {
-    return WrongAnswer(window);
-  }
-  PostCommand(window, kNextCommand);
-  return 0;
+  return WrongAnswer(window);
 }
 
 // The code stays that of the LED which was blinking: it names the LED that was not recognised.
 std::intptr_t SuperDialog::WrongAnswer(WindowHandle window) {
-  test_.testResult = CustomLEDTest::kWrongAnswer;
+  test_.testResult = FrontPanelTest::kWrongAnswer;
   test_.ResetAllParameters();
   PostCommand(window, kLeaveCommand);
   return 1;
@@ -444,7 +462,7 @@ std::intptr_t SuperDialog::Leave(WindowHandle window) {
   for (int n = 0; n < test_.deviceCount; ++n) {
     LEDStruct& entry = test_.devices[static_cast<std::size_t>(n)];
     entry.running = false;
-    if (entry.workerStarted) {
+    if (entry.workerStarted || test_.rules.waitsForUnstarted) {
       AwaitEnd(n, entry);
     }
   }
@@ -458,9 +476,11 @@ void SuperDialog::AwaitEnd(int number, const LEDStruct& entry) {
   constexpr std::uint32_t kPoll_ms = 100;
   const std::uint32_t begin = TheClock().TickCount();
   const auto log = [&](const char* text) {
-    CDMout::LogMessage(
-        LogOptions::Status, kFreeText,
-        text + CDMUtil::ToString(number) + ", Finished: " + CDMUtil::ToString(bool{entry.workerFinished}));
+    if (test_.rules.writesLines) {
+      CDMout::LogMessage(
+          LogOptions::Status, kFreeText,
+          text + CDMUtil::ToString(number) + ", Finished: " + CDMUtil::ToString(bool{entry.workerFinished}));
+    }
   };
   log("Exit_Window: DeviceID - ");
   while (!entry.workerFinished && TheClock().TickCount() - begin < kLongestWait_ms) {

@@ -1,36 +1,37 @@
-// One attempt of CustomLEDTest: a topmost window with a grid of icons and buttons, which starts the LEDs of the
-// device array one after the other and judges the operator's answers. Runs on a thread of its own, which owns the
-// window.
+// One attempt of an operator test: a topmost window with a grid of icons and buttons, which starts the LEDs of the
+// device array one after the other and judges the operator's answers, by the test's rules. Runs on a thread of its
+// own, which owns the window.
 #pragma once
 
 #include <cstdint>
 #include <vector>
 
-#include "ledtests/ButtonDefStruct.h"
 #include "platform/Desktop.h"
 #include "platform/Threads.h"
 
 namespace panelglow {
 
-class CustomLEDTest;
+class FrontPanelTest;
+struct ButtonAnswer;
 struct LEDStruct;
 struct LedKind;
 
 class SuperDialog {
  public:
-  explicit SuperDialog(CustomLEDTest& test);
+  explicit SuperDialog(FrontPanelTest& test);
   ~SuperDialog();
   SuperDialog(const SuperDialog&) = delete;
   SuperDialog& operator=(const SuperDialog&) = delete;
 
-  /// The dialog thread: from the window's creation to the end of its message loop.
+  /// The dialog thread: from the window's creation to the end of its message loop. Sets the test's `dialogLost` when
+  /// there was no window, or when it went away by itself.
   void CreateSuperDialog();
 
  private:
   std::intptr_t CustomLEDDlgProc(const platform::Message& message);
   void CustomTimerProc(platform::WindowHandle window);
   void BeginTest(platform::WindowHandle window);
-  void EnableCustomWindowCtrls(platform::WindowHandle window, const std::vector<ButtonDefStruct>& buttonInfo);
+  void EnableCustomWindowCtrls(platform::WindowHandle window);
 
   bool CreateMainWindow();
   void CreateControls();
@@ -45,17 +46,19 @@ class SuperDialog {
   std::intptr_t OnTimer(platform::WindowHandle window);
   void OnPaint(platform::WindowHandle window);
   void KeepFocusInside(platform::WindowHandle window);
-  void StartWorker(const LedKind& kind);
+  [[nodiscard]] int FirstButton() const;
+  LEDStruct* EntryFor(const LedKind& kind);
+  void StartWorker(const LedKind& kind, LEDStruct& entry);
   void EndWorkers();
-  std::intptr_t Answer(platform::WindowHandle window, std::int32_t deviceId);
-  std::intptr_t AnswerDrive(platform::WindowHandle window);
+  [[nodiscard]] const ButtonAnswer* FindAnswer(std::uint32_t button) const;
+  std::intptr_t Answer(platform::WindowHandle window, const ButtonAnswer& answer);
   std::intptr_t WrongAnswer(platform::WindowHandle window);
   std::intptr_t Leave(platform::WindowHandle window);
   void AwaitEnd(int number, const LEDStruct& entry);
   void PostCommand(platform::WindowHandle window, std::uint32_t command);
   void SendCommand(platform::WindowHandle window, std::uint32_t command);
 
-  CustomLEDTest& test_;
+  FrontPanelTest& test_;
   platform::Desktop& desktop_;
   platform::WindowHandle window_ = 0;
   std::vector<platform::ThreadHandle> overrunning_;  // workers that were still running when their successor began

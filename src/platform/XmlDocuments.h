@@ -37,9 +37,13 @@ class XmlDocument {
   /// The document's text. Throws XmlComponentError when nothing is loaded.
   virtual std::string Text() = 0;
 
-  /// Loads a file and validates it against the schema that its root names by xsi:noNamespaceSchemaLocation. Returns
-  /// all problems in document order; none means valid.
+  /// Loads a file and validates it as Validate does. A file that does not load is the only problem then.
   virtual std::vector<XmlProblem> LoadAndValidate(std::string_view path) = 0;
+
+  /// Validates the loaded document against the schema that its root names by xsi:noNamespaceSchemaLocation. A root that
+  /// the schema does not declare is assessed laxly: its children are judged where the schema declares them. Returns all
+  /// problems in document order; none means valid. Throws XmlComponentError when nothing is loaded.
+  virtual std::vector<XmlProblem> Validate() = 0;
 };
 
 class XmlDocuments {

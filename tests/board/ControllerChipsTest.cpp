@@ -329,6 +329,8 @@ TEST(SmscMec1322Chip, LampsAreListsOfPortsAndTheirMultiplexersGoThroughTheMailbo
   const std::string write = "0200<-86 0201<-";
   const std::string written = kMailboxWritten;
   const std::tuple<Operation, bool, std::string> kOperations[] = {
+      {&Chip::RestorePowerLedState, true, ""},  // nothing is saved yet
+      {&Chip::RestoreChargeLedState, true, ""},
       {&Chip::SavePowerLedState, true, at10 + read + "5C 50ms 00B1<-04 7ms "},
       {&Chip::AssertPowerLedGreen, true, "00A0<-01 7ms 00A1<-02 7ms "},
       {&Chip::DeassertPowerLed, true, "00A0<-00 7ms "},
@@ -445,6 +447,7 @@ TEST(GCodecChip, ALampIsThreeVerbsWithTheSavedPinsAndItsOwn) {
   for (int round = 0; round < 51; ++round) {
     blink += round % 2 == 0 ? "04151700 10ms 500ms " : "0C151700 10ms 500ms ";
   }
+  EXPECT_EQ(verbs(&Chip::RestoreSpeakerLedState), "");  // nothing is saved yet
   const std::pair<Operation, std::string> kOperations[] = {
       {&Chip::SaveSpeakerLedState, "00161F00 10ms 00171F00 10ms 00151F00 10ms "},
       {&Chip::AssertSpeakerLed, "05161700 10ms 05171700 10ms 04151700 10ms 10ms "},
@@ -502,6 +505,7 @@ TEST(CaslChip, TheRadiosGoBackToWhatTheListedDevicesWere) {
   for (const auto& [devices, on] : kDevices) {
     ChipBench bench(kFirmware, "", "[casl]\nwireless.devices.buffer=" + devices + "\n");
     CaslChip chip;
+    EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.RestoreWirelessLedState()); }), "");  // nothing is saved yet
     EXPECT_TRUE(chip.SaveWirelessLedState());  // the first operation reads the keys and the header, too
     EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.DeassertWirelessLed()); }), "2ms ");
     EXPECT_THAT(bench.machine.HardwareState(), HasSubstr("radio 01 = off\nradio 02 = off\n"));

@@ -32,18 +32,25 @@ inline constexpr int kArguments = static_cast<int>(std::size(kCommandLine));
 
 class Bench {
  public:
-  /// `machine` stands in front of bench.toml; `person` is the policy of who sits at it, nobody when empty.
+  /// `machine` stands in front of bench.toml, or is the name of a file of machines/, which then has the
+  /// installation's own board files; `person` is the policy of who sits at it, nobody when empty.
   explicit Bench(const std::string& machine = "", const std::string& person = "", std::uint64_t seed = 1)
       : sim(MachineText(machine), EnterFolder(person, seed)), windows(sim.Windows()), loaded_(Load()) {
-    AddBoardSetting("");
-    sim.DiskFiles().Put("mbdetect.ini", "[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n");
+    if (IsFile(machine)) {
+      const std::string id = SystemIdIn(TextOf(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / machine));
+      for (const char* ini : {"mbdetect.ini", "mbtest.ini"}) {
+        sim.DiskFiles().Put(ini, AsOurs(TextOf(ini), id));
+      }
+    } else {
+      AddBoardSetting("");
+      sim.DiskFiles().Put("mbdetect.ini", "[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n");
+    }
     test.iniFile = ".\\mbdetect.ini";
     test.testIni = ".\\mbtest.ini";
     test.chipIni = ".\\chip.ini";
-    g_pSuperPtrCustom = &test;
     sim.Trace().Keep();
   }
-  ~Bench() { g_pSuperPtrCustom = nullptr; }
+  ~Bench() = default;
   Bench(const Bench&) = delete;
   Bench& operator=(const Bench&) = delete;
 
@@ -79,6 +86,7 @@ class Bench {
     test.MapButtonFunctionsToTests();
     test.PrepareDeviceArray();
     test.InitializeButtonArray();
+    test.MakeDialogRules();
     std::size_t place = 0;
     for (const std::string& function : functions) {
       if (LEDStruct* entry = test.FindDevice(FindLedKindByFunction(function)->deviceId)) {
@@ -101,8 +109,9 @@ class Bench {
     entry.workerStarted = false;
     entry.workerFinished = false;
     sim.Trace().Clear();
-    const BlinkWorker worker = FindBlinkWorker(entry.deviceId);
-    return platform::TheHost().threads.Start("worker", [worker] { RunBlinkWorker(worker); });
+    const BlinkWorker worker = FindLedKindByFunction(function)->worker;
+    return platform::TheHost().threads.Start("worker",
+                                             [this, worker, &entry] { RunBlinkWorker(worker, test, entry); });
   }
   void RunWorker(const std::string& function, bool running = true) {
     platform::TheHost().threads.Wait(StartWorker(function, running), platform::Threads::kNoLimit);
@@ -182,32 +191,62 @@ class Bench {
     return text;
   }
 
+  /// Where the installation of every bench of this process is.
+  static const fs::path& FolderPath() {
+    static const Folder folder;  // one for the process, whose message files are opened once
+    return folder.path;
+  }
+
   sim::Simulation sim;
   platform::desktop::WindowSystem& windows;
 
  private:
+  struct Folder {
+    const fs::path path = fs::temp_directory_path() / ("panelglow-bench-" + std::to_string(::getpid()));
+    ~Folder() { fs::remove_all(path); }
+  };
+
+  static bool IsFile(const std::string& machine) { return machine.ends_with(".toml"); }
+
+  // A process has one system id: a machine of a file goes by that of bench.toml, in its board files too.
+  static std::string AsOurs(std::string text, const std::string& systemId) {
+    for (const auto& [from, to] : {std::pair<std::string, const char*>("[7D10]", "[other]"), {systemId, "7D10"}}) {
+      for (std::size_t at = 0; (at = text.find(from, at)) != std::string::npos;) {
+        text.replace(at, from.size(), to);
+      }
+    }
+    return text;
+  }
+  static std::string TextOf(const fs::path& file) {
+    std::ostringstream text;
+    text << std::ifstream(file).rdbuf();
+    return text.str();
+  }
+  static std::string SystemIdIn(const std::string& machine) {
+    const std::string key = "board_product = \"";
+    return machine.substr(machine.find(key) + key.size(), 4);
+  }
   static std::string MachineText(const std::string& machine) {
     std::ostringstream text;
+    if (IsFile(machine)) {
+      const std::string file = TextOf(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / machine);
+      return AsOurs(file, SystemIdIn(file)) + "\n[driver]\nolder_set = true\n";
+    }
     text << machine << (machine.find("touchpad") == std::string::npos ? "touchpad = true\n" : "")
          << std::ifstream(fs::path(PANELGLOW_SOURCE_DIR) / "tests/ledtests/bench.toml").rdbuf();
     return text.str();
   }
   // A new installation, which is the current folder.
   static sim::SimulationOptions EnterFolder(const std::string& person, std::uint64_t seed) {
-    static const Folder folder;  // one for the process, whose message files are opened once
-    fs::remove_all(folder.path);
-    fs::copy(fs::path(PANELGLOW_SOURCE_DIR) / "installation", folder.path, fs::copy_options::recursive);
-    fs::current_path(folder.path);
+    fs::remove_all(FolderPath());
+    fs::copy(fs::path(PANELGLOW_SOURCE_DIR) / "installation", FolderPath(), fs::copy_options::recursive);
+    fs::current_path(FolderPath());
     sim::SimulationOptions options;
     options.realFiles = true;
     options.operatorPolicy = person;
     options.seed = seed;
     return options;
   }
-  struct Folder {
-    const fs::path path = fs::temp_directory_path() / ("panelglow-bench-" + std::to_string(::getpid()));
-    ~Folder() { fs::remove_all(path); }
-  };
   static bool Load() {
     CmdLineParser::GetInstance(kArguments, kCommandLine);
     BoardDevio().LoadDriver();

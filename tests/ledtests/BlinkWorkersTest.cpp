@@ -3,7 +3,10 @@
 
 #include <set>
 
+#include "board/base/mblib_exception.h"
+#include "harness/base/CDMException.h"
 #include "ledtests/Bench.h"
+#include "ledtests/PutBack.h"
 
 namespace panelglow::ledtest {
 namespace {
@@ -97,20 +100,31 @@ TEST(BlinkWorkers, ThreeModelsHaveTheirLegacyRegistersElsewhere) {
   }
 }
 
+// What a slow part still needs for its last step.
+constexpr sim::Microseconds kSilicon_us = 100'000;
+
 // Ended between any two steps of its first cycle, by a dialog that does not wait any longer.
 TEST(BlinkWorkers, EndedAtAnyMomentLeaveThePanelAsFoundAndNoLockBehind) {
   struct Case {
     const char* function;
     Board board;
+    const char* machine = "";
   };
   for (const Case& c :
        {Case{"numlock", Board::kKnown}, Case{"touchpadlock", Board::kKnown}, Case{"powergreen", Board::kKnown},
         Case{"powerred", Board::kKnown}, Case{"hdred", Board::kKnown}, Case{"chargegreen", Board::kKnown},
-        Case{"chargered", Board::kKnown}, Case{"powergreen", Board::kUnknown}, Case{"hdred", Board::kUnknown}}) {
-    Bench bench;
+        Case{"chargered", Board::kKnown}, Case{"powergreen", Board::kUnknown}, Case{"hdred", Board::kUnknown},
+        // Parts whose saving changes something, or is a register list.
+        Case{"powergreen", Board::kKnown, "mailbox-notebook.toml"},
+        Case{"chargered", Board::kKnown, "mailbox-notebook.toml"},
+        Case{"speakermute", Board::kKnown, "codec-notebook.toml"},
+        Case{"powergreen", Board::kKnown, "sio-ite.toml"}}) {
+    Bench bench(c.machine);
     Use(c.board, bench);
     bench.Prepare({c.function});
     const std::string found = bench.Lit();
+    const std::string state = bench.sim.HardwareState();
+    const bool keepsAll = *c.machine != '\0';  // the legacy registers go to native mode, whatever they were in
     // A whole turn of one cycle tells when something happens.
     const sim::Microseconds begin = bench.sim.Time().Now();
     bench.After(150, [&] { bench.Entry(c.function).running = false; });
@@ -132,10 +146,35 @@ TEST(BlinkWorkers, EndedAtAnyMomentLeaveThePanelAsFoundAndNoLockBehind) {
       const platform::ThreadHandle worker = bench.StartWorker(c.function);
       bench.sim.Time().SleepFor(moment);
       platform::TheHost().threads.Terminate(worker);
+      bench.sim.Time().SleepFor(kSilicon_us);
       ASSERT_EQ(bench.Lit(), found) << c.function << " ended after " << moment << " us";
+      if (keepsAll) {
+        ASSERT_EQ(bench.sim.HardwareState(), state) << c.function << " ended after " << moment << " us";
+      }
       ASSERT_THAT(bench.sim.HardwareState(), Not(HasSubstr("held down"))) << moment;
       ASSERT_FALSE(bench.sim.IsMutexOwned("_HalcyonMotherBoardLib")) << moment;
     }
+  }
+}
+
+TEST(BlinkWorkers, PutTheirLedBackWhateverIsThrown) {
+  const std::function<void()> kThrows[] = {[] { throw new CDMException(990001); }, [] { throw CDMException(990001); },
+                                           [] { throw mblib_exception("text"); }, [] { throw std::string("text"); },
+                                           [] { throw -3; }};
+  for (const auto& fails : kThrows) {
+    Bench bench;
+    int putBack = 0;
+    const auto guarded = [&] {
+      const PutBack restore([&] {
+        ++putBack;
+        fails();
+      });
+      fails();
+    };
+    platform::TheHost().threads.Wait(platform::TheHost().threads.Start("worker", [&] { ActAndLog(guarded); }), 1000);
+    EXPECT_EQ(putBack, 1);
+    EXPECT_EQ(bench.Lines().size(), 2U);  // of the action and of the worker
+    EXPECT_THAT(bench.sim.Output(), HasSubstr("LogMessage 7 20000 \"A LED could not be blinked: "));
   }
 }
 

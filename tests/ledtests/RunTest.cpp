@@ -1,8 +1,10 @@
 // Whole runs inside the process: how the button files are read, and which prompts are shown.
 #include <gmock/gmock.h>
 
+#include <algorithm>
 #include <fstream>
 
+#include "harness/base/Notices.h"
 #include "ledtests/Bench.h"
 
 namespace panelglow::ledtest {
@@ -92,6 +94,44 @@ TEST(ButtonFiles, WithMoreButtonsThanTheDialogHasPlacesAreRefused) {
   const std::vector<std::string> lines = bench.RunProgram();
   EXPECT_THAT(lines, Contains(HasSubstr("The section \"Bench\" in the file .\\ui.xml has 25 buttons")));
   EXPECT_THAT(lines, Contains("TestFailed 990163 \"\""));
+}
+
+TEST(ButtonFiles, OfEveryFormThatIsAllowedAreTakenAndWhatIsOddIsTold) {
+  Bench bench("", "silent");
+  Notices::Forget();
+  Write("ui.xml", R"(<Panels><Section ID="A section"/><Section ID="Bench">
+    <Lamp ID="NumLock"/><Button/><Button ID=""/><Button ID="CapsLock"><Config LEDOnTime="1"/></Button>
+    <Button ID="CapsLock"/><Button ID="Nobody"/></Section></Panels>)");
+  std::string definitions = Read("buttondefinition.xml");
+  for (std::size_t at = 0; (at = definitions.find("ButtonDefinitions")) != std::string::npos;) {
+    definitions.replace(at, 17, "All");
+  }
+  Write("buttondefinition.xml", definitions);
+  EXPECT_THAT(bench.RunProgram(), Contains("ReportFailure 770118"));
+  EXPECT_EQ(bench.test.buttons.size(), 3U);
+  const std::string place = " the section \"Bench\" of .\\ui.xml";
+  EXPECT_THAT(bench.sim.Errors(), HasSubstr("The element \"Lamp\" of" + place + " is taken for a button"));
+  EXPECT_THAT(bench.sim.Errors(), HasSubstr("A button of" + place + " has no ID"));
+  EXPECT_THAT(bench.sim.Errors(), HasSubstr("The button \"CapsLock\" stands 2 times in" + place));
+  EXPECT_THAT(bench.sim.Errors(), HasSubstr("The button with the ID \"Nobody\" in" + place + " is left out"));
+  // An attribute that nobody knows is still an error, whatever the root's name.
+  Write("ui.xml", R"(<Panels><Section ID="Bench"><Button ID="NumLock" Activ="false"/></Section></Panels>)");
+  EXPECT_THAT(bench.RunProgram(), Contains("TestFailed 990163 \"\""));
+}
+
+// Another run in the same folder has the work file for five seconds; then the folder takes no file any more.
+TEST(ButtonFiles, AreCheckedInTurnAndAlsoWhereNoCopyCanBeWritten) {
+  std::string lock = (Bench::FolderPath() / "ui.xml.modif").string() + "_HalcyonFileParser";
+  std::replace_if(
+      lock.begin(), lock.end(), [](char c) { return c == '/' || c == '.'; }, '_');
+  Bench bench("peer = {mutex = '" + lock + "', until_ms = 5000}\n", "silent");
+  Write("ui.xml", R"(<UI><Section ID="Bench"><Button ID="NumLock"/></Section></UI>)");
+  Write("ui.xml.modif", "the other run's");
+  bench.After(4900, [&] { EXPECT_EQ(Read("ui.xml.modif"), "the other run's"); });
+  bench.After(5100, [&] { EXPECT_FALSE(fs::exists("ui.xml.modif")); });
+  EXPECT_THAT(bench.RunProgram(), Contains("UpdatePercentage 5"));
+  bench.sim.DiskFiles().FillDisk();
+  EXPECT_THAT(bench.RunProgram(), Contains("UpdatePercentage 5"));
 }
 
 TEST(Run, ChoosesThePromptsFamilyAnewForEachPrompt) {

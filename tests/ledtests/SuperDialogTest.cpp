@@ -179,6 +179,30 @@ TEST(SuperDialog, EveryWorkerHasEndedWithIt) {
   EXPECT_FALSE(bench.Entry("powergreen").workerStarted);
 }
 
+// The board's mailbox is slow: when the operator cancels, the worker is still saving, and has to be let put back.
+TEST(SuperDialog, LetsAWorkerThatWasToldToStopPutItsLedBack) {
+  for (unsigned cancelled_ms = 300; cancelled_ms < 2000; cancelled_ms += 117) {
+    Bench bench("mailbox-notebook.toml");
+    bench.Prepare({"chargered"});
+    const std::string state = bench.sim.HardwareState();
+    bench.PressAfter(cancelled_ms, 999);
+    EXPECT_FALSE(bench.test.RunSuperLEDTest());
+    EXPECT_TRUE(bench.Entry("chargered").workerFinished) << cancelled_ms;
+    EXPECT_EQ(bench.sim.HardwareState(), state) << cancelled_ms;
+  }
+}
+
+TEST(SuperDialog, IsLostWhenItsWindowGoesAwayByItself) {
+  Bench bench;
+  bench.Prepare({"numlock", "capslock"});
+  const std::string found = bench.Lit();
+  bench.PressAfter(1000, 1003);  // a right answer before it happens is no pass
+  bench.After(3100, [&] { bench.windows.Post({bench.Top(), platform::message::kDestroy, 0, 0}); });
+  EXPECT_FALSE(bench.test.RunSuperLEDTest());
+  EXPECT_EQ(bench.test.failureCode, "990640");
+  EXPECT_EQ(bench.Lit(), found);
+}
+
 TEST(SuperDialog, EndsTheAttemptWhereNoWindowCanBeHad) {
   Bench bench;
   bench.Prepare({"numlock"});

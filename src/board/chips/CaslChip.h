@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -26,7 +27,8 @@ class CaslChip : public Chip {
   bool ReadVirtualTemperature(int zone, bool flag, int& value) override;
 
   bool SaveWirelessLedState() override;
-  bool RestoreWirelessLedState() override { return SetWirelessPower(wirelessOn); }
+  /// Does nothing until there is a save.
+  bool RestoreWirelessLedState() override { return !wirelessOn || SetWirelessPower(*wirelessOn); }
   bool AssertWirelessLed() override { return SetWirelessPower(true); }
   bool DeassertWirelessLed() override { return SetWirelessPower(false); }
 
@@ -43,7 +45,7 @@ class CaslChip : public Chip {
 
   std::vector<std::uint32_t> devices;  // indexes into the wireless state record
   bool isSetUp = false;
-  bool wirelessOn = false;
+  std::optional<bool> wirelessOn;  // as saved
   std::uint8_t writeCommand = 2;
   std::uint8_t readCommand = 1;
   std::uint8_t methodType = 27;

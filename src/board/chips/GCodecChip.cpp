@@ -139,9 +139,12 @@ bool GCodecChip::SaveSpeakerLedState() {
   if (stateSaveVerbs.size() != kVerbs) {
     return false;
   }
+  std::array<std::uint32_t, kVerbs> responses{};  // all or nothing: a save that is interrupted is none
   for (std::size_t i = 0; i < kVerbs; ++i) {
-    savedResponses[i] = SendVerb(stateSaveVerbs[i]);
+    responses[i] = SendVerb(stateSaveVerbs[i]);
   }
+  savedResponses = responses;
+  isStateSaved = true;
   return true;
 }
 
@@ -149,7 +152,7 @@ bool GCodecChip::RestoreSpeakerLedState() {
   if (stateRestoreVerbs.size() != kVerbs) {
     return false;
   }
-  for (std::size_t i = 0; i < kVerbs; ++i) {
+  for (std::size_t i = 0; isStateSaved && i < kVerbs; ++i) {
     SendVerb(savedResponses[i] | stateRestoreVerbs[i]);
   }
   return true;

@@ -56,6 +56,7 @@ class GCodecChip : public GChip {
   std::vector<std::uint32_t> stateSaveVerbs;
   std::vector<std::uint32_t> stateRestoreVerbs;
   std::array<std::uint32_t, kVerbs> savedResponses{};
+  bool isStateSaved = false;
   std::uint16_t speakerBit = 0;
   std::uint16_t microphoneBit = 3;
 };

@@ -1,6 +1,7 @@
 #include "board/chips/GSioChip.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "board/base/IniReader.h"
 #include "board/chips/ChipNumbers.h"
@@ -129,9 +130,11 @@ void GSioChip::WriteEnvRegister(std::uint8_t reg, std::uint8_t value) {
 
 bool GSioChip::SaveFanState() {
   if (savedFanData.empty()) {
+    std::vector<std::uint8_t> values;  // all or nothing: a save that is interrupted is none
     for (const std::uint8_t reg : fanSaveRegs) {
-      savedFanData.push_back(ReadEnvRegister(reg));
+      values.push_back(ReadEnvRegister(reg));
     }
+    savedFanData = std::move(values);
   }
   return true;
 }
@@ -216,11 +219,13 @@ bool GSioChip::IsPowerLedRedSupported(bool& supported) {
 
 bool GSioChip::SavePowerLedState() {
   if (savedPowerLedData.empty()) {
+    std::vector<std::uint8_t> values;  // all or nothing: a save that is interrupted is none
     const ConfigMode mode(*this);
     SelectLogicalDevice(powerLedLdn);
     for (const std::uint8_t reg : powerLedStateRegs) {
-      savedPowerLedData.push_back(ReadConfigRegister(reg));
+      values.push_back(ReadConfigRegister(reg));
     }
+    savedPowerLedData = std::move(values);
   }
   return savedPowerLedData.size() == powerLedStateRegs.size();
 }

@@ -61,9 +61,11 @@ bool MaskedLedChip::Save(const Sequence& support, const Sequence& addresses, Seq
   if (support.empty()) {
     return false;
   }
+  Sequence values;  // all or nothing: a save that is interrupted is none
   for (const SequenceEntry& entry : addresses) {
-    saved.push_back({entry.command, {ReadRegisterByte(entry.command)}});
+    values.push_back({entry.command, {ReadRegisterByte(entry.command)}});
   }
+  saved.insert(saved.end(), values.begin(), values.end());
   return true;
 }
 

@@ -174,30 +174,43 @@ void SmscMec1322Chip::RestoreMux(List which) {
   WriteByte(savedMux);
 }
 
+// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back.
 bool SmscMec1322Chip::SavePowerLedState() {
   SaveMux(kPowerGreenSaveMux);
+  isPowerMuxSaved = true;
   RunList(kPowerGreenEnableMux);
   return true;
 }
 
 bool SmscMec1322Chip::RestorePowerLedState() {
+  if (!isPowerMuxSaved) {
+    return true;
+  }
   RestoreMux(kPowerGreenSaveMux);
   return AssertPowerLedGreen();
 }
 
 bool SmscMec1322Chip::SaveChargeLedState() {
   SaveMux(kChargeRedSaveMux);
-  RunList(kChargeRedEnableMux);
   savedMuxRed = savedMux;
+  isChargeRedMuxSaved = true;
+  RunList(kChargeRedEnableMux);
   SaveMux(kChargeGreenSaveMux);
+  savedMuxGreen = savedMux;
+  isChargeGreenMuxSaved = true;
   RunList(kChargeGreenEnableMux);
   return true;
 }
 
 bool SmscMec1322Chip::RestoreChargeLedState() {
-  RestoreMux(kChargeGreenSaveMux);
-  savedMux = savedMuxRed;
-  RestoreMux(kChargeRedSaveMux);
+  if (isChargeGreenMuxSaved) {
+    savedMux = savedMuxGreen;
+    RestoreMux(kChargeGreenSaveMux);
+  }
+  if (isChargeRedMuxSaved) {
+    savedMux = savedMuxRed;
+    RestoreMux(kChargeRedSaveMux);
+  }
   return true;
 }
 

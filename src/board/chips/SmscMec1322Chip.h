@@ -74,6 +74,10 @@ class SmscMec1322Chip : public EcChip {
   std::uint32_t waitTime;  // ms, behind each write of a list
   std::uint8_t savedMux = 0;
   std::uint8_t savedMuxRed = 0;
+  std::uint8_t savedMuxGreen = 0;  // of the charge LED; kept too, so that putting back can be begun again
+  bool isPowerMuxSaved = false;
+  bool isChargeRedMuxSaved = false;
+  bool isChargeGreenMuxSaved = false;
 };
 
 }  // namespace panelglow

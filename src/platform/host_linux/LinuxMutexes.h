@@ -7,12 +7,13 @@
 // away from under its owner, no write to a disk.
 #pragma once
 
+#include <cstdint>
 #include <map>
 #include <mutex>
-#include <string>
 
 #include "platform/NamedMutexes.h"
 #include "platform/posix/Descriptor.h"
+#include "platform/posix/OwnedName.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -25,10 +26,10 @@ class LinuxMutexes : public NamedMutexes {
 
  private:
   struct Mutex {
-    std::string address;
+    posix::OwnedName name;
     std::uint64_t owner = 0;  // CurrentThread::Id()
     unsigned count = 0;
-    posix::Descriptor socket;  // bound while owned
+    posix::Descriptor socket = {};  // open while owned
   };
 
   void Abandon(std::uint64_t thread);

@@ -1,10 +1,22 @@
 #include "platform/sim/SimMutexes.h"
 
+#include <poll.h>
+
 #include <algorithm>
+
+#include "platform/posix/OwnedName.h"
 
 namespace panelglow::platform::sim {
 
-SimMutexes::SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers) : scheduler_(scheduler) {
+namespace {
+
+constexpr std::string_view kFileLockSuffix = "_HalcyonFileParser";
+constexpr int kNextLook_ms = 5;
+
+}  // namespace
+
+SimMutexes::SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers, bool filesAreReal)
+    : scheduler_(scheduler), filesAreReal_(filesAreReal) {
   for (const Peer& peer : peers) {
     const MutexHandle handle = SimMutexes::Create(peer.mutex);
     scheduler_.At(peer.from, [this, handle] {
@@ -48,7 +60,19 @@ void SimMutexes::WaitFor(MutexHandle handle) {
     scheduler_.Block(&mutex, "the mutex \"" + mutex.name + "\"", std::nullopt);
   }
   mutex.owner = self;
-  ++mutex.count;
+  if (++mutex.count == 1 && filesAreReal_ && mutex.name.ends_with(kFileLockSuffix)) {
+    OwnAmongProcesses(mutex);
+  }
+}
+
+// The machine's time stands still meanwhile: it knows nothing of those processes.
+void SimMutexes::OwnAmongProcesses(Mutex& mutex) const {
+  const posix::OwnedName name(mutex.name);
+  while (posix::OwnedName::IsAvailable() && !(mutex.amongProcesses = name.TryToOwn())) {
+    const posix::Descriptor owner = name.WatchOwner();
+    pollfd watched{owner.Get(), POLLIN, 0};  // a negative descriptor is a mere wait
+    ::poll(&watched, 1, owner ? -1 : kNextLook_ms);
+  }
 }
 
 bool SimMutexes::Release(MutexHandle handle) {
@@ -59,6 +83,7 @@ bool SimMutexes::Release(MutexHandle handle) {
   Mutex& mutex = found->second;
   if (--mutex.count == 0) {
     mutex.owner = 0;
+    mutex.amongProcesses.Close();
     scheduler_.Wake(&mutex);
   }
   return true;
@@ -69,6 +94,7 @@ void SimMutexes::Abandon(ThreadId thread) {
     if (mutex.count != 0 && mutex.owner == thread) {
       mutex.owner = 0;
       mutex.count = 0;
+      mutex.amongProcesses.Close();
       scheduler_.Wake(&mutex);
     }
   }

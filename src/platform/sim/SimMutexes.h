@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "platform/NamedMutexes.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/sim/MachineDescription.h"
 #include "platform/sim/Scheduler.h"
 
@@ -13,7 +14,9 @@ namespace panelglow::platform::sim {
 
 class SimMutexes : public NamedMutexes {
  public:
-  SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers);
+  /// `filesAreReal`: the locks of files, which the real processes of this computer share, hold among those processes
+  /// too. The others guard what this machine alone has: its hardware and its screen.
+  SimMutexes(Scheduler& scheduler, const std::vector<Peer>& peers, bool filesAreReal);
 
   MutexHandle Create(std::string_view name) override;
   void WaitFor(MutexHandle mutex) override;
@@ -32,9 +35,13 @@ class SimMutexes : public NamedMutexes {
     std::string name;
     ThreadId owner = 0;
     unsigned count = 0;
+    posix::Descriptor amongProcesses = {};  // open while owned, of a real file's lock
   };
 
+  void OwnAmongProcesses(Mutex& mutex) const;
+
   Scheduler& scheduler_;
+  bool filesAreReal_;
   std::map<MutexHandle, Mutex> mutexes_;
 };
 

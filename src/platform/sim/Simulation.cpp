@@ -323,7 +323,7 @@ struct Simulation::Parts {
               }),
         driver(description.driver, buses, scheduler, trace, [this] { LookAtPanel(); }),
         management(description, scheduler, firmwareCall, [this] { LookAtPanel(); }),
-        mutexes(scheduler, description.peers),
+        mutexes(scheduler, description.peers, options.realFiles),
         clock(scheduler, description.startTime + static_cast<std::time_t>(simulationOptions.seed * 7919 % 86400)),
         threads(scheduler),
         console(scheduler, simulationOptions.captureOutput),

@@ -184,8 +184,16 @@ class LibXmlDocument : public XmlDocument {
       }
       return findings.problems;
     }
-    const xmlNode* root = xmlDocGetRootElement(document_.get());
-    xmlChar* named = xmlGetNsProp(const_cast<xmlNode*>(root), Xml("noNamespaceSchemaLocation"), Xml(kSchemaInstance));
+    return Validate();
+  }
+
+  std::vector<XmlProblem> Validate() override {
+    if (!document_) {
+      throw XmlComponentError("no document is loaded");
+    }
+    Findings findings;
+    xmlNode* root = xmlDocGetRootElement(document_.get());
+    xmlChar* named = xmlGetNsProp(root, Xml("noNamespaceSchemaLocation"), Xml(kSchemaInstance));
     const std::string schemaPath = Plain(named);
     xmlFree(named);
     const Schema schema = LoadSchema(schemaPath, findings);
@@ -201,13 +209,34 @@ class LibXmlDocument : public XmlDocument {
     }
     xmlSchemaSetValidStructuredErrors(validator.get(), NoteSchemaError, &findings);
     const int result = xmlSchemaValidateDoc(validator.get(), document_.get());
-    if (result != 0 && findings.problems.empty()) {
-      findings.problems.push_back({result, "the document does not fit its schema\n", "/"});
+    if (result == 0 || !findings.problems.empty()) {
+      return IsUndeclared(findings) ? ValidateChildren(validator.get(), root) : findings.problems;
     }
-    return findings.problems;
+    return {{result, "the document does not fit its schema\n", "/"}};
   }
 
  private:
+  // True when all that was found is that the schema does not know the element that was judged.
+  static bool IsUndeclared(const Findings& findings) {
+    return findings.problems.size() == 1 && findings.problems.front().code == XML_SCHEMAV_CVC_ELT_1;
+  }
+
+  static std::vector<XmlProblem> ValidateChildren(xmlSchemaValidCtxt* validator, const xmlNode* root) {
+    std::vector<XmlProblem> problems;
+    for (xmlNode* child = root->children; child != nullptr; child = child->next) {
+      if (child->type != XML_ELEMENT_NODE) {
+        continue;
+      }
+      Findings findings;
+      xmlSchemaSetValidStructuredErrors(validator, NoteSchemaError, &findings);
+      xmlSchemaValidateOneElement(validator, child);
+      if (!IsUndeclared(findings)) {
+        problems.insert(problems.end(), findings.problems.begin(), findings.problems.end());
+      }
+    }
+    return problems;
+  }
+
   static Document LoadFile(std::string_view path, Findings& findings) {
     const std::optional<std::string> bytes = ReadFile(path);
     if (!bytes) {
