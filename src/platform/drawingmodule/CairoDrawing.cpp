@@ -3,17 +3,14 @@
 #include <pango/pangocairo.h>
 
 #include <algorithm>
-#include <array>
 
 #include "platform/Text.h"
 #include "platform/desktop/ScrollParts.h"
+#include "platform/drawingmodule/TextLayouts.h"
 
 namespace panelglow::platform::desktop {
 
 namespace {
-
-using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
-using Description = std::unique_ptr<PangoFontDescription, Deleter<pango_font_description_free>>;
 
 constexpr int kIconSize = 32;  // pixels
 // Larger pictures are treated as unreadable: a small file can claim a size that takes all memory.
@@ -23,27 +20,6 @@ constexpr Color kButtonColor = 0x00E8E8E8;
 constexpr Color kPressedColor = 0x00D0D0D0;
 constexpr Color kWhite = 0x00FFFFFF;
 constexpr Color kFaintText = 0x00808080;
-
-// A caption without its marks.
-struct Caption {
-  std::u16string text;
-  std::size_t underlined = std::u16string::npos;
-};
-
-// A caption with its '&' marks taken out: "&&" is one '&', "&x" underlines the x.
-Caption ReadCaption(std::u16string_view source) {
-  Caption caption;
-  for (std::size_t i = 0; i < source.size(); ++i) {
-    if (source[i] == u'&' && i + 1 < source.size()) {
-      ++i;
-      if (source[i] != u'&' && caption.underlined == std::u16string::npos) {
-        caption.underlined = caption.text.size();
-      }
-    }
-    caption.text.push_back(source[i]);
-  }
-  return caption;
-}
 
 void SetColor(cairo_t* cr, Color color) {
   cairo_set_source_rgb(cr, (color & 0xFFU) / 255.0, (color >> 8U & 0xFFU) / 255.0, (color >> 16U & 0xFFU) / 255.0);
@@ -78,34 +54,6 @@ void DrawBevel(cairo_t* cr, const Rectangle& area, Color topLeft, Color bottomRi
   cairo_line_to(cr, area.right - 0.5, area.bottom - 0.5);
   cairo_line_to(cr, area.left + 0.5, area.bottom - 0.5);
   cairo_stroke(cr);
-}
-
-// Chinese characters have other forms in each language that writes them; all languages that are not named have the
-// last row's.
-struct HanForms {
-  std::string_view locale;
-  const char* families;
-};
-constexpr std::array<HanForms, 4> kHanForms{{{"zh_CN", "DejaVu Sans, Noto Sans CJK SC, Sans"},
-                                             {"zh_TW", "DejaVu Sans, Noto Sans CJK TC, Sans"},
-                                             {"ko_KR", "DejaVu Sans, Noto Sans CJK KR, Sans"},
-                                             {"", "DejaVu Sans, Noto Sans CJK JP, Sans"}}};
-
-Layout MakeLayout(cairo_t* cr, const std::string& text, const Font& font, const std::string& language) {
-  Layout layout(pango_cairo_create_layout(cr));
-  const auto* forms = std::find_if(kHanForms.begin(), kHanForms.end() - 1,
-                                   [&](const HanForms& row) { return row.locale == language; });
-  const Description description(pango_font_description_from_string(forms->families));
-  // A font's height is that of its cell; the letters take about three quarters of it.
-  pango_font_description_set_absolute_size(description.get(), font.height * 0.74 * PANGO_SCALE);
-  pango_font_description_set_weight(description.get(), static_cast<PangoWeight>(font.weight));
-  pango_layout_set_font_description(layout.get(), description.get());
-  if (!language.empty()) {
-    pango_context_set_language(pango_layout_get_context(layout.get()), pango_language_from_string(language.c_str()));
-    pango_layout_context_changed(layout.get());
-  }
-  pango_layout_set_text(layout.get(), text.data(), static_cast<int>(text.size()));
-  return layout;
 }
 
 void DrawPixbuf(cairo_t* cr, const GdkPixbuf* image, int x, int y) {
