@@ -111,7 +111,7 @@ TEST(SystemDisplay, WhenTheDisplayDiesTheRunEndsWithItsCodeAndTheLedsAsFound) {
     run.join();
     EXPECT_EQ(outcome.exitCode, 1) << outcome.output << outcome.errors;
     EXPECT_TRUE(outcome.IsOrderly()) << outcome.output;
-    EXPECT_EQ(outcome.Tagged("ReportFailure").size(), 1U) << outcome.output;
+    EXPECT_THAT(outcome.Tagged("ReportFailure"), ::testing::ElementsAre("ReportFailure 990640"));
     EXPECT_TRUE(outcome.LeftChanged().empty());
     EXPECT_TRUE(outcome.leftBehind.empty());
     const std::size_t told = outcome.errors.find("the display is gone");

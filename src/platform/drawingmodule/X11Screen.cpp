@@ -4,7 +4,6 @@
 #include <X11/Xatom.h>
 #include <X11/Xutil.h>
 #include <X11/cursorfont.h>
-#include <cairo-xlib.h>
 
 #include <algorithm>
 #include <array>
@@ -16,6 +15,7 @@
 #include "platform/Text.h"
 #include "platform/desktop/Damage.h"
 #include "platform/drawingmodule/X11Keys.h"
+#include "platform/drawingmodule/X11Picture.h"
 
 namespace panelglow::platform::desktop {
 
@@ -59,13 +59,8 @@ X11Screen::X11Screen(::Display* display)
 
 X11Screen::~X11Screen() {
   if (!alive_) {
-    // Giving up what the display held would be requests to it.
-    for (auto& [handle, shown] : windows_) {
-      static_cast<void>(shown.target.release());
-    }
-    return;
+    return;  // giving up what the display held would be requests to it
   }
-  windows_.clear();
   if (inputContext_ != nullptr) {
     XDestroyIC(inputContext_);
   }
@@ -105,15 +100,12 @@ void X11Screen::Place(ShownWindow& shown, const SceneWindow& window) {
                       CWOverrideRedirect | CWEventMask | CWCursor, &attributes);
     Name(shown, window.text);
     XMapRaised(display_, shown.window);
-    shown.target.reset(cairo_xlib_surface_create(display_, shown.window,
-                                                 DefaultVisual(display_, DefaultScreen(display_)), width, height));
   } else if (!(shown.frame == frame)) {
     XMoveResizeWindow(display_, shown.window, frame.left, frame.top, static_cast<unsigned>(width),
                       static_cast<unsigned>(height));
-    cairo_xlib_surface_set_size(shown.target.get(), width, height);
   }
   if (isNew || shown.frame.Width() != frame.Width() || shown.frame.Height() != frame.Height()) {
-    shown.picture.reset(cairo_image_surface_create(CAIRO_FORMAT_RGB24, width, height));
+    shown.picture = MakePicture(display_, width, height);
   }
   if (!isNew && shown.title != window.text) {
     Name(shown, window.text);
@@ -141,7 +133,6 @@ void X11Screen::RemoveAllBut(const std::vector<WindowHandle>& windows) {
     if (inputContext_ != nullptr && inputWindow_ == shown->second.window) {
       XDestroyIC(std::exchange(inputContext_, nullptr));
     }
-    shown->second.target.reset();
     XDestroyWindow(display_, shown->second.window);
     shown = windows_.erase(shown);
   }
@@ -243,18 +234,10 @@ void X11Screen::Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>
     }
     const ShownWindow& shown = windows_.at(handle);
     const Rectangle area = Scaled(sceneArea, scale_);
-    Paint(shown, {area.left - shown.frame.left, area.top - shown.frame.top, area.right - shown.frame.left,
-                  area.bottom - shown.frame.top});
+    PutPicture(display_, shown.window, shown.picture.get(),
+               {area.left - shown.frame.left, area.top - shown.frame.top, area.right - shown.frame.left,
+                area.bottom - shown.frame.top});
   }
-}
-
-// Copies a part of the picture, in the window's pixels, onto the display.
-void X11Screen::Paint(const ShownWindow& shown, const Rectangle& area) {
-  const Context context(cairo_create(shown.target.get()));
-  cairo_set_source_surface(context.get(), shown.picture.get(), 0, 0);
-  cairo_rectangle(context.get(), area.left, area.top, area.Width(), area.Height());
-  cairo_fill(context.get());
-  cairo_surface_flush(shown.target.get());
 }
 
 std::vector<ScreenEvent> X11Screen::TakeEvents() {
@@ -289,8 +272,9 @@ void X11Screen::TakeEvent(XEvent& event, std::vector<ScreenEvent>& events) {
     case Expose:
       for (const auto& [handle, shown] : windows_) {
         if (shown.window == event.xexpose.window) {
-          Paint(shown, {event.xexpose.x, event.xexpose.y, event.xexpose.x + event.xexpose.width,
-                        event.xexpose.y + event.xexpose.height});
+          PutPicture(display_, shown.window, shown.picture.get(),
+                     {event.xexpose.x, event.xexpose.y, event.xexpose.x + event.xexpose.width,
+                      event.xexpose.y + event.xexpose.height});
         }
       }
       break;
@@ -349,20 +333,25 @@ bool X11Screen::IsUnderOwnWindow() const {
 
 // Says once that the foreground is another program's now: until it is asked for again.
 void X11Screen::NoteLoss(std::vector<ScreenEvent>& events) {
+  isLost_ = isLost_ && (!hasFocus_ || isCovered_);  // it may come back by itself
   if (foreground_ == 0 || isLost_ || (hasFocus_ && !isCovered_)) {
     return;
   }
-  isLost_ = true;
-  isCovered_ = false;
-  ScreenEvent lost;
-  lost.kind = ScreenEvent::Kind::kForegroundLost;
+  ::Window focused = windows_.at(foreground_).window;
   if (!hasFocus_) {
-    ::Window focused = 0;
     int revertTo = 0;
     XGetInputFocus(display_, &focused, &revertTo);
-    lost.title = TitleOf(focused);
+    hasFocus_ = focused == windows_.at(foreground_).window;  // when the loss is an old story
+    if (hasFocus_ && !isCovered_) {
+      return;
+    }
   }
+  ScreenEvent lost;
+  lost.kind = ScreenEvent::Kind::kForegroundLost;
+  lost.title = hasFocus_ ? std::u16string() : TitleOf(focused);
   events.push_back(std::move(lost));
+  isLost_ = true;
+  isCovered_ = false;
 }
 
 // The title of a window, or of the nearest one around it that has one.

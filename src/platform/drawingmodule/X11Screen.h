@@ -37,7 +37,6 @@ class X11Screen : public Screen {
     Rectangle frame;  // pixels of the display
     std::u16string title;
     Surface picture;  // what the window shows, for exposures
-    Surface target;   // the window itself
   };
 
   explicit X11Screen(::Display* display);
@@ -49,7 +48,6 @@ class X11Screen : public Screen {
   void FocusOn(::Window window);
   void RaiseAll();
   void Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage);
-  static void Paint(const ShownWindow& shown, const Rectangle& area);
   void TakeEvent(XEvent& event, std::vector<ScreenEvent>& events);
   void TakeKey(XEvent& event, std::vector<ScreenEvent>& events);
   void NoteLoss(std::vector<ScreenEvent>& events);
