@@ -62,6 +62,10 @@ class SimThreads : public Threads {
  public:
   explicit SimThreads(Scheduler& scheduler) : scheduler_(scheduler) {}
   ThreadHandle Start(const std::string& name, std::function<void()> body) override {
+    if (refused_ != 0) {
+      --refused_;
+      return 0;
+    }
     const ThreadHandle thread = scheduler_.Start(name, std::move(body));
     scheduler_.Spend(10);
     return thread;
@@ -75,8 +79,11 @@ class SimThreads : public Threads {
   void Close(ThreadHandle /*thread*/) override {}
   void Terminate(ThreadHandle thread) override { scheduler_.Terminate(thread); }
 
+  void RefuseNext(unsigned count) { refused_ = count; }
+
  private:
   Scheduler& scheduler_;
+  unsigned refused_ = 0;
 };
 
 class SimConsole : public Console {
@@ -562,6 +569,7 @@ const MachineDescription& Simulation::Description() const { return parts_->descr
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
 const std::string& Simulation::Errors() const { return parts_->console.Errors(); }
 void Simulation::ClearOutput() { parts_->console.Clear(); }
+void Simulation::RefuseThreads(unsigned count) { parts_->threads.RefuseNext(count); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
 std::string Simulation::HardwareState() { return parts_->buses.State(); }
 std::string Simulation::SettledState() {

@@ -63,6 +63,9 @@ class Simulation {
   [[nodiscard]] const std::string& Errors() const;
   void ClearOutput();
 
+  /// The next `count` threads that the program asks for do not start, as on a system that has no more of them.
+  void RefuseThreads(unsigned count);
+
   /// A console control event, delivered on a thread of its own.
   void RaiseConsole(std::uint32_t type);
 
