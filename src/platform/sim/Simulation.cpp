@@ -9,6 +9,7 @@
 #include <cstdlib>
 #include <ctime>
 #include <map>
+#include <system_error>
 
 #include "platform/AbsentDevices.h"
 #include "platform/desktop/Scene.h"
@@ -101,10 +102,14 @@ class SimConsole : public Console {
         continue;
       }
       if (written <= 0) {
+        outputError_ = outputError_ == 0 ? errno : outputError_;
         return;
       }
       bytes.remove_prefix(static_cast<std::size_t>(written));
     }
+  }
+  std::string OutputProblem() override {
+    return outputError_ == 0 ? std::string() : std::generic_category().message(outputError_);
   }
   void WriteError(std::string_view bytes) override {
     if (capture_) {
@@ -133,6 +138,7 @@ class SimConsole : public Console {
   bool capture_;
   std::string output_;
   std::string errors_;
+  int outputError_ = 0;  // of the first write that failed
   std::function<bool(std::uint32_t)> handler_;
 };
 
@@ -463,7 +469,7 @@ struct Simulation::Parts {
   desktop::WindowSystem windows;
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
-  posix::LazyXmlDocuments xmlDocuments;
+  posix::LazyXmlDocuments xmlDocuments{files};
   AbsentDevices devices;
   Host host;
   std::unique_ptr<Operator> person;
