@@ -74,7 +74,7 @@ TEST_F(ScreenTest, AHeldSpaceAnswersOnePrompt) {
   });
   ASSERT_TRUE(AwaitPrompt());
   display_.Do("keydown space sleep 1.5 keyup space");  // repeated 25 times a second after 0.7 s
-  EXPECT_TRUE(display_.AwaitPixel(kInsideX, kOnlyInsideSecondY, kPromptGray, kLimit));
+  ASSERT_TRUE(display_.AwaitPixel(kInsideX, kOnlyInsideSecondY, kPromptGray, kLimit));
   display_.Do("key n");
   EXPECT_EQ(child.Wait(), 10 * prompt_result::kYes + prompt_result::kNo);
 }
@@ -84,9 +84,9 @@ TEST_F(ScreenTest, ATopmostPromptGetsPlaceAndKeyboardBack) {
   ASSERT_TRUE(AwaitPrompt());
   for (int times = 0; times < 3; ++times) {
     const ::Window other = ShowOther(1280, 1024);
-    EXPECT_TRUE(AwaitPrompt());
+    ASSERT_TRUE(AwaitPrompt());
     EXPECT_EQ(display_.PixelAt(10, 10), kRed);
-    EXPECT_TRUE(AwaitLossOfKeyboard(other));
+    ASSERT_TRUE(AwaitLossOfKeyboard(other));  // or nobody ends the child
   }
   display_.Do("key c");
   EXPECT_EQ(child.Wait(), prompt_result::kCancel);
@@ -98,7 +98,7 @@ TEST_F(ScreenTest, AClickTakesTheKeyboardBackForAnyPrompt) {
   const ::Window other = ShowOther(50, 50);
   display_.Do("key c");  // is the other window's
   display_.Click(kInsideX, kInsideY);
-  EXPECT_TRUE(AwaitLossOfKeyboard(other));
+  ASSERT_TRUE(AwaitLossOfKeyboard(other));  // or nobody ends the child
   display_.Do("key Return");
   EXPECT_EQ(child.Wait(), prompt_result::kOk);
 }
