@@ -37,6 +37,19 @@ void CustomBlinkGreenPowerLED_Legacy(FrontPanelTest& test, LEDStruct& entry);
 void CustomBlinkRedHDLED_Legacy(FrontPanelTest& test, LEDStruct& entry);
 
 void CustomBlinkTouchpadLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkWebcamLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkFloppyLED(FrontPanelTest& test, LEDStruct& entry);
+
+// The network LED: on the board where it has one, otherwise by an adapter's link.
+void CustomBlinkNetworkLED(FrontPanelTest& test, LEDStruct& entry);
+
+/// True when the board has done the whole blink.
+bool CustomBlinkNotebookWirelessLed(FrontPanelTest& test, LEDStruct& entry);
+
+// Drive LEDs: of a disk on the entry's controller, and of the first disk of a type.
+void CustomBlinkCtrlHDLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkIdeHDLED(FrontPanelTest& test, LEDStruct& entry);
+void CustomBlinkScsiHDLED(FrontPanelTest& test, LEDStruct& entry);
 
 /// Runs a worker as a thread's body: what ends it by an exception is logged, since nobody waits for its result.
 void RunBlinkWorker(BlinkWorker worker, FrontPanelTest& test, LEDStruct& entry);

@@ -4,6 +4,7 @@
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/Notices.h"
+#include "ledtests/DriveSelection.h"
 #include "ledtests/LedKind.h"
 
 namespace panelglow {
@@ -18,15 +19,6 @@ constexpr const char* kDefaultButtonFile = ".\\buttondefinition.xml";
 constexpr const char* kDefaultButtonSchema = ".\\buttondefinition.xsd";
 
 constexpr const char* kRequiredFileMissing = "990100";
-
-// The drive controllers of a selection. Drives are not found yet: no controller is known.
-std::vector<std::string> ControllersFor(const std::string& selection) {
-  if (!selection.empty()) {
-    CDMout::LogMessage(LogOptions::Warnings, kFreeText,
-                       "Drive LEDs (function hdgreen) are not tested by this version: they are left out of the run.");
-  }
-  return {};
-}
 
 }  // namespace
 
@@ -175,7 +167,9 @@ bool CustomLEDTest::PrepareDeviceArray() {
   BeginArray();
   for (const ArrayRow& row : kRows) {
     if (row.function == "hdgreen") {
-      AddDrives(ControllersFor(hdControllers));
+      if (!hdControllers.empty()) {
+        AddDrives(getCntrlListForHDD(hdControllers, massStorageIniFile, false));
+      }
     } else if (functions.count(row.function) != 0) {
       AddDevice(row, board.get());
     }

@@ -1,5 +1,7 @@
 #include "ledtests/FrontPanelTest.h"
 
+#include <exception>
+
 #include "board/MotherBoard.h"
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
@@ -23,6 +25,8 @@ constexpr const char* kStatusTerminated = "-1";
 constexpr int kDriverMissing = 20472;
 constexpr int kIconsMissing = 990618;
 constexpr int kEndedByRunControl = 995000;
+constexpr int kUnknownException = 990518;
+constexpr int kStandardException = 995205;
 
 constexpr int kFileMessage = 61;
 
@@ -30,14 +34,14 @@ std::uint32_t Now() { return platform::TheHost().clock.TickCount(); }
 
 }  // namespace
 
-FrontPanelTest::FrontPanelTest(CDevio& driver)
+FrontPanelTest::FrontPanelTest(CDevio& driverClient)
     : systemId([] {
         std::uint16_t id = 0;
         Tsk_GetSystemID(id);
         return id;
       }()),
-      legacyPorts(driver, systemId),
-      driver_(driver),
+      driver(driverClient),
+      legacyPorts(driverClient, systemId),
       startTick(Now()) {}
 
 FrontPanelTest::~FrontPanelTest() = default;
@@ -61,7 +65,7 @@ void FrontPanelTest::BeginRun(const std::string& testName) {
   details.retriesspecified = CDMUtil::ToString(retries);
   details.errorcode = "0";
   xmlCorrupted = CDMUtil::isXMLCorrupted(dataCollectionFile);
-  if (!driver_.IsDriverLoaded()) {
+  if (!driver.IsDriverLoaded()) {
     Notices::Tell(
         "There is no driver on this machine that reaches its LEDs, so nothing can be tested. To see a test on a "
         "simulated machine, try panelglow-diags-sim.");
@@ -107,7 +111,7 @@ void FrontPanelTest::RunAttempt(bool& passed) {
   BeforeAttempt();
   attemptStartTick = Now();
   UpdatePercentage(10);
-  PrepareAttempt();
+  PrepareRecorded();
   UpdatePercentage(20);
   LogMessage(LogOptions::Status, 57, "");
   BeforeDialog();
@@ -120,6 +124,31 @@ void FrontPanelTest::RunAttempt(bool& passed) {
           .messageId = 5});
   }
   PopulateAttemptInformation(attemptNumber, passed ? "0" : failureCode);
+}
+
+// What ends the run here, as an entry of a chip that is malformed, leaves its attempt in the log all the same.
+void FrontPanelTest::PrepareRecorded() {
+  try {
+    PrepareAttempt();
+  } catch (const CDMException* failure) {
+    RecordEnd(failure->code);
+    throw;
+  } catch (const std::exception&) {
+    RecordEnd(kStandardException);
+    throw;
+  } catch (int code) {
+    RecordEnd(code);
+    throw;
+  } catch (const std::string&) {
+    RecordEnd(kUnknownException);
+    throw;
+  }
+}
+
+void FrontPanelTest::RecordEnd(int code) {
+  PopulateAttemptInformation(attemptNumber, CDMUtil::ToString(code));
+  details.status = kStatusFailed;
+  WriteLog();
 }
 
 bool FrontPanelTest::RunSuperLEDTest() {

@@ -5,10 +5,12 @@
 #include <array>
 #include <atomic>
 #include <cstdint>
+#include <fstream>
 #include <initializer_list>
 #include <memory>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "harness/CDMDiag.h"
 #include "harness/DataCollectionLog.h"
@@ -92,10 +94,13 @@ class FrontPanelTest : public CDMDiag {
   platform::ThreadHandle workerThread = 0;
   DialogRules rules;
 
+  std::ofstream webcamLog;  // attached to no file: what the camera's worker notes is seen by no one
+
   std::string iniFile;
   std::string testIni;
   std::string chipIni;
 
+  CDevio& driver;
   LegacyPanelPorts legacyPorts;
 
  protected:
@@ -118,8 +123,8 @@ class FrontPanelTest : public CDMDiag {
     SupportQuestion question;  // only some boards have it: the board is asked; null: the selection is the claim
   };
 
-  /// `driver` is the client that legacy registers are reached by; it outlives the test.
-  explicit FrontPanelTest(CDevio& driver);
+  /// `driverClient` is the client that legacy registers are reached by; it outlives the test.
+  explicit FrontPanelTest(CDevio& driverClient);
 
   /// The run's record is begun, and a driver is there; otherwise throws a new CDMException.
   void BeginRun(const std::string& testName);
@@ -146,7 +151,8 @@ class FrontPanelTest : public CDMDiag {
 
   void BeginArray();
   void AddDevice(std::int32_t deviceId, std::uint8_t address, const std::string& controllerId);
-  /// The entry of a row, when the board has such a LED.
+  /// The entry of a row, when the board has such a LED. Throws NotBuiltException where its chip is not in this
+  /// version.
   void AddDevice(const ArrayRow& row, MotherBoard* board);
   /// One entry for each controller.
   void AddDrives(const std::vector<std::string>& controllers);
@@ -164,10 +170,11 @@ class FrontPanelTest : public CDMDiag {
   void RunAttempt(bool& passed);
   bool FinishPassed();
   bool FinishFailed();
+  void PrepareRecorded();
+  void RecordEnd(int code);
   void PopulateAttemptInformation(int retriesAttempted, const std::string& errorCode);
   void ShuffleDevices();
 
-  CDevio& driver_;
   CDMUtil::SubtestAttempt attempt;
   bool xmlCorrupted = false;
   std::uint32_t attemptStartTick = 0;

@@ -53,7 +53,8 @@ bool LEDStatusIndicator::Run() {
     assertLed = &MotherBoard::AssertPowerLedRed;
   }
   if (assertLed == nullptr) {
-    Notices::Tell("-BlinkType=" + blinkType + " names neither GreenPower nor RedPower in this very spelling: no LED is "
+    Notices::Tell("-BlinkType=" + blinkType +
+                  " names neither GreenPower nor RedPower in this very spelling: no LED is "
                   "blinked.");
   }
   std::unique_ptr<MotherBoard> board = MotherBoard::Instantiate(
@@ -66,6 +67,7 @@ bool LEDStatusIndicator::Run() {
     throw failure.release();  // owned by whoever catches it
   }
   {
+    board->RequireDrivable(MotherBoard::Led::kPower);
     const PutBack restore([&] { board->RestorePowerLedState(); });
     board->SavePowerLedState();
     const std::time_t begin = clock.WallTime();

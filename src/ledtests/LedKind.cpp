@@ -1,6 +1,7 @@
 #include "ledtests/LedKind.h"
 
 #include <algorithm>
+#include <iterator>
 
 namespace panelglow {
 
@@ -19,14 +20,20 @@ constexpr LedKind kKinds[] = {
     {"hdred", kHdRed, 2016, 1016, "770132", "BRHD", CustomBlinkRedHDLED},
     {"powerred", kPowerRed, 2020, 1020, "770134", "BRCP", CustomBlinkRedPowerLED},
     {"powergreen", kPowerGreen, 2017, 1017, "770133", "BGCP", CustomBlinkGreenPowerLED},
-    {"network", kNetwork, 2050, 1018, "770146", "BNL", nullptr},
-    {"webcam", kWebcam, 2051, 1024, "770147", "BWL", nullptr},
+    {"network", kNetwork, 2050, 1018, "770146", "BNL", CustomBlinkNetworkLED},
+    {"webcam", kWebcam, 2051, 1024, "770147", "BWL", CustomBlinkWebcamLED},
     {"chargered", kChargeRed, 2053, 1015, "770149", "BNL", CustomBlinkChargeRedLED},
     {"touchpadlock", kTouchpad, 2054, 1025, "770146", "BTL", CustomBlinkTouchpadLED},
     {"speakermute", kSpeakerMute, 2055, 1026, "770146", "BSL", BlinkSpeaker},
     {"microphone", kMicrophone, 2056, 1027, "770146", "BML", BlinkMicrophone},
-    {"hdgreen", kFirstHdGreen, kHdGreenCommand, kHdButtonCommand, "770106", "BCHD", nullptr},
+    {"hdgreen", kFirstHdGreen, kHdGreenCommand, kHdButtonCommand, "770106", "BCHD", CustomBlinkCtrlHDLED},
+    // Those that are selected by parameters alone.
+    {"floppy", kFloppy, 2001, 1001, "770111", "", CustomBlinkFloppyLED},
+    {"ide", kIdeDrive, 888, kHdButtonCommand, "770106", "", CustomBlinkIdeHDLED},
+    {"scsi", kScsiDrive, 666, kHdButtonCommand, "770106", "", CustomBlinkScsiHDLED},
 };
+
+constexpr std::size_t kByParametersAlone = 3;
 
 template <class Predicate>
 const LedKind* FindKind(Predicate matches) {
@@ -36,7 +43,9 @@ const LedKind* FindKind(Predicate matches) {
 
 }  // namespace
 
-std::span<const LedKind> LedKinds() { return kKinds; }
+std::span<const LedKind> LedKinds() { return std::span(kKinds).first(std::size(kKinds) - kByParametersAlone); }
+
+std::span<const LedKind> AllLedKinds() { return kKinds; }
 
 const LedKind* FindLedKindByFunction(std::string_view function) {
   return FindKind([&](const LedKind& kind) { return kind.function == function; });

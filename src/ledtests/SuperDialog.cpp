@@ -385,18 +385,12 @@ LEDStruct* SuperDialog::EntryFor(const LedKind& kind) {
 
 void SuperDialog::StartWorker(const LedKind& kind, LEDStruct& entry) {
   constexpr std::uint32_t kAfterLockKey_ms = 100;
-  const BlinkWorker worker = kind.worker;
-  if (worker == nullptr) {
-    CDMout::LogMessage(LogOptions::Warnings, kFreeText,
-                       "This version cannot blink the LED of the function " + std::string(kind.function) + ".");
-    return;
-  }
   if (test_.workerThread != 0) {
     overrunning_.push_back(test_.workerThread);
   }
-  test_.workerThread =
-      platform::TheHost().threads.Start("worker " + std::string(kind.function),
-                                        [this, worker, owned = &entry] { RunBlinkWorker(worker, test_, *owned); });
+  test_.workerThread = platform::TheHost().threads.Start(
+      "worker " + std::string(kind.function),
+      [this, worker = kind.worker, owned = &entry] { RunBlinkWorker(worker, test_, *owned); });
   if (IsLockKey(kind.deviceId)) {
     TheClock().Sleep(kAfterLockKey_ms);
   }

@@ -1,6 +1,7 @@
 // The real machine under Linux. What it cannot reach yet (driver, management, keys) answers as absent.
 #pragma once
 
+#include "platform/AbsentDevices.h"
 #include "platform/Host.h"
 #include "platform/host_linux/AbsentDriver.h"
 #include "platform/host_linux/AbsentInputs.h"
@@ -36,8 +37,29 @@ struct LinuxHost {
   profile::ProfileFilesOnFiles profiles{files};
   LinuxThreads threads;
   posix::LazyXmlDocuments xmlDocuments{files};
-  Host host{clock,  console,    cpu,     desktop,  driver, environment, files,  images,
-            inputs, management, mutexes, profiles, driver, threads,     inputs, xmlDocuments};
+  AbsentDevices devices;
+  Host host{.cameras = devices,
+            .clock = clock,
+            .connections = devices,
+            .console = console,
+            .cpu = cpu,
+            .desktop = desktop,
+            .deviceTree = devices,
+            .drivers = driver,
+            .environment = environment,
+            .files = files,
+            .images = images,
+            .keyboard = inputs,
+            .management = management,
+            .modules = devices,
+            .mutexes = mutexes,
+            .profiles = profiles,
+            .rawDisks = devices,
+            .registry = devices,
+            .services = driver,
+            .threads = threads,
+            .touchpad = inputs,
+            .xmlDocuments = xmlDocuments};
 };
 
 }  // namespace panelglow::platform::host_linux

@@ -175,6 +175,14 @@ void Operator::LookAtPrompt(const std::vector<Button>& buttons) {
 
 void Operator::LookAtTest(const std::vector<Button>& buttons) {
   const Microseconds now = simulation_.Time().Now();
+  const bool canStart =
+      std::any_of(buttons.begin(), buttons.end(), [](const Button& button) { return button.id == kStartTest; });
+  if (canStart) {
+    if (now >= windowSeen_ + kReading) {
+      Press(buttons, kStartTest);
+    }
+    return;
+  }
   if (policy_ == Policy::kSilent) {
     return;
   }

@@ -11,6 +11,7 @@
 #include <map>
 #include <system_error>
 
+#include "platform/AbsentDevices.h"
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
@@ -62,6 +63,10 @@ class SimThreads : public Threads {
  public:
   explicit SimThreads(Scheduler& scheduler) : scheduler_(scheduler) {}
   ThreadHandle Start(const std::string& name, std::function<void()> body) override {
+    if (refused_ != 0) {
+      --refused_;
+      return 0;
+    }
     const ThreadHandle thread = scheduler_.Start(name, std::move(body));
     scheduler_.Spend(10);
     return thread;
@@ -75,8 +80,11 @@ class SimThreads : public Threads {
   void Close(ThreadHandle /*thread*/) override {}
   void Terminate(ThreadHandle thread) override { scheduler_.Terminate(thread); }
 
+  void RefuseNext(unsigned count) { refused_ = count; }
+
  private:
   Scheduler& scheduler_;
+  unsigned refused_ = 0;
 };
 
 class SimConsole : public Console {
@@ -117,6 +125,7 @@ class SimConsole : public Console {
       scheduler_.Start("console control", [handler = handler_, type] { handler(type); });
     }
   }
+  [[nodiscard]] bool IsHeard() const { return handler_ != nullptr; }
   [[nodiscard]] const std::string& Output() const { return output_; }
   [[nodiscard]] const std::string& Errors() const { return errors_; }
   void Clear() {
@@ -335,8 +344,28 @@ struct Simulation::Parts {
         windowHost(scheduler),
         windows(windowHost, description.screenWidth, description.screenHeight),
         images(drawing),
-        host{clock,    console,    cpu,     windows,  driver, environment, files,    images,
-             keyboard, management, mutexes, profiles, driver, threads,     touchpad, xmlDocuments} {}
+        host{.cameras = devices,
+             .clock = clock,
+             .connections = devices,
+             .console = console,
+             .cpu = cpu,
+             .desktop = windows,
+             .deviceTree = devices,
+             .drivers = driver,
+             .environment = environment,
+             .files = files,
+             .images = images,
+             .keyboard = keyboard,
+             .management = management,
+             .modules = devices,
+             .mutexes = mutexes,
+             .profiles = profiles,
+             .rawDisks = devices,
+             .registry = devices,
+             .services = driver,
+             .threads = threads,
+             .touchpad = touchpad,
+             .xmlDocuments = xmlDocuments} {}
 
   static KeyboardDevice& AttachKeyboard(Buses& buses) {
     auto keyboard = std::make_unique<KeyboardDevice>();
@@ -393,6 +422,26 @@ struct Simulation::Parts {
     });
   }
 
+  // Lets all chips come to the end of what they have under way. One can set the next one going only a few times.
+  void Settle() {
+    constexpr int kMostSteps = 100;
+    for (int step = 0; step < kMostSteps; ++step) {
+      std::optional<Microseconds> end;
+      for (const Device* chip : chips) {
+        if (const std::optional<Microseconds> until = chip->UnderWayUntil()) {
+          end = std::min(end.value_or(*until), *until);
+        }
+      }
+      if (!end) {
+        return;
+      }
+      scheduler.PassTo(*end);
+      for (Device* chip : chips) {
+        chip->Advance();
+      }
+    }
+  }
+
   SimulationOptions options;
   MachineDescription description;
   Scheduler scheduler;
@@ -421,6 +470,7 @@ struct Simulation::Parts {
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
   posix::LazyXmlDocuments xmlDocuments{files};
+  AbsentDevices devices;
   Host host;
   std::unique_ptr<Operator> person;
   std::unique_ptr<SimScreen> screen;
@@ -490,7 +540,8 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
       if (parts_->screen) {
         parts_->screen->Look();
       }
-      for (std::uint32_t type = 0; type < 2; ++type) {
+      // What comes before the program listens waits for that, as it does between two hand-overs.
+      for (std::uint32_t type = 0; type < 2 && parts_->console.IsHeard(); ++type) {
         if (g_pendingSignals[type] != 0) {
           g_pendingSignals[type] = 0;
           RaiseConsole(type);
@@ -524,8 +575,13 @@ const MachineDescription& Simulation::Description() const { return parts_->descr
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
 const std::string& Simulation::Errors() const { return parts_->console.Errors(); }
 void Simulation::ClearOutput() { parts_->console.Clear(); }
+void Simulation::RefuseThreads(unsigned count) { parts_->threads.RefuseNext(count); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
 std::string Simulation::HardwareState() { return parts_->buses.State(); }
+std::string Simulation::SettledState() {
+  parts_->Settle();
+  return HardwareState();
+}
 const std::string& Simulation::InitialState() const { return parts_->initialState; }
 bool Simulation::IsMutexOwned(std::string_view name) const { return parts_->mutexes.IsOwned(name); }
 

@@ -1,0 +1,110 @@
+#include "ledtests/DriveSelection.h"
+
+#include <algorithm>
+#include <list>
+
+#include "harness/base/CDMUtil.h"
+#include "hw/SetupDI.h"
+#include "storage/MSUtils.h"
+
+namespace panelglow {
+
+namespace {
+
+std::uint8_t Digit(char c) { return c >= '0' && c <= '9' ? static_cast<std::uint8_t>(c - '0') : std::uint8_t{0}; }
+
+std::list<HDD_CTRL_INFO> FindControllers(const std::string& massStorageIni) {
+  std::list<HDD_CTRL_INFO> controllers;
+  WMIDiscovery& wmi = WMIDiscovery::Instance();
+  MSUtils::DiscoverInfoListIDEController(massStorageIni, &wmi, controllers);
+  MSUtils::DiscoverInfoListSCSIController(massStorageIni, &wmi, controllers);
+  return controllers;
+}
+
+}  // namespace
+
+std::vector<std::string> getCntrlListForHDD(const std::string& selection, const std::string& massStorageIni,
+                                            bool anyIsOne) {
+  std::vector<std::string> wanted;
+  CDMUtil::Split(selection, wanted, ",");
+  std::vector<std::string> ids;
+  for (const HDD_CTRL_INFO& controller : FindControllers(massStorageIni)) {
+    if (FindDiskOf(controller.pnpDeviceId).empty()) {
+      continue;  // without a disk nothing can be lit
+    }
+    if (selection == "all") {
+      ids.push_back(controller.pnpDeviceId);
+      continue;
+    }
+    if (anyIsOne && selection == "any") {
+      ids.push_back(controller.pnpDeviceId);
+      break;
+    }
+    const std::string name = FindControllerDetails(controller.vendorId, controller.deviceId, controller.subDeviceId,
+                                                   controller.subVendorId, massStorageIni);
+    ids.insert(ids.end(), static_cast<std::size_t>(std::count(wanted.begin(), wanted.end(), name)),
+               controller.pnpDeviceId);
+  }
+  return ids;
+}
+
+std::string FindControllerDetails(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subDeviceId,
+                                  std::uint32_t subVendorId, const std::string& massStorageIni) {
+  if (massStorageIni.empty()) {
+    return {};
+  }
+  std::list<CTRL_INFO> records;
+  MSUtils::LoadInfoForControllersInSystem(records, massStorageIni, "SATA CONTROLLERS", true);
+  MSUtils::LoadInfoForControllersInSystem(records, massStorageIni, "SAS CONTROLLERS", false);
+  MSUtils::CopyControllerListInfo(records);
+  const auto found = std::find_if(records.begin(), records.end(), [&](const CTRL_INFO& record) {
+    return record.vendorId == vendorId && record.deviceId == deviceId && record.subDeviceId == subDeviceId &&
+           record.subVendorId == subVendorId;
+  });
+  return found == records.end() ? std::string() : found->name;
+}
+
+std::string FindDiskOf(const std::string& controllerId) {
+  SetupDI controller(controllerId.c_str());
+  SetupDI child;
+  while (controller.NextChild(child)) {
+    const std::string id = child.GetDeviceInstanceId();
+    if (!child.GetInterfaceDevicePath(id, platform::kDiskInterface).empty()) {
+      return id;
+    }
+  }
+  return {};
+}
+
+std::string FindDrivePath(std::string_view type) {
+  SetupDI disks;
+  if (!disks.OpenDeviceList("", platform::kPresentDevices | platform::kDeviceInterfaces, platform::kDiskInterface)) {
+    return {};
+  }
+  const std::string wanted = "\\" + std::string(type);
+  while (disks.NextInterface()) {
+    const std::string path = disks.GetInterfaceDevicePath();
+    if (path.find(wanted) != std::string::npos) {
+      return path;
+    }
+  }
+  return {};
+}
+
+std::uint8_t ParseBufferForAdapter(std::string_view address) {
+  return address.empty() ? std::uint8_t{0} : Digit(address[0]);
+}
+
+std::uint8_t ParseBufferForTarget(std::string_view address) {
+  if (address.size() <= 2) {
+    return 0;
+  }
+  const bool isLong = address.size() > 3 && address[3] != ',';
+  return isLong ? static_cast<std::uint8_t>(Digit(address[2]) * 10 + Digit(address[3])) : Digit(address[2]);
+}
+
+std::uint8_t ParseBufferForLun(std::string_view address) {
+  return address.size() > 4 ? Digit(address[4]) : std::uint8_t{0};
+}
+
+}  // namespace panelglow

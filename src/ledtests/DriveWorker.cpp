@@ -1,0 +1,114 @@
+// The workers of drive LEDs, which have no switch of their own: they light when a disk is busy. So a disk is made
+// busy and left alone in turn, by a thread that reads one block and writes back the very bytes it has read.
+#include <cstdint>
+#include <memory>
+#include <span>
+#include <string>
+
+#include "hw/SetupDI.h"
+#include "ledtests/BlinkWorkers.h"
+#include "ledtests/DriveSelection.h"
+#include "ledtests/FrontPanelTest.h"
+#include "ledtests/PutBack.h"
+#include "platform/Host.h"
+#include "storage/MSUtils.h"
+
+namespace panelglow {
+
+namespace {
+
+constexpr int kMostCycles = 50;
+constexpr std::size_t kBlock_bytes = 0x8000;
+constexpr std::uint64_t kBlockPosition = 0x100000;  // from the start of the drive
+
+// States of the activity thread.
+constexpr std::uint32_t kStop = 0;
+constexpr std::uint32_t kRun = 1;
+constexpr std::uint32_t kGaveUp = 2;
+
+void KeepBusy(FrontPanelTest& test, platform::RawDisk& disk, std::span<std::byte> block) {
+  while (test.GetThreadState() == kRun) {
+    if (!disk.Seek(kBlockPosition)) {
+      test.SetThreadState(kGaveUp);
+      return;
+    }
+    // Nothing is written but what has just been read, whole.
+    if (disk.Read(block) == block.size() && disk.Seek(kBlockPosition)) {
+      disk.Write(block);
+    }
+  }
+}
+
+// The activity thread; its result is the thread state.
+void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive) {
+  platform::RawDisks& disks = platform::TheHost().rawDisks;
+  const std::unique_ptr<platform::RawDisk> disk = disks.Open(drive);
+  const std::unique_ptr<platform::DiskBlock> block = disk ? disks.Allocate(kBlock_bytes) : nullptr;
+  if (!block) {
+    test.SetThreadState(kGaveUp);
+    return;
+  }
+  KeepBusy(test, *disk, block->Bytes());
+}
+
+// An activity thread that runs on its own; it ends by the thread state.
+class Activity {
+ public:
+  explicit Activity(FrontPanelTest& test)
+      : thread_(platform::TheHost().threads.Start("drive activity", [&test, drive = test.driveHandle] {
+          ActAndLog([&] { CustomLightUpFpHddLed(test, drive); });
+        })) {}
+  ~Activity() { platform::TheHost().threads.Close(thread_); }
+  Activity(const Activity&) = delete;
+  Activity& operator=(const Activity&) = delete;
+  [[nodiscard]] bool HasStarted() const { return thread_ != 0; }
+
+ private:
+  platform::ThreadHandle thread_;
+};
+
+// False when an activity thread could not be started: the worker then ends without having finished.
+bool BlinkActivity(FrontPanelTest& test, const LEDStruct& entry) {
+  platform::Clock& clock = platform::TheHost().clock;
+  // However the worker ends, no activity goes on behind it.
+  const PutBack stopped([&] { test.SetThreadState(kStop); });
+  for (int cycle = 0; cycle < kMostCycles && entry.running; ++cycle) {
+    test.SetThreadState(kRun);
+    const Activity activity(test);
+    if (!activity.HasStarted()) {
+      return false;
+    }
+    clock.Sleep(static_cast<std::uint32_t>(test.hdOnTime));
+    test.SetThreadState(kStop);
+    clock.Sleep(static_cast<std::uint32_t>(test.hdOffTime));
+  }
+  return true;
+}
+
+// Without a drive that is found, the handle keeps its old value.
+void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::string& drive) {
+  if (!drive.empty()) {
+    test.driveHandle = drive;
+  }
+  entry.workerStarted = true;
+  if (BlinkActivity(test, entry)) {
+    entry.workerFinished = true;
+  }
+}
+
+}  // namespace
+
+void CustomBlinkCtrlHDLED(FrontPanelTest& test, LEDStruct& entry) {
+  const std::string disk = FindDiskOf(entry.controllerId);
+  CustomBlinkHDLED(test, entry, disk.empty() ? "" : MSUtils::GetDriveHandleStrUsingDevInstId(disk));
+}
+
+void CustomBlinkIdeHDLED(FrontPanelTest& test, LEDStruct& entry) {
+  CustomBlinkHDLED(test, entry, FindDrivePath("ide"));
+}
+
+void CustomBlinkScsiHDLED(FrontPanelTest& test, LEDStruct& entry) {
+  CustomBlinkHDLED(test, entry, FindDrivePath("scsi"));
+}
+
+}  // namespace panelglow
