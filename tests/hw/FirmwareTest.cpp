@@ -219,7 +219,7 @@ TEST(SmbiosScanner, WalksTheTableBehindTheEntryPoint) {
   };
   EXPECT_EQ(Memory(board, 1).Product(), "2A78 Board");
   EXPECT_EQ(Memory(board, 1, 0x0402, 0xFFE0).Product(), "2A78 Board");
-  for (const std::uint8_t slots : {0, 2, 200}) {
+  for (const std::uint8_t slots : std::initializer_list<std::uint8_t>{0, 2, 200}) {
     EXPECT_EQ(Memory(Joined({controller(slots, 0), board}), 2).Product(), "2A78 Board") << unsigned{slots};
     EXPECT_EQ(Memory(Joined({controller(slots, 2), board}), 2).Product(), "2A78 Board") << unsigned{slots};
   }
