@@ -75,9 +75,6 @@ bool SetupDI::OpenDeviceList(std::string_view enumerator, std::uint32_t flags, s
   nextDevice = 0;
   childCount = 0;
   nextInterface = 0;
-  if (!interfaceClass.empty()) {
-    classGuid = interfaceClass;
-  }
   return true;
 }
 
@@ -154,7 +151,6 @@ bool SetupDI::FindPciDevice(std::uint16_t vendorId, std::uint16_t deviceId, std:
   while (NextDevice()) {
     if (ReadDeviceProperty(platform::kHardwareIdProperty, buffer, size, type) &&
         TextIn(std::span(buffer).first(size)).find(wanted.data()) != std::string_view::npos) {
-      buffer.fill(0);
       ReadDeviceProperty(platform::kDescriptionProperty, buffer, size, type);
       deviceDescription = TextIn(buffer);
       return true;

@@ -65,7 +65,6 @@ class SetupDI {
  private:
   std::string PathOfCurrentInterface();
 
-  std::string classGuid;
   std::unique_ptr<platform::DeviceList> deviceInfoSet;
   platform::DeviceNode deviceInfoData = 0;  // present device of the list
   std::uint32_t nextDevice = 0;

@@ -145,7 +145,7 @@ void CustomLEDTest::PrepareAttempt() {
 }
 
 bool CustomLEDTest::PrepareDeviceArray() {
-  // The order before the shuffle. The drive LEDs stand between the first row and the second.
+  // The order before the shuffle. The row of hdgreen stands for one entry for each controller.
   constexpr ArrayRow kRows[] = {
       {"hdred", nullptr},
       {"hdgreen", nullptr},

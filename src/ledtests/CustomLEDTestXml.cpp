@@ -20,12 +20,12 @@ constexpr int kFileNotValid = 990163;
 constexpr int kComponentFailed = 990404;
 
 constexpr int kFileMessage = 61;
-constexpr int kTextMessage = 8;
 constexpr int kComponentMessage = 51;
 constexpr unsigned int kNotValidMessage = 53;
 constexpr unsigned int kErrorCountMessage = 56;
 
 constexpr const char* kSchemaInstance = "http://www.w3.org/2001/XMLSchema-instance";
+constexpr const char* kNoFunction = "none";     // of a button that is shown only
 constexpr const char* kDefaultCode = "770146";  // of a function that no button has
 
 // What a failure's text says of the component's problem, each line indented by `indent`.
@@ -95,7 +95,7 @@ std::unique_ptr<platform::XmlDocument> CustomLEDTest::LoadXMLForValidation(const
           .recordedCode = CDMUtil::ToString(kFileNotLoaded),
           .exceptionCode = kFileNotLoaded,
           .option = LogOptions::ServiceErrors,
-          .messageId = kTextMessage,
+          .messageId = kNote,
           .text =
               "\n    Input file " + inputXml + " is corrupt or cannot be found.\n    " + Describe(problem, "    ")});
   }
@@ -114,7 +114,7 @@ bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::stri
   }
   LogMessage(LogOptions::ServiceErrors, kNotValidMessage, "");
   LogMessage(LogOptions::ServiceErrors, kErrorCountMessage, static_cast<int>(problems.size()));
-  LogMessage(LogOptions::ServiceErrors, kTextMessage,
+  LogMessage(LogOptions::ServiceErrors, kNote,
              "\nInput XML file " + inputXml + " is not proper. Parsing errors are listed below :\n\n" + Rule());
   std::string blocks;
   for (std::size_t i = 0; i < problems.size(); ++i) {
@@ -124,7 +124,7 @@ bool CustomLEDTest::ValidateXMLFile(const std::string& inputXml, const std::stri
         .recordedCode = CDMUtil::ToString(kFileNotValid),
         .exceptionCode = kFileNotValid,
         .option = LogOptions::ServiceErrors,
-        .messageId = kTextMessage,
+        .messageId = kNote,
         .text = blocks});
 }
 
@@ -143,7 +143,7 @@ std::vector<platform::XmlProblem> CustomLEDTest::FindProblems(const std::string&
           .recordedCode = CDMUtil::ToString(kComponentFailed),
           .exceptionCode = kComponentFailed,
           .option = LogOptions::ServiceErrors,
-          .messageId = kTextMessage,
+          .messageId = kNote,
           .text = error.what()});
   }
 }
@@ -187,6 +187,12 @@ void CustomLEDTest::ParseXMLConfigurationFiles() {
     button.function = definition->GetAttributeValue("Function", "");
     button.buttonIco = definition->GetAttributeValue("ButtonIco", "");
     button.buttonLParam = definition->GetAttributeValue("ButtonLParam", "");
+    const std::string function = CDMUtil::ToLower(button.function);
+    if (function != kNoFunction && FindLedKindByFunction(function) == nullptr) {
+      Notices::Tell("The Button \"" + CDMUtil::ToLower(button.id) + "\" of " + buttonDefinitionFile +
+                    " has the function \"" + button.function +
+                    "\", which no LED has: it is shown and tests nothing. Say \"none\" where that is meant.");
+    }
     if (button.errorCode.empty()) {
       button.errorCode = definition->GetAttributeValue("ErrorCode", "");
     }

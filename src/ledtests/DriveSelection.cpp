@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <list>
+#include <set>
 
 #include "harness/base/CDMUtil.h"
 #include "hw/SetupDI.h"
@@ -10,6 +11,8 @@
 namespace panelglow {
 
 namespace {
+
+constexpr std::size_t kLongestName = 127;  // of a name, and of the whole selection, that is compared
 
 std::uint8_t Digit(char c) { return c >= '0' && c <= '9' ? static_cast<std::uint8_t>(c - '0') : std::uint8_t{0}; }
 
@@ -26,7 +29,7 @@ std::list<HDD_CTRL_INFO> FindControllers(const std::string& massStorageIni) {
 std::vector<std::string> getCntrlListForHDD(const std::string& selection, const std::string& massStorageIni,
                                             bool anyIsOne) {
   std::vector<std::string> wanted;
-  CDMUtil::Split(selection, wanted, ",");
+  CDMUtil::Split(selection.substr(0, kLongestName), wanted, ",");
   std::vector<std::string> ids;
   for (const HDD_CTRL_INFO& controller : FindControllers(massStorageIni)) {
     if (FindDiskOf(controller.pnpDeviceId).empty()) {
@@ -41,7 +44,8 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
       break;
     }
     const std::string name = FindControllerDetails(controller.vendorId, controller.deviceId, controller.subDeviceId,
-                                                   controller.subVendorId, massStorageIni);
+                                                   controller.subVendorId, massStorageIni)
+                                 .substr(0, kLongestName);
     ids.insert(ids.end(), static_cast<std::size_t>(std::count(wanted.begin(), wanted.end(), name)),
                controller.pnpDeviceId);
   }
@@ -67,9 +71,10 @@ std::string FindControllerDetails(std::uint32_t vendorId, std::uint32_t deviceId
 std::string FindDiskOf(const std::string& controllerId) {
   SetupDI controller(controllerId.c_str());
   SetupDI child;
-  while (controller.NextChild(child)) {
+  std::set<platform::DeviceNode> seen;  // a tree that is changing, or broken, may lead in a circle
+  while (controller.NextChild(child) && seen.insert(child.GetDevNode()).second) {
     const std::string id = child.GetDeviceInstanceId();
-    if (!child.GetInterfaceDevicePath(id, platform::kDiskInterface).empty()) {
+    if (!id.empty() && !child.GetInterfaceDevicePath(id, platform::kDiskInterface).empty()) {
       return id;
     }
   }
@@ -99,7 +104,7 @@ std::uint8_t ParseBufferForTarget(std::string_view address) {
   if (address.size() <= 2) {
     return 0;
   }
-  const bool isLong = address.size() > 3 && address[3] != ',';
+  const bool isLong = address.size() > 3 && address[3] >= '0' && address[3] <= '9';
   return isLong ? static_cast<std::uint8_t>(Digit(address[2]) * 10 + Digit(address[3])) : Digit(address[2]);
 }
 

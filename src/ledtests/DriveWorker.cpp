@@ -54,10 +54,9 @@ void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive) {
 // An activity thread that runs on its own; it ends by the thread state.
 class Activity {
  public:
-  explicit Activity(FrontPanelTest& test)
-      : thread_(platform::TheHost().threads.Start("drive activity", [&test, drive = test.driveHandle] {
-          ActAndLog([&] { CustomLightUpFpHddLed(test, drive); });
-        })) {}
+  Activity(FrontPanelTest& test, const std::string& drive)
+      : thread_(platform::TheHost().threads.Start(
+            "drive activity", [&test, drive] { ActAndLog([&] { CustomLightUpFpHddLed(test, drive); }); })) {}
   ~Activity() { platform::TheHost().threads.Close(thread_); }
   Activity(const Activity&) = delete;
   Activity& operator=(const Activity&) = delete;
@@ -68,30 +67,35 @@ class Activity {
 };
 
 // False when an activity thread could not be started: the worker then ends without having finished.
-bool BlinkActivity(FrontPanelTest& test, const LEDStruct& entry) {
+bool BlinkActivity(FrontPanelTest& test, const LEDStruct& entry, const std::string& drive) {
   platform::Clock& clock = platform::TheHost().clock;
-  // However the worker ends, no activity goes on behind it.
-  const PutBack stopped([&] { test.SetThreadState(kStop); });
+  // However the worker ends, no activity of its own goes on behind it.
+  bool isBusy = false;
+  const PutBack stopped([&] {
+    if (isBusy) {
+      test.SetThreadState(kStop);
+    }
+  });
   for (int cycle = 0; cycle < kMostCycles && entry.running; ++cycle) {
+    isBusy = true;
     test.SetThreadState(kRun);
-    const Activity activity(test);
+    const Activity activity(test, drive);
     if (!activity.HasStarted()) {
       return false;
     }
     clock.Sleep(static_cast<std::uint32_t>(test.hdOnTime));
     test.SetThreadState(kStop);
+    isBusy = false;
     clock.Sleep(static_cast<std::uint32_t>(test.hdOffTime));
   }
   return true;
 }
 
-// Without a drive that is found, the handle keeps its old value.
-void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::string& drive) {
-  if (!drive.empty()) {
-    test.driveHandle = drive;
-  }
+// Without a drive that is found, the one of the worker before is made busy.
+void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::string& found) {
+  const std::string drive = test.ChangeDriveHandle(found);
   entry.workerStarted = true;
-  if (BlinkActivity(test, entry)) {
+  if (BlinkActivity(test, entry, drive)) {
     entry.workerFinished = true;
   }
 }

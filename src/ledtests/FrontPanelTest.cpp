@@ -133,6 +133,9 @@ void FrontPanelTest::PrepareRecorded() {
   } catch (const CDMException* failure) {
     RecordEnd(failure->code);
     throw;
+  } catch (const CDMException& failure) {
+    RecordEnd(failure.code);
+    throw;
   } catch (const std::exception&) {
     RecordEnd(kStandardException);
     throw;

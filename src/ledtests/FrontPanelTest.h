@@ -8,6 +8,7 @@
 #include <fstream>
 #include <initializer_list>
 #include <memory>
+#include <mutex>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -53,8 +54,12 @@ class FrontPanelTest : public CDMDiag {
   /// Tells every worker to stop.
   void ResetAllParameters();
 
-  /// Waits up to about 3.8 s for a started worker to finish, and closes its handle.
+  /// Waits up to about 3.8 s for a worker to finish, and closes its handle; one that overruns keeps it, for the end
+  /// of the dialog to end it.
   void WaitForThreadToFinish(std::int32_t deviceId);
+
+  /// Makes a drive the one that is made busy, unless `found` is empty; the path of that drive. Workers may overlap.
+  std::string ChangeDriveHandle(const std::string& found);
 
   void SetThreadState(std::uint32_t state) { threadState = state; }
   [[nodiscard]] std::uint32_t GetThreadState() const { return threadState; }
@@ -90,7 +95,6 @@ class FrontPanelTest : public CDMDiag {
   std::atomic<std::uint32_t> threadState{0};
   std::string failureCode;    // of the LED now blinking, or of the cancel
   std::string hdControllers;  // "all", or a comma list of names; empty: no drive LEDs
-  std::string driveHandle;
   platform::ThreadHandle workerThread = 0;
   DialogRules rules;
 
@@ -167,6 +171,9 @@ class FrontPanelTest : public CDMDiag {
   CDMUtil::SubtestDetails details;
 
  private:
+  std::mutex driveGuard;
+  std::string driveHandle;  // by driveGuard
+
   void RunAttempt(bool& passed);
   bool FinishPassed();
   bool FinishFailed();

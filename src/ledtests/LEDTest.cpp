@@ -1,5 +1,7 @@
 #include "ledtests/LEDTest.h"
 
+#include <algorithm>
+
 #include "board/MotherBoard.h"
 #include "board/base/IniReader.h"
 #include "harness/base/CDMException.h"
@@ -149,8 +151,8 @@ bool LEDTest::Run() {
 void LEDTest::ReadArguments() {
   retries = GetArgument("-Retries", 1);
   ledTimeout = GetArgument("-LEDTimeout", 30);
-  hdOnTime = GetArgument("-HDLEDOnTime", 500);
-  hdOffTime = GetArgument("-HDLEDOffTime", 500);
+  hdOnTime = std::max(GetArgument("-HDLEDOnTime", 500), 0);
+  hdOffTime = std::max(GetArgument("-HDLEDOffTime", 500), 0);
   iniFile = GetArgument("-INIFile", "");
   testIni = GetArgument("-TestIni", "");
   chipIni = GetArgument("-ChipIni", "");
@@ -193,7 +195,7 @@ void LEDTest::PrepareAttempt() {
 }
 
 void LEDTest::PrepareDeviceArray(MotherBoard* board) {
-  // The order before the shuffle. The drives by controller stand behind the third row.
+  // The order before the shuffle. The row of hdgreen stands for one entry for each controller.
   constexpr ArrayRow kRows[] = {
       {"hdred", nullptr},       {"ide", nullptr},
       {"scsi", nullptr},        {"hdgreen", nullptr},

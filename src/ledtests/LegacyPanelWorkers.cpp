@@ -32,10 +32,14 @@ void BlinkLegacyLed(FrontPanelTest& test, LEDStruct& entry, const LegacyLed& led
                     const std::function<void(LegacyPanelPorts&)>& begin) {
   LegacyPanelPorts& ports = test.legacyPorts;
   {
+    bool touched = false;
     const PutBack restore([&] {
-      ports.CustomSetGreenPwrLedNativeMode();
-      ports.CustomSetRedPwrLedNativeMode();
+      if (touched) {
+        ports.CustomSetGreenPwrLedNativeMode();
+        ports.CustomSetRedPwrLedNativeMode();
+      }
     });
+    touched = true;
     ports.CustomSetGreenPwrLedGpioMode();
     ports.CustomSetRedPwrLedGpioMode();
     begin(ports);

@@ -44,6 +44,8 @@ void ActAndLog(const std::function<void()>& action) {
     LogFailure(text);
   } catch (int code) {
     LogFailure("code " + CDMUtil::ToString(code));
+  } catch (...) {
+    LogFailure("an unknown failure");
   }
 }
 

@@ -67,7 +67,7 @@ constexpr int kCancelText = 60;
 // Command ids of the dialog itself.
 constexpr std::uint32_t kLeaveCommand = 998;
 constexpr std::uint32_t kCancelCommand = 999;
-constexpr std::uint32_t kNextCommand = 1000;  // of the start button too, which the operator never gets to press
+constexpr std::uint32_t kNextCommand = 1000;  // of the start button too
 
 constexpr std::uint32_t kSecondsTimer = 1;
 constexpr std::uint32_t kForegroundTimer = 2;
@@ -390,7 +390,7 @@ void SuperDialog::StartWorker(const LedKind& kind, LEDStruct& entry) {
   }
   test_.workerThread = platform::TheHost().threads.Start(
       "worker " + std::string(kind.function),
-      [this, worker = kind.worker, owned = &entry] { RunBlinkWorker(worker, test_, *owned); });
+      [&test = test_, worker = kind.worker, owned = &entry] { RunBlinkWorker(worker, test, *owned); });
   if (IsLockKey(kind.deviceId)) {
     TheClock().Sleep(kAfterLockKey_ms);
   }

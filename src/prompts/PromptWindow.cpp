@@ -55,7 +55,6 @@ constexpr std::uint32_t kTicksPerSecond = 1000 / kTick_ms;
 constexpr std::uint32_t kStopTimer = 1;
 constexpr std::uint32_t kStopPeriod_ms = 5000;
 
-constexpr unsigned int kImageMessage = 8;
 
 // Button sets by style: the buttons in order, and the default one. Every other style has the first set.
 struct ButtonSet {
@@ -145,7 +144,7 @@ void PromptWindow::MeasureImage() {
   hasImage_ = size.has_value();
   imageFailed_ = !hasImage_;
   if (imageFailed_) {
-    CDMout::LogMessage(LogOptions::Debug, kImageMessage, "Error Loading Image File.");
+    CDMout::LogMessage(LogOptions::Debug, kNote, "Error Loading Image File.");
     imageWidth_ = kFailedImageWidth;
     imageHeight_ = kFailedImageHeight;
     return;

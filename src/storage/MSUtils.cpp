@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <memory>
 
+#include "config/FileLock.h"
 #include "config/OrgFileParser.h"
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
@@ -22,6 +23,7 @@ constexpr int kListUnusable = 990294;
 constexpr const char* kSataSection = "SATA CONTROLLERS";
 constexpr const char* kSasSection = "SAS CONTROLLERS";
 constexpr const char* kNvsSection = "NON VOLATILE STORAGE CONTROLLERS";
+constexpr const char* kDriveQueryLock = "_PanelglowDriveQuery";
 constexpr const char* kTemporaryFile = "\\tmpmsctrl.ini";
 constexpr const char* kKeyPrefix = "ENTRY";
 
@@ -57,8 +59,6 @@ Knowledge& Known() {
   throw failure.release();  // owned by whoever catches it
 }
 
-std::string Text(const std::array<char, kLongestWord>& room) { return room.data(); }
-
 // ---- the lines of a section
 
 // One line's fields are taken from the parser as they are needed; a number that a line lacks is that of the line
@@ -82,7 +82,7 @@ struct LineReader {
   std::string ReadWord() {
     std::array<char, kLongestWord> room{};
     parser.NextFieldText(room);
-    return Text(room);
+    return room.data();
   }
   std::string ReadName() {
     std::array<char, kLongestName> room{' '};
@@ -137,9 +137,9 @@ void AddByManagement(LineReader& line, std::list<CTRL_INFO>& out) {
 }
 
 // The section's lines under numbered keys in a file of their own, where they can be looked up by key.
-std::string WriteTemporaryFile(OrgFileParser& parser, const std::string& iniPath, const std::string& section) {
+void WriteTemporaryFile(OrgFileParser& parser, const std::string& path, const std::string& iniPath,
+                        const std::string& section) {
   platform::Files& files = platform::TheHost().files;
-  const std::string path = files.CurrentDirectory() + kTemporaryFile;
   if (Known().firstLoad && files.CanRead(path)) {
     Known().firstLoad = false;
     files.Remove(path);
@@ -151,7 +151,6 @@ std::string WriteTemporaryFile(OrgFileParser& parser, const std::string& iniPath
   parser.SetTargetPath(path);
   parser.EraseSection(section);
   parser.AppendLines(section);
-  return path;
 }
 
 // ---- the rows of the management service
@@ -267,7 +266,9 @@ int MSUtils::InterfaceKindOf(const std::string& word) {
 void MSUtils::LoadInfoForControllersInSystem(std::list<CTRL_INFO>& out, const std::string& iniPath,
                                              const std::string& section, bool sataFlag) {
   OrgFileParser source(iniPath);  // its lock is held to the end
-  const std::string path = WriteTemporaryFile(source, iniPath, section);
+  const std::string path = platform::TheHost().files.CurrentDirectory() + kTemporaryFile;
+  const FileLock turn(path);  // of another INI file's reader, too
+  WriteTemporaryFile(source, path, iniPath, section);
   FileParser parser(path);
   const int count = parser.CountKeys(section);
   if (count == 0) {
@@ -359,6 +360,7 @@ HDD_CTRL_INFO* MSUtils::AddUnlistedController(std::uint32_t vendorId, std::uint3
 int MSUtils::FindScsiPort(const std::string& driverName, UsedScsiPorts& usedScsiPorts) {
   constexpr int kPorts = 8;
   constexpr std::size_t kFirstBuffer = 32;
+  constexpr std::size_t kLargestValue = 65536;
   for (int port = 0; port < kPorts; ++port) {
     const std::unique_ptr<platform::RegistryKey> key = platform::TheHost().registry.OpenMachineKey(
         "HARDWARE\\DEVICEMAP\\Scsi\\Scsi Port " + CDMUtil::ToString(port));
@@ -367,7 +369,7 @@ int MSUtils::FindScsiPort(const std::string& driverName, UsedScsiPorts& usedScsi
     }
     std::string value(kFirstBuffer, '\0');
     std::size_t size = 0;
-    if (key->Read("Driver", value, size) == platform::kMoreData) {
+    if (key->Read("Driver", value, size) == platform::kMoreData && size <= kLargestValue) {
       value.assign(size, '\0');
       key->Read("Driver", value, size);
     }
@@ -387,6 +389,8 @@ int MSUtils::FindScsiPort(const std::string& driverName, UsedScsiPorts& usedScsi
 // ---- drives
 
 std::string MSUtils::GetDriveHandleStrUsingDevInstId(const std::string& devInstId) {
+  // Two workers may ask at once, one of them late; the management service is not made for that.
+  const platform::NamedMutexLock turn(platform::TheHost().mutexes, kDriveQueryLock);
   const wstring table = u"HDDs";
   WMIDiscovery& wmi = WMIDiscovery::Instance();
   wmi.RunNamedQuery(table, CDMUtil::ToWString("SELECT * FROM Win32_DiskDrive where PNPDeviceID='" +

@@ -54,7 +54,7 @@ TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
   EXPECT_THAT(outcome.output,
               EndsWith("FAILED: the green power LED was not recognised [ReportFailure 770133]; the code that the "
                        "installation gives this button [TestFailed 771017 \"\"] (exit code 1)\n"));
-  EXPECT_THAT(outcome.output, HasSubstr(" presses \"N&um Lock\" (1003)\n"));
+  EXPECT_THAT(outcome.output, HasSubstr(" presses \"Num Lock\" (1003)\n"));
   EXPECT_THAT(outcome.output, Not(HasSubstr("\x1B")));  // no colour where no terminal is
   EXPECT_THAT(installation.Read("trace.txt"), HasSubstr("0A20"));
   EXPECT_THAT(installation.Read("pictures/01-prompt.png"), StartsWith("\x89PNG"));

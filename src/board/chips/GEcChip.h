@@ -31,11 +31,16 @@ class GEcChip : public GChip {
   bool ReadLowLimitTemperature(int zone, int& value) override;
 
   bool IsPowerLedRedSupported(bool& supported) override;
-  bool SavePowerLedState() override { return RunSequence(powerSave); }
+  bool SavePowerLedState() override {
+    const bool saved = RunSequence(powerSave);
+    isPowerSaved = true;  // also by a sequence without entries; not by one that was interrupted
+    return saved;
+  }
   bool AssertPowerLedGreen() override { return RunSequence(powerGreenAssert); }
   bool AssertPowerLedRed() override { return RunSequence(powerRedAssert); }
   bool DeassertPowerLed() override { return RunSequence(powerDeassert); }
-  bool RestorePowerLedState() override { return RunSequence(powerRestore); }
+  /// Does nothing until there is a save.
+  bool RestorePowerLedState() override { return !isPowerSaved || RunSequence(powerRestore); }
 
   // ---- the part's protocol. The waits give up silently after 4095 looks: a stuck controller makes for wrong data,
   // not for a hang.
@@ -73,6 +78,7 @@ class GEcChip : public GChip {
   Sequence powerDeassert;
   Sequence powerSave;
   Sequence powerRestore;
+  bool isPowerSaved = false;
 };
 
 }  // namespace panelglow

@@ -84,8 +84,16 @@ void WindowSystem::SetLanguage(std::string_view locale) {
 }
 
 void WindowSystem::LoseForeground(std::u16string_view title) {
-  if (foreground_ != 0) {
-    foreign_ = title;
+  if (foreground_ == 0) {
+    return;
+  }
+  foreign_ = title;
+  // The release of a key that is held goes to the other program.
+  for (const auto& [handle, window] : windows_) {
+    if (std::exchange(window->spaceHeld, false)) {
+      window->pressed = false;
+      Changed();
+    }
   }
 }
 

@@ -42,7 +42,10 @@ std::uint32_t VirtualKeyOf(KeySym symbol) {
   if (symbol >= XK_a && symbol <= XK_z) {
     return static_cast<std::uint32_t>(symbol - XK_a + 'A');
   }
-  return symbol < 0x80 ? static_cast<std::uint32_t>(symbol) : 0;
+  // Of letters and digits the code is the character. Punctuation has codes of its own, which nothing here asks for;
+  // those of its characters belong to other keys.
+  const bool isOwnCode = (symbol >= XK_A && symbol <= XK_Z) || (symbol >= XK_0 && symbol <= XK_9);
+  return isOwnCode ? static_cast<std::uint32_t>(symbol) : 0;
 }
 
 char16_t FirstCharacter(const char* text, int length) {

@@ -154,8 +154,7 @@ void Operator::Look() {
   }
   if (top != 0) {
     const std::vector<Button> buttons = ButtonsOnTop(windows, top);
-    const bool isTest =
-        std::any_of(buttons.begin(), buttons.end(), [](const Button& button) { return button.id == kCancelTest; });
+    const bool isTest = windows.FindControl(top, kCancelTest) != 0;
     if (isTest) {
       LookAtTest(buttons);
     } else {
