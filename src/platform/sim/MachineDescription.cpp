@@ -6,6 +6,7 @@
 #include "platform/Text.h"
 #include "platform/sim/ChipReader.h"
 #include "platform/sim/DescriptionSection.h"
+#include "platform/sim/DeviceReader.h"
 
 namespace panelglow::platform::sim {
 
@@ -177,6 +178,7 @@ MachineDescription ParseMachine(std::string_view text, std::string_view source) 
   root.Each("driver", [&](Section& section) { ReadDriver(section, machine.driver); });
   root.Each("pci", [&](Section& section) { ReadPci(section, machine); });
   root.Each("chip", [&](Section& section) { machine.chips.push_back(ReadChip(section)); });
+  ReadDevices(root, machine);
   root.Each("firmware_call", [&](Section& section) { machine.firmwareCall = ReadFirmwareCall(section); });
   root.Each("led", [&](Section& section) { ReadLed(section, machine); });
   root.Each("event", [&](Section& section) { ReadEvent(section, machine); });
