@@ -2,13 +2,16 @@
 
 #include <algorithm>
 #include <array>
+#include <set>
 #include <vector>
 
 #include "board/base/IniReader.h"
-#include "board/base/mblib_exception.h"
+#include "board/base/NotBuiltException.h"
+#include "board/base/SelectedSystem.h"
 #include "board/chips/NoneChip.h"
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "hw/SMBIOSDiscovery.h"
 #include "hw/Tsk.h"
 #include "platform/Host.h"
@@ -22,6 +25,7 @@ constexpr int kChipFileMissing = 990431;
 constexpr int kChipFileMissingMessage = 70;
 constexpr const char* kNotFound = "was_not_found";
 constexpr const char* kUndef = "undef";
+constexpr const char* kNoChip = "none";
 
 // System ids whose boards are served by the older path unless the INI data names a class.
 constexpr std::array<std::string_view, 21> kOlderBoards{"A08",  "0A08", "A58",  "0A58", "AA8",  "0AA8", "A9C",
@@ -36,7 +40,7 @@ using BoardFactory = std::unique_ptr<MotherBoard> (*)(const std::string& systemI
 
 struct BoardRow {
   std::string_view name;
-  BoardFactory make;  // null: a class still to be written, answered like an unknown one
+  BoardFactory make;  // null: a class still to be written
 };
 
 std::unique_ptr<MotherBoard> MakeGeneric(const std::string& systemId) {
@@ -50,17 +54,50 @@ constexpr std::array<BoardRow, 6> kBoardClasses{{{"generic", MakeGeneric},
                                                  {"mistral", nullptr},
                                                  {"cobble", nullptr}}};
 
+// Boards of the oldest kind, still to be written.
+constexpr std::array<std::string_view, 2> kOldestClasses{"Lantern", "Orchard"};
+
+constexpr const char* kLegacyPorts = "the ports of the oldest desktops are used for its LEDs";
+
+// `what` is named by `setting` and cannot be had.
+[[noreturn]] void RefuseNotBuilt(const std::string& what, const Setting& setting, const std::string& served) {
+  const std::string text = setting.place + ": " + what + " \"" + setting.text +
+                           "\" is not built into this version, which cannot drive " + served;
+  Notices::Tell(text + ".");
+  throw NotBuiltException(text);
+}
+
+// A name as it is compared, with its place.
+Setting ReadName(const std::string& key, const std::string& defaultValue) {
+  Setting name = IniReader::Instance().ReadIniSetting(key, defaultValue);
+  name.text = CDMUtil::ToLower(name.text);
+  return name;
+}
+
 // The class that the INI data names; empty when it names none of this path.
-std::string SelectClass(const std::string& classKey, const std::string& systemId) {
-  std::string name = CDMUtil::ToLower(ReadIniValue(classKey, ""));
-  if (!name.empty()) {
+Setting SelectClass(const std::string& classKey, const std::string& systemId) {
+  Setting name = ReadName(classKey, "");
+  if (!name.text.empty()) {
     return name;
   }
-  if (ReadIniValue("MotherboardClass", kNotFound) != kNotFound || IsOlderBoard(systemId) ||
-      ReadIniValue("chips", kNotFound) == kNotFound) {
+  if (ReadIniValue("MotherboardClass", kNotFound) != kNotFound || IsOlderBoard(systemId)) {
     return {};
   }
-  return "generic";
+  if (ReadIniValue("chips", kNotFound) != kNotFound) {
+    return "generic";
+  }
+  Notices::Tell("This machine's board is not known: " +
+                (systemId.empty() ? "the firmware tables name no base board product"
+                                  : "its system id is \"" + systemId + "\"") +
+                ", and " + IniReader::Instance().DescribeSections() + "; without \"" + classKey +
+                "\" or \"chips\" there, " + kLegacyPorts + ".");
+  return {};
+}
+
+const ChipRow* FindChipRow(std::string_view name) {
+  const std::span<const ChipRow> rows = ChipRows();
+  const auto found = std::find_if(rows.begin(), rows.end(), [&](const ChipRow& row) { return row.name == name; });
+  return found == rows.end() ? nullptr : &*found;
 }
 
 }  // namespace
@@ -74,46 +111,72 @@ std::unique_ptr<MotherBoard> MotherBoard::Instantiate(const std::string& detectI
     missing.addMessage(LogOptions::DeviceErrors, kChipFileMissingMessage, chipIniPath);
     throw missing;
   }
-  const std::string systemId = SMBIOSDiscovery::Instance().GetProductText();
-  IniReader::Instance(systemIdOverride.empty() ? systemId : systemIdOverride, detectIniPath, testIniPath,
-                      chipIniPath);
-  const std::string wanted = SelectClass(classKey, systemId);
+  const SMBIOSDiscovery& firmware = SMBIOSDiscovery::Instance();
+  const std::string systemId = firmware.GetProductText();
+  const std::string section = systemIdOverride.empty() ? systemId : systemIdOverride;
+  const ProcessorInfo processor = firmware.GetProcessor(0);
+  IniReader::Instance(section, detectIniPath, testIniPath, chipIniPath);
+  SetSelectedSystem({CDMUtil::Trim(processor.manufacturer), processor.family, detectIniPath, section});
+  const Setting wanted = SelectClass(classKey, systemId);
   const auto found = std::find_if(kBoardClasses.begin(), kBoardClasses.end(),
-                                  [&](const BoardRow& row) { return row.name == wanted; });
-  return found == kBoardClasses.end() || found->make == nullptr ? nullptr : found->make(systemId);
+                                  [&](const BoardRow& row) { return row.name == wanted.text; });
+  if (found == kBoardClasses.end()) {
+    if (wanted.text != "legacy") {
+      TellOf(wanted, "there is no board class \"" + wanted.text + "\"; " + kLegacyPorts);
+    }
+    return nullptr;
+  }
+  if (found->make == nullptr) {
+    RefuseNotBuilt("the board class", wanted, "this machine's LEDs");
+  }
+  return found->make(systemId);
 }
 
 std::unique_ptr<MotherBoard> MotherBoard::Instance(const std::string& detectIniPath) {
   constexpr std::size_t kValueBuffer = 1024;
+  constexpr const char* kKey = "MotherboardClass";
   std::uint16_t id = 0;
   Tsk_GetSystemID(id);
   const std::string section = CDMUtil::ToUpper(CDMUtil::ToHexString(id));
   std::string name(kValueBuffer, '\0');
-  name.resize(platform::TheHost().profiles.GetValue(section, "MotherboardClass", "", name, detectIniPath));
-  // "Lantern" and "Orchard" are still to be written: a board that names one is answered like an unknown one.
+  name.resize(platform::TheHost().profiles.GetValue(section, kKey, "", name, detectIniPath));
+  const Setting wanted(name, detectIniPath + ", section [" + section + "], key \"" + kKey + "\"");
+  if (std::find(kOldestClasses.begin(), kOldestClasses.end(), name) != kOldestClasses.end()) {
+    RefuseNotBuilt("the board class", wanted, "this machine's LEDs");
+  }
+  if (!name.empty()) {
+    TellOf(wanted, "there is no board class \"" + name + "\"; " + kLegacyPorts);
+  }
   return nullptr;
 }
 
 MotherBoard::MotherBoard(const std::string& systemIdText)
     : lock(platform::TheHost().mutexes, kBoardMutex), systemId(SystemIdOf(systemIdText)), className("generic") {
-  const std::string list = CDMUtil::ToLower(ReadIniValue("chips", ""));
+  const Setting list = ReadName("chips", "");
   chips[kPlainChipPlace - 1] = std::make_unique<Chip>();
-  if (list.empty()) {
+  if (list.text.empty()) {
     BuildAllChips();
-  } else {
-    BuildListedChips(list);
+    return;
   }
+  CDMUtil::Split(list.text, listed, ", ");
+  for (const std::string& name : listed) {
+    const ChipRow* row = FindChipRow(name);
+    if (row == nullptr && name != kNoChip) {
+      TellOf(list, "there is no chip \"" + name + "\"");
+    } else if (row != nullptr && row->make == nullptr) {
+      TellOf(list, "the chip \"" + name + "\" is not built into this version; what it serves is not there");
+    }
+  }
+  BuildListedChips(listed);
 }
 
-void MotherBoard::BuildListedChips(const std::string& list) {
-  std::vector<std::string> names;
-  CDMUtil::Split(list, names, ", ");
+void MotherBoard::BuildListedChips(const std::vector<std::string>& names) {
   for (const bool genericFamilies : {false, true}) {  // these two come last
     for (const ChipRow& row : ChipRows()) {
       const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
-      const bool listed = std::find(names.begin(), names.end(), row.name) != names.end();
+      const bool isListed = std::find(names.begin(), names.end(), row.name) != names.end();
       std::unique_ptr<Chip>& chip = chips[row.place - 1];
-      if (isGeneric == genericFamilies && listed && !chip && row.make != nullptr) {
+      if (isGeneric == genericFamilies && isListed && !chip && row.make != nullptr) {
         chip = row.make();
       }
     }
@@ -153,36 +216,116 @@ void MotherBoard::BuildAllChips() {
   }
 }
 
+// ---- whose chip, and what to say when it does nothing
+
 Chip& MotherBoard::ChipOf(ChipChoice& choice) {
   if (choice.chip == nullptr) {
+    Setting name(choice.name);
     if (choice.name.empty()) {
-      choice.name = CDMUtil::ToLower(ReadIniValue(choice.key, ""));
+      name = ReadName(choice.key, "");
     }
+    const ChipRow* row = FindChipRow(name.text);
+    const bool isWanted = listed.empty() || std::find(listed.begin(), listed.end(), name.text) != listed.end();
+    if (row != nullptr && row->make == nullptr && isWanted) {
+      RefuseNotBuilt("the chip", name, std::string("the ") + choice.what);
+    }
+    choice.name = name.text;
     choice.chip = &GetChip(choice.name);
   }
   return *choice.chip;
 }
 
+void MotherBoard::RequireDrivable(Led led) {
+  switch (led) {
+    case Led::kPower:
+      ChipOf(powerLed);
+      break;
+    case Led::kCharge:
+      ChipOf(chargeLed);
+      break;
+    case Led::kHd:
+      ChipOf(hdLed);
+      break;
+    case Led::kWireless:
+      ChipOf(wirelessLed);
+      break;
+    case Led::kSpeaker:
+      ChipOf(speakerLed);
+      break;
+    case Led::kMicrophone:
+      ChipOf(microphoneLed);
+      break;
+  }
+}
+
+std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
+  IniReader& reader = IniReader::Instance();
+  if (choice.name.empty()) {
+    return std::string("the key \"") + choice.key + "\" names no chip for it; " + reader.DescribeSections();
+  }
+  const std::string place = reader.ReadIniSetting(choice.key, "").place;
+  const std::string chip = "the chip \"" + choice.name + "\" (" + (place.empty() ? choice.key : place) + ")";
+  if (FindChipRow(choice.name) == nullptr) {
+    return chip + " does not exist";
+  }
+  if (!listed.empty() && std::find(listed.begin(), listed.end(), choice.name) == listed.end()) {
+    return chip + " is not in the list of the key \"chips\"";
+  }
+  std::string missing;
+  for (const std::string& section :
+       std::set<std::string>{choice.name, ReadIniValue("chip." + choice.name + ".data", "")}) {
+    const std::string keys = reader.MissingKeys(section, choice.settings);
+    missing += keys.empty() ? "" : "; without a value in [" + section + "]: " + keys;
+  }
+  return chip + " has nothing for it" + missing;
+}
+
+bool MotherBoard::SwitchOn(ChipChoice& choice, bool (Chip::*operation)()) {
+  const bool done = (ChipOf(choice).*operation)();
+  choice.wasLit = choice.wasLit || done;
+  if (!done) {
+    Notices::Tell(std::string("The ") + choice.what + " cannot be lit: " + WhyNothing(choice) + ".");
+  }
+  return done;
+}
+
+bool MotherBoard::SwitchOff(ChipChoice& choice, bool (Chip::*operation)()) {
+  const bool done = (ChipOf(choice).*operation)();
+  if (!done && choice.wasLit) {
+    Notices::Tell(std::string("The ") + choice.what + " cannot be darkened: " + WhyNothing(choice) + ".");
+  }
+  return done;
+}
+
 bool MotherBoard::IsSupported(const char* key, ChipChoice& choice, bool (Chip::*ask)(bool&), bool& supported) {
-  const std::string answer = CDMUtil::ToLower(ReadIniValue(key, kUndef));
-  if (answer == "no" || answer == "yes") {
-    supported = answer == "yes";
+  const Setting answer = ReadName(key, kUndef);
+  if (answer.text == "no" || answer.text == "yes") {
+    supported = answer.text == "yes";
     return true;
+  }
+  if (!answer.text.empty()) {
+    TellOf(answer, "\"" + answer.text + "\" is neither yes nor no; the chip is asked");
   }
   return (ChipOf(choice).*ask)(supported);
 }
 
 bool MotherBoard::IsPanelLedLegacy() {
-  return CDMUtil::ToLower(ReadIniValue("test.panelglow.uselegacy", "no")) == "yes";
+  const Setting answer = ReadName("test.panelglow.uselegacy", "no");
+  if (!answer.text.empty() && answer.text != "yes" && answer.text != "no") {
+    TellOf(answer, "\"" + answer.text + "\" is neither yes nor no and counts as no");
+  }
+  return answer.text == "yes";
 }
+
+// ---- operations
 
 bool MotherBoard::IsPowerLedRedSupported(bool& supported) {
   return IsSupported("test.powerled.redled.support", powerLed, &Chip::IsPowerLedRedSupported, supported);
 }
 bool MotherBoard::SavePowerLedState() { return ChipOf(powerLed).SavePowerLedState(); }
-bool MotherBoard::AssertPowerLedGreen() { return ChipOf(powerLed).AssertPowerLedGreen(); }
-bool MotherBoard::AssertPowerLedRed() { return ChipOf(powerLed).AssertPowerLedRed(); }
-bool MotherBoard::DeassertPowerLed() { return ChipOf(powerLed).DeassertPowerLed(); }
+bool MotherBoard::AssertPowerLedGreen() { return SwitchOn(powerLed, &Chip::AssertPowerLedGreen); }
+bool MotherBoard::AssertPowerLedRed() { return SwitchOn(powerLed, &Chip::AssertPowerLedRed); }
+bool MotherBoard::DeassertPowerLed() { return SwitchOff(powerLed, &Chip::DeassertPowerLed); }
 bool MotherBoard::RestorePowerLedState() { return ChipOf(powerLed).RestorePowerLedState(); }
 bool MotherBoard::BlinkPowerLedGreen() { return ChipOf(powerLed).BlinkPowerLedGreen(); }
 bool MotherBoard::BlinkPowerLedRed() { return ChipOf(powerLed).BlinkPowerLedRed(); }
@@ -190,10 +333,10 @@ bool MotherBoard::BlinkPowerLedRed() { return ChipOf(powerLed).BlinkPowerLedRed(
 bool MotherBoard::IsChargeLedRedSupported(bool& supported) {
   return IsSupported("test.chargeled.redled.support", chargeLed, &Chip::IsChargeLedRedSupported, supported);
 }
-bool MotherBoard::AssertChargeLedWhite() { return ChipOf(chargeLed).AssertChargeLedWhite(); }
-bool MotherBoard::DeassertChargeLedWhite() { return ChipOf(chargeLed).DeassertChargeLedWhite(); }
-bool MotherBoard::AssertChargeLedRed() { return ChipOf(chargeLed).AssertChargeLedRed(); }
-bool MotherBoard::DeassertChargeLedRed() { return ChipOf(chargeLed).DeassertChargeLedRed(); }
+bool MotherBoard::AssertChargeLedWhite() { return SwitchOn(chargeLed, &Chip::AssertChargeLedWhite); }
+bool MotherBoard::DeassertChargeLedWhite() { return SwitchOff(chargeLed, &Chip::DeassertChargeLedWhite); }
+bool MotherBoard::AssertChargeLedRed() { return SwitchOn(chargeLed, &Chip::AssertChargeLedRed); }
+bool MotherBoard::DeassertChargeLedRed() { return SwitchOff(chargeLed, &Chip::DeassertChargeLedRed); }
 bool MotherBoard::BlinkChargeLedWhite() { return ChipOf(chargeLed).BlinkChargeLedWhite(); }
 bool MotherBoard::BlinkChargeLedRed() { return ChipOf(chargeLed).BlinkChargeLedRed(); }
 bool MotherBoard::SaveChargeLedState() { return ChipOf(chargeLed).SaveChargeLedState(); }
@@ -204,8 +347,8 @@ bool MotherBoard::IsHdLedRedSupported(bool& supported) {
 }
 bool MotherBoard::SaveHdLedState() { return ChipOf(hdLed).SaveHdLedState(); }
 bool MotherBoard::RestoreHdLedState() { return ChipOf(hdLed).RestoreHdLedState(); }
-bool MotherBoard::AssertHdLedRed() { return ChipOf(hdLed).AssertHdLedRed(); }
-bool MotherBoard::DeassertHdLedRed() { return ChipOf(hdLed).DeassertHdLedRed(); }
+bool MotherBoard::AssertHdLedRed() { return SwitchOn(hdLed, &Chip::AssertHdLedRed); }
+bool MotherBoard::DeassertHdLedRed() { return SwitchOff(hdLed, &Chip::DeassertHdLedRed); }
 bool MotherBoard::BlinkHdLedRed() { return ChipOf(hdLed).BlinkHdLedRed(); }
 
 bool MotherBoard::IsWirelessLedSupported(bool& supported) {
@@ -213,18 +356,18 @@ bool MotherBoard::IsWirelessLedSupported(bool& supported) {
 }
 bool MotherBoard::SaveWirelessLedState() { return ChipOf(wirelessLed).SaveWirelessLedState(); }
 bool MotherBoard::RestoreWirelessLedState() { return ChipOf(wirelessLed).RestoreWirelessLedState(); }
-bool MotherBoard::AssertWirelessLed() { return ChipOf(wirelessLed).AssertWirelessLed(); }
-bool MotherBoard::DeassertWirelessLed() { return ChipOf(wirelessLed).DeassertWirelessLed(); }
+bool MotherBoard::AssertWirelessLed() { return SwitchOn(wirelessLed, &Chip::AssertWirelessLed); }
+bool MotherBoard::DeassertWirelessLed() { return SwitchOff(wirelessLed, &Chip::DeassertWirelessLed); }
 bool MotherBoard::BlinkWirelessLed() { return false; }  // no chip can
 
 bool MotherBoard::SaveSpeakerLedState() { return ChipOf(speakerLed).SaveSpeakerLedState(); }
 bool MotherBoard::RestoreSpeakerLedState() { return ChipOf(speakerLed).RestoreSpeakerLedState(); }
 bool MotherBoard::BlinkSpeakerLed() { return ChipOf(speakerLed).BlinkSpeakerLed(); }
 bool MotherBoard::BlinkMicrophoneLed() { return ChipOf(microphoneLed).BlinkMicrophoneLed(); }
-bool MotherBoard::AssertSpeakerLed() { return ChipOf(speakerLed).AssertSpeakerLed(); }
-bool MotherBoard::DeassertSpeakerLed() { return ChipOf(speakerLed).DeassertSpeakerLed(); }
-bool MotherBoard::AssertMicrophoneLed() { return ChipOf(microphoneLed).AssertMicrophoneLed(); }
-bool MotherBoard::DeassertMicrophoneLed() { return ChipOf(microphoneLed).DeassertMicrophoneLed(); }
+bool MotherBoard::AssertSpeakerLed() { return SwitchOn(speakerLed, &Chip::AssertSpeakerLed); }
+bool MotherBoard::DeassertSpeakerLed() { return SwitchOff(speakerLed, &Chip::DeassertSpeakerLed); }
+bool MotherBoard::AssertMicrophoneLed() { return SwitchOn(microphoneLed, &Chip::AssertMicrophoneLed); }
+bool MotherBoard::DeassertMicrophoneLed() { return SwitchOff(microphoneLed, &Chip::DeassertMicrophoneLed); }
 
 bool MotherBoard::SavePowerButton() { return ChipOf(powerButton).SavePowerButtonState(); }
 bool MotherBoard::RestorePowerButton() { return ChipOf(powerButton).RestorePowerButtonState(); }

@@ -10,6 +10,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "board/ChipTable.h"
 #include "board/chips/Chip.h"
@@ -21,12 +22,14 @@ class MotherBoard {
  public:
   /// A board by the INI data of this system (or of `systemIdOverride`); null when the data selects no class of this
   /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException
-  /// 990431 when the chip file is missing, mblib_exception for chip data that cannot be used.
+  /// 990431 when the chip file is missing, mblib_exception for chip data that cannot be used, and NotBuiltException
+  /// for a class that this version does not have.
   static std::unique_ptr<MotherBoard> Instantiate(const std::string& detectIniPath, const std::string& testIniPath,
                                                   const std::string& chipIniPath, const std::string& classKey,
                                                   const std::string& systemIdOverride);
 
-  /// A board of the oldest kind by the key "MotherboardClass"; null when there is none of that name.
+  /// A board of the oldest kind by the key "MotherboardClass"; null when there is none of that name. Throws
+  /// NotBuiltException for one that this version does not have.
   static std::unique_ptr<MotherBoard> Instance(const std::string& detectIniPath);
 
   /// The generic class. `systemIdText` is the system id as hexadecimal text.
@@ -41,8 +44,16 @@ class MotherBoard {
   [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
   [[nodiscard]] const std::string& GetClassName() const { return className; }
 
-  // ---- LED operations. False: the board has no such LED. A blink that returns true has set the chip to blink the
-  // LED by itself; otherwise the caller toggles. Save and restore must come on the same board.
+  /// The LEDs of the panel that are the board's.
+  enum class Led { kPower, kCharge, kHd, kWireless, kSpeaker, kMicrophone };
+
+  /// Throws NotBuiltException when the files give the LED to a chip that this version does not have: nobody can light
+  /// it, and its darkness is not the panel's fault. To be asked before the LED's test; the operations throw the same.
+  void RequireDrivable(Led led);
+
+  // ---- LED operations. False: the board has no such LED; that an LED cannot be lit or darkened is told to people. A
+  // blink that returns true has set the chip to blink the LED by itself; otherwise the caller toggles. Save and
+  // restore must come on the same board.
 
   /// True when the tests are to use their own legacy port code instead of this board.
   virtual bool IsPanelLedLegacy();
@@ -104,29 +115,38 @@ class MotherBoard {
   /// class has preset that name.
   struct ChipChoice {
     const char* key;
-    std::string name;
+    const char* what;      // as people call it
+    const char* settings;  // beginning of its keys in a chip's section
+    std::string name = {};
     Chip* chip = nullptr;
+    bool wasLit = false;  // by this board
   };
   Chip& ChipOf(ChipChoice& choice);
 
   /// The answer of an INI key "yes" or "no"; for anything else the chip's.
   bool IsSupported(const char* key, ChipChoice& choice, bool (Chip::*ask)(bool&), bool& supported);
 
-  ChipChoice powerLed{"test.powerled.chip", {}};
-  ChipChoice chargeLed{"test.chargeled.chip", {}};
-  ChipChoice hdLed{"test.hdled.chip", {}};
-  ChipChoice wirelessLed{"test.wirelessled.chip", {}};
-  ChipChoice speakerLed{"test.speakerled.chip", {}};
-  ChipChoice microphoneLed{"test.microphoneled.chip", {}};
-  ChipChoice powerButton{"test.powerbutton.chip", {}};
+  /// The chip's operation. People are told when the LED cannot be lit, or be darkened once it was lit.
+  bool SwitchOn(ChipChoice& choice, bool (Chip::*operation)());
+  bool SwitchOff(ChipChoice& choice, bool (Chip::*operation)());
+
+  ChipChoice powerLed{"test.powerled.chip", "power LED", "powerled."};
+  ChipChoice chargeLed{"test.chargeled.chip", "charge LED", "chargeled."};
+  ChipChoice hdLed{"test.hdled.chip", "drive LED", "hdled."};
+  ChipChoice wirelessLed{"test.wirelessled.chip", "wireless LED", "wirelessled."};
+  ChipChoice speakerLed{"test.speakerled.chip", "speaker LED", "codecgpio."};
+  ChipChoice microphoneLed{"test.microphoneled.chip", "microphone LED", "codecgpio."};
+  ChipChoice powerButton{"test.powerbutton.chip", "power button", ""};
 
  private:
-  void BuildListedChips(const std::string& list);
+  void BuildListedChips(const std::vector<std::string>& names);
   void BuildAllChips();
   void InitializeGeneric(std::size_t place);
+  [[nodiscard]] std::string WhyNothing(const ChipChoice& choice) const;
 
   platform::NamedMutexLock lock;  // in front of the chips: given up behind them, also when the construction fails
   std::array<std::unique_ptr<Chip>, kChipPlaces> chips;
+  std::vector<std::string> listed;  // the value of "chips", in names; none: every class
   std::uint16_t systemId;
   std::string className;
 };

@@ -148,28 +148,26 @@ bool FileParser::NextFieldNumber(unsigned int& out, int base) {
 
 // ---- sections and keys
 
-int FileParser::CountSections() {
-  if (sectionCount < 0) {
+const std::vector<std::string>& FileParser::SectionNames() {
+  if (!sectionNames) {
     sectionNames = ReadList(
         [&](std::span<char> room) { return Profiles().GetValue(std::nullopt, std::nullopt, "", room, path); }, false);
-    sectionCount = static_cast<int>(sectionNames.size());
   }
-  return sectionCount;
+  return *sectionNames;
 }
 
+int FileParser::CountSections() { return static_cast<int>(SectionNames().size()); }
+
 bool FileParser::HasSection(const std::string& name) {
-  if (sectionNames.empty()) {
-    CountSections();
-  }
-  return std::any_of(sectionNames.begin(), sectionNames.end(),
+  const std::vector<std::string>& names = SectionNames();
+  return std::any_of(names.begin(), names.end(),
                      [&](const std::string& section) { return CDMUtil::EqualIgnoreCase(section, name); });
 }
 
 int FileParser::CountKeys(const std::string& section) {
-  keyCount = static_cast<int>(
+  return static_cast<int>(
       ReadList([&](std::span<char> room) { return Profiles().GetValue(section, std::nullopt, "", room, path); }, true)
           .size());
-  return keyCount;
 }
 
 // ---- the target file

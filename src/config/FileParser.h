@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <functional>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -78,20 +79,19 @@ class FileParser {
   /// and for an empty one when there must be some.
   static std::vector<std::string> ReadList(const ListCall& call, bool mustHaveContent);
 
-  std::vector<std::string> sectionNames;  // filled at first need
-  std::string buffer;                     // the current line as read
+  std::string buffer;  // the current line as read
   std::string currentValue;
   std::string path;
   std::string targetPath;
   std::vector<std::string> fields;
   std::size_t fieldIndex = 0;  // of the field to be handed out next
-  int sectionCount = -1;
-  int keyCount = -1;
 
  private:
+  const std::vector<std::string>& SectionNames();
   bool NextField(std::size_t& cursor, std::string& out) const;
   int Convert(const std::string& section, const std::string& prefix, bool clear, int firstNumber);
 
+  std::optional<std::vector<std::string>> sectionNames;  // read at first need
   FileLock lock;
 };
 

@@ -15,6 +15,7 @@ class IniFile {
   IniFile& operator=(const IniFile&) = default;
 
   /// True when the file existed at construction, or after a successful section read or a write.
+  [[nodiscard]] const std::string& GetPath() const { return path; }
   [[nodiscard]] bool Exists() const { return exists; }
 
   /// The value, at most 254 characters of it. Without the file: empty, whatever the default. Otherwise the section's

@@ -6,13 +6,12 @@
 namespace panelglow {
 
 int OrgFileParser::ReadSection(const std::string& section) {
-  if (lineCount == 0) {
+  if (lines.empty()) {
     lines = ReadList(
         [&](std::span<char> room) { return platform::TheHost().profiles.GetSection(section, room, path); }, false);
-    lineCount = static_cast<int>(lines.size());
     lineIndex = 0;
   }
-  return lineCount;
+  return static_cast<int>(lines.size());
 }
 
 bool OrgFileParser::NextLine() {
@@ -34,7 +33,6 @@ void OrgFileParser::AppendLines(const std::string& section) {
 
 void OrgFileParser::Reset() {
   lines.clear();
-  lineCount = 0;
   lineIndex = 0;
 }
 

@@ -22,7 +22,7 @@ class OrgFileParser : public FileParser {
   /// Takes the next line and splits it into fields. False at the end.
   bool NextLine();
 
-  /// Writes the lines to the target file under the prefix and rising numbers. Throws -1 when that fails.
+  /// Writes the lines to the target file under the prefix and rising numbers from 0. Throws -1 when that fails.
   void AppendLines(const std::string& section);
 
   /// Forgets the lines; the numbering goes on.
@@ -33,8 +33,7 @@ class OrgFileParser : public FileParser {
  private:
   std::vector<std::string> lines;
   std::string prefix;
-  int lineCount = 0;
-  int nextEntry = 1;
+  int nextEntry = 0;
   std::size_t lineIndex = 0;
 };
 

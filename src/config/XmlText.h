@@ -56,14 +56,14 @@ class XmlText {
   }
 
  private:
-  // In place, the last byte holds how many of the 15 before it are free. Otherwise it is negative, the first eight
-  // bytes are the address of the characters and the next four their number.
+  // In place, the last byte holds how many of the 15 before it are free. Otherwise it is kOnHeap, the first eight
+  // bytes are the address of the characters and the next four their number. Nothing here asks whether char is signed.
   using Bytes = std::array<char, 16>;
   static constexpr char kInPlace = 15;
-  static constexpr char kOnHeap = -1;
+  static constexpr char kOnHeap = 16;
   static constexpr Bytes kEmpty{0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, kInPlace};
 
-  [[nodiscard]] bool IsInPlace() const noexcept { return bytes_.back() >= 0; }
+  [[nodiscard]] bool IsInPlace() const noexcept { return bytes_.back() != kOnHeap; }
   [[nodiscard]] char* Heap() const noexcept {
     char* characters = nullptr;
     std::memcpy(&characters, bytes_.data(), sizeof(characters));

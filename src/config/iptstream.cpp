@@ -2,9 +2,7 @@
 
 #include <algorithm>
 #include <array>
-#include <limits>
 #include <stdexcept>
-#include <streambuf>
 #include <type_traits>
 #include <utility>
 
@@ -20,36 +18,13 @@ constexpr std::uint32_t kLargestStep = 1U << 16U;
 Persistent* IdentityOf(Persistent& object) { return &object; }
 Persistent* IdentityOf(PersistentByProxy& object) { return &object.GetProxy(); }
 
-// What a stream buffer holds ready, without a virtual call for each few bytes.
-class ReadyBytes : public std::streambuf {
- public:
-  static const char* Take(std::streambuf& source, std::size_t size) {
-    const char* const here = (source.*&ReadyBytes::gptr)();
-    const auto ready = static_cast<std::size_t>((source.*&ReadyBytes::egptr)() - here);
-    if (here == nullptr || size > ready || size > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
-      return nullptr;
-    }
-    (source.*&ReadyBytes::gbump)(static_cast<int>(size));
-    return here;
-  }
-};
-
 }  // namespace
 
 // ---- bytes, integers and texts
 
-// The next `size` bytes where the source holds them, which moves behind them; null when it has not so many ready.
-const char* iptstream::TakeReady(std::size_t size) {
+void iptstream::Read(char* data, std::size_t size) {
   if (broken) {
     throw std::runtime_error("The stream has failed before");
-  }
-  return bytes.good() ? ReadyBytes::Take(*bytes.rdbuf(), size) : nullptr;
-}
-
-void iptstream::Read(char* data, std::size_t size) {
-  if (const char* ready = TakeReady(size)) {
-    std::copy_n(ready, size, data);
-    return;
   }
   const auto length = static_cast<std::streamsize>(size);
   if (!bytes.good() || bytes.rdbuf()->sgetn(data, length) != length) {
@@ -72,20 +47,16 @@ std::uint32_t iptstream::ReadUnsigned() {
 }
 
 std::string_view iptstream::ReadText() {
-  const std::uint32_t length = ReadUnsigned();
-  if (const char* ready = TakeReady(length)) {
-    return {ready, length};
-  }
   // Piece by piece: a length that lies takes no more memory than the stream has bytes.
-  pieces.clear();
-  for (std::uint32_t left = length; left > 0;) {
+  text.clear();
+  for (std::uint32_t left = ReadUnsigned(); left > 0;) {
     const std::uint32_t step = std::min(left, kLargestStep);
-    const std::size_t had = pieces.size();
-    pieces.resize(had + step);
-    Read(pieces.data() + had, step);
+    const std::size_t had = text.size();
+    text.resize(had + step);
+    Read(text.data() + had, step);
     left -= step;
   }
-  return pieces;
+  return text;
 }
 
 // What failed leaves objects half read and on their way out: nothing may follow it, and no pointer may lead to them.

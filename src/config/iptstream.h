@@ -28,7 +28,7 @@ class iptstream final : public ptstream {
 
   std::uint32_t ReadUnsigned();
   std::int32_t ReadInteger() { return static_cast<std::int32_t>(ReadUnsigned()); }
-  void ReadString(std::string& text) { text = ReadText(); }
+  void ReadString(std::string& target) { target = ReadText(); }
 
   /// The same, good until the next call.
   std::string_view ReadText();
@@ -98,7 +98,6 @@ class iptstream final : public ptstream {
   indexed_pointer& EntryOf(std::uint32_t number);
   std::uint8_t ReadByte();
   void Read(char* data, std::size_t size);
-  const char* TakeReady(std::size_t size);
   [[noreturn]] void Fail(const std::string& message);
 
   std::ios& bytes;                                 // buffer and state of the byte stream
@@ -107,7 +106,7 @@ class iptstream final : public ptstream {
   std::uint32_t depth = 0;                         // of the objects being read
   std::uint32_t deepest = 0;                       // level that was reached since the innermost of them began
   bool broken = false;
-  std::string pieces;  // of the last ReadText, when its bytes came in pieces
+  std::string text;  // of the last ReadText
 };
 
 }  // namespace panelglow

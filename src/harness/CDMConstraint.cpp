@@ -105,44 +105,23 @@ bool CDMConstraint::Check(const std::string& value) const {
   }
 }
 
-std::string CDMConstraint::GetLowText() const {
+// The one of the three that the rule's type has; `none` where there are no numbers.
+std::string CDMConstraint::TextOf(int integer, double real, std::int64_t large, const char* none) const {
   switch (valueType) {
     case CDMArgumentType::Integer:
-      return CDMUtil::ToString(intLow);
+      return CDMUtil::ToString(integer);
     case CDMArgumentType::Double:
-      return CDMUtil::ToString(doubleLow);
+      return CDMUtil::ToString(real);
     case CDMArgumentType::LargeInteger:
-      return CDMUtil::ToString(longLow);
+      return CDMUtil::ToString(large);
     default:
-      return kNoNumber;
+      return none;
   }
 }
 
-std::string CDMConstraint::GetHighText() const {
-  switch (valueType) {
-    case CDMArgumentType::Integer:
-      return CDMUtil::ToString(intHigh);
-    case CDMArgumentType::Double:
-      return CDMUtil::ToString(doubleHigh);
-    case CDMArgumentType::LargeInteger:
-      return CDMUtil::ToString(longHigh);
-    default:
-      return kNoNumber;
-  }
-}
-
-std::string CDMConstraint::GetValueText() const {
-  switch (valueType) {
-    case CDMArgumentType::Integer:
-      return CDMUtil::ToString(intValue);
-    case CDMArgumentType::Double:
-      return CDMUtil::ToString(doubleValue);
-    case CDMArgumentType::LargeInteger:
-      return CDMUtil::ToString(longValue);
-    default:
-      return {};
-  }
-}
+std::string CDMConstraint::GetLowText() const { return TextOf(intLow, doubleLow, longLow, kNoNumber); }
+std::string CDMConstraint::GetHighText() const { return TextOf(intHigh, doubleHigh, longHigh, kNoNumber); }
+std::string CDMConstraint::GetValueText() const { return TextOf(intValue, doubleValue, longValue, ""); }
 
 std::string CDMConstraint::GetHelp() const {
   if (!list.empty()) {

@@ -56,6 +56,7 @@ class CDMConstraint {
   template <class Number>
   [[nodiscard]] bool Compare(Number value, Number low, Number high, Number single) const;
   [[nodiscard]] bool IsInList(const std::string& value) const;
+  [[nodiscard]] std::string TextOf(int integer, double real, std::int64_t large, const char* none) const;
   [[nodiscard]] std::string GetValueText() const;
 
   int intLow = 0;

@@ -7,6 +7,7 @@
 #include "harness/CmdLineParser.h"
 #include "harness/MessageFiles.h"
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
 #include "prompts/DiagnosticConfiguration.h"
@@ -132,7 +133,14 @@ bool CDMDiag::GetArgument(const std::string& argument, bool defaultValue) const 
 }
 
 int CDMDiag::GetArgument(const std::string& argument, int defaultValue) const {
-  return CDMUtil::ToInt(CDMUtil::Trim(GetArgument(argument, CDMUtil::ToString(defaultValue))));
+  const std::string text = CDMUtil::Trim(GetArgument(argument, CDMUtil::ToString(defaultValue)));
+  const int number = CDMUtil::ToInt(text);
+  if (!CDMUtil::IsInteger(text) || text == "-" || CDMUtil::ToInt64(text) != number) {
+    Notices::Tell("The parameter " + argument + " is \"" + text +
+                  "\", which is no number of 32 bits, decimal or hexadecimal behind 0x: it counts as " +
+                  CDMUtil::ToString(number) + ".");
+  }
+  return number;
 }
 
 bool CDMDiag::ValidateArguments() {

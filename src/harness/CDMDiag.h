@@ -92,7 +92,7 @@ class CDMDiag {
   /// `seconds` 0: no limit. `hook` sees the window's messages first, and finishes one by returning 0; empty for none.
   static int PopMessageWindow(const wstring& text, const wstring& title, int seconds, platform::WindowProcedure hook);
 
-  /// Lets the operator enter a line, at most 256 characters; what was typed is wiped when no further character comes
+  /// Lets the operator enter a line, at most 255 characters; what was typed is wiped when no further character comes
   /// within `clearInterval` ms. Ended by the button: 5; by the Enter key: 0.
   static int PopTextWindow(const wstring& text, const wstring& title, std::string& entered,
                            std::uint32_t clearInterval);

@@ -6,12 +6,6 @@
 
 namespace panelglow {
 
-namespace {
-
-constexpr unsigned int kParameterMessage = 8;
-
-}  // namespace
-
 CmdLineParser& CmdLineParser::GetInstance(int argc, const char* const* argv) {
   static CmdLineParser parser(argc, argv);
   return parser;
@@ -40,7 +34,7 @@ void CmdLineParser::ReadParameterFile(const std::function<std::string()>& modelN
   }
   paramFileOk = false;
   if (file.empty() || section.empty()) {
-    CDMout::LogMessage(LogOptions::Debug, kParameterMessage,
+    CDMout::LogMessage(LogOptions::Debug, kNote,
                        "ERROR! -ParamFile and -ParamSection both must be blank or both must be provided");
     return;
   }
@@ -64,7 +58,7 @@ std::string CmdLineParser::GetParameter(std::string_view name, std::string_view 
 void CmdLineParser::AddParameter(std::string_view name, const std::string& value) {
   const std::string key = CDMUtil::ToLower(name);
   if (!parameters.emplace(key, value).second) {
-    CDMout::LogMessage(LogOptions::Debug, kParameterMessage, "Ignored! Already exists on the command line: " + key);
+    CDMout::LogMessage(LogOptions::Debug, kNote, "Ignored! Already exists on the command line: " + key);
   }
 }
 

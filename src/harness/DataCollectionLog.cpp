@@ -1,12 +1,15 @@
 #include "harness/DataCollectionLog.h"
 
 #include <algorithm>
-#include <exception>
+#include <optional>
+#include <stdexcept>
+#include <utility>
 
 #include "config/XmlObject.h"
 #include "harness/CmdLineParser.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 
 namespace panelglow::CDMUtil {
@@ -14,7 +17,22 @@ namespace panelglow::CDMUtil {
 namespace {
 
 constexpr const char* kFormatVersion = "4.15.0";
-constexpr unsigned int kLogMessage = 8;
+constexpr std::size_t kLongestReason = 200;
+
+// Texts that are no UTF-8 are taken for the system's code page; no text may make the file one that is not well
+// formed.
+std::string Utf8(const std::string& text) {
+  wstring wide = platform::WideFromUtf8(text);
+  if (platform::Utf8FromWide(wide) != text) {
+    wide = platform::WideFromCodePage(text);
+  }
+  constexpr char16_t kReplacement = 0xFFFD;
+  std::replace_if(
+      wide.begin(), wide.end(), [](char16_t c) { return c > kReplacement; }, kReplacement);
+  return platform::Utf8FromWide(wide);
+}
+
+void Set(XmlObject& element, const char* name, const std::string& value) { element.SetAttribute(name, Utf8(value)); }
 
 XmlObject Element(const char* name) {
   XmlObject element;
@@ -24,20 +42,20 @@ XmlObject Element(const char* name) {
 
 XmlObject ResultElement(const SubtestResult& result) {
   XmlObject element = Element("Result");
-  element.SetAttribute("description", result.description);
-  element.SetAttribute("status", result.status);
-  element.SetAttribute("actualmin", result.actualmin);
-  element.SetAttribute("actualmax", result.actualmax);
-  element.SetAttribute("expectedmin", result.expectedmin);
-  element.SetAttribute("expectedmax", result.expectedmax);
-  element.SetAttribute("timestamp", result.timestamp);
+  Set(element, "description", result.description);
+  Set(element, "status", result.status);
+  Set(element, "actualmin", result.actualmin);
+  Set(element, "actualmax", result.actualmax);
+  Set(element, "expectedmin", result.expectedmin);
+  Set(element, "expectedmax", result.expectedmax);
+  Set(element, "timestamp", result.timestamp);
   return element;
 }
 
 XmlObject AttemptElement(const SubtestAttempt& attempt) {
   XmlObject element = Element("Attempt");
-  element.SetAttribute("number", attempt.number);
-  element.SetAttribute("errorcode", attempt.errorcode);
+  Set(element, "number", attempt.number);
+  Set(element, "errorcode", attempt.errorcode);
   if (!attempt.results.empty()) {
     XmlObject results = Element("Results");
     for (const SubtestResult& result : attempt.results) {
@@ -50,8 +68,8 @@ XmlObject AttemptElement(const SubtestAttempt& attempt) {
 
 XmlObject AttemptsElement(const SubtestDetails& details) {
   XmlObject element = Element("Attempts");
-  element.SetAttribute("retriesspecified", details.retriesspecified);
-  element.SetAttribute("retriesattempted", details.retriesattempted);
+  Set(element, "retriesspecified", details.retriesspecified);
+  Set(element, "retriesattempted", details.retriesattempted);
   for (const SubtestAttempt& attempt : details.attempts) {
     element.AddChild(AttemptElement(attempt));
   }
@@ -62,8 +80,8 @@ XmlObject ArgumentListElement() {
   XmlObject element = Element("ArgumentList");
   for (const auto& [name, value] : CmdLineParser::GetInstance().GetParameters()) {
     XmlObject argument = Element("Argument");
-    argument.SetAttribute("name", name);
-    argument.SetAttribute("value", value);
+    Set(argument, "name", name);
+    Set(argument, "value", value);
     element.AddChild(std::move(argument));
   }
   return element;
@@ -71,36 +89,76 @@ XmlObject ArgumentListElement() {
 
 XmlObject DiagnosticElement(const std::string& diagnosticName, const SubtestDetails& details) {
   XmlObject subtest = Element("Subtest");
-  subtest.SetAttribute("name", details.name);
-  subtest.SetAttribute("duration", details.duration);
-  subtest.SetAttribute("status", details.status);
-  subtest.SetAttribute("errorcode", details.errorcode);
-  subtest.SetAttribute("starttime", details.starttime);
-  subtest.SetAttribute("endtime", details.endtime);
+  Set(subtest, "name", details.name);
+  Set(subtest, "duration", details.duration);
+  Set(subtest, "status", details.status);
+  Set(subtest, "errorcode", details.errorcode);
+  Set(subtest, "starttime", details.starttime);
+  Set(subtest, "endtime", details.endtime);
   subtest.AddChild(AttemptsElement(details));
   subtest.AddChild(ArgumentListElement());
   XmlObject diagnostic = Element("Diagnostic");
-  diagnostic.SetAttribute("name", diagnosticName);
+  Set(diagnostic, "name", diagnosticName);
   diagnostic.AddChild(std::move(subtest));
   return diagnostic;
 }
 
-// The file's tree, or a new one when there is no file that loads.
-XmlObject LoadLog(const std::string& path) {
-  XmlObject root = Element("DiagnosticsData");
-  root.SetAttribute("Version", kFormatVersion);
-  try {
-    XmlObject loaded;
-    if (loaded.LoadFromFile(path, false, false, -1)) {
-      root = std::move(loaded);
-      if (root.GetAttributeValue("Version", "").empty()) {
-        root.SetAttribute("Version", kFormatVersion);
-      }
-    }
-  } catch (const std::exception&) {
-    // Checked before the run: what has happened to the file since, it is replaced now.
+// A log that is there, as far as it could be read.
+struct OldLog {
+  std::optional<XmlObject> root;
+  bool damaged = false;  // read, and not fit to be added to
+  std::string problem;
+};
+
+// A comment that came as an instruction, as what it was; anything else as it is.
+std::string CommentOf(const std::string& instruction) {
+  const std::string mark = "<?" + std::string(platform::kXmlComment);
+  if (!instruction.starts_with(mark)) {
+    return instruction;
   }
-  return root;
+  std::string_view content = std::string_view(instruction).substr(mark.size());
+  content.remove_prefix(content.starts_with(' ') ? 1 : 0);
+  content.remove_suffix(std::string_view("?>").size());
+  return "<!--" + std::string(content) + "-->";
+}
+
+void RestoreComments(XmlObject& element) {
+  if (!std::as_const(element).GetProlog().instructions.empty()) {
+    std::vector<std::string>& instructions = element.GetProlog().instructions;
+    std::transform(instructions.begin(), instructions.end(), instructions.begin(), CommentOf);
+  }
+  for (XmlObject& child : element.children) {
+    RestoreComments(child);
+  }
+}
+
+// Strictly: whatever passes here can be added to and loses nothing by it, and whatever does not pass is not touched.
+OldLog ReadLog(const std::string& file) {
+  const std::unique_ptr<platform::XmlDocument> document = platform::TheHost().xmlDocuments.Create();
+  if (document == nullptr) {
+    return {{}, false, "the XML component (libpanelglow-xml.so), which reads it, is not there"};
+  }
+  platform::XmlProblem problem;
+  std::optional<std::string> text;
+  if (document->Load(file, problem)) {
+    text = document->SimpleText(problem);
+  }
+  if (!text) {
+    return {{}, true, Trim(problem.reason)};
+  }
+  try {
+    OldLog log{XmlObject(*text), false, {}};
+    RestoreComments(*log.root);
+    return log;
+  } catch (const std::runtime_error& failure) {
+    return {{}, true, failure.what()};  // a name that begins with a sign, as "_a"
+  }
+}
+
+void TellThatItIsLeft(const std::string& file, const OldLog& log) {
+  Notices::Tell("The structured log " + file +
+                " is left as it is, without a record of this run: " + log.problem.substr(0, kLongestReason) +
+                (log.damaged ? ". Mend it, or name another file by -DataCollectionFile." : "."));
 }
 
 bool WriteLog(const std::string& path, const std::string& diagnosticName, const SubtestDetails& details) {
@@ -108,9 +166,19 @@ bool WriteLog(const std::string& path, const std::string& diagnosticName, const 
   if (file.empty()) {
     return false;
   }
-  XmlObject root = LoadLog(file);
-  root.AddChild(DiagnosticElement(diagnosticName, details));
-  return root.TrySaveToFile(file, false, false);
+  OldLog log{Element("DiagnosticsData"), false, {}};
+  if (FileExists(file)) {
+    log = ReadLog(file);
+    if (!log.root) {
+      TellThatItIsLeft(file, log);
+      return false;
+    }
+  }
+  if (log.root->GetAttributeValue("Version", "").empty()) {
+    log.root->SetAttribute("Version", kFormatVersion);
+  }
+  log.root->AddChild(DiagnosticElement(diagnosticName, details));
+  return log.root->TrySaveToFile(file, false, false);
 }
 
 }  // namespace
@@ -121,13 +189,15 @@ bool isXMLCorrupted(const std::string& path) {
   if (!FileExists(file)) {
     return false;
   }
-  const std::unique_ptr<platform::XmlDocument> document = platform::TheHost().xmlDocuments.Create();
-  platform::XmlProblem problem;
-  if (document != nullptr && document->Load(file, problem)) {
+  const OldLog log = ReadLog(file);
+  if (log.root) {
     return false;
   }
-  CDMout::LogMessage(LogOptions::Debug, kLogMessage,
-                     "XML file is corrupted! The subtest will continue without writing data to the XML file.");
+  TellThatItIsLeft(file, log);
+  if (log.damaged) {
+    CDMout::LogMessage(LogOptions::Debug, kNote,
+                       "XML file is corrupted! The subtest will continue without writing data to the XML file.");
+  }
   return true;
 }
 
@@ -169,9 +239,9 @@ void PopulateSubtestInfoAndWriteLog(const std::string& path, const std::string& 
     return;
   }
   if (WriteLog(path, diagnosticName, details)) {
-    CDMout::LogMessage(LogOptions::Debug, kLogMessage, "DataCollection XML log written successfully");
+    CDMout::LogMessage(LogOptions::Debug, kNote, "DataCollection XML log written successfully");
   } else {
-    CDMout::LogMessage(LogOptions::Debug, kLogMessage, "DataCollection XML log could not be written: " + path);
+    CDMout::LogMessage(LogOptions::Debug, kNote, "DataCollection XML log could not be written: " + path);
   }
 }
 

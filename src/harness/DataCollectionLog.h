@@ -38,7 +38,8 @@ struct SubtestDetails {
   std::vector<SubtestAttempt> attempts;
 };
 
-/// True, with a debug line, when the file exists and is not well formed: it must not be written to then.
+/// True when the file exists and cannot be added to without a loss; it must not be written to then. People are told
+/// why; a file that is not what it should be is a debug line, too.
 bool isXMLCorrupted(const std::string& path);
 
 /// Adds an attempt to `details`, or another error code to the attempt of that number. `startTicks`: tick count at the

@@ -11,6 +11,7 @@
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
+#include "harness/base/Notices.h"
 #include "hw/SMBIOSDiscovery.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
@@ -99,7 +100,20 @@ CDMDiag* DiagnosticManager::FindSubtest(const std::string& subtestName) {
   return found == subtests.end() ? nullptr : found->second;
 }
 
+// What nobody could read is no answer and no pass.
 int DiagnosticManager::Run() {
+  const int exitCode = AnswerOrRun();
+  const std::string problem = platform::TheHost().console.OutputProblem();
+  if (problem.empty()) {
+    return exitCode;
+  }
+  Notices::Tell("Standard output did not take all lines (" + problem +
+                "), so the verdict may be among those that are lost: the exit code is 1, and the run has to be "
+                "repeated with an output that can be written.");
+  return kFailed;
+}
+
+int DiagnosticManager::AnswerOrRun() const {
   if (!AreRequestsValid()) {
     return kFailed;
   }
@@ -174,11 +188,17 @@ bool DiagnosticManager::HandleControl(std::uint32_t type) {
   if (!isBreak) {
     return true;
   }
+  static std::atomic<int> heard{0};
+  const std::string times = ++heard > 1 ? " (" + CDMUtil::ToString(heard.load()) + " times now)" : "";
   // Before the command line is read nobody knows what will run: the break is kept for it.
   if (!isCommandLineRead || FindSubtest(CmdLineParser::GetInstance().GetParameter("-subtest", "")) != nullptr) {
     CDMDiag::AddSignal(type);
+    Notices::Tell("The request to stop was heard" + times +
+                  ". The run ends at its next step, that of an LED test when the attempt under way is over (the "
+                  "dialog's cancel button ends it at once), and puts every LED back first.");
   } else {
     CDMout::LogMessage(LogOptions::Status, kControlMessage, "");
+    Notices::Tell("The request to stop was heard" + times + ". No subtest is running that it could end.");
   }
   return true;
 }

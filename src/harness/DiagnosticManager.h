@@ -28,7 +28,7 @@ class DiagnosticManager {
   void RegisterSubtest(const std::string& subtestName, CDMDiag* test);
 
   /// Answers what the command line asks about the program, or else runs the subtest that it names. The exit code: 0
-  /// when something was answered or the subtest passed, otherwise 1.
+  /// when something was answered or the subtest passed, and standard output took all of it; otherwise 1.
   int Run();
 
   /// The XML description of the whole diagnostic, without a line end behind it.
@@ -47,6 +47,7 @@ class DiagnosticManager {
 
  private:
   static bool AreRequestsValid();
+  int AnswerOrRun() const;
   bool AnswerRequests(CDMDiag* test) const;
   int RunSubtest(CDMDiag* test) const;
   int RunGuarded(CDMDiag* test) const;

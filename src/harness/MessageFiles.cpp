@@ -6,6 +6,7 @@
 #include "harness/CmdLineParser.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/MessageFormat.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -22,8 +23,19 @@ std::string BaseNameOf(const std::string& programPath) {
   return file.substr(0, file.find(".exe"));
 }
 
+// In the current folder; by that name when its path is too long for CurrentDirectoryPath.
 std::string MessageFilePath(const std::string& prefix, const std::string& programPath) {
-  return CDMUtil::CurrentDirectoryPath() + "\\" + prefix + BaseNameOf(programPath) + ".msg";
+  const std::string folder = CDMUtil::CurrentDirectoryPath();
+  return (folder.empty() ? "." : folder) + "\\" + prefix + BaseNameOf(programPath) + ".msg";
+}
+
+// A number stands where the text should be.
+void TellIfMissing(bool exists, const std::string& path) {
+  if (!exists) {
+    Notices::Tell(
+        "The message file " + path +
+        " is missing, so that numbers stand for texts: start the program in the folder of the installation.");
+  }
 }
 
 wstring WideIdOf(int id) { return CDMUtil::ToWString(CDMUtil::ToString(id)); }
@@ -51,7 +63,11 @@ MessageFiles::MessageFiles(const std::string& programPath, const std::string& in
 std::string MessageFiles::ResolveLogMessage(unsigned int id, const std::string& text) const {
   const std::string number = CDMUtil::ToString(id);
   const std::string format = (*logTexts).GetValue(locale, number);
-  return format.empty() ? number + " \"" + text + "\"" : FormatMessageText(format, text);
+  if (!format.empty()) {
+    return FormatMessageText(format, text);
+  }
+  TellIfMissing((*logTexts).Exists(), (*logTexts).GetPath());
+  return number + " \"" + text + "\"";
 }
 
 wstring MessageFiles::GetResourceString(int id, const wstring& text) const {
@@ -62,6 +78,7 @@ wstring MessageFiles::GetResourceString(int id, const wstring& text) const {
       return FormatMessageText(format, text);
     }
   }
+  TellIfMissing((*standardTexts).Exists(), platform::Utf8FromWide((*standardTexts).GetPath()));
   return key + u" \"" + text + u"\"";
 }
 
@@ -95,7 +112,11 @@ wstring MessageFiles::GetResourceString(int id, const wstring& text, const wstri
       break;
     }
   }
-  return format.empty() ? fallback : FormatMessageText(format, text);
+  if (!format.empty()) {
+    return FormatMessageText(format, text);
+  }
+  TellIfMissing((*standardTexts).Exists(), platform::Utf8FromWide((*standardTexts).GetPath()));
+  return fallback;
 }
 
 }  // namespace panelglow

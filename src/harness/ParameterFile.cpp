@@ -13,10 +13,9 @@ namespace panelglow {
 
 namespace {
 
-constexpr unsigned int kParameterMessage = 8;
 constexpr const char* kSetKey = "ParamSet";
 
-void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kParameterMessage, text); }
+void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kNote, text); }
 
 bool Exists(OrgFileParser& parser, const std::string& section) {
   Log("Checking section: " + section);

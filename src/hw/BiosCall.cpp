@@ -7,7 +7,7 @@
 #include <variant>
 
 #include "harness/base/CDMException.h"
-#include "platform/Host.h"
+#include "hw/WMIDiscovery.h"
 
 namespace panelglow {
 
@@ -21,6 +21,7 @@ using platform::ManagementValue;
 
 constexpr const char* kNamespace = "\\\\.\\root\\wmi";
 constexpr const char16_t* kInterfaceQuery = u"SELECT * FROM tmbBIntM";
+constexpr const char* kQueryStep = "tmbBIntM Query";
 
 struct Method {
   const char16_t* name;
@@ -77,16 +78,32 @@ std::optional<std::vector<std::uint8_t>> BytesOf(const ManagementRow& row, std::
   return bytes;
 }
 
-// Where the interface object of this machine is.
-wstring InterfacePath(platform::ManagementConnection& services) {
-  const auto rows = services.Query(kInterfaceQuery);
-  const ManagementValue* path = rows && !rows->empty() ? rows->front().Find(u"__RELPATH") : nullptr;
-  const auto* scalar = path == nullptr ? nullptr : std::get_if<ManagementScalar>(&path->content);
-  const auto* text = scalar == nullptr ? nullptr : std::get_if<wstring>(scalar);
-  if (text == nullptr) {
-    throw InvalidTmbWMIException("tmbBIntM Query");
+// The connection and, by it, where the interface object of this machine is. Why a connection fails is a second
+// message of the step that needs it.
+std::unique_ptr<WMIDiscovery> Connect(wstring& path) {
+  try {
+    auto management = std::make_unique<WMIDiscovery>(kNamespace);
+    std::string text;
+    if (management->RunQuery(kInterfaceQuery) != 0 && management->GetCurrentValue(u"__RELPATH", text, 0) &&
+        !text.empty()) {
+      path = platform::WideFromCodePage(text);
+      return management;
+    }
+  } catch (const std::string& reason) {
+    InvalidTmbWMIException failure(kQueryStep);
+    failure.addMessage(LogOptions::ServiceErrors, failure.code, reason);
+    throw failure;
   }
-  return *text;
+  throw InvalidTmbWMIException(kQueryStep);
+}
+
+// The first four bytes as one number.
+std::uint32_t StatusOf(const std::vector<std::uint8_t>& sign) {
+  std::uint32_t status = 0;
+  for (std::size_t i = std::min<std::size_t>(sign.size(), 4); i-- > 0;) {
+    status = status << 8U | sign[i];
+  }
+  return status;
 }
 
 ManagementRow InputOf(std::uint32_t command, std::uint32_t commandType, const std::vector<std::uint8_t>& inputBytes) {
@@ -107,14 +124,10 @@ ManagementRow InputOf(std::uint32_t command, std::uint32_t commandType, const st
 std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandType,
                                    const std::vector<std::uint8_t>& inputBytes, std::size_t sizeIndex) {
   const Method& method = kMethods.at(sizeIndex);
-  platform::ManagementError error;
-  const std::unique_ptr<platform::ManagementConnection> services =
-      platform::TheHost().management.Connect(kNamespace, error);
-  if (!services) {
-    throw InvalidTmbWMIException("tmbBIntM Query");
-  }
-  const platform::ManagementCallResult result = services->Call(
-      {u"tmbBIntM", InterfacePath(*services), method.name, u"tmbBDataIn", InputOf(command, commandType, inputBytes)});
+  wstring path;
+  const std::unique_ptr<WMIDiscovery> management = Connect(path);
+  const platform::ManagementCallResult result =
+      management->Call({u"tmbBIntM", path, method.name, u"tmbBDataIn", InputOf(command, commandType, inputBytes)});
   if (result.failedAt != ManagementCallStep::kNone) {
     throw InvalidTmbWMIException(kStepNames.at(static_cast<std::size_t>(result.failedAt)));
   }
@@ -123,7 +136,7 @@ std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandT
     throw InvalidTmbWMIException("Get Sign");
   }
   if (!std::equal(sign->begin(), sign->end(), kFirmwareSign.begin(), kFirmwareSign.end())) {
-    throw InvalidTmbWMICallException(command, commandType);
+    throw InvalidTmbWMICallException(command, StatusOf(*sign));
   }
   if (method.answer_bytes == 0) {
     return {};

@@ -9,7 +9,8 @@
 namespace panelglow {
 
 /// `sizeIndex` picks the size of the answer: 0, 4, 128, 1024 or 4096 bytes. Throws InvalidTmbWMIException for a step
-/// that fails, a short answer included, and InvalidTmbWMICallException when the firmware does not sign its answer.
+/// that fails, a short answer included, and InvalidTmbWMICallException, with the command and what stands in place of
+/// the signature, when the firmware does not sign its answer.
 std::vector<std::uint8_t> CallBios(std::uint32_t command, std::uint32_t commandType,
                                    const std::vector<std::uint8_t>& inputBytes, std::size_t sizeIndex);
 

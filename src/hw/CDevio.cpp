@@ -5,11 +5,12 @@
 #include <utility>
 
 #include "harness/base/CDMout.h"
-#include "hw/DriverRecords.h"
+#include "platform/DriverRecords.h"
 #include "platform/Host.h"
 
 namespace panelglow {
 
+namespace driver = platform::driver;
 using driver::DriverRecord;
 
 namespace {
@@ -22,6 +23,11 @@ constexpr std::uint64_t kMemoryBarMask = ~std::uint64_t{15};
 
 // From here on a version word is in the new form.
 constexpr std::uint32_t kFirstNewVersion = 0xFFF;
+
+constexpr std::uint64_t AddressOf(std::uint32_t low, std::uint32_t high) { return std::uint64_t{high} << 32U | low; }
+
+// Of an access to mapped memory with so many bytes to go.
+constexpr std::size_t AccessWidth(std::size_t left_bytes) { return left_bytes >= 4 ? 4 : 1; }
 
 DriverLoader Loader() { return {platform::TheHost().services, platform::TheHost().drivers}; }
 
@@ -214,7 +220,7 @@ std::uint8_t CDevio::ReadPciBar(std::uint16_t location, std::uint16_t reg, std::
       return status;
     }
   }
-  base = (std::uint64_t{high} << 32U | low) & ((low & kBarIsIo) != 0 ? kIoBarMask : kMemoryBarMask);
+  base = AddressOf(low, high) & ((low & kBarIsIo) != 0 ? kIoBarMask : kMemoryBarMask);
   return 0;
 }
 
@@ -269,52 +275,58 @@ std::uint64_t CDevio::Map64(std::uint64_t address, std::uint32_t length) {
   return record.Get(16, 8);
 }
 
-std::uint32_t CDevio::CopyFrom(std::uint64_t mapped, std::uint32_t length, std::span<std::byte> buffer) {
-  if (mapped == 0) {
-    return 0;
-  }
-  device->ReadMapped(mapped, buffer.first(length));
-  return length;
+// Where the machine's memory is mapped, by the form of the request that the system's word size asks for: one of 32
+// bits has no high half.
+std::uint64_t CDevio::Map(std::uint64_t address, std::uint32_t length) {
+  return platform::TheHost().cpu.Is64BitSystem() ? Map64(address, length)
+                                                 : Map32(static_cast<std::uint32_t>(address), length, nullptr);
 }
 
-std::uint32_t CDevio::CopyTo(std::uint64_t mapped, std::uint32_t length, std::span<const std::byte> buffer) {
+// Device memory is accessed four bytes at a time, what is left over byte by byte.
+std::uint32_t CDevio::CopyFrom(std::uint64_t mapped, std::span<std::byte> buffer) {
   if (mapped == 0) {
     return 0;
   }
-  device->WriteMapped(mapped, buffer.first(length));
-  return length;
+  for (std::size_t at = 0; at < buffer.size();) {
+    const std::size_t width = AccessWidth(buffer.size() - at);
+    driver::PutNumber(buffer, at, width, device->ReadMapped(mapped + at, width));
+    at += width;
+  }
+  return static_cast<std::uint32_t>(buffer.size());
+}
+
+std::uint32_t CDevio::CopyTo(std::uint64_t mapped, std::span<const std::byte> buffer) {
+  if (mapped == 0) {
+    return 0;
+  }
+  for (std::size_t at = 0; at < buffer.size();) {
+    const std::size_t width = AccessWidth(buffer.size() - at);
+    device->WriteMapped(mapped + at, width, static_cast<std::uint32_t>(driver::NumberAt(buffer, at, width)));
+    at += width;
+  }
+  return static_cast<std::uint32_t>(buffer.size());
 }
 
 std::uint32_t CDevio::ReadPhysicalMemory(std::uint32_t address, std::uint32_t length, std::span<std::byte> buffer) {
-  if (platform::TheHost().cpu.Is64BitSystem()) {
-    return ReadPhysicalMemory64(address, 0, length, buffer);
-  }
-  length = static_cast<std::uint32_t>(std::min<std::size_t>(length, buffer.size()));
-  return CopyFrom(Map32(address, length, nullptr), length, buffer);
+  return ReadPhysicalMemory64(address, 0, length, buffer);
 }
 
 std::uint32_t CDevio::ReadPhysicalMemory64(std::uint32_t low, std::uint32_t high, std::uint32_t length,
                                            std::span<std::byte> buffer) {
-  if (!platform::TheHost().cpu.Is64BitSystem()) {
-    return ReadPhysicalMemory(low, length, buffer);
-  }
-  length = static_cast<std::uint32_t>(std::min<std::size_t>(length, buffer.size()));
-  return CopyFrom(Map64(std::uint64_t{high} << 32U | low, length), length, buffer);
+  buffer = buffer.first(std::min<std::size_t>(length, buffer.size()));
+  return CopyFrom(Map(AddressOf(low, high), static_cast<std::uint32_t>(buffer.size())), buffer);
 }
 
 std::uint32_t CDevio::WritePhysicalMemory(std::uint32_t address, std::uint32_t length,
                                           std::span<const std::byte> buffer) {
-  if (platform::TheHost().cpu.Is64BitSystem()) {
-    return WritePhysicalMemory64(address, 0, length, buffer);
-  }
-  length = static_cast<std::uint32_t>(std::min<std::size_t>(length, buffer.size()));
-  return CopyTo(Map32(address, length, nullptr), length, buffer);
+  buffer = buffer.first(std::min<std::size_t>(length, buffer.size()));
+  return CopyTo(Map(address, static_cast<std::uint32_t>(buffer.size())), buffer);
 }
 
 std::uint32_t CDevio::WritePhysicalMemory64(std::uint32_t low, std::uint32_t high, std::uint32_t length,
                                             std::span<const std::byte> buffer) {
-  length = static_cast<std::uint32_t>(std::min<std::size_t>(length, buffer.size()));
-  return CopyTo(Map64(std::uint64_t{high} << 32U | low, length), length, buffer);
+  buffer = buffer.first(std::min<std::size_t>(length, buffer.size()));
+  return CopyTo(Map64(AddressOf(low, high), static_cast<std::uint32_t>(buffer.size())), buffer);
 }
 
 std::uint32_t CDevio::MapPhysicalMemory(std::uint32_t address, std::uint32_t length, MappingRecord* record) {
@@ -340,7 +352,7 @@ std::uint32_t CDevio::ReadMsr(std::uint64_t& value) {
     return platform::kErrorInvalidHandle;
   }
   DriverRecord<driver::kMsrSize> record;
-  record.Set(4, 4, value);
+  record.Set(driver::kMsrIndex, 4, value);
   const std::uint32_t error = device->Control(driver::kReadMsr, record.Bytes(), record.Bytes());
   if (error == 0) {
     value = record.Get(0, 8);

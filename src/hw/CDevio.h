@@ -111,8 +111,9 @@ class CDevio {
                          std::uint16_t index, std::uint16_t& location);
   std::uint64_t Map32(std::uint32_t address, std::uint32_t length, MappingRecord* record);
   std::uint64_t Map64(std::uint64_t address, std::uint32_t length);
-  std::uint32_t CopyFrom(std::uint64_t mapped, std::uint32_t length, std::span<std::byte> buffer);
-  std::uint32_t CopyTo(std::uint64_t mapped, std::uint32_t length, std::span<const std::byte> buffer);
+  std::uint64_t Map(std::uint64_t address, std::uint32_t length);
+  std::uint32_t CopyFrom(std::uint64_t mapped, std::span<std::byte> buffer);
+  std::uint32_t CopyTo(std::uint64_t mapped, std::span<const std::byte> buffer);
   std::uint16_t ReadFirmware(std::uint32_t code, std::uint16_t segment, std::uint16_t offset);
 
   DriverNames names;

@@ -59,7 +59,7 @@ void SmbiosScanner::Walk(std::size_t count) {
   for (std::size_t i = 0; i < count && start + kHeaderSize <= table_.size(); ++i) {
     const std::uint8_t type = table_[start];
     const std::uint8_t length = table_[start + 1];
-    structures_.push_back({type, start, length});
+    structures_.push_back({type, start});
     if (type == kMemoryControllerType) {
       const std::size_t slots = start + 14 < table_.size() ? table_[start + 14] : 0U;
       start += 16 + 2 * slots;

@@ -38,7 +38,6 @@ class SmbiosScanner {
   struct Structure {
     std::uint8_t type = 127;
     std::size_t start = 0;
-    std::uint8_t length = 0;
   };
 
   void Walk(std::size_t count);

@@ -79,7 +79,7 @@ std::vector<platform::ManagementRow> WMIDiscovery::Rows(const wstring& query) {
 }
 
 int WMIDiscovery::RunQuery(const wstring& query) {
-  currentTable = std::make_unique<WMITable>(wstring(), Rows(query));
+  currentTable = std::make_unique<WMITable>(Rows(query));
   return currentTable->RowCount();
 }
 
@@ -88,7 +88,7 @@ bool WMIDiscovery::GetCurrentValue(const wstring& property, std::string& out, in
 }
 
 void WMIDiscovery::RunNamedQuery(const wstring& tableName, const wstring& query) {
-  tables[tableName] = std::make_unique<WMITable>(tableName, Rows(query));
+  tables[tableName] = std::make_unique<WMITable>(Rows(query));
 }
 
 void WMIDiscovery::GetTable(const wstring& className) {
@@ -141,6 +141,10 @@ int WMIDiscovery::GetBinaryProperty(const wstring& className, const wstring& pro
     }
   }
   return 0;
+}
+
+platform::ManagementCallResult WMIDiscovery::Call(const platform::ManagementCall& call) {
+  return services->Call(call);
 }
 
 }  // namespace panelglow

@@ -48,6 +48,9 @@ class WMIDiscovery {
   /// query failed or a row has no such property.
   int GetBinaryProperty(const wstring& className, const wstring& property, std::vector<std::uint8_t>& destination);
 
+  /// Calls a method of an object.
+  platform::ManagementCallResult Call(const platform::ManagementCall& call);
+
  private:
   std::vector<platform::ManagementRow> Rows(const wstring& query);
 

@@ -11,8 +11,7 @@ namespace panelglow {
 
 class WMITable {
  public:
-  WMITable(wstring tableName, std::vector<platform::ManagementRow> tableRows)
-      : name(std::move(tableName)), rows(std::move(tableRows)) {}
+  explicit WMITable(std::vector<platform::ManagementRow> tableRows) : rows(std::move(tableRows)) {}
   virtual ~WMITable() = default;
 
   [[nodiscard]] int RowCount() const { return static_cast<int>(rows.size()); }
@@ -21,7 +20,6 @@ class WMITable {
   bool GetValue(const wstring& property, std::string& out, int row) const;
 
  private:
-  wstring name;
   std::vector<platform::ManagementRow> rows;
 };
 

@@ -21,6 +21,29 @@ bool IsSupported(MotherBoard* board, bool (MotherBoard::*question)(bool&)) {
   return board != nullptr && (board->*question)(supported) && supported;
 }
 
+struct BoardLed {
+  std::string_view function;
+  MotherBoard::Led led;
+};
+constexpr BoardLed kBoardLeds[] = {{"hdred", MotherBoard::Led::kHd},
+                                   {"powerred", MotherBoard::Led::kPower},
+                                   {"powergreen", MotherBoard::Led::kPower},
+                                   {"network", MotherBoard::Led::kWireless},
+                                   {"speakermute", MotherBoard::Led::kSpeaker},
+                                   {"microphone", MotherBoard::Led::kMicrophone},
+                                   {"chargered", MotherBoard::Led::kCharge},
+                                   {"chargegreen", MotherBoard::Led::kCharge}};
+
+// Ends the run where the board's files give the LED to a chip that this version cannot drive: its darkness would be
+// blamed on the panel.
+void RequireDrivable(MotherBoard* board, std::string_view function) {
+  for (const BoardLed& row : kBoardLeds) {
+    if (board != nullptr && row.function == function) {
+      board->RequireDrivable(row.led);
+    }
+  }
+}
+
 }  // namespace
 
 void FrontPanelTest::BeginArray() {
@@ -52,6 +75,7 @@ void FrontPanelTest::AddDevice(std::int32_t deviceId, std::uint8_t address, cons
 
 void FrontPanelTest::AddDevice(const ArrayRow& row, MotherBoard* board) {
   const LedKind* const kind = FindLedKindByFunction(row.function);
+  RequireDrivable(board, row.function);
   if (kind != nullptr && IsSupported(board, row.question)) {
     const bool isDrive = kind->deviceId == kHdRed || kind->deviceId == kIdeDrive || kind->deviceId == kScsiDrive;
     AddDevice(kind->deviceId, isDrive ? std::uint8_t{0} : static_cast<std::uint8_t>(kind->deviceId), "");

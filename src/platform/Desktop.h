@@ -1,8 +1,8 @@
 // Windows, messages, timers and controls, cut to what the dialogs and prompts of this program ask.
 //
 // A window belongs to the thread that created it: its procedure runs there, and only there. Posted messages are taken
-// in order; a sent message is a direct call on the owner's thread and waits for the owner from any other. Timer and
-// paint messages are made only when nothing posted waits, paint last.
+// in order; a sent message is a direct call on the owner's thread and waits for the owner from any other. Paint and
+// timer messages are made only when nothing posted waits and no input does, timers last.
 #pragma once
 
 #include <cstddef>
@@ -81,6 +81,11 @@ inline constexpr std::uint32_t kAppCommand = 0x0319;
 inline constexpr std::uint32_t kGetDefaultId = 0x0400;  // which button Enter presses; see kHasDefaultId
 }  // namespace message
 
+/// Bits in the `lParam` of the messages of keys.
+namespace key_data {
+inline constexpr std::intptr_t kWasDown = 0x40000000;  // of a key going down and its character: it is held
+}  // namespace key_data
+
 /// What happened to a device, in the `wParam` of kDeviceChange.
 namespace device_event {
 inline constexpr std::uint32_t kNodesChanged = 0x0007;
@@ -129,6 +134,7 @@ inline constexpr std::uint32_t kThumbPosition = 4;
 inline constexpr std::uint32_t kThumbTrack = 5;
 inline constexpr std::uint32_t kStart = 6;
 inline constexpr std::uint32_t kEnd = 7;
+inline constexpr std::uint32_t kReleased = 8;  // the mouse button, which ends what it asked for
 }  // namespace scroll
 
 struct Rectangle {
@@ -286,8 +292,14 @@ class Desktop {
   virtual void SetFocus(WindowHandle window) = 0;
   virtual WindowHandle Focus() = 0;  // of the calling thread
   virtual bool SetForegroundWindow(WindowHandle window) = 0;
+
+  /// Another program's window may be it, which has a title and nothing else.
   virtual WindowHandle ForegroundWindow() = 0;
+
   virtual void SetActiveWindow(WindowHandle window) = 0;
+
+  /// The language of the texts that are drawn from now on, as "ja_JP": Chinese characters have other forms in each.
+  virtual void SetLanguage(std::string_view locale) = 0;
 
   /// Shares the input state of the thread that owns `other` with the calling thread, or ends that; while shared,
   /// taking the foreground is not refused.
@@ -305,7 +317,7 @@ class Desktop {
   virtual std::intptr_t Send(const Message& message) = 0;
   virtual void Post(const Message& message) = 0;
 
-  /// Blocks until the calling thread has a message. False for the quit message.
+  /// Blocks until the calling thread has a message. False for the quit message, and when there is no display any more.
   virtual bool GetMessage(Message& message) = 0;
 
   /// Handles the keyboard rules of a dialog (Tab, arrows, Enter, Escape, mnemonics) for a message of `dialog` or one

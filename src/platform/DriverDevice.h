@@ -20,10 +20,9 @@ class DriverDevice {
   /// number; bytes of `out` that the driver does not write stay as they are. Numbers are little-endian.
   virtual std::uint32_t Control(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) = 0;
 
-  /// Copies between a mapped address that the driver gave out and `bytes`, in naturally ordered accesses of four
-  /// bytes and the rest by single bytes, as device memory wants it.
-  virtual void ReadMapped(std::uint64_t mapped_address, std::span<std::byte> bytes) = 0;
-  virtual void WriteMapped(std::uint64_t mapped_address, std::span<const std::byte> bytes) = 0;
+  /// One access to device memory at a mapped address that the driver gave out. `width` is 1 or 4 bytes.
+  virtual std::uint32_t ReadMapped(std::uint64_t mapped_address, std::size_t width) = 0;
+  virtual void WriteMapped(std::uint64_t mapped_address, std::size_t width, std::uint32_t value) = 0;
 };
 
 class DriverDevices {

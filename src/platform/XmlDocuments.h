@@ -3,6 +3,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -23,6 +24,8 @@ class XmlComponentError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+inline constexpr std::string_view kXmlComment = "panelglow-comment";
+
 class XmlDocument {
  public:
   virtual ~XmlDocument() = default;
@@ -36,6 +39,14 @@ class XmlDocument {
 
   /// The document's text. Throws XmlComponentError when nothing is loaded.
   virtual std::string Text() = 0;
+
+  /// The loaded document for a reader that knows elements, attributes, texts and instructions and nothing else:
+  /// UTF-8, with a declaration only if there was one, the names as written, the text of an element in one piece in
+  /// front of its first child, escaped by the five named entities, "&#09;", "&#10;" and "&#13;". A comment is an
+  /// instruction with the target kXmlComment; what stands behind an element's last child stands in front of the
+  /// element. Nothing, with the reason in `problem`, when the document holds something that this form has no place
+  /// for. Throws XmlComponentError when nothing is loaded.
+  virtual std::optional<std::string> SimpleText(XmlProblem& problem) = 0;
 
   /// Loads a file and validates it as Validate does. A file that does not load is the only problem then.
   virtual std::vector<XmlProblem> LoadAndValidate(std::string_view path) = 0;

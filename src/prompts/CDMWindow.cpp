@@ -27,6 +27,8 @@ PromptState& ThePromptState() {
 }
 
 void CDMWindow::LockPrompt() {
+  // Whatever the operator is shown comes through here first.
+  platform::TheHost().desktop.SetLanguage(Locale());
   platform::NamedMutexes& mutexes = platform::TheHost().mutexes;
   g_promptMutex = mutexes.Create(kPromptMutex);
   mutexes.WaitFor(g_promptMutex);

@@ -5,7 +5,6 @@
 #include <string_view>
 #include <utility>
 
-#include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
 #include "platform/Host.h"
 #include "prompts/CDMWindow.h"
@@ -113,7 +112,10 @@ int MarkedPrompt(const wstring& text, const wstring& title, unsigned int promptS
 }
 
 PromptWindow::PromptWindow(const Family& family, Request request)
-    : family_(family), request_(std::move(request)), desktop_(platform::TheHost().desktop) {
+    : family_(family),
+      request_(std::move(request)),
+      desktop_(platform::TheHost().desktop),
+      countDown_(desktop_, family.background) {
   topmost_ = (request_.style & kPromptTopmost) != 0;
   request_.style &= ~kPromptTopmost;
   if (!family_.configurable) {
@@ -448,7 +450,7 @@ void PromptWindow::OnTimer() {
   if (topmost_) {
     KeepForeground();
   }
-  CountDown();
+  CountTick();
 }
 
 // A worker that returns without being done is started again at the next tick.
@@ -489,7 +491,7 @@ void PromptWindow::KeepForeground() {
   FocusFirstChild(true);
 }
 
-void PromptWindow::CountDown() {
+void PromptWindow::CountTick() {
   if (timeoutTicks_ == 0) {
     return;
   }
@@ -500,7 +502,7 @@ void PromptWindow::CountDown() {
     desktop_.Invalidate(window_);  // which stays when the result is 0, and has nothing to count any more
   }
   if (elapsedTicks_ % kTicksPerSecond == 0) {
-    desktop_.Invalidate(desktop_.ForegroundWindow());
+    desktop_.Invalidate(window_);
   }
 }
 
@@ -540,20 +542,24 @@ std::intptr_t PromptWindow::OnPaint(const platform::Message& received) {
   if (hasImage_) {
     PaintImage();
   }
-  const WindowHandle former = std::exchange(countDownControl_, timeoutTicks_ == 0 ? 0 : ControlUnderCountDown());
-  if (former != 0 && former != countDownControl_) {
-    PaintControl(former);  // takes the number away
+  const std::vector<WindowHandle> former = countDown_.Controls();
+  std::vector<WindowHandle> buttons;
+  for (const Button& button : buttons_) {
+    buttons.push_back(button.window);
+  }
+  countDown_.Arrange(window_, buttons, SecondsLeft());
+  for (const WindowHandle control : former) {
+    if (!countDown_.IsOn(control)) {
+      PaintControl(control);  // takes the number away
+    }
   }
   if (timeoutTicks_ == 0) {
     return desktop_.DefaultProcedure(received);
   }
-  const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(received.window);
-  if (countDownControl_ != 0) {
-    PaintControl(countDownControl_);
-  } else {
-    const Point place = CountDownPlace();
-    PaintCountDown(*canvas, place.x, place.y);
+  for (const WindowHandle control : countDown_.Controls()) {
+    PaintControl(control);
   }
+  countDown_.Paint(*desktop_.BeginPaint(received.window), received.window);
   return 0;
 }
 
@@ -563,43 +569,22 @@ void PromptWindow::PaintImage() {
                     desktop_.ClientRectangle(imageControl_));
 }
 
-PromptWindow::Point PromptWindow::CountDownPlace() const { return {clientWidth_ / 5, clientHeight_ - 22}; }
-
-// The count-down has a fixed place in the window. A control that stands there would cover what the window paints, as
-// the text does in the forms without an image; so the number is painted on the control then. 0 when there is none.
-WindowHandle PromptWindow::ControlUnderCountDown() const {
-  const Point place = CountDownPlace();
-  for (const WindowHandle child : desktop_.Children(window_)) {
-    if (desktop_.IsWindowVisible(child) && desktop_.WindowRectangle(child).Contains(place.x, place.y)) {
-      return child;
-    }
-  }
-  return 0;
-}
-
 // What this window paints on one of its controls: the marked text, and the count-down where that lies on it.
 void PromptWindow::PaintControl(WindowHandle control) {
   const std::unique_ptr<platform::Canvas> canvas = desktop_.BeginPaint(control);
   if (control == markedPane_) {
     PaintMarkedText(*canvas);
   }
-  if (control != countDownControl_) {
-    return;
+  if (countDown_.IsOn(control)) {
+    countDown_.Paint(*canvas, control);
   }
-  const Rectangle place = desktop_.WindowRectangle(control);
-  const int frame = (place.Width() - desktop_.ClientRectangle(control).Width()) / 2;
-  int x = CountDownPlace().x - place.left - frame;
-  if (IsButton(control)) {
-    constexpr int kGap = 6;  // pixels to the caption, which can still be read
-    const Rectangle caption = desktop_.MeasureText(desktop_.WindowText(control), place.Width(), kPromptFont);
-    x = std::max(x, (place.Width() + caption.Width()) / 2 + kGap);
-  }
-  PaintCountDown(*canvas, x, CountDownPlace().y - place.top - frame);
 }
 
-void PromptWindow::PaintCountDown(platform::Canvas& canvas, int x, int y) const {
-  const std::uint32_t seconds = (timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000;
-  canvas.DrawText(x, y, CDMUtil::ToWString(CDMUtil::ToString(seconds)), kPromptFont, 0, std::nullopt);
+std::optional<std::uint32_t> PromptWindow::SecondsLeft() const {
+  if (timeoutTicks_ == 0) {
+    return std::nullopt;
+  }
+  return (timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000;
 }
 
 void PromptWindow::PaintMarkedText(platform::Canvas& canvas) const {

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "platform/Desktop.h"
+#include "prompts/CountDown.h"
 #include "prompts/MarkedText.h"
 #include "prompts/PromptState.h"
 
@@ -65,10 +66,6 @@ class PromptWindow {
     int result;
     platform::WindowHandle window;
   };
-  struct Point {
-    int x;  // client pixels
-    int y;
-  };
 
   void MeasureImage();
   bool Create();
@@ -85,14 +82,12 @@ class PromptWindow {
   void OnTimer();
   void CheckWorker();
   void KeepForeground();
-  void CountDown();
+  void CountTick();
   void OnScroll(const platform::Message& message);
   std::intptr_t OnPaint(const platform::Message& message);
   void PaintImage();
-  [[nodiscard]] Point CountDownPlace() const;
-  [[nodiscard]] platform::WindowHandle ControlUnderCountDown() const;
   void PaintControl(platform::WindowHandle control);
-  void PaintCountDown(platform::Canvas& canvas, int x, int y) const;
+  [[nodiscard]] std::optional<std::uint32_t> SecondsLeft() const;
   void PaintMarkedText(platform::Canvas& canvas) const;
   void OnDeviceChange(std::uintptr_t event);
   [[nodiscard]] bool IsButton(platform::WindowHandle control) const;
@@ -108,6 +103,7 @@ class PromptWindow {
   Family family_;
   Request request_;
   platform::Desktop& desktop_;
+  CountDown countDown_;
   bool topmost_ = false;
   int charWidth_ = 0;
   int result_ = 0;
@@ -120,7 +116,6 @@ class PromptWindow {
   platform::WindowHandle imageControl_ = 0;
   platform::WindowHandle horizontalBar_ = 0;
   platform::WindowHandle verticalBar_ = 0;
-  platform::WindowHandle countDownControl_ = 0;  // the control that the count-down is painted on; 0: the window
   std::vector<Button> buttons_;
   int buttonWidth_ = 0;
   bool hasImage_ = false;

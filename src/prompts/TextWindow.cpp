@@ -24,7 +24,7 @@ constexpr Rectangle kInputPlace = PlaceAt(120, 190, 300, 25);
 constexpr Rectangle kLabelPlace = PlaceAt(10, 10, 520, 140);
 
 constexpr std::uint32_t kClearTimer = 1500;
-constexpr std::size_t kLongestLine = 256;  // characters
+constexpr std::size_t kLongestLine = 255;  // characters: a read of 256 ends with a zero
 constexpr std::uintptr_t kEnterKey = 13;
 
 // A key's release has an odd message number, with and without Alt.

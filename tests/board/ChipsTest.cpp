@@ -204,5 +204,75 @@ TEST(GChip, NumberedKeysEndAtAGapOrAtTheirCount) {
   EXPECT_EQ(chip.fullSpeedData, 0x7F);
 }
 
+// The names that the file's writers know: every key that a chip looks up in its section.
+TEST(GenericChips, LookUpTheirKeysByTheirNames) {
+  const std::string common =
+      "fan.1.pwm.reg, fan.1.tach.reg, fan.full_speed.data, fan.pwms, fan.restore_sleep, fan.save.regs, fan.tachs";
+  const std::string parts =
+      "fan.1.pwm.reg, fan.1.pwm_ctl.reg, fan.1.tach.reg, fan.2.pwm_ctl.reg, fan.3.pwm_ctl.reg, "
+      "fan.full_speed.data, fan.pwms, fan.restore_sleep, fan.save.regs, fan.tachs, ";
+  const std::string ports =
+      "config.data.port, config.index.port, config.mode.enter.sequence, "
+      "config.mode.exit.sequence, ";
+  const std::string environment = "environment.data.reg, environment.index.reg, ";
+  const std::string bars = "gpiobar, gpiobar.bar.ldn, gpiobar.bar.reg, hwmbar, hwmbar.bar.ldn, hwmbar.bar.reg, ";
+  const std::string zones = ", temp.1.limit.reg, temp.1.read.reg, temp.zones";
+  const std::string masked =
+      "chargeled.red.assert.sequence, chargeled.red.deassert.sequence, chargeled.white.assert.sequence, "
+      "chargeled.white.deassert.sequence, " +
+      common +
+      ", hdled.red.assert.sequence, hdled.red.deassert.sequence, "
+      "powerled.green.assert.sequence, powerled.green.deassert.sequence, powerled.ldn, "
+      "powerled.red.assert.sequence, powerled.red.deassert.sequence, powerled.state.regs" +
+      zones + ", wirelessled.assert.sequence, wirelessled.deassert.sequence";
+  const std::pair<const char*, std::string> kChips[] = {
+      {"g_fintek", ports + environment +
+                       "fan.1.pwm.reg, fan.1.tach.reg, fan.full_speed.data, "
+                       "fan.manual_mode.set.sequence, fan.pwms, fan.restore_sleep, fan.save.regs, fan.tachs, " +
+                       bars +
+                       "powerled.green.blink.sequence, powerled.ldn, powerled.red.blink.sequence, "
+                       "powerled.state.regs" +
+                       zones},
+      {"g_it8702", ports + "config.reg, " + environment + parts +
+                       "fan_ctl.reg, fan_main_control.reg, fan_ramp_rate.reg, " + bars +
+                       "powerled.color.primary.gpio, powerled.color.secondary.gpio, powerled.green.blink.sequence, "
+                       "powerled.ldn, powerled.red.blink.sequence, powerled.state.regs" +
+                       zones},
+      {"g_ec",
+       "ec.data.port, ec.ibf.sleeptime, ec.obf.sleeptime, ec.query.cmd, ec.read.cmd, ec.sc.port, "
+       "ec.write.cmd, fan.1.pwm.reg, fan.1.tach.reg, fan.full_speed.data, fan.manual_mode.reset.sequence, "
+       "fan.manual_mode.set.sequence, fan.pwms, fan.restore_sleep, fan.save.regs, fan.tachs, "
+       "powerled.deassert.sequence, powerled.green.assert.sequence, powerled.ldn, "
+       "powerled.red.assert.sequence, powerled.state.regs, powerled.state.restore.sequence, "
+       "powerled.state.save.sequence" +
+           zones},
+      {"g_codec",
+       "codec.ics.reg, codec.icw.reg, codec.irr.reg, codecgpio.state.restore.sequence, "
+       "codecgpio.state.save.sequence, codecgpio.state.set.sequence, " +
+           common + ", microphoneled.gpio.ldn, powerled.ldn, powerled.state.regs, speakerled.gpio.ldn" + zones},
+      {"smsc_mec1322",
+       "chargeled.green.assert.sequence, chargeled.green.deassert.sequence, chargeled.green.enablemux.sequence, "
+       "chargeled.green.savemux.sequence, chargeled.red.assert.sequence, chargeled.red.deassert.sequence, "
+       "chargeled.red.enablemux.sequence, chargeled.red.savemux.sequence, powerled.green.assert.sequence, "
+       "powerled.green.deassert.sequence, powerled.green.enablemux.sequence, powerled.green.savemux.sequence"},
+      {"casl",
+       "config.read.command, config.write.command, wireless.assert.command, wireless.deassert.command, "
+       "wireless.devices.buffer, wireless.methodtype, wireless.powercontrol"},
+      {"g_iospace", masked},
+      {"g_memoryspace", masked},
+  };
+  for (const auto& [chip, keys] : kChips) {
+    BoardBench bench("firmware_call = {}\n");
+    bench.SetFiles("[7D10]\nchip.codec.hdabar=0xFE5C0000\nchip.g_ec.ec.set_pwm.cmd=1\n", "", "");
+    IniReader& reader = IniReader::Instance("7D10", ".\\mbdetect.ini", "", ".\\chip.ini");
+    for (const ChipRow& row : ChipRows()) {
+      if (row.name == chip) {
+        row.make()->Initialize();
+      }
+    }
+    EXPECT_EQ(reader.MissingKeys(chip, ""), keys) << chip;
+  }
+}
+
 }  // namespace
 }  // namespace panelglow

@@ -394,16 +394,18 @@ TEST(GCodecChip, AVerbIsSentThroughTheImmediateCommandRegisters) {
   ChipBench bench(kCodec, "chip.codec.hdabar=0xFE0F000F\n", kVerbs);
   GCodecChip chip;
   EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(0x001F1600), 5U); }),
-            "FE0F0060<-00000000 FE0F0068->0000 FE0F0060<-00161F00 10ms FE0F0068<-0100 FE0F0068->0100 "
-            "10ms FE0F0068->0200 FE0F0064->05000000 ");
+            "FE0F0060<-00000000 FE0F0068->00 FE0F0069->00 FE0F0060<-00161F00 10ms FE0F0068<-01 FE0F0069<-00 "
+            "FE0F0068->01 FE0F0069->00 "
+            "10ms FE0F0068->02 FE0F0069->00 FE0F0064->05000000 ");
   EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(0x201F1600), 0U); }),  // nobody there
-            "FE0F0060<-00000000 FE0F0068->0200 FE0F0068<-0200 FE0F0060<-00161F20 10ms FE0F0068<-0100 "
-            "FE0F0068->0100 10ms FE0F0068->0000 ");
+            "FE0F0060<-00000000 FE0F0068->02 FE0F0069->00 FE0F0068<-02 FE0F0069<-00 FE0F0060<-00161F20 10ms "
+            "FE0F0068<-01 FE0F0069<-00 "
+            "FE0F0068->01 FE0F0069->00 10ms FE0F0068->00 FE0F0069->00 ");
 }
 
 TEST(GCodecChip, ABusyControllerCostsFourMoreLooksAtTheStatusInAll) {
-  const std::string busy = "10ms FE0F0068->0100 ";
-  const std::string begin = "FE0F0060<-00000000 FE0F0068->0100 ";
+  const std::string busy = "10ms FE0F0068->01 FE0F0069->00 ";
+  const std::string begin = "FE0F0060<-00000000 FE0F0068->01 FE0F0069->00 ";
   // Memory in the controller's place: its start bit stays as it is written.
   ChipBench bench("", "chip.codec.hdabar=0xFE0F0000\n", kVerbs);
   GCodecChip chip;
@@ -411,9 +413,11 @@ TEST(GCodecChip, ABusyControllerCostsFourMoreLooksAtTheStatusInAll) {
   EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(1), 0U); }), begin + busy + busy + busy + busy);
   bench.machine.Time().At(bench.machine.Time().Now() + 25'000,
                           [&] { bench.machine.Hardware().WriteMemory(0xFE0F0068, 0); });
-  EXPECT_EQ(
-      bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(1), 0U); }),
-      begin + busy + busy + "10ms FE0F0068->0000 FE0F0060<-01000000 10ms FE0F0068<-0100 FE0F0068->0100 " + busy);
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(chip.SendVerb(1), 0U); }),
+            begin + busy + busy +
+                "10ms FE0F0068->00 FE0F0069->00 FE0F0060<-01000000 10ms FE0F0068<-01 FE0F0069<-00 FE0F0068->01 "
+                "FE0F0069->00 " +
+                busy);
 }
 
 TEST(GCodecChip, WithoutADriverALampTakesItsTimeAndDoesNothing) {
@@ -549,7 +553,7 @@ TEST(CaslChip, FansAndTemperaturesAreItemsOfCountedRecords) {
 }
 
 TEST(CaslChip, AFailingCallSaysAtWhichStep) {
-  const std::pair<const char*, const char*> kFaults[] = {{"wrong-signature", "tmbWMI call (1,27)"},
+  const std::pair<const char*, const char*> kFaults[] = {{"wrong-signature", "tmbWMI call (1,1279869254)"},
                                                          {"short-data", "WMI call Return Size Discovery"},
                                                          {"get-method", "WMI call GetMethod"},
                                                          {"get-class", "WMI call Get tmbBIntM"},

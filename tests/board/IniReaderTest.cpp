@@ -3,7 +3,12 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
+
 #include "board/BoardBench.h"
+#include "board/base/mblib_exception.h"
+#include "board/chips/Sequence.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
 namespace {
@@ -77,6 +82,51 @@ TEST(IniReader, NumbersAreDecimalOrPrefixedAndEveryReadIsRecorded) {
             "motherboard.lib input data (chip.ini:1):\n7D10 a = 2e\n7D10 b = 0\n7D10 c = 2e\n7D10 d = (undef)\n"
             "7D10 e = fed80100\n7D10 f = ffffffff\n7D10 g = 10\n7D10 h = text\n7D10 i = dflt (dflt)\n"
             "7D10 none = a (dflt)\n7D10 none2 = ffffffff (dflt)\n");
+}
+
+TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
+  BoardBench bench;
+  bench.SetFiles("[7D10]\na=OxF9\nb=0xFFFFFFFF\nc=-1\nchip.g_ec.d=F8h\ngood=0x20\nempty=undef\n", "",
+                 "[g_ec]\ne=0x1F9\nf=255\ng=-128\nh=0x10000\ni=0xFFFF\nj=0xF9 x\n"
+                 "list=B40:1.300,0x10:undef\n[parts]\nbase=g_ce\n");
+  IniReader& reader = IniReader::Instance("7D10", kFiles[0], kFiles[1], kFiles[2]);
+  const std::string detect = ".\\mbdetect.ini, section [7D10], key ";
+  const std::string chip = ".\\chip.ini, section [g_ec], key ";
+  const std::string none = " is no number and counts as 0; numbers are decimal, or hexadecimal behind 0x";
+  IniReader::status_t status = IniReader::kNotFound;
+  Sequence sequence;
+  const std::pair<std::function<void()>, std::string> kReads[] = {
+      {[&] { reader.ReadIniInt("good", status, 0); }, ""},
+      {[&] { reader.ReadIniInt("empty", status, 0); }, ""},
+      {[&] { reader.ReadIniInt("none", status, 0); }, ""},
+      {[&] { EXPECT_EQ(ReadIniInt("a", 5), 0); }, detect + "\"a\": \"OxF9\"" + none},
+      {[&] { reader.ReadIniUnsigned("b", status, 0); }, ""},
+      {[&] { EXPECT_EQ(ReadIniInt("b", 0), 0x7FFFFFFF); },
+       detect + "\"b\": \"0xFFFFFFFF\" does not fit into 31 bits and counts as 0x7FFFFFFF"},
+      {[&] { EXPECT_EQ(ReadIniInt("c", 0), -1); }, ""},
+      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "d", 1), 0); }, detect + "\"chip.g_ec.d\": \"F8h\"" + none},
+      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "e", 1), 0xF9); },
+       chip + "\"e\": \"0x1F9\" does not fit into 8 bits and counts as 0xF9"},
+      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "f", 1) + ReadChipByte("g_ec", "g", 1), 255 + 128); }, ""},
+      {[&] { EXPECT_EQ(ReadChipWord("g_ec", "h", 1), 0); },
+       chip + "\"h\": \"0x10000\" does not fit into 16 bits and counts as 0x0"},
+      {[&] { EXPECT_EQ(ReadChipWord("g_ec", "i", 1), 0xFFFF); }, ""},
+      {[&] { ParseByteList(ReadChipSetting("g_ec", "j", "")); }, chip + "\"j\": \"x\"" + none},
+      {[&] { ParseByteList("x"); }, ""},  // of no file
+      {[&] { ParseSequence(ReadChipSetting("g_ec", "list", ""), sequence, 16); },
+       chip + "\"list\": \"B40\"" + none + ".\npanelglow-diags: " + chip +
+           "\"list\": \"300\" does not fit into 8 bits and counts as 0x2C"},
+      {[&] { EXPECT_THROW(ParsePairs<std::uint8_t>(ReadChipSetting("g_ec", "i", "")), mblib_exception); },
+       chip + "\"i\": malformed sequence entry: '0xFFFF'. should be: 'cmd:data[.data]*,...'"},
+      {[&] { ReadChipByte("parts", "x", 1); },
+       ".\\chip.ini, section [parts], key \"base\": there is no section [g_ce]"},
+  };
+  Notices::Forget();
+  for (const auto& [read, told] : kReads) {
+    bench.machine.ClearOutput();
+    read();
+    EXPECT_EQ(bench.machine.Errors(), told.empty() ? "" : "panelglow-diags: " + told + ".\n");
+  }
 }
 
 TEST(IniReader, WhichFilesThereAreIsKnownFromTheStartAndTheChipFileStaysTheFirst) {

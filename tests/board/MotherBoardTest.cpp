@@ -1,13 +1,17 @@
 // Which board the INI files make of a machine, whose chip serves an LED, and the lock that a board is.
 #include "board/MotherBoard.h"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <set>
 
 #include "board/BoardBench.h"
+#include "board/base/NotBuiltException.h"
+#include "board/base/SelectedSystem.h"
 #include "board/base/mblib_exception.h"
 #include "harness/base/CDMException.h"
+#include "harness/base/Notices.h"
 #include "hw/SMBIOSDiscovery.h"
 #include "platform/Host.h"
 
@@ -37,6 +41,36 @@ TEST(ChipTable, EveryNameIsUniqueAndLeadsToItsOwnPlace) {
       {"g_it8702", 39}, {"g_fintek", 39}, {"g_sio", 39}, {"g_ec", 40}, {"g_ec_it8519", 40}, {"g_codec", 46}};
   for (const auto& [name, place] : kPlaces) {
     EXPECT_EQ(ChipPlaceOf(name), place) << name;
+  }
+}
+
+// The published order of the places, and of the names that share one.
+TEST(ChipTable, StandsInItsOrder) {
+  std::string order;
+  for (const ChipRow& row : ChipRows()) {
+    order += std::to_string(row.place) + " " + std::string(row.name) + ", ";
+  }
+  EXPECT_EQ(order,
+            "1 chip, 2 adt, 3 adt_sio11, 4 acpi, 5 casl, 6 ec, 7 ec_wpc8763, 8 ec_it8512, 9 ec_it8518, 10 fin, "
+            "11 fin_f8000, 12 fin_f71858, 13 fin_f71855, 14 fin_f71863, 15 fin_f71808a, 16 fin_f71808e, 17 hudson, "
+            "19 intelc200, 18 ich, 20 ite, 21 ite_8758, 22 ite_8721, 23 ite_8772, 24 mcp, 25 nuv_w83667, "
+            "26 nuv_nct5571, 27 nuv_nct5572, 28 sbx, 29 sb710, 30 sio, 31 smbus_device, 32 smsc5407, 33 win, "
+            "34 win_w83202g, 35 win_wpcd376, 36 vt1211, 37 nuv_npcd378h, 38 smsc_sch5327b, 39 g_fintek, 39 g_it8702, "
+            "39 g_ite, 39 g_sio, 40 g_ec_it8519, 40 g_ec, 41 videochip, 42 smsc_mec1322, 43 smsc_kbc1126, "
+            "44 g_iospace, 45 g_memoryspace, 46 g_codec, ");
+  BoardBench bench;
+  const std::string settings =
+      "chip.codec.hdabar=0xFE5C0000\nchip.g_ec.ec.set_pwm.cmd=1\nchip.g_ec_it8519.ec.set_pwm.cmd=1\n";
+  const std::pair<const char*, const char*> kLists[] = {
+      {"g_sio g_ite g_it8702 g_fintek g_ec", "g_fintek g_ec"},
+      {"g_sio g_ite g_it8702 g_ec g_ec_it8519", "g_it8702 g_ec_it8519"},
+      {"g_sio g_ite", "g_ite none"},
+      {"g_sio", "g_sio none"},
+      {"", "g_sio g_ec"}};
+  for (const auto& [list, built] : kLists) {
+    bench.SetFiles("[7D10]\nplatform=generic\n" + settings + "chips=" + list + "\n", "", "");
+    const std::unique_ptr<MotherBoard> board = BoardBench::Board();
+    EXPECT_EQ(board->GetChip("g_sio").GetName() + " " + board->GetChip("g_ec").GetName(), built) << list;
   }
 }
 
@@ -92,6 +126,184 @@ TEST(MotherBoard, ALedIsServedByTheChipThatTheFilesName) {
   };
   EXPECT_EQ(lit(""), "");
   EXPECT_EQ(lit("test.wirelessled.chip=G_IOSPACE\ntest.hdled.chip=none\n"), "wireless ");
+}
+
+// Each LED by its own key: one chip for it, another for all others.
+TEST(MotherBoard, EachLedAsksTheChipOfItsOwnKeyAndNoOther) {
+  constexpr std::uint32_t kPort = 0xA20;
+  BoardBench bench("chip = [{name = \"m\", kind = \"memory-registers\", base = 0xFE000000, initial = [0]}]\n");
+  const char* const lists[] = {"powerled.green.assert", "powerled.green.deassert", "powerled.red.assert",
+                               "powerled.red.deassert", "chargeled.white.assert",  "chargeled.white.deassert",
+                               "chargeled.red.assert",  "chargeled.red.deassert",  "hdled.red.assert",
+                               "hdled.red.deassert",    "wirelessled.assert",      "wirelessled.deassert"};
+  std::string chip = "[g_iospace]\n";
+  for (const char* list : lists) {
+    chip += list + std::string(".sequence=") + std::to_string(kPort) + ":1\n";
+  }
+  chip += "[g_memoryspace]\n";
+  for (const char* list : lists) {
+    chip += list + std::string(".sequence=0xFE000000:1\n");
+  }
+  using Operation = bool (MotherBoard::*)();
+  const std::pair<const char*, std::vector<Operation>> kLeds[] = {
+      {"power",
+       {&MotherBoard::AssertPowerLedGreen, &MotherBoard::AssertPowerLedRed, &MotherBoard::DeassertPowerLed,
+        &MotherBoard::RestorePowerLedState}},
+      {"charge",
+       {&MotherBoard::AssertChargeLedWhite, &MotherBoard::DeassertChargeLedWhite, &MotherBoard::AssertChargeLedRed,
+        &MotherBoard::DeassertChargeLedRed}},
+      {"hd",
+       {&MotherBoard::SaveHdLedState, &MotherBoard::AssertHdLedRed, &MotherBoard::DeassertHdLedRed,
+        &MotherBoard::RestoreHdLedState}},
+      {"wireless",
+       {&MotherBoard::SaveWirelessLedState, &MotherBoard::AssertWirelessLed, &MotherBoard::DeassertWirelessLed,
+        &MotherBoard::RestoreWirelessLedState}},
+  };
+  for (const auto& [own, ownOperations] : kLeds) {
+    std::string test = "[7D10]\n";
+    for (const auto& [led, operations] : kLeds) {
+      test += std::string("test.") + led + "led.chip=" + (led == own ? "g_memoryspace\n" : "g_iospace\n");
+    }
+    bench.SetFiles("[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n", test, chip);
+    const std::unique_ptr<MotherBoard> board = BoardBench::Board();
+    for (const auto& [led, operations] : kLeds) {
+      for (const Operation operation : operations) {
+        const std::string traffic = bench.Traffic([&] { EXPECT_TRUE(((*board).*operation)()); });
+        EXPECT_EQ(traffic.substr(0, 4), led == own ? "FE00" : "0A20") << own << " " << led;
+      }
+    }
+  }
+  // The codec's two: each pin by its own key.
+  bench.SetFiles(
+      "[7D10]\nplatform=generic\nchips=g_codec\nchip.codec.hdabar=0xFE0F0000\n"
+      "test.microphoneled.chip=g_codec\n",
+      "", "[g_codec]\ncodecgpio.state.set.sequence=1,2,3\n");
+  const std::unique_ptr<MotherBoard> board = BoardBench::Board();
+  EXPECT_TRUE(board->AssertMicrophoneLed() && board->DeassertMicrophoneLed());
+  EXPECT_FALSE(board->AssertSpeakerLed() || board->DeassertSpeakerLed());
+}
+
+// What the board's files name and this version does not have is nothing for other hardware's code.
+TEST(MotherBoard, AClassOrChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
+  BoardBench bench;
+  Notices::Forget();
+  SMBIOSDiscovery::Instance().productText = "7D10";
+  const auto refusal = [](auto action) -> std::string {
+    try {
+      action();
+    } catch (const NotBuiltException& refused) {
+      return refused.what();
+    }
+    return "none";
+  };
+  const std::string end = "is not built into this version, which cannot drive ";
+  bench.SetFiles("[7D10]\nplatform=CBB\n", "", "");
+  const std::string noClass = refusal([] { BoardBench::Board(); });
+  EXPECT_EQ(noClass, ".\\mbdetect.ini, section [7D10], key \"platform\": the board class \"cbb\" " + end +
+                         "this machine's LEDs");
+  EXPECT_EQ(bench.machine.Errors(), "panelglow-diags: " + noClass + ".\n");
+  for (const char* oldest : {"Lantern", "Orchard"}) {
+    bench.SetFiles(std::string("[7D10]\nMotherboardClass=") + oldest + "\n", "", "");
+    EXPECT_EQ(BoardBench::Board(), nullptr);
+    EXPECT_THAT(refusal([] { MotherBoard::Instance(".\\mbdetect.ini"); }), ::testing::HasSubstr(oldest));
+  }
+
+  bench.SetFiles("[7D10]\nplatform=generic\nchips=fin,g_iospace\n",
+                 "[Common]\ntest.powerled.chip=Fin\ntest.hdled.chip=g_iospace\ntest.chargeled.chip=ich\n", "");
+  const std::unique_ptr<MotherBoard> board = BoardBench::Board();
+  const std::string noChip = refusal([&] { board->RequireDrivable(MotherBoard::Led::kPower); });
+  EXPECT_EQ(noChip,
+            ".\\mbtest.ini, section [Common], key \"test.powerled.chip\": the chip \"fin\" " + end + "the power LED");
+  EXPECT_EQ(refusal([&] { board->AssertPowerLedGreen(); }), noChip);
+  board->RequireDrivable(MotherBoard::Led::kHd);
+  board->RequireDrivable(MotherBoard::Led::kCharge);  // which no list holds: that is another mistake
+  board->RequireDrivable(MotherBoard::Led::kWireless);
+}
+
+TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
+  struct Case {
+    const char* detect;
+    const char* test;
+    const char* chip;
+    std::vector<const char*> told;  // parts of the lines, in order; none: nothing is told
+  };
+  const char* const generic = "[7D10]\nplatform=generic\nchips=g_iospace\n";
+  const char* const lamp =
+      "[g_iospace]\npowerled.green.assert.sequence=0xA20:1\npowerled.green.deassert.sequence=0xA20:0xFE\n"
+      "powerled.red.deassert.sequence=0xA20:0xFE\n";
+  const Case kCases[] = {
+      {generic, "[7D10]\ntest.powerled.chip=g_iospace\ntest.powerled.redled.support=no\n", lamp, {}},
+      {"[7D10]\nplatform=legacy\n", "", "", {}},
+      {"[7D11]\nplatform=generic\n",
+       "[7D10]\na=b\n",
+       "",
+       {"system id is \"7D10\", and section [7D10] is in .\\mbtest.ini, not in .\\mbdetect.ini; without"}},
+      {"[7D10]\nplatform=genric\n", "", "", {"key \"platform\": there is no board class \"genric\""}},
+      {"[7D10]\nchips=g_iospace,g_iospce,ich\n",
+       "[7D10]\ntest.powerled.chip=g_iospace\n",
+       lamp,
+       {"key \"chips\": there is no chip \"g_iospce\"", "key \"chips\": the chip \"ich\" is not built"}},
+      {generic,
+       "",
+       "",
+       {"The power LED cannot be lit: the key \"test.powerled.chip\" names no chip for it; section [7D10] is in "
+        ".\\mbdetect.ini, not in .\\mbtest.ini"}},
+      {generic,
+       "[7D10]\ntest.powerled.chip=g_iospce\n",
+       "",
+       {"cannot be lit: the chip \"g_iospce\" (.\\mbtest.ini, "}},
+      {generic, "[7D10]\ntest.powerled.chip=g_sio\n", "", {"cannot be lit: the chip \"g_sio\" (.\\mbtest.ini, "}},
+      {generic,
+       "[7D10]\ntest.powerled.chip=g_iospace\n",
+       "[g_iospace]\npowerled.green.assert.sequence=undef\n",
+       {"has nothing for it; without a value in [g_iospace]: powerled.green.assert.sequence, "
+        "powerled.green.deassert.sequence, powerled.ldn, powerled.red."}},
+      {generic,
+       "[7D10]\ntest.powerled.chip=g_iospace\n",
+       "[g_iospace]\npowerled.green.assert.sequence=0xA20:1\n",
+       {"The power LED cannot be darkened: the chip \"g_iospace\""}},
+      {generic,
+       "[7D10]\ntest.powerled.chip=g_iospace\ntest.powerled.redled.support=maybe\ntest.panelglow.uselegacy=1\n",
+       lamp,
+       {"key \"test.powerled.redled.support\": \"maybe\" is neither yes nor no; the chip is asked",
+        "key \"test.panelglow.uselegacy\": \"1\" is neither yes nor no and counts as no"}},
+  };
+  for (const Case& c : kCases) {
+    SCOPED_TRACE(c.detect + std::string(c.test) + c.chip);
+    Notices::Forget();
+    BoardBench bench;
+    bench.SetFiles(c.detect, c.test, c.chip);
+    SMBIOSDiscovery::Instance().productText = "7D10";
+    for (int worker = 0; worker < 2; ++worker) {
+      if (const std::unique_ptr<MotherBoard> board = BoardBench::Board("")) {
+        bool supported = false;
+        board->IsPowerLedRedSupported(supported);
+        board->IsPanelLedLegacy();
+        board->DeassertChargeLedRed();  // never lit here: no matter
+        board->AssertPowerLedGreen();
+        board->DeassertPowerLed();
+      }
+    }
+    std::vector<std::string> lines;
+    CDMUtil::Split(bench.machine.Errors(), lines, "\n");
+    ASSERT_EQ(lines.size(), c.told.size()) << bench.machine.Errors();
+    for (std::size_t i = 0; i < lines.size(); ++i) {
+      EXPECT_THAT(lines[i], ::testing::HasSubstr(c.told[i]));
+    }
+  }
+}
+
+TEST(MotherBoard, KeepsWhatItFoundOutForLaterReaders) {
+  BoardBench bench;
+  ProcessorInfo processor;
+  processor.manufacturer = " AMD  ";
+  processor.family = 0x6B;
+  SMBIOSDiscovery::Instance().processors = {processor};
+  BoardBench::Board("0B1C");
+  const SelectedSystem system = GetSelectedSystem();
+  EXPECT_EQ(system.processorManufacturer + "/" + system.detectIniPath + "/" + system.section,
+            "AMD/.\\mbdetect.ini/0B1C");
+  EXPECT_EQ(system.processorFamily, 0x6BU);
 }
 
 TEST(MotherBoard, SupportIsYesOrNoByTheFilesAndOtherwiseTheChips) {

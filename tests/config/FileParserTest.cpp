@@ -171,7 +171,9 @@ TEST_F(FileParserTest, CopiesLinesUnderNumberedKeys) {
   EXPECT_EQ(parser.ReadSection("b"), 1);
   parser.AppendLines("all");
   FileParser copy("t.ini");
-  EXPECT_TRUE(copy.ReadValue("all", "N3"));
+  EXPECT_TRUE(copy.ReadValue("all", "N0"));
+  EXPECT_EQ(copy.GetCurrentValue(), "plain, line");
+  EXPECT_TRUE(copy.ReadValue("all", "N2"));
   EXPECT_EQ(copy.GetCurrentValue(), "third");
   copy.SetTargetPath("t.ini");
   EXPECT_TRUE(copy.WriteBuffer("c", "k") && copy.EraseSection("all") && copy.EraseSection("a"));
@@ -185,7 +187,7 @@ TEST_F(FileParserTest, ACopyThatCannotBeMadeThrowsAndSaysSo) {
   EXPECT_EQ(parser.ConvertToIni("fits", "E", true, 1), 1);
   EXPECT_EQ(Thrown([&] { parser.ConvertToIni("s", "E", false, 1); }), -1);
   machine_.DiskFiles().FillDisk();
-  EXPECT_EQ(Thrown([&] { parser.ConvertToIni("fits", "E", false, 1); }), -3);
+  EXPECT_EQ(Thrown([&] { parser.ConvertToIni("fits", "E", false, 2); }), -3);
   EXPECT_EQ(machine_.Errors(), "ConvertToIni Failed: -1\nConvertToIni Failed: -3\n");
   parser.ReadSection("fits");
   EXPECT_EQ(Thrown([&] { parser.AppendLines("all"); }), -1);

@@ -42,6 +42,8 @@ TEST(XmlObject, ReadsWhatItKnowsAndDropsTheRest) {
       {"< a/>", "<a/>"},
       {"<a1-b.c/>", "<a1-b.c/>"},
       {"<a b='1' b=\"2\" B='3'/>", "<a b=\"3\"/>"},
+      {"<a b='1' b='&lt;'/>", "<a b=\"&lt;\"/>"},
+      {"<\xC3\xA4 \xC3\xB6='1'/>", "<\xC3\xA4 \xC3\xB6=\"1\"/>"},
       {"<a b = '1'\tc\n=\n\"2\"/>", "<a b=\"1\" c=\"2\"/>"},
       {"<a b='it\"s' c=\"it's\"/>", "<a b=\"it&quot;s\" c=\"it's\"/>"},
       {"<a b/>", "<a/>"},
@@ -421,6 +423,15 @@ TEST_F(XmlFiles, LooksAtNothingBehindTheElementThatWasAskedFor) {
     EXPECT_TRUE(object.LoadFromFile("m.xml", false, wrap, 1));
     EXPECT_THROW(static_cast<void>(object.LoadFromFile("m.xml", false, wrap, 2)), std::runtime_error);
   }
+}
+
+TEST_F(XmlFiles, AttributesInsideAnElementThatIsPassedOverAreNotLookedAt) {
+  machine_.DiskFiles().Put("m.xml", "<a><b c=d 1='>'/>text</a><e x='1'/><f c=d/><g/>");
+  XmlObject object;
+  EXPECT_TRUE(object.LoadFromFile("m.xml", false, false, 1));
+  EXPECT_EQ(object.ToString(true), "<e x=\"1\"/>");
+  EXPECT_THROW(static_cast<void>(object.LoadFromFile("m.xml", false, false, 0)), std::runtime_error);
+  EXPECT_THROW(static_cast<void>(object.LoadFromFile("m.xml", false, false, 3)), std::runtime_error);  // its own are
 }
 
 TEST_F(XmlFiles, LeavesTheObjectAloneWhenThereIsNothingToLoad) {

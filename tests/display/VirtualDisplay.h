@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <string>
 #include <thread>
+#include <utility>
 
 #include <X11/Xlib.h>
 #include <X11/Xutil.h>
@@ -21,7 +22,7 @@ namespace panelglow::systemtest {
 // An Xvfb of the test's own on a free display number, ended with the object.
 class VirtualDisplay {
  public:
-  VirtualDisplay() {
+  explicit VirtualDisplay(const std::string& size = "1280x1024") {
     std::array<int, 2> pipe{};
     if (::pipe(pipe.data()) != 0) {
       return;
@@ -29,8 +30,9 @@ class VirtualDisplay {
     pid_ = ::fork();
     if (pid_ == 0) {
       ::close(pipe[0]);
+      const std::string screen = size + "x24";
       const std::string descriptor = std::to_string(pipe[1]);
-      ::execlp("Xvfb", "Xvfb", "-displayfd", descriptor.c_str(), "-screen", "0", "1280x1024x24", "-nolisten", "tcp",
+      ::execlp("Xvfb", "Xvfb", "-displayfd", descriptor.c_str(), "-screen", "0", screen.c_str(), "-nolisten", "tcp",
                nullptr);
       ::_exit(127);
     }
@@ -46,20 +48,17 @@ class VirtualDisplay {
       display_ = ::XOpenDisplay(name_.c_str());
     }
   }
-  ~VirtualDisplay() {
-    if (display_ != nullptr) {
-      ::XCloseDisplay(display_);
-    }
-    if (pid_ > 0) {
-      ::kill(pid_, SIGTERM);
-      ::waitpid(pid_, nullptr, 0);
-    }
-  }
+  ~VirtualDisplay() { End(SIGTERM); }
   VirtualDisplay(const VirtualDisplay&) = delete;
   VirtualDisplay& operator=(const VirtualDisplay&) = delete;
 
   [[nodiscard]] bool IsOpen() const { return display_ != nullptr; }
   [[nodiscard]] const std::string& Name() const { return name_; }
+
+  // The server dies; from now on the display can only be destroyed.
+  void Kill() { End(SIGKILL); }
+
+  [[nodiscard]] ::Display* Connection() const { return display_; }
 
   // Colour of a pixel, red in the highest byte of three.
   [[nodiscard]] unsigned long PixelAt(int x, int y) const {
@@ -90,6 +89,16 @@ class VirtualDisplay {
   }
 
  private:
+  void End(int signal) {
+    if (display_ != nullptr) {
+      ::XCloseDisplay(std::exchange(display_, nullptr));
+    }
+    if (pid_ > 0) {
+      ::kill(pid_, signal);
+      ::waitpid(std::exchange(pid_, -1), nullptr, 0);
+    }
+  }
+
   pid_t pid_ = -1;
   std::string name_;
   ::Display* display_ = nullptr;

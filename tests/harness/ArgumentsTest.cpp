@@ -4,6 +4,7 @@
 #include "harness/CDMArgument.h"
 #include "harness/CmdLineParser.h"
 #include "harness/Probe.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
 namespace {
@@ -121,21 +122,65 @@ TEST(CDMDiag, AValueComesFromTheCommandLineThenTheDeclarationThenTheCaller) {
                                       "LogMessage 1 2 \"true\" \"\"\n"));  // a hidden one is not explained
 }
 
+TEST(CDMDiag, ANumberThatIsNoneOrDoesNotFitIsToldWithWhatItCountsAs) {
+  for (const auto& [text, counts] :
+       std::initializer_list<std::pair<const char*, const char*>>{{"2147483647", nullptr},
+                                                                  {"-0x80000000", nullptr},
+                                                                  {"7FFF", "0"},
+                                                                  {"OxF9", "0"},
+                                                                  {"-", "0"},
+                                                                  {"2147483648", "2147483647"},
+                                                                  {"0xFFFFFFFF", "2147483647"},
+                                                                  {"0xFFFFFFFFFFFFFFFFF", "2147483647"}}) {
+    ProbeRun run{"-subtest=Probe -mode=" + std::string(text)};
+    run.prepare = [](Probe& probe) {
+      Notices::Forget();
+      probe.Declare("-Mode", CDMArgumentType::String, "");
+      static_cast<void>(probe.GetArgument("-Mode", 5));
+    };
+    EXPECT_EQ(run.Errors(),
+              counts == nullptr
+                  ? std::string()
+                  : "panelglow-diags: The parameter -Mode is \"" + std::string(text) +
+                        "\", which is no number of 32 bits, decimal or hexadecimal behind 0x: it counts "
+                        "as " +
+                        counts + ".\n");
+  }
+}
+
+TEST(CDMDiag, TheConfigurationFileOfThePromptsIsTheOneThatIsNamed) {
+  for (const auto& [words, found] : {std::pair{"", "none"}, {"-diagconf=.\\Look.ini", "255"}}) {
+    ProbeRun run{"-subtest=Probe " + std::string(words)};
+    run.files[".\\Look.ini"] = "[WindowSettings]\nBackgroundColor=255\n";
+    run.body = [] {
+      const platform::Color ground = CDMDiag::GetWindowBackgroundBrush();
+      CDMDiag::ReportFailure(CDMDiag::HasWindowSettings() ? CDMUtil::ToString(ground) : "none");
+      return true;
+    };
+    EXPECT_EQ(run.Lines(), "ReportFailure " + std::string(found) + "\nEndOfTest\n= 0\n");
+  }
+}
+
 TEST(CDMDiag, ControlFilesCountByPlaceAndWholeContentAlsoWithoutProgramData) {
   const std::tuple<const char*, const char*, const char*> kCases[] = {
       {"\\halcyon.ctl", "pause", "pause"}, {"\\halcyon.ctl", "resume", "resume"},
       {"\\halcyon.ctl", "resume\r\n", ""}, {"\\halcyon.ctl", "terminate", "stop"},
-      {".\\halcyon.ctl", "terminate", ""}, {"\\Tamberlane\\kill.ctl", "", ""},
+      {".\\halcyon.ctl", "terminate", ""}, {"\\Tamberlane\\TMB Halcyon Hardware Diagnostics\\kill.ctl", "", ""},
       {"\\kill.ctl", "", "stop"},          {".\\kill.ctl", "", "stop"}};
   for (const auto& [path, content, asked] : kCases) {
-    platform::sim::MachineDescription description;
-    description.environment.clear();
-    platform::sim::Simulation machine(std::move(description), {});
-    machine.DiskFiles().Put(path, content);
-    EXPECT_EQ(std::string(CDMDiag::ShouldTestBeTerminated() ? "stop" : "") +
-                  (CDMDiag::IsPauseRequested() ? "pause" : "") + (CDMDiag::IsResumeRequested() ? "resume" : ""),
-              asked)
-        << path << content;
+    for (const bool isSet : {false, true}) {
+      platform::sim::MachineDescription description;
+      description.environment.clear();
+      if (isSet) {
+        description.environment["ProgramData"] = "";
+      }
+      platform::sim::Simulation machine(std::move(description), {});
+      machine.DiskFiles().Put(path, content);
+      EXPECT_EQ(std::string(CDMDiag::ShouldTestBeTerminated() ? "stop" : "") +
+                    (CDMDiag::IsPauseRequested() ? "pause" : "") + (CDMDiag::IsResumeRequested() ? "resume" : ""),
+                asked)
+          << path << content;
+    }
   }
 }
 

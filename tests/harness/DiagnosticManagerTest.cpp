@@ -132,7 +132,16 @@ TEST(DiagnosticManager, TheFirstRequestWithABadValueIsNamedInFixedOrderAndNothin
 }
 
 TEST(DiagnosticManager, ABreakIsNotedForTheSubtestLoggedWithoutOneAndIgnoredBehindTheManager) {
-  for (const auto& [words, output] : {std::pair{"-subtest=Probe", "noted"}, {"", "LogMessage 6 1 \"\" \"\"\n"}}) {
+  constexpr const char* kHeard = "panelglow-diags: The request to stop was heard";
+  constexpr const char* kWhat =
+      ". The run ends at its next step, that of an LED test when the attempt under way is over (the dialog's cancel "
+      "button ends it at once), and puts every LED back first.\n";
+  const std::string kNothing = ". No subtest is running that it could end.\n";
+  const std::string kTwice = " (2 times now)";
+  for (const auto& [words, output] :
+       {std::pair{"-subtest=Probe", "noted" + std::string(kHeard) + kWhat + kHeard + kTwice + kWhat},
+        {"", "LogMessage 6 1 \"\" \"\"\nLogMessage 6 1 \"\" \"\"\n" + std::string(kHeard) + kNothing + kHeard +
+                 kTwice + kNothing}}) {
     EXPECT_EQ(InOwnProcess([words = words] {
                 platform::sim::Simulation machine(platform::sim::MachineDescription{}, {});
                 const char* arguments[] = {"probe", words};
@@ -141,11 +150,12 @@ TEST(DiagnosticManager, ABreakIsNotedForTheSubtestLoggedWithoutOneAndIgnoredBehi
                   Probe probe([] { return true; });
                   manager.RegisterSubtest("Probe", &probe);
                   machine.RaiseConsole(1);
+                  machine.RaiseConsole(0);
                   machine.Time().SleepFor(1000);
                 }
                 machine.RaiseConsole(0);
                 machine.Time().SleepFor(1000);
-                return machine.Output() + (CDMDiag::IsSignalReceived() ? "noted" : "");
+                return machine.Output() + (CDMDiag::IsSignalReceived() ? "noted" : "") + machine.Errors();
               }),
               output);
   }

@@ -1,10 +1,14 @@
 // From a message number to a text and a picture: which file answers, and when it is looked at.
 #include "harness/MessageFiles.h"
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
+
+#include <cstdlib>
+#include <filesystem>
 
 #include "harness/CmdLineParser.h"
 #include "harness/OwnProcess.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 #include "platform/sim/Simulation.h"
 
@@ -75,18 +79,47 @@ TEST_F(MessageFilesTest, APictureIsTakenFromTheFirstFileThatHasItAndMustExist) {
   EXPECT_EQ(TextAndMedia(files, 4), "standard | 4");
   EXPECT_EQ(TextAndMedia(files, 5), "fallback | .\\here.bmp");
   EXPECT_EQ(TextAndMedia(files, 6, u"old"), "fallback | ");  // the integrator's file is always asked
+  EXPECT_EQ(machine.Errors(), "");
   EXPECT_EQ(TextAndMedia(MessageFiles(kProgram, "", "en_US"), 1, u"old"), "fallback | old");
 }
 
 TEST_F(MessageFilesTest, AFileIsOpenedAtItsFirstUseAndReadAtEachLookUp) {
   const MessageFiles files(kProgram, "", "en_US");
+  Notices::Forget();
   EXPECT_EQ(files.ResolveLogMessage(4294967295U, "a \"b\""), "4294967295 \"a \"b\"\"");
+  EXPECT_EQ(
+      machine.Errors(),
+      "panelglow-diags: The message file C:\\bench\\nonui_probe.msg is missing, so that numbers stand for texts: "
+      "start the program in the folder of the installation.\n");
   Put("C:\\bench\\nonui_probe.msg", "[en_US]\n1=too late\n");
   Put("C:\\bench\\probe.msg", "[en_US]\n1=in time\n");
   EXPECT_EQ(files.ResolveLogMessage(1, "x"), "1 \"x\"");
   EXPECT_EQ(TextOf(files, 1), "in time");
   Put("C:\\bench\\probe.msg", "[en_US]\n1=edited\n");
   EXPECT_EQ(TextOf(files, 1), "edited");
+  EXPECT_EQ(TextAndMedia(MessageFiles("C:\\suite\\other.exe", "", "en_US"), 1), "fallback | ");
+  EXPECT_THAT(machine.Errors(), ::testing::HasSubstr("The message file C:\\bench\\other.msg is missing"));
+}
+
+TEST(MessageFiles, AFolderOfAnyDepthMayHoldThem) {
+  EXPECT_EQ(InOwnProcess([] {
+              std::string top = (std::filesystem::temp_directory_path() / "panelglow-deep-XXXXXX").string();
+              std::filesystem::current_path(::mkdtemp(top.data()));
+              for (int i = 0; i < 3; ++i) {
+                const std::string folder(100, 'f');
+                std::filesystem::create_directory(folder);
+                std::filesystem::current_path(folder);
+              }
+              platform::sim::SimulationOptions options;
+              options.realFiles = true;
+              const Simulation machine(MachineDescription{}, options);
+              platform::TheHost().files.Write(".\\probe.msg", "[en_US]\n1=deep\n");
+              const std::string text = TextOf(MessageFiles("probe.exe", "", "en_US"), 1);
+              std::filesystem::current_path("/");
+              std::filesystem::remove_all(top);
+              return text;
+            }),
+            "deep");
 }
 
 TEST(MessageFiles, TwoThreadsMayReachThemFirstAtTheSameTime) {

@@ -45,7 +45,19 @@ struct ProbeRun {
 
   /// Standard output with the exit code behind it, as "= 0".
   [[nodiscard]] std::string Output() const {
-    return InOwnProcess([this] {
+    return Run([](const platform::sim::Simulation& machine, int exitCode) {
+      return machine.Output() + "= " + std::to_string(exitCode);
+    });
+  }
+
+  /// What people are told.
+  [[nodiscard]] std::string Errors() const {
+    return Run([](const platform::sim::Simulation& machine, int) { return machine.Errors(); });
+  }
+
+  [[nodiscard]] std::string Run(
+      const std::function<std::string(const platform::sim::Simulation&, int)>& answer) const {
+    return InOwnProcess([&] {
       platform::sim::MachineDescription description;
       description.firmware.boardProduct = boardProduct;
       platform::sim::Simulation machine(std::move(description), {});
@@ -64,11 +76,11 @@ struct ProbeRun {
       manager.RegisterSubtest("Probe", &probe);
       manager.RegisterSubtest("Other", nullptr);
       const int exitCode = manager.Run();
-      return machine.Output() + "= " + std::to_string(exitCode);
+      return answer(machine, exitCode);
     });
   }
 
-  /// The same without log lines of the class Debug, and with a line end.
+  /// The output without log lines of the class Debug, and with a line end.
   [[nodiscard]] std::string Lines() const {
     std::vector<std::string> lines;
     CDMUtil::Split(Output(), lines, "\n");

@@ -213,6 +213,15 @@ TEST(CDevio, CopiesPhysicalMemoryOfAnyLength) {
     EXPECT_EQ(devio.WritePhysicalMemory(0x2001, 7, written), 7U);
     EXPECT_EQ(devio.ReadPhysicalMemory(0x2001, 7, read), 7U);
     EXPECT_EQ(Hex(read), "A5A5A5A5A5A5A50000");
+    std::string accesses;
+    for (const DriverRequest& request : machine.Trace().Requests()) {
+      const std::string text = Describe(request);
+      const std::size_t at = text.find("memory ");
+      accesses += at == std::string::npos ? "" : text.substr(at + 7) + "; ";
+    }
+    EXPECT_EQ(accesses,
+              "00002001 <- A5 A5 A5 A5; 00002005 <- A5; 00002006 <- A5; 00002007 <- A5; "
+              "00002001 -> A5 A5 A5 A5; 00002005 -> A5; 00002006 -> A5; 00002007 -> A5; ");
     EXPECT_EQ(devio.ReadPhysicalMemory64(0x2001, 0, 7, read), 7U);
     EXPECT_EQ(machine.Trace().Requests().back().code, DriverRequest::kMappedRead);
     EXPECT_EQ(devio.ReadPhysicalMemory(0x2001, 100, read), 9U);  // no more than the buffer holds
@@ -242,6 +251,52 @@ TEST_F(CDevioTest, ReadsTheFirmwareSegmentAndGivesTheErrorOfARefusedRegister) {
   EXPECT_EQ(value, 0x199U);
   EXPECT_EQ(devio_.ReadFirmwareWord(0xF000, 1), 'S' | 'M' << 8);
   EXPECT_EQ(devio_.ReadFirmwareByte(0xF000, 3), '_');
+}
+
+// A driver that is there and reports a failure, whatever stands in the record that it gives back.
+TEST(CDevio, TakesNothingFromARequestThatFailed) {
+  MachineDescription description = Machine(true);
+  description.driver.refused = {0x220004, 0x220008, 0x22000C, 0x220010, 0x220014, 0x22003C, 0x220040,
+                                0x220044, 0x220048, 0x220058, 0x2200A8, 0x2200C8, 0x222498};
+  description.driver.registers = {{0x199, 7}};
+  for (const bool is64Bit : {true, false}) {
+    description.is64Bit = is64Bit;
+    Simulation machine(description, {});
+    CDevio d;
+    std::uint8_t byte = 1;
+    std::uint16_t word = 1;
+    std::uint16_t location = 1;
+    std::uint32_t dword = 1;
+    std::uint64_t msr = 0x199;
+    std::vector<std::byte> buffer(4, std::byte{7});
+    CDevio::MappingRecord mapping{1, 2, 3, 4, 5};
+    EXPECT_EQ(d.InportByte(0x80) + d.InportWord(0x80) + d.InportDword(0x80), 0U);
+    EXPECT_FALSE(d.OutportByte(0x80, 0) || d.OutportWord(0x80, 0));
+    d.ReadPciConfigByte(kSerial, 0, byte);
+    d.ReadPciConfigWord(kSerial, 0, word);
+    d.ReadPciConfigDword(kSerial, 0, dword);
+    EXPECT_EQ(byte + word + dword, 0U);
+    d.FindPciDevice(0x8086, 0x1C02, 0, location);
+    EXPECT_EQ(location, 0);
+    d.FindPciClass(0x060100, 1, location);
+    EXPECT_EQ(location, 0);
+    EXPECT_EQ(d.ReadPhysicalMemory(0x1000, 4, buffer) + d.WritePhysicalMemory(0x1000, 4, buffer), 0U);
+    EXPECT_EQ(buffer, std::vector<std::byte>(4, std::byte{7}));
+    EXPECT_EQ(d.MapPhysicalMemory(0x1000, 4, &mapping), 0U);
+    EXPECT_FALSE(d.UnmapPhysicalMemory(mapping));
+    EXPECT_THAT(mapping, ElementsAre(1U, 2U, 3U, 4U, 5U));
+    EXPECT_EQ(d.ReadMsr(msr), 31U);
+    EXPECT_EQ(msr, 0x199U);
+  }
+}
+
+TEST(CDevio, ReadsAModelSpecificRegisterOf64Bits) {
+  MachineDescription description = Machine(true);
+  description.driver.registers = {{0x199, 0x1122334455667788}};
+  Simulation machine(description, {});
+  std::uint64_t value = 0xFFFFFFFF00000199;
+  EXPECT_EQ(CDevio().ReadMsr(value), 0U);
+  EXPECT_EQ(value, 0x1122334455667788U);
 }
 
 // ---- the driver's service

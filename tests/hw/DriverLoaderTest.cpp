@@ -44,8 +44,8 @@ class Services : public platform::ServiceManager, public platform::DriverDevices
  private:
   struct Device : DriverDevice {
     std::uint32_t Control(std::uint32_t, std::span<const std::byte>, std::span<std::byte>) override { return 0; }
-    void ReadMapped(std::uint64_t, std::span<std::byte>) override {}
-    void WriteMapped(std::uint64_t, std::span<const std::byte>) override {}
+    std::uint32_t ReadMapped(std::uint64_t, std::size_t) override { return 0; }
+    void WriteMapped(std::uint64_t, std::size_t, std::uint32_t) override {}
   };
 
   static std::string Hex(std::uint32_t value) { return CDMUtil::ToUpper(CDMUtil::ToHexString(value)); }

@@ -1,6 +1,7 @@
 // The two readers of the firmware's structure table, and the system id that comes out of it.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <cstdlib>
 #include <random>
@@ -207,14 +208,22 @@ class Memory {
 
 TEST(SmbiosScanner, WalksTheTableBehindTheEntryPoint) {
   const Bytes board = BaseBoard({"M", "2A78 Board", "S"});
-  Bytes controller(12, 0);
-  controller[10] = 2;  // slots
-  controller.insert(controller.end(), 4, 0x11);
-  const Bytes withoutStrings = Structure(5, controller, {});
-  Bytes withString = Structure(5, controller, {"ab"});
+  // A memory controller's length is by its slots, whatever its header says; two zero bytes behind it are its own.
+  const auto controller = [](std::uint8_t slots, std::size_t zeroes) {
+    Bytes bytes(16 + std::size_t{2} * slots + zeroes, 0x11);
+    bytes[0] = 5;
+    bytes[1] = 8;
+    bytes[14] = slots;
+    std::fill(bytes.end() - static_cast<std::ptrdiff_t>(zeroes), bytes.end(), std::uint8_t{0});
+    return bytes;
+  };
   EXPECT_EQ(Memory(board, 1).Product(), "2A78 Board");
   EXPECT_EQ(Memory(board, 1, 0x0402, 0xFFE0).Product(), "2A78 Board");
-  EXPECT_EQ(Memory(Joined({withoutStrings, board}), 2).Product(), "2A78 Board");
+  for (const std::uint8_t slots : std::initializer_list<std::uint8_t>{0, 2, 200}) {
+    EXPECT_EQ(Memory(Joined({controller(slots, 0), board}), 2).Product(), "2A78 Board") << unsigned{slots};
+    EXPECT_EQ(Memory(Joined({controller(slots, 2), board}), 2).Product(), "2A78 Board") << unsigned{slots};
+  }
+  EXPECT_EQ(Memory(Joined({controller(2, 3), board}), 2).Product(), "none");  // one zero too many
   EXPECT_EQ(Memory(Joined({Structure(1, {1}, {"x", "y"}), board}), 2).Product(), "2A78 Board");
   EXPECT_EQ(Memory(Joined({Structure(1, {1}, {}), board}), 1).Product(), "none");  // not among those counted
   EXPECT_EQ(Memory(Joined({Structure(1, {1}, {}), board}), 0x0102, 0x0102).Product(), "2A78 Board");

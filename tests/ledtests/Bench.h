@@ -238,6 +238,7 @@ class Bench {
   }
   // A new installation, which is the current folder.
   static sim::SimulationOptions EnterFolder(const std::string& person, std::uint64_t seed) {
+    fs::current_path(fs::temp_directory_path());  // out of the folder of the bench before
     fs::remove_all(FolderPath());
     fs::copy(fs::path(PANELGLOW_SOURCE_DIR) / "installation", FolderPath(), fs::copy_options::recursive);
     fs::current_path(FolderPath());

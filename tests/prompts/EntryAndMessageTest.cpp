@@ -2,6 +2,7 @@
 #include <gmock/gmock.h>
 
 #include "prompts/Desk.h"
+#include "prompts/DiagnosticWindow.h"
 #include "prompts/MessageWindow.h"
 #include "prompts/PromptWindow.h"
 #include "prompts/TextWindow.h"
@@ -138,7 +139,7 @@ TEST(TextWindow, WipesWhatIsNotGoneOnWithInTime) {
   EXPECT_EQ(entered, "fast");
 }
 
-TEST(TextWindow, TakesAtMost256CharactersInTheSystemsCodePage) {
+TEST(TextWindow, TakesAtMost255CharactersInTheSystemsCodePage) {
   Desk desk;
   desk.At(100, [&] {
     desk.windows.Key(0x41, u'ä', false);
@@ -149,7 +150,7 @@ TEST(TextWindow, TakesAtMost256CharactersInTheSystemsCodePage) {
   PressEnterAt(desk, 1000);
   std::string entered;
   EXPECT_EQ(ShowTextWindow(u"text", u"title", entered, 5000), prompt_result::kNone);
-  EXPECT_EQ(entered, "\xE4" + std::string(255, '?'));
+  EXPECT_EQ(entered, "\xE4" + std::string(254, '?'));
 }
 
 TEST(TextWindow, GivesTheFocusToItsFieldAndLeavesTheLineAloneWhenTheThreadIsToQuit) {
@@ -180,6 +181,27 @@ TEST(EachWindow, EndsAtOnceWhereNoWindowCanBeHad) {
     EXPECT_THAT(desk.sim.Output(), HasSubstr("LogMessage 8 20000 \"A prompt cannot be shown"));
     EXPECT_EQ(desk.Top(), 0U);
     EXPECT_FALSE(desk.sim.IsMutexOwned(kPromptLock));
+  }
+  EXPECT_EQ(entered, "before");
+}
+
+TEST(EachWindow, EndsWithoutAnAnswerWhenTheDisplayGoesAway) {
+  std::string entered = "before";
+  const std::pair<std::function<int()>, int> kCases[] = {
+      {[] { return ShowMessageWindow(u"text", u"title", 0, nullptr); }, 1},
+      {[&] { return ShowTextWindow(u"text", u"title", entered, 5000); }, prompt_result::kNone},
+      {[] { return TextPrompt(u"", u"", 0, nullptr, 0); }, prompt_result::kNone},
+      {[] { return ImagePrompt(u"", u"", kPromptTopmost, u"", nullptr, 0); }, prompt_result::kNone},
+      {[] { return DiagnosticWindow("").TextForm(u"", u"", 0); }, prompt_result::kNone},
+  };
+  for (const auto& [show, result] : kCases) {
+    Desk desk;
+    desk.At(500, [&] { desk.windows.LoseScreen(); });
+    EXPECT_EQ(show(), result);
+    EXPECT_NEAR(desk.Now_ms(), 500, 10);
+    EXPECT_FALSE(desk.sim.IsMutexOwned(kPromptLock));
+    EXPECT_EQ(show(), result);  // and the next one is not shown at all
+    EXPECT_NEAR(desk.Now_ms(), 500, 10);
   }
   EXPECT_EQ(entered, "before");
 }

@@ -122,6 +122,69 @@ TEST(Prompt, KeepsCaptionsBeyondAllMeasureWithinReach) {
   }
 }
 
+// Where the count-down is painted, on the screen, with the control or window that shows it.
+struct Shown {
+  WindowHandle on;
+  platform::Rectangle place;
+};
+std::vector<Shown> CountDownsOf(Desk& desk) {
+  std::vector<Shown> found;
+  for (const platform::desktop::SceneWindow& window : desk.windows.MakeScene().windows) {
+    for (const platform::desktop::DrawOperation& operation : window.operations) {
+      const auto* text = std::get_if<platform::desktop::TextOperation>(&operation);
+      if (text != nullptr && text->text == u"59") {
+        const platform::Rectangle size = desk.windows.MeasureText(text->text, 1000, text->font);
+        const int left = window.client.left + text->area.left;
+        const int top = window.client.top + text->area.top;
+        found.push_back({window.handle, {left, top, left + size.Width(), top + size.Height()}});
+      }
+    }
+  }
+  return found;
+}
+
+TEST(Prompt, NoButtonHidesAnyPartOfTheCountDown) {
+  const TemporaryFile picture("counted.pgm", HalfBlack(600, 200));
+  const TemporaryFile wide("counted-wide.pgm", HalfBlack(900, 200));
+  for (const char* locale : {"en_US", "ja_JP"}) {
+    for (const std::string& image : {std::string(), picture.Path(), wide.Path()}) {
+      for (unsigned style = 0; style <= 5; ++style) {
+        for (const bool isLong : {false, true}) {
+          SCOPED_TRACE(std::string(locale) + " " + std::to_string(style) + " " + image + (isLong ? " long" : ""));
+          Desk desk;
+          desk.locale = locale;
+          CDMWindow::SetServices({[&](int, const wstring& text) { return isLong ? text + wstring(30, u'W') : text; },
+                                  [&] { return desk.locale; },
+                                  {}});
+          ThePromptState().timeoutSeconds = 60;
+          desk.At(1500, [&] {
+            const std::vector<Shown> shown = CountDownsOf(desk);
+            ASSERT_FALSE(shown.empty());
+            EXPECT_EQ(shown.front().on, desk.Top());
+            const platform::Rectangle number = shown.front().place;
+            for (const WindowHandle child : desk.windows.Children(desk.Top())) {
+              const platform::Rectangle area = desk.windows.ScreenRectangle(child);
+              const bool touches = desk.windows.IsWindowVisible(child) && area.left < number.right &&
+                                   number.left < area.right && area.top < number.bottom && number.top < area.bottom;
+              const auto own =
+                  std::find_if(shown.begin(), shown.end(), [&](const Shown& one) { return one.on == child; });
+              EXPECT_EQ(touches, own != shown.end());
+              if (touches && desk.windows.ControlId(child) > 1000) {  // a button: it shows the whole of it
+                EXPECT_EQ(own->place, number);
+                EXPECT_LE(area.left, number.left);
+                EXPECT_GE(area.right, number.right);
+                EXPECT_TRUE(isLong || style == 2 || style == 3);  // elsewhere there is room beside the buttons
+              }
+            }
+          });
+          desk.PostAt(1600, platform::message::kCommand, 1005);
+          ImagePrompt(u"text", u"title", style | kPromptTopmost, platform::WideFromUtf8(image), nullptr, 0);
+        }
+      }
+    }
+  }
+}
+
 TEST(ImagePrompt, NamesAFileThatIsNoPicture) {
   const std::string picture = HalfBlack(400, 300);
   const TemporaryFile empty("empty.png", "");

@@ -2,6 +2,9 @@
 #include <gdk-pixbuf/gdk-pixbuf.h>
 #include <gmock/gmock.h>
 
+#include <numeric>
+#include <set>
+
 #include "platform/posix/LazyDrawing.h"
 #include "prompts/Desk.h"
 #include "prompts/DiagnosticWindow.h"
@@ -104,6 +107,62 @@ TEST(Pixels, TheCountDownIsSeenInEveryFormWhatEverIsUnderIt) {
             : TextPrompt(u"text", u"title", 3 | kPromptTopmost, nullptr, 0);
     }
   }
+}
+
+// The ink of a text on a prompt: how dark each pixel of its field is.
+std::vector<int> InkOf(const wstring& text, const char* locale, int weight) {
+  Desk desk;
+  desk.locale = locale;
+  std::vector<int> ink;
+  desk.At(100, [&] {
+    desk.windows.SetFont(desk.windows.FindControl(desk.Top(), 1000), {18, weight});
+    const Photo photo(desk);
+    for (int y = 12; y < 40; ++y) {
+      for (int x = 12; x < 140; ++x) {
+        ink.push_back(255 - static_cast<int>(photo.At(kLeft + x, kTop + y) & 0xFFU));
+      }
+    }
+  });
+  desk.ClickAt(200, 1005);
+  TextPrompt(text, u"title", 0, nullptr, 0);
+  return ink;
+}
+
+TEST(Pixels, ChineseJapaneseAndKoreanAreBoldAndHaveTheFormsOfTheirLanguage) {
+  const wstring kSame = u"\u9AA8\u76F4\u6D77";  // one code each, and another shape in each language
+  std::set<std::vector<int>> shapes;
+  for (const auto& [locale, text] : {std::pair<const char*, wstring>{"zh_CN", u"电源灯"},
+                                     {"zh_TW", u"電源燈"},
+                                     {"ja_JP", u"電源ランプ"},
+                                     {"ko_KR", u"전원 표시등"}}) {
+    const std::vector<int> bold = InkOf(text, locale, 600);
+    const std::vector<int> normal = InkOf(text, locale, 400);
+    EXPECT_GT(std::accumulate(bold.begin(), bold.end(), 0),
+              std::accumulate(normal.begin(), normal.end(), 0) * 11 / 10)
+        << locale;
+    shapes.insert(InkOf(kSame, locale, 600));
+  }
+  EXPECT_EQ(shapes.size(), 4U);
+}
+
+TEST(Pixels, ALoneSurrogateSpoilsOnlyItself) {
+  const std::vector<int> whole = InkOf(u"Text \xFFFD and more", "en_US", 600);
+  EXPECT_EQ(InkOf(u"Text \xD83D and more", "en_US", 600), whole);
+  EXPECT_EQ(InkOf(u"Text \xDE00 and more", "en_US", 600), whole);
+}
+
+TEST(Pixels, OnlyTheFocusedButtonHasTheHeavyFrame) {
+  Desk desk;
+  const auto frames = [&] {
+    const Photo photo(desk);
+    const auto isHeavy = [&](int y) { return photo.At(kLeft + 365 + 20, kTop + y) == 0; };
+    return std::pair(isHeavy(10), isHeavy(40));
+  };
+  desk.At(100, [&] { EXPECT_EQ(frames(), std::pair(true, false)); });
+  desk.At(200, [&] { desk.windows.Key(0x09, 0, false); });  // Tab
+  desk.At(300, [&] { EXPECT_EQ(frames(), std::pair(false, true)); });
+  desk.ClickAt(400, 1004);
+  TextPrompt(u"text", u"title", 4, nullptr, 0);
 }
 
 TEST(Pixels, AConfiguredColorFillsWindowTextsAndButtonsAndLeavesTextsReadable) {

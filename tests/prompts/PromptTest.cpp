@@ -89,6 +89,36 @@ TEST(Prompt, RunsItsWorkerAgainUntilThatIsDone) {
   EXPECT_EQ(runs, 6);  // without ticks nothing starts it
 }
 
+TEST(Prompt, AsksAgainForAThreadOfItsWorkerThatDoesNotStart) {
+  Desk desk;
+  desk.sim.RefuseThreads(3);
+  const AutoWorker worker = [](std::atomic<bool>& done) { done = true; };
+  EXPECT_EQ(ImagePrompt(u"", u"", kPromptTopmost, u"", worker, prompt_result::kRetry), prompt_result::kRetry);
+  EXPECT_NEAR(desk.Now_ms(), 50, 10);
+}
+
+TEST(Prompt, LeavesNothingOfItsInputToTheNextOne) {
+  Desk desk;
+  desk.At(100, [&] { desk.windows.KeyDown(0x0D, u'\r', false, false); });  // ends the first one
+  desk.At(200, [&] {
+    EXPECT_EQ(desk.windows.WindowText(desk.Top()), u"second");
+    EXPECT_EQ(desk.windows.TopLevelWindows().size(), 1U);
+    EXPECT_EQ(desk.windows.ForegroundWindow(), desk.Top());
+    EXPECT_EQ(desk.windows.ControlId(desk.windows.Focus()), 1006);
+    EXPECT_TRUE(desk.sim.IsMutexOwned(kPromptLock));
+    desk.windows.KeyUp(0x0D, false);
+    desk.windows.KeyDown(0x20, u' ', false, true);  // a Space that has been held since before
+    desk.windows.KeyUp(0x20, false);
+    const platform::Rectangle place = desk.windows.ScreenRectangle(desk.windows.FindControl(desk.Top(), 1006));
+    desk.windows.MouseButton(place.left + 5, place.top + 5, false);  // a button that went down on the first one
+  });
+  desk.ClickAt(300, 1002);
+  EXPECT_EQ(TextPrompt(u"text", u"first", 4, nullptr, 0), prompt_result::kYes);
+  EXPECT_EQ(ImagePrompt(u"text", u"second", 5, u"", nullptr, 0), prompt_result::kCancel);
+  EXPECT_NEAR(desk.Now_ms(), 310, 20);
+  EXPECT_FALSE(desk.sim.IsMutexOwned(kPromptLock));
+}
+
 TEST(Prompt, OnceOneWasTopmostAllAre) {
   Desk desk;
   desk.At(50, [&] {
@@ -113,6 +143,9 @@ TEST(Prompt, KeepsTheForegroundExceptAgainstAWindowOfItsOwnTitle) {
       EXPECT_EQ(desk.windows.TopLevelWindows().size(), 2U);
       EXPECT_EQ(desk.windows.ForegroundWindow() == own, wstring(title) != u"title");
     });
+    // A window that is not ours, as the display tells of it, when the first one is gone.
+    desk.At(1600, [&] { desk.windows.LoseForeground(title); });
+    desk.At(1700, [&] { EXPECT_EQ(desk.windows.ForegroundWindow() == own, wstring(title) != u"title"); });
     desk.ClickAt(2000, 1005);
     EXPECT_EQ(Text(kPromptTopmost), prompt_result::kOk);
   }

@@ -148,6 +148,25 @@ TEST(SystemBadInput, NoMessageTextCanBreakARun) {
   }
 }
 
+// Standard output on a full disk, and a reader that has gone: the run reaches its end, and does not count as a pass.
+TEST(SystemBadInput, OutputThatNobodyGetsIsNoPass) {
+  const fs::path program = fs::path(PANELGLOW_BINARY_DIR) / "panelglow-diags-sim";
+  for (const auto& [redirection, reason] :
+       {std::pair{">/dev/full", "No space left on device"}, {"| true", "Broken pipe"}}) {
+    const Installation installation;
+    const std::string machine = installation.Machine("desktop.toml");
+    installation.Write("run.sh", "{ " + program.string() +
+                                     " -subtest=CustomLEDTest -SectionID=Desktop -DataCollectionFile=log.xml; "
+                                     "echo $? >code; } " +
+                                     redirection + "\nexit \"$(cat code)\"\n");
+    const Outcome outcome = RunProgram("/bin/sh", {"run.sh"}, installation.Path(""),
+                                       {{"PANELGLOW_SIM_MACHINE", machine}, {"PANELGLOW_SIM_OPERATOR", "perfect"}});
+    EXPECT_EQ(outcome.exitCode, 1) << redirection;
+    EXPECT_THAT(outcome.errors, HasSubstr("Standard output did not take all lines (" + std::string(reason) + ")"));
+    EXPECT_THAT(installation.Read("log.xml"), HasSubstr("status=\"1\""));
+  }
+}
+
 TEST(SystemBadInput, ADataCollectionPathThatCannotBeWrittenLeavesTheVerdictAlone) {
   for (const auto& [path, machineText] :
        {std::pair{"folder", ""}, {"log.xml", "\n[[event]]\nat_ms = 3000\nfill_disk = true\n"}, {"   ", ""}}) {

@@ -61,15 +61,6 @@ TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {
   EXPECT_GT(installation.Read("pictures/01-prompt.png").size(), 2000U);
 }
 
-TEST(SystemController, NothingTestedIsNeverAPass) {
-  const Installation installation;
-  const Outcome outcome =
-      Controller(installation, {"--machine", installation.Machine("desktop.toml"), "--", "-subtest=LEDTest"});
-  EXPECT_EQ(outcome.exitCode, 1);
-  EXPECT_THAT(outcome.output, HasSubstr("nothing was tested"));
-  EXPECT_THAT(outcome.output, Not(HasSubstr("PASSED")));
-}
-
 TEST(SystemController, TheProductWithoutItsDriverSaysSoWhateverTheEnvironmentHolds) {
   const Installation installation;
   const Outcome outcome = RunProgram(

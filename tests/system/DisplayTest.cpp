@@ -62,6 +62,86 @@ TEST(SystemDisplay, APersonTakesTheTestWithMouseAndKeyboard) {
   EXPECT_TRUE(outcome.IsOrderly());
 }
 
+// The X server dies while something stands on it. Nobody answers any more: the run fails, ends as any other, and
+// leaves the LEDs as it found them.
+TEST(SystemDisplay, WhenTheDisplayDiesTheRunEndsWithItsCodeAndTheLedsAsFound) {
+  constexpr unsigned long kDarkGreen = 0x103818;
+  constexpr int kLedX = 47;
+  constexpr int kPowerY = 81;
+  constexpr int kNumLockY = 183;
+  enum class Moment { kPrompt, kBoardBlink, kKeyBlink, kAfterAnAnswer };
+  for (const Moment moment : {Moment::kPrompt, Moment::kBoardBlink, Moment::kKeyBlink, Moment::kAfterAnAnswer}) {
+    SCOPED_TRACE(static_cast<int>(moment));
+    VirtualDisplay display;
+    ASSERT_TRUE(display.IsOpen()) << "Xvfb does not start";
+    const Installation installation;
+    const bool isBoard = moment == Moment::kBoardBlink;
+    installation.Write("ui.xml", std::string("<UI><Section ID=\"Default\"><Button ID=\"") +
+                                     (isBoard ? "PowerGreen" : "NumLock") + "\"/></Section></UI>");
+    SimulatedRun program{installation.Machine("desktop.toml"), "", 1, {}, {"-subtest=CustomLEDTest", "-Retries=0"}};
+    program.arguments.emplace_back("-OperatorCheating=false");
+    if (moment == Moment::kAfterAnAnswer) {
+      installation.Write("ui.xml", kTwoKeys);
+    }
+    program.environment = {
+        {"DISPLAY", display.Name()}, {"PANELGLOW_SIM_WINDOW", "1"}, {"PANELGLOW_SIM_REAL_TIME", "1"}};
+    Outcome outcome;
+    std::thread run([&] { outcome = program.In(installation); });
+    EXPECT_TRUE(display.AwaitPixel(640, 600, kPromptGray, 20s));
+    if (moment != Moment::kPrompt) {
+      display.Do("key Return");
+      EXPECT_TRUE(display.AwaitPixel(640, 500, kDialogGray, 20s));
+    }
+    if (isBoard) {
+      EXPECT_TRUE(display.AwaitPixel(kLedX, kPowerY, kDarkGreen, 20s));
+    } else if (moment == Moment::kKeyBlink) {
+      EXPECT_TRUE(display.AwaitPixel(kLedX, kNumLockY, kLitGreen, 20s));
+    } else if (moment == Moment::kAfterAnAnswer) {
+      const auto blinks = [&](int y) { return display.PixelAt(kLedX, y) == kLitGreen; };
+      constexpr int kCapsLockY = 217;
+      const auto end = std::chrono::steady_clock::now() + 20s;
+      while (!blinks(kNumLockY) && !blinks(kCapsLockY) && std::chrono::steady_clock::now() < end) {
+        std::this_thread::sleep_for(5ms);
+      }
+      const bool numLock = blinks(kNumLockY);
+      display.Click(335 + (numLock ? 58 : 260) + 65, 211 + 150 + 15);
+      EXPECT_TRUE(display.AwaitPixel(kLedX, numLock ? kCapsLockY : kNumLockY, kLitGreen, 20s));
+    }
+    display.Kill();
+    run.join();
+    EXPECT_EQ(outcome.exitCode, 1) << outcome.output << outcome.errors;
+    EXPECT_TRUE(outcome.IsOrderly()) << outcome.output;
+    EXPECT_THAT(outcome.Tagged("ReportFailure"), ::testing::ElementsAre("ReportFailure 990640"));
+    EXPECT_TRUE(outcome.LeftChanged().empty());
+    EXPECT_TRUE(outcome.leftBehind.empty());
+    const std::size_t told = outcome.errors.find("the display is gone");
+    EXPECT_NE(told, std::string::npos);
+    EXPECT_EQ(outcome.errors.find("the display is gone", told + 1), std::string::npos);
+  }
+}
+
+TEST(SystemDisplay, ADisplaySmallerThanTheMachinesScreenShowsEveryButton) {
+  const VirtualDisplay display("800x480");
+  ASSERT_TRUE(display.IsOpen()) << "Xvfb does not start";
+  const Installation installation;
+  installation.Write("ui.xml", kTwoKeys);
+  Outcome outcome;
+  std::thread run([&] {
+    outcome = RunProgram("panelglow-sim",
+                         {"--machine", installation.Machine("desktop.toml"), "--window", "--raw", "--",
+                          "-subtest=CustomLEDTest", "-Retries=0", "-LEDTimeout=60"},
+                         installation.Path(""), {{"DISPLAY", display.Name()}});
+  });
+  constexpr double kScale = 480 / 1024.0;
+  const auto on = [&](int pixel) { return static_cast<int>(pixel * kScale); };
+  EXPECT_TRUE(display.AwaitPixel(on(640), on(600), kPromptGray, 20s));
+  display.Click(on(640), on(362 + 4 + 267 + 12));  // OK
+  EXPECT_TRUE(display.AwaitPixel(on(640), on(500), kDialogGray, 20s));
+  display.Click(on(335 + 430), on(211 + 559));  // cancel, the lowest button
+  run.join();
+  EXPECT_THAT(outcome.output, HasSubstr("ReportFailure 990354"));
+}
+
 TEST(SystemDisplay, WithoutADisplayTheCallIsRefusedAtOnce) {
   const Installation installation;
   for (const char* name : {"", ":4711"}) {

@@ -2,6 +2,8 @@
 // or the INI files are wrong.
 #include <gmock/gmock.h>
 
+#include <sstream>
+
 #include "system/SystemRun.h"
 
 namespace panelglow::systemtest {
@@ -106,6 +108,75 @@ TEST(SystemSilicon, AWrongWordInTheIniFilesShowsOnThePanelOrInWhatIsLeftBehind) 
       EXPECT_THAT(outcome.leftBehind, Contains(HasSubstr(c.leftBehind)));
     }
   }
+}
+
+// A board that this version cannot drive is no unknown one: the ports of other boards are left alone.
+TEST(SystemSilicon, ABoardClassThatIsNotBuiltEndsTheRunBeforeAnyPortIsTouched) {
+  for (const char* words : {"platform=cbb", "MotherboardClass=Orchard"}) {
+    const Installation installation;
+    installation.Write("mbdetect.ini", std::string("[7E40]\n") + words + "\n");
+    const Outcome outcome = LedRun(installation.Machine("unknown-board.toml"), "Desktop").In(installation);
+    EXPECT_TRUE(outcome.IsOrderly());
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_THAT(outcome.errors, HasSubstr("is not built into this version, which cannot drive this machine's LEDs."));
+    EXPECT_THAT(outcome.Tagged("ReportFailure"), IsEmpty());  // no LED is blamed
+    EXPECT_THAT(outcome.leftBehind, IsEmpty());
+    EXPECT_EQ(outcome.TimesLit("power-green") + outcome.TimesLit("power-red") + outcome.TimesLit("drive-red"), 0U);
+  }
+}
+
+// Standard error is for what is odd: a machine with its sections is not, a board without them is.
+TEST(SystemSilicon, AGoodRunTellsPeopleNothing) {
+  const std::pair<const char*, const char*> kMachines[] = {
+      {"desktop.toml", "Desktop"},
+      {"notebook.toml", "Notebook"},
+      {"sio-ite.toml", "TwoColorPower"},
+      {"sio-fintek.toml", "TwoColorPower"},
+      {"sio-generic.toml", "TwoColorPower"},
+      {"ec-notebook.toml", "EcNotebook"},
+      {"ec16-notebook.toml", "EcNotebook"},
+      {"old-ec.toml", "TwoColorPower"},
+      {"mailbox-notebook.toml", "MailboxNotebook"},
+      {"codec-notebook.toml", "CodecNotebook"},
+      {"casl-notebook.toml", "FirmwareNotebook"},
+  };
+  for (const auto& [file, section] : kMachines) {
+    const Installation installation;
+    const Outcome outcome = LedRun(installation.Machine(file), section).In(installation);
+    EXPECT_EQ(outcome.exitCode, 0) << file;
+    EXPECT_EQ(outcome.errors, "") << file;
+  }
+  const Installation installation;
+  const Outcome unknown = LedRun(installation.Machine("unknown-board.toml"), "Desktop").In(installation);
+  EXPECT_EQ(
+      unknown.errors,
+      "panelglow-diags: This machine's board is not known: its system id is \"7E40\", and section [7E40] is not "
+      "in .\\mbdetect.ini and .\\mbtest.ini; without \"platform\" or \"chips\" there, the ports of the oldest "
+      "desktops are used for its LEDs.\n");
+}
+
+// A command of the docs, typed from the folder that the docs name.
+TEST(SystemSilicon, TheCommandOfTheDocsPasses) {
+  const std::string docs = Golden("../../docs/writing-a-platform.md");
+  const std::string program = "../build/release/bin/panelglow-sim ";
+  const std::size_t at = docs.find(program);
+  ASSERT_NE(at, std::string::npos);
+  std::string command = docs.substr(at + program.size(), docs.find("\n\n", at) - at - program.size());
+  for (const auto& [typed, here] : {std::pair{"\\\n", ""},
+                                    {"--trace /tmp/trace.txt ", ""},
+                                    {"../machines/", PANELGLOW_SOURCE_DIR "/machines/"}}) {
+    const std::size_t place = command.find(typed);
+    ASSERT_NE(place, std::string::npos) << typed;
+    command.replace(place, std::string(typed).size(), here);
+  }
+  std::vector<std::string> arguments;
+  std::istringstream words(command);
+  for (std::string word; words >> word;) {
+    arguments.push_back(word);
+  }
+  const Installation installation;
+  const Outcome outcome = RunProgram("panelglow-sim", arguments, installation.Path(""), {});
+  EXPECT_EQ(outcome.exitCode, 0) << outcome.output << outcome.errors;
 }
 
 }  // namespace

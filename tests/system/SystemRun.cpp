@@ -158,12 +158,13 @@ Outcome SimulatedRun::In(const Installation& installation) const {
   const std::string allFaults =
       std::accumulate(faults.begin(), faults.end(), std::string(),
                       [](const std::string& all, const std::string& fault) { return all + fault + ";"; });
-  Outcome outcome = RunProgram("panelglow-diags-sim", arguments, installation.Path(""),
-                               {{"PANELGLOW_SIM_MACHINE", machine},
-                                {"PANELGLOW_SIM_OPERATOR", person},
-                                {"PANELGLOW_SIM_SEED", std::to_string(seed)},
-                                {"PANELGLOW_SIM_FAULTS", allFaults},
-                                {"PANELGLOW_SIM_REPORT", report.string()}});
+  std::map<std::string, std::string> variables{{"PANELGLOW_SIM_MACHINE", machine},
+                                               {"PANELGLOW_SIM_OPERATOR", person},
+                                               {"PANELGLOW_SIM_SEED", std::to_string(seed)},
+                                               {"PANELGLOW_SIM_FAULTS", allFaults},
+                                               {"PANELGLOW_SIM_REPORT", report.string()}};
+  variables.insert(environment.begin(), environment.end());
+  Outcome outcome = RunProgram("panelglow-diags-sim", arguments, installation.Path(""), variables);
   ReadReport(report, outcome);
   return outcome;
 }

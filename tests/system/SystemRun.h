@@ -60,6 +60,7 @@ struct SimulatedRun {
   unsigned seed = 1;
   std::vector<std::string> faults;  // "LED=KIND"
   std::vector<std::string> arguments;
+  std::map<std::string, std::string> environment = {};
 
   [[nodiscard]] Outcome In(const Installation& installation) const;
 

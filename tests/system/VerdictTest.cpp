@@ -182,7 +182,7 @@ TEST(SystemVerdict, TheStatusIndicatorBlinksUntilItsTimeIsUpOrItIsStoppedAndPuts
     EXPECT_TRUE(outcome.IsOrderly());
     EXPECT_NEAR(static_cast<double>(outcome.TimesLit(c.led)), static_cast<double>(c.blinks), 2);
     const bool changes = std::any_of(outcome.edges.begin(), outcome.edges.end(),
-                                    [&](const Edge& edge) { return edge.time_us > 0 && edge.led == c.led; });
+                                     [&](const Edge& edge) { return edge.time_us > 0 && edge.led == c.led; });
     EXPECT_EQ(changes, c.blinks != 0);  // a type without a power colour leaves the lamp as it is, and is told
     EXPECT_EQ(outcome.errors.find("names neither") != std::string::npos, c.blinks == 0) << outcome.errors;
     EXPECT_EQ(PercentagesOf(outcome), " 1 100");

@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 
+#include "board/base/Setting.h"
 #include "config/IniFile.h"
 
 namespace panelglow {
@@ -31,7 +32,7 @@ class IniReader {
   virtual ~IniReader() = default;
 
   /// Typed reads of the layered files: status kFound gives the value, kUndefined an empty text or 0, kNotFound the
-  /// default. Numbers are decimal, or hexadecimal behind "0x"; any other text is 0.
+  /// default. Numbers are decimal, or hexadecimal behind "0x"; any other text is 0, and people are told of it.
   std::string ReadIniValue(const std::string& key, status_t& status, const std::string& defaultValue);
   int ReadIniInt(const std::string& key, status_t& status, int defaultValue);
   unsigned int ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue);
@@ -39,7 +40,21 @@ class IniReader {
   /// Typed reads of a chip section; "chip.<section>.<key>" in the layered files comes first.
   std::string ReadChipValue(const std::string& chipSection, const std::string& key, status_t& status,
                             const std::string& defaultValue);
-  int ReadChipInt(const std::string& chipSection, const std::string& key, status_t& status, int defaultValue);
+  /// People are told of a number that does not fit into `bits`, which is what the caller keeps of it.
+  int ReadChipInt(const std::string& chipSection, const std::string& key, status_t& status, int defaultValue,
+                  unsigned bits = 32);
+
+  /// A text with its place.
+  Setting ReadIniSetting(const std::string& key, const std::string& defaultValue);
+  Setting ReadChipSetting(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
+
+  /// For people: which of the layered files have a section of this system, in words.
+  [[nodiscard]] std::string DescribeSections();
+
+  /// The keys of a chip section with this beginning that were looked up and have no value, by commas.
+  [[nodiscard]] std::string MissingKeys(const std::string& chipSection, const std::string& beginning);
+
+  [[nodiscard]] bool HasChipSection(const std::string& chipSection);
 
   /// Writes the record of all look-ups to standard output.
   void DumpLookups();
@@ -60,6 +75,7 @@ class IniReader {
   struct Result {
     status_t status = kNotFound;
     std::string text;
+    std::string place;  // as Setting's
   };
 
   static Sources WithPresence(Sources from);
@@ -67,11 +83,13 @@ class IniReader {
   IniFile GetChipFile(const std::string& path);
   static Result LookUp(const Sources& from, const std::string& key);
   Result LookUpChip(const std::string& chipSection, const std::string& key);
-  static Result Judge(const std::string& raw);
+  static Result Judge(const std::string& raw, std::string place);
+  void TellOfMissingBase(const IniFile& file, const std::string& from, const std::string& path,
+                         const std::string& base) const;
   void Record(const std::string& entry, const std::string& value);
   std::string ReadText(const Result& result, const std::string& entry, const std::string& defaultValue);
   template <class Number>
-  Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue);
+  Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue, unsigned bits = 32);
 
   std::mutex guard;  // of all that follows; never held while a file is touched, which may wait
   std::optional<Sources> sources;
@@ -85,6 +103,12 @@ std::string ReadIniValue(const std::string& key, IniReader::status_t& status, co
 int ReadIniInt(const std::string& key, int defaultValue);
 unsigned int ReadIniUnsigned(const std::string& key, unsigned int defaultValue);
 std::string ReadChipValue(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
+Setting ReadChipSetting(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
 int ReadChipInt(const std::string& chipSection, const std::string& key, int defaultValue);
+
+// Numbers of 8, 16 and 32 bits without sign: the low bits of what ReadChipInt gives.
+std::uint8_t ReadChipByte(const std::string& chipSection, const std::string& key, std::uint8_t defaultValue);
+std::uint16_t ReadChipWord(const std::string& chipSection, const std::string& key, std::uint16_t defaultValue);
+std::uint32_t ReadChipDword(const std::string& chipSection, const std::string& key, std::uint32_t defaultValue);
 
 }  // namespace panelglow

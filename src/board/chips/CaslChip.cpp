@@ -3,7 +3,7 @@
 #include <algorithm>
 
 #include "board/base/IniReader.h"
-#include "board/chips/ChipNumbers.h"
+#include "board/chips/Sequence.h"
 #include "harness/base/CDMUtil.h"
 #include "hw/BiosCall.h"
 
@@ -47,26 +47,20 @@ bool IsOn(const std::vector<std::uint8_t>& record, std::uint32_t device) {
 
 }  // namespace
 
-std::uint8_t CaslChip::ReadByteKey(const std::string& section, const char* key, int defaultValue) {
-  return LowByte(static_cast<std::uint32_t>(ReadChipInt(section, key, defaultValue)));
-}
-
 void CaslChip::Initialize() {
   const std::string section = ReadIniValue("chip.casl.data", name);
-  writeCommand = ReadByteKey(section, "config.write.command", writeCommand);
-  readCommand = ReadByteKey(section, "config.read.command", readCommand);
-  methodType = ReadByteKey(section, "wireless.methodtype", methodType);
-  powerControl = ReadByteKey(section, "wireless.powercontrol", powerControl);
-  assertValue = ReadByteKey(section, "wireless.assert.command", assertValue);
-  deassertValue = ReadByteKey(section, "wireless.deassert.command", deassertValue);
-  const std::string list = ReadChipValue(section, "wireless.devices.buffer", "");
-  std::vector<std::string> tokens;
-  if (list != "undef") {
-    CDMUtil::Split(list, tokens, ", ");
-  }
+  writeCommand = ReadChipByte(section, "config.write.command", writeCommand);
+  readCommand = ReadChipByte(section, "config.read.command", readCommand);
+  methodType = ReadChipByte(section, "wireless.methodtype", methodType);
+  powerControl = ReadChipByte(section, "wireless.powercontrol", powerControl);
+  assertValue = ReadChipByte(section, "wireless.assert.command", assertValue);
+  deassertValue = ReadChipByte(section, "wireless.deassert.command", deassertValue);
+  const Setting list = ReadChipSetting(section, "wireless.devices.buffer", "");
   devices.clear();
-  for (const std::string& token : tokens) {
-    devices.push_back(static_cast<std::uint32_t>(CDMUtil::ToInt(token)));
+  for (const std::string& token : SplitList(list)) {
+    const auto device = static_cast<std::uint32_t>(CDMUtil::ToInt(token));
+    CheckNumber(token, 32, device, list);
+    devices.push_back(device);
   }
   ReadWirelessHeader();
   isSetUp = true;

@@ -41,7 +41,6 @@ class CaslChip : public Chip {
  private:
   void SetUpOnce();
   [[nodiscard]] std::vector<std::uint8_t> ReadWirelessRecord() const;
-  std::uint8_t ReadByteKey(const std::string& section, const char* key, int defaultValue);
 
   std::vector<std::uint32_t> devices;  // indexes into the wireless state record
   bool isSetUp = false;

@@ -145,7 +145,6 @@ class Chip {
   CDevio& devio;
   std::string name;
   bool manualFanMode = false;    // fans are under software control
-  bool fanStateSaved = false;    // saved fan registers are valid
   std::uint32_t lastStatus = 0;  // last value of a latched status read
 
  private:

@@ -8,60 +8,60 @@ namespace panelglow {
 
 namespace {
 
-constexpr int kFullSpeed = 255;
+constexpr std::uint8_t kFullSpeed = 255;
 constexpr std::uint32_t kMostNumberedKeys = 256;  // a list without end in a file is not walked without end
-
-std::vector<std::uint16_t> Words(const std::vector<std::uint32_t>& numbers) {
-  std::vector<std::uint16_t> words;
-  words.reserve(numbers.size());
-  for (const std::uint32_t number : numbers) {
-    words.push_back(static_cast<std::uint16_t>(number));
-  }
-  return words;
-}
 
 }  // namespace
 
 void GChip::LoadConfiguration() {
   if (section.empty()) {
-    section = ReadIniValue("chip." + name + ".data", name);
+    IniReader& reader = IniReader::Instance();
+    const Setting chosen = reader.ReadIniSetting("chip." + name + ".data", name);
+    section = chosen.text;
+    if (!chosen.place.empty() && !reader.HasChipSection(section)) {
+      TellOf(chosen, reader.GetChipIniPath() + " has no section [" + section + "]");
+    }
   }
   LoadFanConfiguration();
   LoadTemperatureConfiguration();
   LoadPowerLedConfiguration();
 }
 
-std::vector<std::uint32_t> GChip::ReadNumberedList(const std::string& countKey, const std::string& prefix,
-                                                   const std::string& suffix) const {
-  const auto count = static_cast<std::uint32_t>(ReadChipInt(section, countKey, 0));
+template <class Number>
+std::vector<Number> GChip::ReadNumberedList(const std::string& countKey, const std::string& prefix,
+                                            const std::string& suffix) const {
+  IniReader& reader = IniReader::Instance();
+  IniReader::status_t status = IniReader::kNotFound;
+  const std::uint32_t count = ReadChipDword(section, countKey, 0);
   const std::uint32_t last = count != 0 && count < kMostNumberedKeys ? count : kMostNumberedKeys;
-  std::vector<std::uint32_t> numbers;
+  std::vector<Number> numbers;
   for (std::uint32_t n = 1; n <= last; ++n) {
-    const int number = ReadChipInt(section, prefix + "." + CDMUtil::ToString(n) + "." + suffix, 0);
+    const std::string key = prefix + "." + CDMUtil::ToString(n) + "." + suffix;
+    const int number = reader.ReadChipInt(section, key, status, 0, 8 * sizeof(Number));
     if (number == 0) {
       break;
     }
-    numbers.push_back(static_cast<std::uint32_t>(number));
+    numbers.push_back(static_cast<Number>(number));
   }
   return numbers;
 }
 
 void GChip::LoadFanConfiguration() {
-  fanSaveRegs = ParseByteList(ReadChipValue(section, "fan.save.regs", ""));
-  fanRestoreSleep = static_cast<std::uint32_t>(ReadChipInt(section, "fan.restore_sleep", 0));
-  tachRegs = ReadNumberedList("fan.tachs", "fan", "tach.reg");
-  pwmRegs = Words(ReadNumberedList("fan.pwms", "fan", "pwm.reg"));
-  fullSpeedData = static_cast<std::uint8_t>(ReadChipInt(section, "fan.full_speed.data", kFullSpeed));
+  fanSaveRegs = ParseByteList(ReadChipSetting(section, "fan.save.regs", ""));
+  fanRestoreSleep = ReadChipDword(section, "fan.restore_sleep", 0);
+  tachRegs = ReadNumberedList<std::uint32_t>("fan.tachs", "fan", "tach.reg");
+  pwmRegs = ReadNumberedList<std::uint16_t>("fan.pwms", "fan", "pwm.reg");
+  fullSpeedData = ReadChipByte(section, "fan.full_speed.data", kFullSpeed);
 }
 
 void GChip::LoadTemperatureConfiguration() {
-  tempReadRegs = Words(ReadNumberedList("temp.zones", "temp", "read.reg"));
-  tempLimitRegs = Words(ReadNumberedList("temp.zones", "temp", "limit.reg"));
+  tempReadRegs = ReadNumberedList<std::uint16_t>("temp.zones", "temp", "read.reg");
+  tempLimitRegs = ReadNumberedList<std::uint16_t>("temp.zones", "temp", "limit.reg");
 }
 
 void GChip::LoadPowerLedConfiguration() {
-  powerLedLdn = static_cast<std::uint8_t>(ReadChipInt(section, "powerled.ldn", 0));
-  powerLedStateRegs = ParseByteList(ReadChipValue(section, "powerled.state.regs", ""));
+  powerLedLdn = ReadChipByte(section, "powerled.ldn", 0);
+  powerLedStateRegs = ParseByteList(ReadChipSetting(section, "powerled.state.regs", ""));
 }
 
 bool GChip::SetManualFanMode(bool on) {

@@ -39,8 +39,9 @@ class GChip : public Chip {
 
   /// The numbers of "<prefix>.1.<suffix>", "<prefix>.2.<suffix>", ... up to the first 0, or up to the number under
   /// `countKey` when that is not 0.
-  [[nodiscard]] std::vector<std::uint32_t> ReadNumberedList(const std::string& countKey, const std::string& prefix,
-                                                            const std::string& suffix) const;
+  template <class Number>
+  [[nodiscard]] std::vector<Number> ReadNumberedList(const std::string& countKey, const std::string& prefix,
+                                                     const std::string& suffix) const;
 
   std::string section;                     // chip file section; empty until loaded
   std::vector<std::uint8_t> savedFanData;  // values read by SaveFanState

@@ -4,7 +4,7 @@
 
 #include "board/base/IniReader.h"
 #include "board/base/mblib_exception.h"
-#include "harness/base/CDMUtil.h"
+#include "board/chips/Sequence.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -33,11 +33,11 @@ void Pause() { platform::TheHost().clock.Sleep(kPause_ms); }
 GCodecChip::GCodecChip() : GChip("g_codec") {
   LoadConfiguration();
   hdaBar = FindController();
-  icwReg = static_cast<std::uint16_t>(ReadChipInt(section, "codec.icw.reg", icwReg));
-  irrReg = static_cast<std::uint16_t>(ReadChipInt(section, "codec.irr.reg", irrReg));
-  icsReg = static_cast<std::uint16_t>(ReadChipInt(section, "codec.ics.reg", icsReg));
-  speakerBit = static_cast<std::uint16_t>(ReadChipInt(section, "speakerled.gpio.ldn", speakerBit));
-  microphoneBit = static_cast<std::uint16_t>(ReadChipInt(section, "microphoneled.gpio.ldn", microphoneBit));
+  icwReg = ReadChipWord(section, "codec.icw.reg", icwReg);
+  irrReg = ReadChipWord(section, "codec.irr.reg", irrReg);
+  icsReg = ReadChipWord(section, "codec.ics.reg", icsReg);
+  speakerBit = ReadChipWord(section, "speakerled.gpio.ldn", speakerBit);
+  microphoneBit = ReadChipWord(section, "microphoneled.gpio.ldn", microphoneBit);
   GCodecChip::LoadVerbLists();
 }
 
@@ -63,20 +63,15 @@ std::uint32_t GCodecChip::FindController() {
 }
 
 void GCodecChip::LoadVerbLists() {
-  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.set.sequence", ""), stateSetVerbs);
-  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.save.sequence", ""), stateSaveVerbs);
-  GCodecChip::ParseVerbList(ReadChipValue(section, "codecgpio.state.restore.sequence", ""), stateRestoreVerbs);
+  GCodecChip::ParseVerbList(ReadChipSetting(section, "codecgpio.state.set.sequence", ""), stateSetVerbs);
+  GCodecChip::ParseVerbList(ReadChipSetting(section, "codecgpio.state.save.sequence", ""), stateSaveVerbs);
+  GCodecChip::ParseVerbList(ReadChipSetting(section, "codecgpio.state.restore.sequence", ""), stateRestoreVerbs);
 }
 
-void GCodecChip::ParseVerbList(const std::string& text, std::vector<std::uint32_t>& list) {
+void GCodecChip::ParseVerbList(const Setting& setting, std::vector<std::uint32_t>& list) {
   list.clear();
-  if (text == "undef") {
-    return;
-  }
-  std::vector<std::string> tokens;
-  CDMUtil::Split(text, tokens, ", ");
-  for (const std::string& token : tokens) {
-    list.push_back(static_cast<std::uint32_t>(CDMUtil::ToUnsignedLong(token)));
+  for (const std::string& token : SplitList(setting)) {
+    list.push_back(WideNumberIn(token, setting));
   }
 }
 

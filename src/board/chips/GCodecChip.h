@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "board/base/Setting.h"
 #include "board/chips/GChip.h"
 
 namespace panelglow {
@@ -29,7 +30,7 @@ class GCodecChip : public GChip {
   virtual bool ReservedOperation86() { return false; }
 
   /// "undef" is an empty list.
-  virtual void ParseVerbList(const std::string& text, std::vector<std::uint32_t>& list);
+  virtual void ParseVerbList(const Setting& setting, std::vector<std::uint32_t>& list);
 
   /// Sends one verb and returns the codec's response; 0 when the controller stays busy or gives none.
   virtual std::uint32_t SendVerb(std::uint32_t verb);

@@ -15,6 +15,9 @@ constexpr std::uint8_t kOutputBufferFull = 0x01;
 constexpr std::uint8_t kInputBufferFull = 0x02;
 constexpr int kMostLooks = 4095;
 
+constexpr std::uint8_t kUsualWriteCmd = 0x81;
+constexpr std::uint8_t kUsualQueryCmd = 0x84;
+
 constexpr double kTachPeriod_s = 2.7826087e-5;  // of one count of the tachometer
 constexpr double kSecondsPerMinute = 60.0;
 constexpr std::uint32_t kTachStopped = 0xFFFF;
@@ -23,38 +26,35 @@ constexpr std::uint32_t kTachStopped = 0xFFFF;
 
 void GEcChip::Initialize() {
   LoadConfiguration();
-  scPort = ReadByteKey("ec.sc.port", scPort);
-  dataPort = ReadByteKey("ec.data.port", dataPort);
-  readCmd = ReadByteKey("ec.read.cmd", readCmd);
-  writeCmd = ReadByteKey("ec.write.cmd", writeCmd);
-  queryCmd = ReadByteKey("ec.query.cmd", queryCmd);
-  ibfSleep = static_cast<std::uint32_t>(ReadChipInt(section, "ec.ibf.sleeptime", 0));
-  obfSleep = static_cast<std::uint32_t>(ReadChipInt(section, "ec.obf.sleeptime", 0));
+  scPort = ReadChipByte(section, "ec.sc.port", scPort);
+  dataPort = ReadChipByte(section, "ec.data.port", dataPort);
+  readCmd = ReadChipByte(section, "ec.read.cmd", readCmd);
+  // Not sent by this class; read so that the record of look-ups is whole.
+  ReadChipByte(section, "ec.write.cmd", kUsualWriteCmd);
+  ReadChipByte(section, "ec.query.cmd", kUsualQueryCmd);
+  ibfSleep = ReadChipDword(section, "ec.ibf.sleeptime", 0);
+  obfSleep = ReadChipDword(section, "ec.obf.sleeptime", 0);
   IniReader::status_t status = IniReader::kNotFound;
-  const int command = IniReader::Instance().ReadChipInt(section, "ec.set_pwm.cmd", status, 0);
+  const int command = IniReader::Instance().ReadChipInt(section, "ec.set_pwm.cmd", status, 0, 8);
   if (status != IniReader::kFound) {
     throw mblib_exception("chip.ini missing mandatory entry for EC: ec.set_pwm.cmd");
   }
   setPwmCmd = LowByte(static_cast<std::uint32_t>(command));
-  ParseSequence(ReadChipValue(section, "fan.manual_mode.set.sequence", ""), manualSetSequence);
-  ParseSequence(ReadChipValue(section, "fan.manual_mode.reset.sequence", ""), manualResetSequence);
+  ParseSequence(ReadChipSetting(section, "fan.manual_mode.set.sequence", ""), manualSetSequence);
+  ParseSequence(ReadChipSetting(section, "fan.manual_mode.reset.sequence", ""), manualResetSequence);
   LoadLedSequences();
 }
 
-std::uint8_t GEcChip::ReadByteKey(const char* key, std::uint8_t defaultValue) {
-  return LowByte(static_cast<std::uint32_t>(ReadChipInt(section, key, defaultValue)));
-}
-
 void GEcChip::LoadLedSequences() {
-  ParseSequence(ReadChipValue(section, "powerled.red.assert.sequence", ""), powerRedAssert);
-  ParseSequence(ReadChipValue(section, "powerled.green.assert.sequence", ""), powerGreenAssert);
-  ParseSequence(ReadChipValue(section, "powerled.deassert.sequence", ""), powerDeassert);
-  ParseSequence(ReadChipValue(section, "powerled.state.save.sequence", ""), powerSave);
-  ParseSequence(ReadChipValue(section, "powerled.state.restore.sequence", ""), powerRestore);
+  ParseSequence(ReadChipSetting(section, "powerled.red.assert.sequence", ""), powerRedAssert);
+  ParseSequence(ReadChipSetting(section, "powerled.green.assert.sequence", ""), powerGreenAssert);
+  ParseSequence(ReadChipSetting(section, "powerled.deassert.sequence", ""), powerDeassert);
+  ParseSequence(ReadChipSetting(section, "powerled.state.save.sequence", ""), powerSave);
+  ParseSequence(ReadChipSetting(section, "powerled.state.restore.sequence", ""), powerRestore);
 }
 
-bool GEcChip::ParseSequence(const std::string& text, Sequence& sequence) {
-  return panelglow::ParseSequence(text, sequence);
+bool GEcChip::ParseSequence(const Setting& setting, Sequence& sequence) {
+  return panelglow::ParseSequence(setting, sequence, 8);  // a command is a byte
 }
 
 // ---- the part's protocol

@@ -44,7 +44,7 @@ class GEcChip : public GChip {
   virtual bool ReservedOperation88() { return false; }
   virtual void WaitIbfClear();
   virtual void WaitObfSet();
-  virtual bool ParseSequence(const std::string& text, Sequence& sequence);
+  virtual bool ParseSequence(const Setting& setting, Sequence& sequence);
 
   /// True at once for an empty sequence.
   virtual bool RunSequence(const Sequence& sequence);
@@ -59,13 +59,10 @@ class GEcChip : public GChip {
  private:
   void SendCommand(std::uint8_t command);
   void SendData(std::uint8_t data);
-  std::uint8_t ReadByteKey(const char* key, std::uint8_t defaultValue);
 
   std::uint8_t scPort = 0x66;  // status and command
   std::uint8_t dataPort = 0x62;
   std::uint8_t readCmd = 0x80;
-  std::uint8_t writeCmd = 0x81;  // kept for chips that need it, as the query command
-  std::uint8_t queryCmd = 0x84;
   std::uint32_t ibfSleep = 0;  // ms, before each wait for the input buffer
   std::uint32_t obfSleep = 0;  // ms, before each wait for the output buffer
   std::uint8_t setPwmCmd = 0;

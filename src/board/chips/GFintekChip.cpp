@@ -5,7 +5,6 @@
 #include "board/base/IniReader.h"
 #include "board/chips/ChipNumbers.h"
 #include "board/chips/Sequence.h"
-#include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -34,28 +33,16 @@ constexpr std::array<GpioGroup, 5> kGpioGroups{
 
 void GFintekChip::Initialize() {
   GSioChip::Initialize();
-  ParsePairList(ReadChipValue(section, "fan.manual_mode.set.sequence", ""), manualModeSet);
+  ParsePairList(ReadChipSetting(section, "fan.manual_mode.set.sequence", ""), manualModeSet);
   LoadBlinkLists();
 }
 
 void GFintekChip::LoadBlinkLists() {
-  ParsePairList(ReadChipValue(section, "powerled.red.blink.sequence", ""), redBlink);
-  ParsePairList(ReadChipValue(section, "powerled.green.blink.sequence", ""), greenBlink);
+  ParsePairList(ReadChipSetting(section, "powerled.red.blink.sequence", ""), redBlink);
+  ParsePairList(ReadChipSetting(section, "powerled.green.blink.sequence", ""), greenBlink);
 }
 
-void GFintekChip::ParsePairList(const std::string& text, PairList& list) {
-  list.clear();
-  if (text == "undef") {
-    return;
-  }
-  std::vector<std::string> entries;
-  CDMUtil::Split(text, entries, ", ");
-  for (const std::string& entry : entries) {
-    const std::vector<std::string> tokens = SplitEntry(entry);
-    list.emplace_back(LowByte(static_cast<std::uint32_t>(CDMUtil::ToInt(tokens[0]))),
-                      LowByte(static_cast<std::uint32_t>(CDMUtil::ToInt(tokens[1]))));
-  }
-}
+void GFintekChip::ParsePairList(const Setting& setting, PairList& list) { list = ParsePairs<std::uint8_t>(setting); }
 
 bool GFintekChip::RunPairList(const PairList& list) {
   for (const auto& [reg, value] : list) {

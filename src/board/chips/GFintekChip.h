@@ -7,6 +7,7 @@
 #include <utility>
 #include <vector>
 
+#include "board/base/Setting.h"
 #include "board/chips/GSioChip.h"
 
 namespace panelglow {
@@ -35,7 +36,7 @@ class GFintekChip : public GSioChip {
   virtual bool MapGpioLine(int line, std::uint8_t& reg, std::uint8_t& mask);
 
   /// "register:value,..."; "undef" is an empty list. Throws mblib_exception for an entry of another form.
-  virtual void ParsePairList(const std::string& text, PairList& list);
+  virtual void ParsePairList(const Setting& setting, PairList& list);
 
   /// Writes environment registers in order.
   virtual bool RunPairList(const PairList& list);

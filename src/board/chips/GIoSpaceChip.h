@@ -8,7 +8,7 @@ namespace panelglow {
 
 class GIoSpaceChip : public MaskedLedChip {
  public:
-  GIoSpaceChip() : MaskedLedChip("g_iospace") {}
+  GIoSpaceChip() : MaskedLedChip("g_iospace", 16) {}
 
  protected:
   void SetEntry(std::uint32_t address, std::uint8_t mask) override;

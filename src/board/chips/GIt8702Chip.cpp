@@ -21,9 +21,7 @@ constexpr std::uint8_t kStopped = 0xFE;
 
 void GIt8702Chip::Initialize() {
   GIteChip::Initialize();
-  const auto readRegister = [this](const char* key) {
-    return LowByte(static_cast<std::uint32_t>(ReadChipInt(section, key, 0)));
-  };
+  const auto readRegister = [this](const char* key) { return ReadChipByte(section, key, 0); };
   configReg = readRegister("config.reg");
   fanMainControlReg = readRegister("fan_main_control.reg");
   fanControlReg = readRegister("fan_ctl.reg");

@@ -32,13 +32,18 @@ constexpr std::uint32_t kStatusSettle_ms = 100;
 
 constexpr std::uint8_t kNoMap = 255;
 
+[[noreturn]] void Refuse(const std::string& failure, const Setting& setting) {
+  TellOf(setting, failure);
+  throw mblib_exception(failure);
+}
+
 }  // namespace
 
 void GIteChip::Initialize() {
   GSioChip::Initialize();
   for (std::size_t i = 0; i < pwmControlRegs.size(); ++i) {
     const std::string key = "fan." + std::to_string(i + 1) + ".pwm_ctl.reg";
-    pwmControlRegs[i] = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, key, 0)));
+    pwmControlRegs[i] = ReadChipByte(section, key, 0);
   }
   LoadBlinkLists();
 }
@@ -93,30 +98,30 @@ void GIteChip::LoadBlinkLists() {
 
 // Pairs of configuration register and value in one flat list; a last register without a value is dropped.
 GIteChip::PairList GIteChip::ParseBlinkList(const std::string& key) {
+  const Setting setting = ReadChipSetting(section, key, "");
   std::vector<std::string> tokens;
-  CDMUtil::Split(ReadChipValue(section, key, ""), tokens, ",: ");
+  CDMUtil::Split(setting.text, tokens, ",: ");
   PairList list;
   for (std::size_t i = 0; i + 1 < tokens.size(); i += 2) {
-    list.emplace_back(LowByte(static_cast<std::uint32_t>(CDMUtil::ToInt(tokens[i]))), BlinkValue(tokens[i + 1], key));
+    list.emplace_back(LowByte(NumberIn(tokens[i], 8, setting)), BlinkValue(tokens[i + 1], key, setting));
   }
   return list;
 }
 
-std::uint8_t GIteChip::BlinkValue(const std::string& token, const std::string& key) {
+std::uint8_t GIteChip::BlinkValue(const std::string& token, const std::string& key, const Setting& setting) {
   for (const auto& [color, line] : {std::pair{"primary", primaryLine}, std::pair{"secondary", secondaryLine}}) {
     if (token == std::string(color) + "_led") {
       const std::uint8_t map = MapGpioLine(line);
       if (map == kNoMap) {
-        throw mblib_exception(std::string("invalid ") + color + " led map. Check powerled.color." + color +
-                              ".gpio entry.");
+        Refuse(std::string("invalid ") + color + " led map. Check powerled.color." + color + ".gpio entry.", setting);
       }
       return map;
     }
   }
   if (!CDMUtil::IsInteger(token)) {
-    throw mblib_exception("invalid " + key + " entry");
+    Refuse("invalid " + key + " entry", setting);
   }
-  return LowByte(static_cast<std::uint32_t>(CDMUtil::ToInt(token)));
+  return LowByte(NumberIn(token, 8, setting));
 }
 
 // Eight lines in each group of ten, five groups; the map leaves no gaps.

@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "board/base/Setting.h"
 #include "board/chips/GSioChip.h"
 
 namespace panelglow {
@@ -43,7 +44,7 @@ class GIteChip : public GSioChip {
  private:
   using PairList = std::vector<std::pair<std::uint8_t, std::uint8_t>>;
   PairList ParseBlinkList(const std::string& key);
-  std::uint8_t BlinkValue(const std::string& token, const std::string& key);
+  std::uint8_t BlinkValue(const std::string& token, const std::string& key, const Setting& setting);
 
   std::array<std::uint8_t, 3> pwmControlRegs{};  // "fan.<n>.pwm_ctl.reg"
   int primaryLine = 22;                          // GPIO line of the LED's first colour

@@ -17,7 +17,7 @@ constexpr std::uint32_t kFlipSettle_ms = 30;
 }  // namespace
 
 // The block's address is a setting of the board, under the chip's name or under the section that it is given.
-GMemorySpaceChip::GMemorySpaceChip() : MaskedLedChip("g_memoryspace"), gpioBar(kDefaultGpioBar) {
+GMemorySpaceChip::GMemorySpaceChip() : MaskedLedChip("g_memoryspace", 32), gpioBar(kDefaultGpioBar) {
   unsigned int bar = ReadIniUnsigned("chip." + name + ".gpiobar", 0);
   if (bar == 0 && section != name) {
     bar = ReadIniUnsigned("chip." + section + ".gpiobar", 0);

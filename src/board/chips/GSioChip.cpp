@@ -17,7 +17,7 @@ constexpr std::uint8_t kLogicalDeviceNumber = 0x07;  // configuration register t
 // Base address registers as the common parts have them: high byte's register, low byte's register.
 constexpr int kHwmLdn = 4;
 constexpr int kHwmBarReg = 0x6061;
-constexpr int kGpioLdn = 7;
+constexpr std::uint8_t kGpioLdn = 7;
 constexpr int kGpioBarReg = 0x6263;
 
 constexpr std::int64_t kTachClock = 1'350'000;
@@ -39,15 +39,15 @@ struct GSioChip::BarKeys {
 
 void GSioChip::Initialize() {
   LoadConfiguration();
-  indexPort = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, "config.index.port", 0)));
-  dataPort = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, "config.data.port", 0)));
-  enterSequence = ParseByteList(ReadChipValue(section, "config.mode.enter.sequence", ""));
-  exitSequence = ParseByteList(ReadChipValue(section, "config.mode.exit.sequence", ""));
+  indexPort = ReadChipByte(section, "config.index.port", 0);
+  dataPort = ReadChipByte(section, "config.data.port", 0);
+  enterSequence = ParseByteList(ReadChipSetting(section, "config.mode.enter.sequence", ""));
+  exitSequence = ParseByteList(ReadChipSetting(section, "config.mode.exit.sequence", ""));
   hwmBar =
       FindBar({"hwmbar", "hwmbar.bar.ldn", kHwmLdn, "hwmbar.bar.reg", kHwmBarReg, "could not read HWMBAR from SIO"});
-  envIndexReg = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, "environment.index.reg", 0)));
-  envDataReg = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, "environment.data.reg", 0)));
-  gpioLdn = LowByte(static_cast<std::uint32_t>(ReadChipInt(section, "gpiobar.bar.ldn", kGpioLdn)));
+  envIndexReg = ReadChipByte(section, "environment.index.reg", 0);
+  envDataReg = ReadChipByte(section, "environment.data.reg", 0);
+  gpioLdn = ReadChipByte(section, "gpiobar.bar.ldn", kGpioLdn);
   gpioBar = FindBar(
       {"gpiobar", "gpiobar.bar.ldn", kGpioLdn, "gpiobar.bar.reg", kGpioBarReg, "could not read GPIOBAR from SIO"});
 }
@@ -56,15 +56,15 @@ void GSioChip::Initialize() {
 std::uint16_t GSioChip::FindBar(const BarKeys& keys) {
   IniReader& reader = IniReader::Instance();
   IniReader::status_t status = IniReader::kNotFound;
-  const int address = reader.ReadChipInt(section, keys.address, status, 0);
+  const int address = reader.ReadChipInt(section, keys.address, status, 0, 16);
   if (status != IniReader::kNotFound) {
     return static_cast<std::uint16_t>(address);
   }
   IniReader::status_t ldnStatus = IniReader::kNotFound;
   IniReader::status_t regStatus = IniReader::kNotFound;
-  const int ldn = reader.ReadChipInt(section, keys.ldn, ldnStatus, keys.defaultLdn);
+  const int ldn = reader.ReadChipInt(section, keys.ldn, ldnStatus, keys.defaultLdn, 8);
   const auto registers =
-      static_cast<std::uint32_t>(reader.ReadChipInt(section, keys.reg, regStatus, keys.defaultReg));
+      static_cast<std::uint32_t>(reader.ReadChipInt(section, keys.reg, regStatus, keys.defaultReg, 16));
   if (ldnStatus == IniReader::kUndefined || regStatus == IniReader::kUndefined) {
     return 0;
   }

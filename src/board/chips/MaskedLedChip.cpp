@@ -21,11 +21,13 @@ std::uint8_t MaskOf(const SequenceEntry& entry) { return entry.data.empty() ? st
 }  // namespace
 
 // The sequences stand in the section of the chip's own name, whatever section its other keys are read from.
-MaskedLedChip::MaskedLedChip(const std::string& chipName) : GChip(chipName) {
+MaskedLedChip::MaskedLedChip(const std::string& chipName, unsigned addressBits) : GChip(chipName) {
   static_assert(kListKeys.size() == kListCount);
   LoadConfiguration();
   for (std::size_t i = 0; i < kListKeys.size(); ++i) {
-    ParseSequence(CDMUtil::ToLower(ReadChipValue(name, std::string(kListKeys[i]), "")), lists[i]);
+    Setting setting = ReadChipSetting(name, std::string(kListKeys[i]), "");
+    setting.text = CDMUtil::ToLower(setting.text);
+    ParseSequence(setting, lists[i], addressBits);
   }
 }
 

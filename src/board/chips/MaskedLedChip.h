@@ -39,7 +39,8 @@ class MaskedLedChip : public GChip {
   bool DeassertWirelessLed() override { return Flip(list(kWirelessDeassert)); }
 
  protected:
-  explicit MaskedLedChip(const std::string& chipName);
+  /// `addressBits`: how wide the addresses of the registers are.
+  MaskedLedChip(const std::string& chipName, unsigned addressBits);
 
   // One entry of a sequence, on the hardware.
   virtual void SetEntry(std::uint32_t address, std::uint8_t mask) = 0;

@@ -17,27 +17,31 @@ std::vector<std::string> Tokens(const std::string& text, std::string_view separa
 
 }  // namespace
 
-std::vector<std::string> SplitEntry(const std::string& entry) {
+std::vector<std::string> SplitList(const Setting& setting) {
+  return setting.text == kUndef ? std::vector<std::string>() : Tokens(setting.text, ", ");
+}
+
+std::vector<std::string> SplitEntry(const std::string& entry, const Setting& setting) {
   std::vector<std::string> tokens = Tokens(entry, ": ");
   if (tokens.size() != 2) {
-    throw mblib_exception("malformed sequence entry: '" + entry + "'. should be: 'cmd:data[.data]*,...'");
+    const std::string failure = "malformed sequence entry: '" + entry + "'. should be: 'cmd:data[.data]*,...'";
+    TellOf(setting, failure);
+    throw mblib_exception(failure);
   }
   return tokens;
 }
 
-bool ParseSequence(const std::string& text, Sequence& sequence) {
-  if (text == kUndef) {
-    return false;
-  }
+bool ParseSequence(const Setting& setting, Sequence& sequence, unsigned commandBits) {
   bool read = false;
-  for (const std::string& entry : Tokens(text, ", ")) {
-    const std::vector<std::string> tokens = SplitEntry(entry);
+  for (const std::string& entry : SplitList(setting)) {
+    const std::vector<std::string> tokens = SplitEntry(entry, setting);
     SequenceEntry parsed;
     // Unsigned, since memory-mapped registers stand above 0x7FFFFFFF.
     parsed.command = CDMUtil::ToUnsignedLong(tokens[0]);
+    CheckNumber(tokens[0], commandBits, parsed.command & (0xFFFFFFFFU >> (32 - commandBits)), setting);
     if (tokens[1] != kUndef) {
       for (const std::string& byte : Tokens(tokens[1], ". ")) {
-        parsed.data.push_back(static_cast<std::uint8_t>(CDMUtil::ToInt(byte)));
+        parsed.data.push_back(static_cast<std::uint8_t>(NumberIn(byte, 8, setting)));
       }
     }
     sequence.push_back(std::move(parsed));
@@ -46,10 +50,10 @@ bool ParseSequence(const std::string& text, Sequence& sequence) {
   return read;
 }
 
-std::vector<std::uint8_t> ParseByteList(const std::string& text) {
+std::vector<std::uint8_t> ParseByteList(const Setting& setting) {
   std::vector<std::uint8_t> bytes;
-  for (const std::string& token : Tokens(text, ", ")) {
-    bytes.push_back(static_cast<std::uint8_t>(CDMUtil::ToInt(token)));
+  for (const std::string& token : Tokens(setting.text, ", ")) {
+    bytes.push_back(static_cast<std::uint8_t>(NumberIn(token, 8, setting)));
   }
   return bytes;
 }

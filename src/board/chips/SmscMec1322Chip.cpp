@@ -3,7 +3,6 @@
 #include "board/base/IniReader.h"
 #include "board/chips/ChipNumbers.h"
 #include "board/chips/Sequence.h"
-#include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -53,29 +52,13 @@ constexpr int kDefaultWait_ms = 30;
 SmscMec1322Chip::SmscMec1322Chip() : EcChip("smsc_mec1322") {
   static_assert(kListKeys.size() == kListCount);
   devio.OutportByte(kFirstConfigPort, kEnterKey);
-  configIndexPort = devio.InportByte(kFirstConfigPort + 1) == kNobody ? kSecondConfigPort : kFirstConfigPort;
-  configDataPort = static_cast<std::uint16_t>(configIndexPort + 1);
-  devio.OutportByte(configIndexPort, kEnterKey);
-  section = ReadIniValue("chip.smsc_mec1322.data", name);
+  const bool isSecond = devio.InportByte(kFirstConfigPort + 1) == kNobody;
+  devio.OutportByte(isSecond ? kSecondConfigPort : kFirstConfigPort, kEnterKey);
+  const std::string section = ReadIniValue("chip.smsc_mec1322.data", name);
   for (std::size_t i = 0; i < kListKeys.size(); ++i) {
-    lists[i] = ParseList(ReadChipValue(section, kListKeys[i], ""));
+    lists[i] = ParsePairs<std::uint16_t>(ReadChipSetting(section, kListKeys[i], ""));
   }
   waitTime = static_cast<std::uint32_t>(ReadIniInt("test.panelglow.waittime", kDefaultWait_ms));
-}
-
-SmscMec1322Chip::PortList SmscMec1322Chip::ParseList(const std::string& text) {
-  PortList list;
-  if (text == "undef") {
-    return list;
-  }
-  std::vector<std::string> entries;
-  CDMUtil::Split(text, entries, ", ");
-  for (const std::string& entry : entries) {
-    const std::vector<std::string> tokens = SplitEntry(entry);
-    list.emplace_back(static_cast<std::uint16_t>(CDMUtil::ToInt(tokens[0])),
-                      LowByte(static_cast<std::uint32_t>(CDMUtil::ToInt(tokens[1]))));
-  }
-  return list;
 }
 
 bool SmscMec1322Chip::RunList(List which) {

@@ -54,7 +54,6 @@ class SmscMec1322Chip : public EcChip {
   };
   using PortList = std::vector<std::pair<std::uint16_t, std::uint8_t>>;
 
-  static PortList ParseList(const std::string& text);
   bool RunList(List which);
   bool SaveMux(List which);
   void RestoreMux(List which);
@@ -67,9 +66,6 @@ class SmscMec1322Chip : public EcChip {
   void WriteByte(std::uint8_t value);
   std::uint8_t ReadFanPage(std::uint8_t low);
 
-  std::uint16_t configIndexPort = 0;
-  std::uint16_t configDataPort = 0;
-  std::string section;
   std::array<PortList, kListCount> lists;
   std::uint32_t waitTime;  // ms, behind each write of a list
   std::uint8_t savedMux = 0;

@@ -115,29 +115,10 @@ void ReplaceAll(std::string& text, std::string_view from, std::string_view to) {
     return;
   }
   const bool bringsItBack = to.find(from) != std::string_view::npos;
-  std::string done;
-  std::size_t settled = 0;  // of `done`, what is not looked at again
-  std::string next;         // put back in front of the rest of the text, first character last
-  done.reserve(text.size());
-  for (std::size_t at = 0; at < text.size() || !next.empty();) {
-    if (next.empty()) {
-      done += text[at++];
-    } else {
-      done += next.back();
-      next.pop_back();
-    }
-    if (done.size() - settled < from.size() || !done.ends_with(from)) {
-      continue;
-    }
-    done.resize(done.size() - from.size());
-    if (bringsItBack) {
-      done += to;
-      settled = done.size();
-    } else {
-      next.append(to.rbegin(), to.rend());
-    }
+  for (std::size_t at = text.find(from); at != std::string::npos;) {
+    text.replace(at, from.size(), to);
+    at = text.find(from, bringsItBack ? at + to.size() : 0);
   }
-  text = std::move(done);
 }
 
 void Split(std::string_view text, std::vector<std::string>& out, std::string_view separators) {

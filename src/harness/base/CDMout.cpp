@@ -63,14 +63,14 @@ void CDMout::UpdatePercentage(int percent) {
   WriteLine("UpdatePercentage " + CDMUtil::ToString(std::clamp(percent, 0, 100)));
 }
 
-void CDMout::ReportFailure(std::string_view text) { WriteLine("ReportFailure " + std::string(text)); }
+void CDMout::ReportFailure(std::string_view text) { WriteLine("ReportFailure " + CDMUtil::OnOneLine(text)); }
 
-void CDMout::TestFailed(std::string_view text) { WriteLine("TestFailed " + std::string(text)); }
+void CDMout::TestFailed(std::string_view text) { WriteLine("TestFailed " + CDMUtil::OnOneLine(text)); }
 
 void CDMout::TestFailed(int code, std::string_view text) {
   std::array<char, 24> digits{};
   std::snprintf(digits.data(), digits.size(), "%06d", code);
-  WriteLine("TestFailed " + std::string(digits.data()) + " " + Quoted(text));
+  WriteLine("TestFailed " + std::string(digits.data()) + " " + Quoted(CDMUtil::OnOneLine(text)));
 }
 
 void CDMout::EndOfTest() { WriteLine("EndOfTest"); }

@@ -9,7 +9,8 @@
 
 namespace panelglow {
 
-/// Every operation writes one line and hands it on at once. May be called from any thread.
+/// Every operation writes one line, whatever its text holds (line ends become blanks; nothing else is escaped), and
+/// hands it on at once. May be called from any thread.
 class CDMout {
  public:
   virtual ~CDMout() = default;
@@ -27,7 +28,7 @@ class CDMout {
   /// The last line of a run.
   static void EndOfTest();
 
-  /// A log line. Line ends in `text` become blanks; nothing else is escaped.
+  /// A log line.
   static void LogMessage(LogOptions option, unsigned int id, std::string_view text);
   static void LogMessage(LogOptions option, unsigned int id, const char* text);
   static void LogMessage(LogOptions option, unsigned int id, const std::string& text);

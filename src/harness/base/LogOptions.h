@@ -22,7 +22,12 @@ enum class LogOptions : int {
   Invalid = 15,
 };
 
-/// Message number of a text that needs no entry in the message files.
+// Message numbers that several parts of the program use.
+
+/// A text that needs no entry in the message files.
 inline constexpr unsigned int kFreeText = 20000;
+
+/// What the program notes about its own files and parameters.
+inline constexpr unsigned int kNote = 8;
 
 }  // namespace panelglow

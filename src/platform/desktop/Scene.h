@@ -2,6 +2,7 @@
 // module into a file or onto a display.
 #pragma once
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <variant>
@@ -65,7 +66,9 @@ struct SceneWindow {
   Font font;
   bool enabled = true;
   bool focused = false;
-  bool defaultButton = false;
+  bool heavyFrame = false;  // of a button: the one that Enter presses
+  std::size_t caret = 0;    // of an entry field: before which character it stands
+  bool topmost = false;     // of a top-level window
   bool pressed = false;
   bool vertical = false;  // scroll bar
   ScrollState scroll;
@@ -79,6 +82,8 @@ struct Scene {
   Color background = 0x00604838;
   std::vector<SceneWindow> windows;
   WindowHandle foreground = 0;
+  std::uint64_t foregroundRequest = 0;  // grows when the foreground is to be taken (again)
+  std::string language;                 // of the texts, as "ja_JP": which forms Chinese characters have
 };
 
 /// Implemented by the drawing module.
@@ -92,8 +97,9 @@ class SceneDrawing {
   /// Size of an image or icon file; nothing when it does not decode.
   virtual std::optional<std::pair<int, int>> ImageSize(const std::string& path) = 0;
 
-  /// Width and height of `text` broken to `width` pixels.
-  virtual std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font) = 0;
+  /// Width and height of `text`, in a language as Scene has it, broken to `width` pixels.
+  virtual std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font,
+                                          const std::string& language) = 0;
 };
 
 }  // namespace panelglow::platform::desktop

@@ -10,13 +10,15 @@
 namespace panelglow::platform::desktop {
 
 struct ScreenEvent {
-  enum class Kind { kMouseDown, kMouseUp, kMouseMove, kKey };
-  Kind kind = Kind::kKey;
+  enum class Kind { kMouseDown, kMouseUp, kMouseMove, kKeyDown, kKeyUp, kForegroundLost };
+  Kind kind = Kind::kKeyDown;
   int x = 0;  // screen pixels
   int y = 0;
-  std::uint32_t virtualKey = 0;  // of the home system; WindowSystem's own code for Shift+Tab
+  std::uint32_t virtualKey = 0;  // see Keys.h
   char16_t character = 0;        // what the key types, 0 for none
   bool alt = false;
+  bool repeat = false;   // the key was down already: it is held
+  std::u16string title;  // of another program's window that has the keyboard now or covers ours; empty if unknown
 };
 
 class Screen {
@@ -29,13 +31,14 @@ class Screen {
   /// A file descriptor that is readable when TakeEvents() may have something.
   [[nodiscard]] virtual int Descriptor() const = 0;
 
-  /// Shows the scene's top-level windows, each as a window of the display, and takes away those that are not in it.
+  /// Shows the scene's top-level windows, each as a window of the display, and takes away those that are not in it. A
+  /// foreground request that is new raises the windows, and gives the foreground window the keyboard when it lost it.
   virtual void Show(const Scene& scene) = 0;
 
   /// What has happened since the last call; never blocks. Exposed parts are drawn again on the way.
   virtual std::vector<ScreenEvent> TakeEvents() = 0;
 
-  /// False once the display has gone away.
+  /// False once the display has gone away; nothing is shown and nothing comes in from then on.
   [[nodiscard]] virtual bool IsAlive() const = 0;
 };
 

@@ -13,14 +13,15 @@
 
 #include "platform/Desktop.h"
 #include "platform/desktop/Scene.h"
+#include "platform/desktop/Screen.h"
 #include "platform/desktop/WindowHost.h"
 
 namespace panelglow::platform::desktop {
 
 class WindowSystem : public Desktop {
  public:
-  /// Our own key code: Tab with the Shift key.
-  static constexpr std::uint32_t kShiftTabKey = 0x0109;
+  /// What ForegroundWindow() names while another program's window has the foreground.
+  static constexpr WindowHandle kForeignWindow = 0xFFFFFFFF;
 
   /// A screen without pixels is no screen: no window can be made on it, and every message loop ends at once.
   WindowSystem(WindowHost& host, int screenWidth, int screenHeight);
@@ -58,8 +59,9 @@ class WindowSystem : public Desktop {
   void SetFocus(WindowHandle window) override;
   WindowHandle Focus() override;
   bool SetForegroundWindow(WindowHandle window) override;
-  WindowHandle ForegroundWindow() override { return foreground_; }
+  WindowHandle ForegroundWindow() override { return foreign_ ? kForeignWindow : foreground_; }
   void SetActiveWindow(WindowHandle window) override;
+  void SetLanguage(std::string_view locale) override;
   void AttachInput(WindowHandle other, bool attach) override;
   std::uint32_t SetTimer(WindowHandle window, std::uint32_t timer, std::uint32_t period_ms,
                          TimerProcedure procedure) override;
@@ -80,6 +82,9 @@ class WindowSystem : public Desktop {
 
   // ---- the screen's side: what comes in from mouse and keyboard, and what is to be seen
 
+  /// What a screen says has happened, by one of the calls below.
+  void Take(const ScreenEvent& event);
+
   /// A press and release of the left mouse button at a point of the screen. It reaches the window that is there when
   /// its thread takes the message, not the one that is there now.
   void Click(int x, int y);
@@ -89,8 +94,20 @@ class WindowSystem : public Desktop {
   void MouseButton(int x, int y, bool down);
   void MouseMove(int x, int y);
 
-  /// A key press and release by virtual-key code; `character` is what it types, 0 for none. `alt`: with the Alt key.
+  /// A key going down, by its code in Keys.h; `character` is what it types, 0 for none. `alt`: with the Alt key.
+  /// `repeat`: it was down already, and is held.
+  void KeyDown(std::uint32_t virtualKey, char16_t character, bool alt, bool repeat);
+  void KeyUp(std::uint32_t virtualKey, bool alt);
+
+  /// A key that is pressed and released.
   void Key(std::uint32_t virtualKey, char16_t character, bool alt);
+
+  /// A window of another program has taken the keyboard, or stands above ours. It is the foreground window until one
+  /// of ours takes the foreground back.
+  void LoseForeground(std::u16string_view title);
+
+  /// The screen is gone: every message loop ends, and no window can be made any more.
+  void LoseScreen();
 
   /// Visible top-level windows, topmost last.
   [[nodiscard]] std::vector<WindowHandle> TopLevelWindows() const;
@@ -122,15 +139,6 @@ class WindowSystem : public Desktop {
     std::uint64_t due_ms = 0;
     TimerProcedure procedure;
   };
-  enum class InputKind { kKey, kMouseDown, kMouseUp, kMouseMove };
-  struct Input {
-    InputKind kind = InputKind::kKey;
-    int x = 0;
-    int y = 0;
-    std::uint32_t virtualKey = 0;
-    char16_t character = 0;
-    bool alt = false;
-  };
   struct SentMessage {
     Message message;
     std::intptr_t result = 0;
@@ -145,14 +153,14 @@ class WindowSystem : public Desktop {
   std::intptr_t Call(const Message& message);
   void HandleSentMessages(Queue& queue);
   bool TakeInput(Queue& queue, Message& message);
-  bool TakeKey(Queue& queue, const Input& input, Message& message);
-  bool TakeMouse(const Input& input, Message& message);
-  void PushMouse(InputKind kind, int x, int y);
+  bool TakeKey(Queue& queue, const ScreenEvent& input, Message& message);
+  bool TakeMouse(const ScreenEvent& input, Message& message);
+  void PushMouse(ScreenEvent::Kind kind, int x, int y);
+  void PushKey(const ScreenEvent& input);
   bool TakeTimer(Queue& queue, Message& message);
   bool TakePaint(std::uint32_t thread, Message& message);
   void Activate(WindowHandle window);
   void Raise(WindowHandle window, ZOrder order);
-  void SetTopmost(Window& window, bool topmost);
   [[nodiscard]] WindowHandle TopLevelOf(WindowHandle window) const;
   [[nodiscard]] bool IsDescendant(WindowHandle ancestor, WindowHandle window) const;
   [[nodiscard]] WindowHandle WindowAt(int x, int y) const;
@@ -160,7 +168,12 @@ class WindowSystem : public Desktop {
   std::intptr_t ControlProcedure(const Message& message);
   void OnControlDown(WindowHandle control, int x, int y);
   void OnControlMove(WindowHandle control, int x, int y);
-  void OnControlUp(WindowHandle control);
+  void OnControlUp(WindowHandle control, int x, int y);
+  void OnScrollBarDown(WindowHandle bar, int x, int y);
+  void RepeatScroll(WindowHandle bar, std::uint32_t delay_ms);
+  void OnButtonKey(WindowHandle button, const Message& message);
+  void OnEditKey(WindowHandle edit, std::uintptr_t virtualKey);
+  void OnEditCharacter(WindowHandle edit, char16_t character);
   void SendScroll(WindowHandle bar, std::uint32_t request, int position);
   [[nodiscard]] int FrameEdgesAt(const Window& window, int x, int y) const;
   void DragFrame(int x, int y);
@@ -170,6 +183,7 @@ class WindowSystem : public Desktop {
   void FocusInGroup(WindowHandle dialog, bool backwards);
   bool PressMnemonic(WindowHandle dialog, char16_t letter);
   [[nodiscard]] WindowHandle DefaultButton(WindowHandle dialog) const;
+  [[nodiscard]] bool HasHeavyFrame(const Window& button) const;
   void SendSize(WindowHandle window);
   void AskForColor(WindowHandle control);
   [[nodiscard]] Rectangle ClientOnScreen(const Window& window) const;
@@ -184,13 +198,17 @@ class WindowSystem : public Desktop {
   std::map<std::uint32_t, std::unique_ptr<Queue>> queues_;
   WindowHandle nextWindow_ = 1;
   WindowHandle foreground_ = 0;
+  std::optional<std::u16string> foreign_;  // title of another program's window that has the foreground
+  std::uint64_t foregroundRequests_ = 0;
+  std::string language_;
   std::uint64_t revision_ = 0;
 
   // While the mouse button is down.
+  bool mouseDown_ = false;
   std::uint32_t mouseThread_ = 0;
   WindowHandle captured_ = 0;  // where it went down
   int dragEdges_ = 0;          // edges of the captured window's frame that are dragged
-  int dragX_ = 0;              // last place of a drag; of a scroll thumb, the grip within it
+  int dragX_ = 0;  // last place of a drag; of a scroll thumb the grip within it, else the mouse on the bar
   int dragY_ = 0;
   std::function<SceneDrawing*()> drawing_;
 };

@@ -4,14 +4,13 @@
 
 #include <algorithm>
 
+#include "platform/Text.h"
 #include "platform/desktop/ScrollParts.h"
+#include "platform/drawingmodule/TextLayouts.h"
 
 namespace panelglow::platform::desktop {
 
 namespace {
-
-using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
-using Description = std::unique_ptr<PangoFontDescription, Deleter<pango_font_description_free>>;
 
 constexpr int kIconSize = 32;  // pixels
 // Larger pictures are treated as unreadable: a small file can claim a size that takes all memory.
@@ -21,39 +20,6 @@ constexpr Color kButtonColor = 0x00E8E8E8;
 constexpr Color kPressedColor = 0x00D0D0D0;
 constexpr Color kWhite = 0x00FFFFFF;
 constexpr Color kFaintText = 0x00808080;
-
-std::string Utf8(std::u16string_view text) {
-  glong length = 0;
-  gchar* converted = g_utf16_to_utf8(reinterpret_cast<const gunichar2*>(text.data()), static_cast<glong>(text.size()),
-                                     nullptr, &length, nullptr);
-  if (converted == nullptr) {
-    return "?";
-  }
-  std::string utf8(converted, static_cast<std::size_t>(length));
-  g_free(converted);
-  return utf8;
-}
-
-// A caption without its marks.
-struct Caption {
-  std::u16string text;
-  std::size_t underlined = std::u16string::npos;
-};
-
-// A caption with its '&' marks taken out: "&&" is one '&', "&x" underlines the x.
-Caption ReadCaption(std::u16string_view source) {
-  Caption caption;
-  for (std::size_t i = 0; i < source.size(); ++i) {
-    if (source[i] == u'&' && i + 1 < source.size()) {
-      ++i;
-      if (source[i] != u'&' && caption.underlined == std::u16string::npos) {
-        caption.underlined = caption.text.size();
-      }
-    }
-    caption.text.push_back(source[i]);
-  }
-  return caption;
-}
 
 void SetColor(cairo_t* cr, Color color) {
   cairo_set_source_rgb(cr, (color & 0xFFU) / 255.0, (color >> 8U & 0xFFU) / 255.0, (color >> 16U & 0xFFU) / 255.0);
@@ -90,17 +56,6 @@ void DrawBevel(cairo_t* cr, const Rectangle& area, Color topLeft, Color bottomRi
   cairo_stroke(cr);
 }
 
-Layout MakeLayout(cairo_t* cr, const std::string& text, const Font& font) {
-  Layout layout(pango_cairo_create_layout(cr));
-  const Description description(pango_font_description_from_string("DejaVu Sans, Noto Sans CJK JP, Sans"));
-  // A font's height is that of its cell; the letters take about three quarters of it.
-  pango_font_description_set_absolute_size(description.get(), font.height * 0.74 * PANGO_SCALE);
-  pango_font_description_set_weight(description.get(), static_cast<PangoWeight>(font.weight));
-  pango_layout_set_font_description(layout.get(), description.get());
-  pango_layout_set_text(layout.get(), text.data(), static_cast<int>(text.size()));
-  return layout;
-}
-
 void DrawPixbuf(cairo_t* cr, const GdkPixbuf* image, int x, int y) {
   const int width = gdk_pixbuf_get_width(image);
   const int height = gdk_pixbuf_get_height(image);
@@ -129,7 +84,7 @@ void DrawPixbuf(cairo_t* cr, const GdkPixbuf* image, int x, int y) {
 }
 
 std::string FilePath(std::u16string_view path) {
-  std::string name = Utf8(path);
+  std::string name = Utf8FromWide(path);
   std::replace(name.begin(), name.end(), '\\', '/');
   return name;
 }
@@ -137,13 +92,16 @@ std::string FilePath(std::u16string_view path) {
 Color TextColor(const SceneWindow& window, Color ground) { return window.enabled ? ReadableOn(ground) : kFaintText; }
 
 // A caption on one line in the middle of a button; what is too long ends in an ellipsis.
-void DrawButtonCaption(cairo_t* cr, const SceneWindow& window, Color ground) {
+void DrawButtonCaption(cairo_t* cr, const SceneWindow& window, Color ground, const std::string& language) {
   constexpr int kMargin = 4;  // pixels
   const Caption caption = ReadCaption(window.text);
-  const Layout layout = MakeLayout(cr, Utf8(caption.text), window.font);
+  const Layout layout = MakeLayout(cr, Utf8FromWide(caption.text), window.font, language);
   if (caption.underlined != std::u16string::npos) {
-    const std::size_t begin = Utf8(std::u16string_view(caption.text).substr(0, caption.underlined)).size();
-    const std::size_t end = Utf8(std::u16string_view(caption.text).substr(0, caption.underlined + 1)).size();
+    const std::u16string_view before = std::u16string_view(caption.text).substr(0, caption.underlined);
+    const std::size_t begin = Utf8FromWide(before).size();
+    const bool isPair = (caption.text[caption.underlined] & 0xFC00) == 0xD800;
+    const std::size_t end =
+        Utf8FromWide(std::u16string_view(caption.text).substr(0, caption.underlined + (isPair ? 2 : 1))).size();
     PangoAttrList* attributes = pango_attr_list_new();
     PangoAttribute* underline = pango_attr_underline_new(PANGO_UNDERLINE_SINGLE);
     underline->start_index = static_cast<guint>(begin);
@@ -164,9 +122,9 @@ void DrawButtonCaption(cairo_t* cr, const SceneWindow& window, Color ground) {
 }
 
 // The lines of a static control. A line that does not fit as a whole is left out, and an ellipsis says so.
-void DrawStaticText(cairo_t* cr, const SceneWindow& window) {
+void DrawStaticText(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   constexpr int kMargin = 2;  // pixels, left and right
-  const Layout layout = MakeLayout(cr, Utf8(window.text), window.font);
+  const Layout layout = MakeLayout(cr, Utf8FromWide(window.text), window.font, language);
   pango_layout_set_width(layout.get(), std::max(0, window.client.Width() - 2 * kMargin) * PANGO_SCALE);
   pango_layout_set_height(layout.get(), std::max(0, window.client.Height() - 1) * PANGO_SCALE);
   pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
@@ -177,17 +135,20 @@ void DrawStaticText(cairo_t* cr, const SceneWindow& window) {
   pango_cairo_show_layout(cr, layout.get());
 }
 
-// An entry field: one line that is moved so that its end can be seen, with the caret behind it.
-void DrawEdit(cairo_t* cr, const SceneWindow& window) {
+// An entry field: one line that is moved so that the caret can be seen.
+void DrawEdit(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   constexpr int kMargin = 4;  // pixels, left and right
   FillRectangle(cr, window.frame, kWhite);
   DrawBevel(cr, window.frame, 0x00606060, kWhite);
-  const Layout layout = MakeLayout(cr, Utf8(window.text), window.font);
+  const Layout layout = MakeLayout(cr, Utf8FromWide(window.text), window.font, language);
   pango_layout_set_single_paragraph_mode(layout.get(), TRUE);
-  int width = 0;
   int height = 0;
-  pango_layout_get_pixel_size(layout.get(), &width, &height);
-  const int x = window.client.left + kMargin - std::max(0, width - (window.client.Width() - 2 * kMargin));
+  pango_layout_get_pixel_size(layout.get(), nullptr, &height);
+  PangoRectangle caret{};
+  const std::size_t before = Utf8FromWide(std::u16string_view(window.text).substr(0, window.caret)).size();
+  pango_layout_get_cursor_pos(layout.get(), static_cast<int>(before), &caret, nullptr);
+  const int caretX = PANGO_PIXELS(caret.x);
+  const int x = window.client.left + kMargin - std::max(0, caretX - (window.client.Width() - 2 * kMargin));
   const double y = window.client.top + (window.client.Height() - height) / 2.0;
   cairo_save(cr);
   cairo_rectangle(cr, window.client.left, window.client.top, window.client.Width(), window.client.Height());
@@ -196,7 +157,7 @@ void DrawEdit(cairo_t* cr, const SceneWindow& window) {
   SetColor(cr, TextColor(window, kWhite));
   pango_cairo_show_layout(cr, layout.get());
   if (window.focused) {
-    FillRectangle(cr, {x + width + 1, static_cast<int>(y), x + width + 2, static_cast<int>(y) + height}, 0);
+    FillRectangle(cr, {x + caretX + 1, static_cast<int>(y), x + caretX + 2, static_cast<int>(y) + height}, 0);
   }
   cairo_restore(cr);
 }
@@ -213,19 +174,19 @@ Color ButtonColor(const SceneWindow& window) {
   return part(0) | part(8) | part(16);
 }
 
-void DrawButton(cairo_t* cr, const SceneWindow& window) {
+void DrawButton(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   const Color ground = ButtonColor(window);
   const Color line = ReadableOn(ground);
   FillRectangle(cr, window.frame, ground);
   DrawBevel(cr, window.frame, kWhite, ShadowOn(ground));
-  if (window.defaultButton || window.focused) {
+  if (window.heavyFrame) {
     cairo_set_line_width(cr, 1);
     SetColor(cr, line);
     cairo_rectangle(cr, window.frame.left + 0.5, window.frame.top + 0.5, window.frame.Width() - 1,
                     window.frame.Height() - 1);
     cairo_stroke(cr);
   }
-  DrawButtonCaption(cr, window, ground);
+  DrawButtonCaption(cr, window, ground, language);
   if (window.focused) {
     const double dashes[] = {1, 1};
     cairo_set_dash(cr, dashes, 2, 0);
@@ -276,7 +237,7 @@ bool CairoDrawing::WritePng(const Scene& scene, const std::string& path) {
   const Context context(cairo_create(surface.get()));
   FillRectangle(context.get(), {0, 0, scene.width, scene.height}, scene.background);
   for (const SceneWindow& window : scene.windows) {
-    DrawWindow(context.get(), window);
+    DrawWindow(context.get(), window, scene.language);
   }
   return cairo_surface_write_to_png(surface.get(), path.c_str()) == CAIRO_STATUS_SUCCESS;
 }
@@ -289,10 +250,11 @@ std::optional<std::pair<int, int>> CairoDrawing::ImageSize(const std::string& pa
   return std::pair{gdk_pixbuf_get_width(image), gdk_pixbuf_get_height(image)};
 }
 
-std::pair<int, int> CairoDrawing::MeasureText(std::u16string_view text, int width, const Font& font) {
+std::pair<int, int> CairoDrawing::MeasureText(std::u16string_view text, int width, const Font& font,
+                                              const std::string& language) {
   const Surface surface(cairo_image_surface_create(CAIRO_FORMAT_RGB24, 1, 1));
   const Context context(cairo_create(surface.get()));
-  const Layout layout = MakeLayout(context.get(), Utf8(text), font);
+  const Layout layout = MakeLayout(context.get(), Utf8FromWide(text), font, language);
   pango_layout_set_width(layout.get(), width * PANGO_SCALE);
   pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
   int w = 0;
@@ -320,20 +282,22 @@ const GdkPixbuf* CairoDrawing::Load(const std::string& path) {
   return images_.insert_or_assign(path, Image{written, fileSize, std::move(image)}).first->second.pixels.get();
 }
 
-void CairoDrawing::DrawOperations(cairo_t* cr, const SceneWindow& window) {
+void CairoDrawing::DrawOperations(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   cairo_save(cr);
   cairo_rectangle(cr, window.client.left, window.client.top, window.client.Width(), window.client.Height());
   cairo_clip(cr);
   cairo_translate(cr, window.client.left, window.client.top);
   for (const DrawOperation& operation : window.operations) {
-    std::visit([&](const auto& step) { Draw(cr, step); }, operation);
+    std::visit([&](const auto& step) { Draw(cr, step, language); }, operation);
   }
   cairo_restore(cr);
 }
 
-void CairoDrawing::Draw(cairo_t* cr, const FillOperation& fill) { FillRectangle(cr, fill.area, fill.color); }
+void CairoDrawing::Draw(cairo_t* cr, const FillOperation& fill, const std::string& /*language*/) {
+  FillRectangle(cr, fill.area, fill.color);
+}
 
-void CairoDrawing::Draw(cairo_t* cr, const DiscOperation& disc) {
+void CairoDrawing::Draw(cairo_t* cr, const DiscOperation& disc, const std::string& /*language*/) {
   constexpr double kFullTurn = 6.283185307179586;
   SetColor(cr, disc.color);
   cairo_arc(cr, (disc.area.left + disc.area.right) / 2.0, (disc.area.top + disc.area.bottom) / 2.0,
@@ -341,8 +305,8 @@ void CairoDrawing::Draw(cairo_t* cr, const DiscOperation& disc) {
   cairo_fill(cr);
 }
 
-void CairoDrawing::Draw(cairo_t* cr, const TextOperation& text) {
-  const Layout layout = MakeLayout(cr, Utf8(text.text), text.font);
+void CairoDrawing::Draw(cairo_t* cr, const TextOperation& text, const std::string& language) {
+  const Layout layout = MakeLayout(cr, Utf8FromWide(text.text), text.font, language);
   cairo_save(cr);
   if (text.boxed) {
     cairo_rectangle(cr, text.area.left, text.area.top, text.area.Width(), text.area.Height());
@@ -365,7 +329,7 @@ void CairoDrawing::Draw(cairo_t* cr, const TextOperation& text) {
   cairo_restore(cr);
 }
 
-void CairoDrawing::Draw(cairo_t* cr, const ImageOperation& operation) {
+void CairoDrawing::Draw(cairo_t* cr, const ImageOperation& operation, const std::string& /*language*/) {
   if (const GdkPixbuf* image = Load(FilePath(operation.path))) {
     cairo_save(cr);
     cairo_rectangle(cr, operation.clip.left, operation.clip.top, operation.clip.Width(), operation.clip.Height());
@@ -390,13 +354,13 @@ void CairoDrawing::DrawIcon(cairo_t* cr, const SceneWindow& window) {
   }
 }
 
-void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
+void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   cairo_save(cr);
   cairo_rectangle(cr, window.clip.left, window.clip.top, window.clip.Width(), window.clip.Height());
   cairo_clip(cr);
   switch (window.kind) {
     case WindowKind::kButton:
-      DrawButton(cr, window);
+      DrawButton(cr, window, language);
       break;
     case WindowKind::kScrollBar:
       DrawScrollBar(cr, window);
@@ -405,7 +369,7 @@ void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
       DrawIcon(cr, window);
       break;
     case WindowKind::kEdit:
-      DrawEdit(cr, window);
+      DrawEdit(cr, window, language);
       break;
     case WindowKind::kStatic:
     case WindowKind::kImageArea:
@@ -414,7 +378,7 @@ void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
         DrawBevel(cr, window.frame, ShadowOn(window.background), ShadowOn(window.background));
       }
       if (window.kind == WindowKind::kStatic) {
-        DrawStaticText(cr, window);
+        DrawStaticText(cr, window, language);
       }
       break;
     case WindowKind::kPlain:
@@ -430,7 +394,7 @@ void CairoDrawing::DrawWindow(cairo_t* cr, const SceneWindow& window) {
   cairo_save(cr);
   cairo_rectangle(cr, window.clip.left, window.clip.top, window.clip.Width(), window.clip.Height());
   cairo_clip(cr);
-  DrawOperations(cr, window);
+  DrawOperations(cr, window, language);
   cairo_restore(cr);
 }
 

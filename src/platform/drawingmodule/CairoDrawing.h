@@ -30,19 +30,20 @@ class CairoDrawing : public SceneDrawing {
  public:
   bool WritePng(const Scene& scene, const std::string& path) override;
   std::optional<std::pair<int, int>> ImageSize(const std::string& path) override;
-  std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font) override;
+  std::pair<int, int> MeasureText(std::u16string_view text, int width, const Font& font,
+                                  const std::string& language) override;
 
-  /// Draws one window of a scene, in screen coordinates.
-  void DrawWindow(cairo_t* cr, const SceneWindow& window);
+  /// Draws one window of a scene, in screen coordinates; `language` is the scene's.
+  void DrawWindow(cairo_t* cr, const SceneWindow& window, const std::string& language);
 
  private:
   const GdkPixbuf* Load(const std::string& path);
-  void DrawOperations(cairo_t* cr, const SceneWindow& window);
+  void DrawOperations(cairo_t* cr, const SceneWindow& window, const std::string& language);
   void DrawIcon(cairo_t* cr, const SceneWindow& window);
-  void Draw(cairo_t* cr, const FillOperation& fill);
-  void Draw(cairo_t* cr, const DiscOperation& disc);
-  void Draw(cairo_t* cr, const TextOperation& text);
-  void Draw(cairo_t* cr, const ImageOperation& operation);
+  void Draw(cairo_t* cr, const FillOperation& fill, const std::string& language);
+  void Draw(cairo_t* cr, const DiscOperation& disc, const std::string& language);
+  void Draw(cairo_t* cr, const TextOperation& text, const std::string& language);
+  void Draw(cairo_t* cr, const ImageOperation& operation, const std::string& language);
 
   struct Image {
     std::filesystem::file_time_type written;  // of the file that was read

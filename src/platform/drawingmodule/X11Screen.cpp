@@ -1,71 +1,31 @@
 #include "platform/drawingmodule/X11Screen.h"
 
+#include <X11/XKBlib.h>
+#include <X11/Xatom.h>
 #include <X11/Xutil.h>
-#include <X11/keysym.h>
-#include <cairo-xlib.h>
+#include <X11/cursorfont.h>
 
 #include <algorithm>
 #include <array>
 #include <clocale>
+#include <cmath>
 #include <cstdlib>
 #include <utility>
 
+#include "platform/Text.h"
 #include "platform/desktop/Damage.h"
-#include "platform/desktop/WindowSystem.h"
+#include "platform/drawingmodule/X11Keys.h"
+#include "platform/drawingmodule/X11Picture.h"
 
 namespace panelglow::platform::desktop {
 
 namespace {
 
-struct KeyRow {
-  KeySym symbol;
-  std::uint32_t virtualKey;  // of the home system
-};
-
-// Keys that stand for something else than the character they type.
-constexpr std::array<KeyRow, 14> kKeys{{{XK_BackSpace, 0x08},
-                                        {XK_Tab, 0x09},
-                                        {XK_ISO_Left_Tab, WindowSystem::kShiftTabKey},
-                                        {XK_Return, 0x0D},
-                                        {XK_KP_Enter, 0x0D},
-                                        {XK_Escape, 0x1B},
-                                        {XK_space, 0x20},
-                                        {XK_End, 0x23},
-                                        {XK_Home, 0x24},
-                                        {XK_Left, 0x25},
-                                        {XK_Up, 0x26},
-                                        {XK_Right, 0x27},
-                                        {XK_Down, 0x28},
-                                        {XK_Delete, 0x2E}}};
-
-// Letters and digits have their upper-case character as code.
-std::uint32_t VirtualKeyOf(KeySym symbol) {
-  const auto* row = std::find_if(kKeys.begin(), kKeys.end(), [&](const KeyRow& key) { return key.symbol == symbol; });
-  if (row != kKeys.end()) {
-    return row->virtualKey;
-  }
-  if (symbol >= XK_a && symbol <= XK_z) {
-    return static_cast<std::uint32_t>(symbol - XK_a + 'A');
-  }
-  return symbol < 0x80 ? static_cast<std::uint32_t>(symbol) : 0;
-}
-
-// The first character of a UTF-8 text as one UTF-16 unit, 0 for none and for those that need two.
-char16_t FirstCharacter(const char* text, int length) {
-  if (length <= 0) {
-    return 0;
-  }
-  const auto byte = [&](int i) { return static_cast<unsigned>(static_cast<unsigned char>(text[i])); };
-  if (byte(0) < 0x80) {
-    return static_cast<char16_t>(byte(0));
-  }
-  if ((byte(0) & 0xE0U) == 0xC0 && length >= 2) {
-    return static_cast<char16_t>((byte(0) & 0x1FU) << 6U | (byte(1) & 0x3FU));
-  }
-  if ((byte(0) & 0xF0U) == 0xE0 && length >= 3) {
-    return static_cast<char16_t>((byte(0) & 0x0FU) << 12U | (byte(1) & 0x3FU) << 6U | (byte(2) & 0x3FU));
-  }
-  return 0;
+// The smallest rectangle of whole pixels of the display around an area of the scene.
+Rectangle Scaled(const Rectangle& area, double scale) {
+  const auto down = [&](int value) { return static_cast<int>(std::floor(value * scale)); };
+  const auto up = [&](int value) { return static_cast<int>(std::ceil(value * scale)); };
+  return {down(area.left), down(area.top), up(area.right), up(area.bottom)};
 }
 
 }  // namespace
@@ -84,28 +44,38 @@ std::unique_ptr<X11Screen> X11Screen::Open(std::string& error) {
   return std::unique_ptr<X11Screen>(new X11Screen(display));
 }
 
-X11Screen::X11Screen(::Display* display) : display_(display) {
+X11Screen::X11Screen(::Display* display)
+    : display_(display),
+      nameProperty_(XInternAtom(display, "_NET_WM_NAME", False)),
+      utf8_(XInternAtom(display, "UTF8_STRING", False)),
+      cursor_(XCreateFontCursor(display, XC_left_ptr)) {
   XSetErrorHandler(OnError);
+  XSetIOErrorHandler(OnIoError);
   XSetIOErrorExitHandler(display_, OnGone, this);
+  XkbSetDetectableAutoRepeat(display_, True, nullptr);  // a key that is held is pressed again, not released
   XSetLocaleModifiers("");
   inputMethod_ = XOpenIM(display_, nullptr, nullptr, nullptr);
 }
 
 X11Screen::~X11Screen() {
-  windows_.clear();
-  if (alive_) {
-    if (inputContext_ != nullptr) {
-      XDestroyIC(inputContext_);
-    }
-    if (inputMethod_ != nullptr) {
-      XCloseIM(inputMethod_);
-    }
-    XCloseDisplay(display_);
+  if (!alive_) {
+    return;  // giving up what the display held would be requests to it
   }
+  if (inputContext_ != nullptr) {
+    XDestroyIC(inputContext_);
+  }
+  if (inputMethod_ != nullptr) {
+    XCloseIM(inputMethod_);
+  }
+  XFreeCursor(display_, cursor_);
+  XCloseDisplay(display_);
 }
 
 // A window of ours may be gone by the time a request about it arrives: no reason to end.
 int X11Screen::OnError(::Display* /*display*/, XErrorEvent* /*event*/) { return 0; }
+
+// Both instead of the library's own, which end the process: first this for any display, then OnGone for the one.
+int X11Screen::OnIoError(::Display* /*display*/) { return 0; }
 
 void X11Screen::OnGone(::Display* /*display*/, void* screen) { static_cast<X11Screen*>(screen)->alive_ = false; }
 
@@ -113,30 +83,45 @@ int X11Screen::Width() const { return DisplayWidth(display_, DefaultScreen(displ
 int X11Screen::Height() const { return DisplayHeight(display_, DefaultScreen(display_)); }
 int X11Screen::Descriptor() const { return ConnectionNumber(display_); }
 
-void X11Screen::Place(ShownWindow& shown, WindowHandle handle, const Rectangle& frame) {
+void X11Screen::Place(ShownWindow& shown, const SceneWindow& window) {
+  const Rectangle frame = Scaled(window.frame, scale_);
   const int width = std::max(1, frame.Width());
   const int height = std::max(1, frame.Height());
   const bool isNew = shown.window == 0;
   if (isNew) {
     XSetWindowAttributes attributes{};
     attributes.override_redirect = True;
-    attributes.event_mask = ExposureMask | ButtonPressMask | ButtonReleaseMask | PointerMotionMask | KeyPressMask;
-    shown.window = XCreateWindow(display_, DefaultRootWindow(display_), frame.left, frame.top,
-                                 static_cast<unsigned>(width), static_cast<unsigned>(height), 0, CopyFromParent,
-                                 InputOutput, CopyFromParent, CWOverrideRedirect | CWEventMask, &attributes);
-    XStoreName(display_, shown.window, ("panelglow " + std::to_string(handle)).c_str());
+    attributes.cursor = cursor_;
+    attributes.event_mask = ExposureMask | ButtonPressMask | ButtonReleaseMask | PointerMotionMask | KeyPressMask |
+                            KeyReleaseMask | FocusChangeMask | KeymapStateMask | VisibilityChangeMask;
+    shown.window =
+        XCreateWindow(display_, DefaultRootWindow(display_), frame.left, frame.top, static_cast<unsigned>(width),
+                      static_cast<unsigned>(height), 0, CopyFromParent, InputOutput, CopyFromParent,
+                      CWOverrideRedirect | CWEventMask | CWCursor, &attributes);
+    Name(shown, window.text);
     XMapRaised(display_, shown.window);
-    shown.target.reset(cairo_xlib_surface_create(display_, shown.window,
-                                                 DefaultVisual(display_, DefaultScreen(display_)), width, height));
   } else if (!(shown.frame == frame)) {
     XMoveResizeWindow(display_, shown.window, frame.left, frame.top, static_cast<unsigned>(width),
                       static_cast<unsigned>(height));
-    cairo_xlib_surface_set_size(shown.target.get(), width, height);
   }
   if (isNew || shown.frame.Width() != frame.Width() || shown.frame.Height() != frame.Height()) {
-    shown.picture.reset(cairo_image_surface_create(CAIRO_FORMAT_RGB24, width, height));
+    shown.picture = MakePicture(display_, width, height);
+  }
+  if (!isNew && shown.title != window.text) {
+    Name(shown, window.text);
   }
   shown.frame = frame;
+}
+
+// What lists of windows, and other programs, call the window.
+void X11Screen::Name(ShownWindow& shown, const std::u16string& title) {
+  shown.title = title;
+  const std::string name = title.empty() ? "panelglow-diags" : Utf8FromWide(title);
+  const auto* bytes = reinterpret_cast<const unsigned char*>(name.data());
+  for (const Atom property : {nameProperty_, Atom{XA_WM_NAME}}) {
+    XChangeProperty(display_, shown.window, property, utf8_, 8, PropModeReplace, bytes,
+                    static_cast<int>(name.size()));
+  }
 }
 
 void X11Screen::RemoveAllBut(const std::vector<WindowHandle>& windows) {
@@ -148,19 +133,28 @@ void X11Screen::RemoveAllBut(const std::vector<WindowHandle>& windows) {
     if (inputContext_ != nullptr && inputWindow_ == shown->second.window) {
       XDestroyIC(std::exchange(inputContext_, nullptr));
     }
-    shown->second.target.reset();
     XDestroyWindow(display_, shown->second.window);
     shown = windows_.erase(shown);
   }
 }
 
-void X11Screen::FocusOn(WindowHandle foreground) {
-  const auto front = windows_.find(foreground);
-  const WindowHandle before = std::exchange(foreground_, front == windows_.end() ? 0 : foreground);
-  if (foreground_ == 0 || foreground_ == before) {
+void X11Screen::BringForward(const Scene& scene) {
+  const auto front = windows_.find(scene.foreground);
+  const WindowHandle before = std::exchange(foreground_, front == windows_.end() ? 0 : scene.foreground);
+  if (foreground_ == 0 || (foreground_ == before && request_ == scene.foregroundRequest)) {
     return;
   }
-  XSetInputFocus(display_, front->second.window, RevertToParent, CurrentTime);
+  request_ = scene.foregroundRequest;
+  isLost_ = false;
+  if (foreground_ == before) {
+    RaiseAll();
+    if (!hasFocus_) {
+      FocusOn(front->second.window);
+    }
+    return;
+  }
+  FocusOn(front->second.window);
+  isCovered_ = false;
   if (inputMethod_ != nullptr) {
     if (inputContext_ != nullptr) {
       XDestroyIC(inputContext_);
@@ -171,29 +165,52 @@ void X11Screen::FocusOn(WindowHandle foreground) {
   }
 }
 
+void X11Screen::FocusOn(::Window window) {
+  XSetInputFocus(display_, window, RevertToParent, CurrentTime);
+  hasFocus_ = true;  // until the display says otherwise
+}
+
+void X11Screen::RaiseAll() {
+  for (const WindowHandle handle : order_) {
+    XRaiseWindow(display_, windows_.at(handle).window);
+  }
+}
+
+// After each step the display may be gone, and must not be used any more.
 void X11Screen::Show(const Scene& scene) {
   if (!alive_) {
     return;
   }
+  if (scene.width > 0 && scene.height > 0) {
+    // A screen larger than the display is shown smaller, so that every part of it can be seen.
+    scale_ =
+        std::min({1.0, Width() / static_cast<double>(scene.width), Height() / static_cast<double>(scene.height)});
+  }
   const std::map<WindowHandle, Rectangle> damage = DamageBetween(shown_, scene);
   std::vector<WindowHandle> order;
   for (const SceneWindow& window : scene.windows) {
-    if (window.topLevel == window.handle) {
+    if (alive_ && window.topLevel == window.handle) {
       order.push_back(window.handle);
-      Place(windows_[window.handle], window.handle, window.frame);
+      Place(windows_[window.handle], window);
     }
   }
-  RemoveAllBut(order);
-  if (order != order_) {
-    for (const WindowHandle handle : order) {
-      XRaiseWindow(display_, windows_.at(handle).window);
-    }
+  if (alive_) {
+    RemoveAllBut(order);
+  }
+  if (alive_ && order != order_) {
     order_ = order;
+    RaiseAll();
   }
-  FocusOn(scene.foreground);  // before it is painted: whoever sees the window may type
-  Draw(scene, damage);
+  if (alive_) {
+    BringForward(scene);  // before it is painted: whoever sees the window may type
+  }
+  if (alive_) {
+    Draw(scene, damage);
+  }
   shown_ = scene;
-  XFlush(display_);
+  if (alive_) {
+    XFlush(display_);
+  }
 }
 
 void X11Screen::Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage) {
@@ -203,71 +220,37 @@ void X11Screen::Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>
       continue;
     }
     const ShownWindow& shown = windows_.at(window.topLevel);
-    const Rectangle& area = damaged->second;
+    const Rectangle area = Scaled(damaged->second, scale_);
     const Context context(cairo_create(shown.picture.get()));
     cairo_translate(context.get(), -shown.frame.left, -shown.frame.top);
     cairo_rectangle(context.get(), area.left, area.top, area.Width(), area.Height());
     cairo_clip(context.get());
-    drawing_.DrawWindow(context.get(), window);
+    cairo_scale(context.get(), scale_, scale_);
+    drawing_.DrawWindow(context.get(), window, scene.language);
   }
-  for (const auto& [handle, area] : damage) {
+  for (const auto& [handle, sceneArea] : damage) {
+    if (!alive_) {
+      return;
+    }
     const ShownWindow& shown = windows_.at(handle);
-    Paint(shown, {area.left - shown.frame.left, area.top - shown.frame.top, area.right - shown.frame.left,
-                  area.bottom - shown.frame.top});
+    const Rectangle area = Scaled(sceneArea, scale_);
+    PutPicture(display_, shown.window, shown.picture.get(),
+               {area.left - shown.frame.left, area.top - shown.frame.top, area.right - shown.frame.left,
+                area.bottom - shown.frame.top});
   }
-}
-
-// Copies a part of the picture, in the window's pixels, onto the display.
-void X11Screen::Paint(const ShownWindow& shown, const Rectangle& area) {
-  const Context context(cairo_create(shown.target.get()));
-  cairo_set_source_surface(context.get(), shown.picture.get(), 0, 0);
-  cairo_rectangle(context.get(), area.left, area.top, area.Width(), area.Height());
-  cairo_fill(context.get());
-  cairo_surface_flush(shown.target.get());
 }
 
 std::vector<ScreenEvent> X11Screen::TakeEvents() {
   std::vector<ScreenEvent> events;
-  while (alive_ && XPending(display_) > 0) {
+  while (alive_ && XPending(display_) > 0 && alive_) {
     XEvent event{};
     XNextEvent(display_, &event);
-    if (XFilterEvent(&event, 0) != 0) {
-      continue;
+    if (alive_ && XFilterEvent(&event, 0) == 0) {
+      TakeEvent(event, events);
     }
-    const auto mouse = [&](ScreenEvent::Kind kind, int x, int y) {
-      ScreenEvent taken;
-      taken.kind = kind;
-      taken.x = x;
-      taken.y = y;
-      events.push_back(taken);
-    };
-    switch (event.type) {
-      case Expose:
-        for (const auto& [handle, shown] : windows_) {
-          if (shown.window == event.xexpose.window) {
-            Paint(shown, {event.xexpose.x, event.xexpose.y, event.xexpose.x + event.xexpose.width,
-                          event.xexpose.y + event.xexpose.height});
-          }
-        }
-        break;
-      case ButtonPress:
-      case ButtonRelease:
-        if (event.xbutton.button == Button1) {
-          mouse(event.type == ButtonPress ? ScreenEvent::Kind::kMouseDown : ScreenEvent::Kind::kMouseUp,
-                event.xbutton.x_root, event.xbutton.y_root);
-        }
-        break;
-      case MotionNotify:
-        if ((event.xmotion.state & Button1Mask) != 0) {
-          mouse(ScreenEvent::Kind::kMouseMove, event.xmotion.x_root, event.xmotion.y_root);
-        }
-        break;
-      case KeyPress:
-        TakeKey(event, events);
-        break;
-      default:
-        break;
-    }
+  }
+  if (alive_) {
+    NoteLoss(events);
   }
   if (alive_) {
     XFlush(display_);
@@ -275,11 +258,144 @@ std::vector<ScreenEvent> X11Screen::TakeEvents() {
   return events;
 }
 
+void X11Screen::TakeEvent(XEvent& event, std::vector<ScreenEvent>& events) {
+  const auto mouse = [&](ScreenEvent::Kind kind, int x, int y) {
+    ScreenEvent taken;
+    taken.kind = kind;
+    taken.x = static_cast<int>(x / scale_);
+    taken.y = static_cast<int>(y / scale_);
+    events.push_back(std::move(taken));
+  };
+  const auto front = windows_.find(foreground_);
+  const ::Window frontWindow = front == windows_.end() ? 0 : front->second.window;
+  switch (event.type) {
+    case Expose:
+      for (const auto& [handle, shown] : windows_) {
+        if (shown.window == event.xexpose.window) {
+          PutPicture(display_, shown.window, shown.picture.get(),
+                     {event.xexpose.x, event.xexpose.y, event.xexpose.x + event.xexpose.width,
+                      event.xexpose.y + event.xexpose.height});
+        }
+      }
+      break;
+    case ButtonPress:
+      if (frontWindow != 0) {
+        FocusOn(event.xbutton.window);
+      }
+      [[fallthrough]];
+    case ButtonRelease:
+      if (event.xbutton.button == Button1) {
+        mouse(event.type == ButtonPress ? ScreenEvent::Kind::kMouseDown : ScreenEvent::Kind::kMouseUp,
+              event.xbutton.x_root, event.xbutton.y_root);
+      }
+      break;
+    case MotionNotify:
+      if ((event.xmotion.state & Button1Mask) != 0) {
+        mouse(ScreenEvent::Kind::kMouseMove, event.xmotion.x_root, event.xmotion.y_root);
+      }
+      break;
+    case KeyPress:
+    case KeyRelease:
+      TakeKey(event, events);
+      break;
+    case KeymapNotify:  // follows each focus: keys that were pressed or released elsewhere
+      for (std::size_t code = 0; code < keysDown_.size(); ++code) {
+        const auto byte = static_cast<unsigned>(static_cast<unsigned char>(event.xkeymap.key_vector[code / 8]));
+        keysDown_.set(code, (byte >> code % 8 & 1U) != 0);
+      }
+      break;
+    case FocusIn:
+    case FocusOut: {
+      const XFocusChangeEvent& focus = event.xfocus;
+      const bool isGrab = focus.mode == NotifyGrab || focus.mode == NotifyUngrab;
+      if (focus.window == frontWindow && !isGrab && focus.detail != NotifyPointer && focus.detail != NotifyInferior) {
+        hasFocus_ = event.type == FocusIn;
+      }
+      break;
+    }
+    case VisibilityNotify:
+      if (event.xvisibility.window == frontWindow) {
+        isCovered_ = event.xvisibility.state != VisibilityUnobscured && !IsUnderOwnWindow();
+      }
+      break;
+    default:
+      break;
+  }
+}
+
+// True when a window of ours lies on the foreground one.
+bool X11Screen::IsUnderOwnWindow() const {
+  const auto place = std::find(order_.begin(), order_.end(), foreground_);
+  return place != order_.end() && std::any_of(place + 1, order_.end(), [&](WindowHandle above) {
+           return !(Common(windows_.at(above).frame, windows_.at(foreground_).frame) == Rectangle{});
+         });
+}
+
+// Says once that the foreground is another program's now: until it is asked for again.
+void X11Screen::NoteLoss(std::vector<ScreenEvent>& events) {
+  isLost_ = isLost_ && (!hasFocus_ || isCovered_);  // it may come back by itself
+  if (foreground_ == 0 || isLost_ || (hasFocus_ && !isCovered_)) {
+    return;
+  }
+  ::Window focused = windows_.at(foreground_).window;
+  if (!hasFocus_) {
+    int revertTo = 0;
+    XGetInputFocus(display_, &focused, &revertTo);
+    hasFocus_ = focused == windows_.at(foreground_).window;  // when the loss is an old story
+    if (hasFocus_ && !isCovered_) {
+      return;
+    }
+  }
+  ScreenEvent lost;
+  lost.kind = ScreenEvent::Kind::kForegroundLost;
+  lost.title = hasFocus_ ? std::u16string() : TitleOf(focused);
+  events.push_back(std::move(lost));
+  isLost_ = true;
+  isCovered_ = false;
+}
+
+// The title of a window, or of the nearest one around it that has one.
+std::u16string X11Screen::TitleOf(::Window window) const {
+  constexpr long kLongestTitle = 1024;  // in units of four bytes
+  constexpr int kMostLevels = 16;
+  for (int level = 0; alive_ && level < kMostLevels && window > PointerRoot; ++level) {
+    for (const Atom property : {nameProperty_, Atom{XA_WM_NAME}}) {
+      Atom type = 0;
+      int format = 0;
+      unsigned long length = 0;
+      unsigned long left = 0;
+      unsigned char* bytes = nullptr;
+      const int failed = XGetWindowProperty(display_, window, property, 0, kLongestTitle, False, AnyPropertyType,
+                                            &type, &format, &length, &left, &bytes);
+      std::u16string title;
+      if (failed == 0 && bytes != nullptr && format == 8) {
+        title = WideFromUtf8({reinterpret_cast<const char*>(bytes), length});
+      }
+      if (bytes != nullptr) {
+        XFree(bytes);
+      }
+      if (!title.empty()) {
+        return title;
+      }
+    }
+    ::Window root = 0;
+    ::Window parent = 0;
+    ::Window* children = nullptr;
+    unsigned count = 0;
+    const bool known = XQueryTree(display_, window, &root, &parent, &children, &count) != 0;
+    if (children != nullptr) {
+      XFree(children);
+    }
+    window = known && parent != root ? parent : 0;
+  }
+  return {};
+}
+
 void X11Screen::TakeKey(XEvent& event, std::vector<ScreenEvent>& events) {
   std::array<char, 32> text{};
   KeySym symbol = NoSymbol;
   int length = 0;
-  if (inputContext_ != nullptr) {
+  if (event.type == KeyPress && inputContext_ != nullptr) {
     Status status = 0;
     length =
         Xutf8LookupString(inputContext_, &event.xkey, text.data(), static_cast<int>(text.size()), &symbol, &status);
@@ -293,8 +409,20 @@ void X11Screen::TakeKey(XEvent& event, std::vector<ScreenEvent>& events) {
   taken.virtualKey = VirtualKeyOf(symbol);
   taken.character = FirstCharacter(text.data(), length);
   taken.alt = (event.xkey.state & Mod1Mask) != 0;
+  // A text that an input method made has no key.
+  const std::size_t code = event.xkey.keycode;
+  const bool hasKey = code > 0 && code < keysDown_.size();
+  if (event.type == KeyRelease) {
+    taken.kind = ScreenEvent::Kind::kKeyUp;
+    taken.character = 0;
+  } else {
+    taken.repeat = hasKey && keysDown_.test(code);
+  }
+  if (hasKey) {
+    keysDown_.set(code, event.type == KeyPress);
+  }
   if (taken.virtualKey != 0 || taken.character != 0) {
-    events.push_back(taken);
+    events.push_back(std::move(taken));
   }
 }
 

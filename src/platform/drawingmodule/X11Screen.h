@@ -4,6 +4,7 @@
 
 #include <X11/Xlib.h>
 
+#include <bitset>
 #include <map>
 #include <memory>
 #include <string>
@@ -33,30 +34,46 @@ class X11Screen : public Screen {
  private:
   struct ShownWindow {
     ::Window window = 0;
-    Rectangle frame;
+    Rectangle frame;  // pixels of the display
+    std::u16string title;
     Surface picture;  // what the window shows, for exposures
-    Surface target;   // the window itself
   };
 
   explicit X11Screen(::Display* display);
 
-  void Place(ShownWindow& shown, WindowHandle handle, const Rectangle& frame);
+  void Place(ShownWindow& shown, const SceneWindow& window);
+  void Name(ShownWindow& shown, const std::u16string& title);
   void RemoveAllBut(const std::vector<WindowHandle>& windows);
-  void FocusOn(WindowHandle foreground);
+  void BringForward(const Scene& scene);
+  void FocusOn(::Window window);
+  void RaiseAll();
   void Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage);
-  static void Paint(const ShownWindow& shown, const Rectangle& area);
+  void TakeEvent(XEvent& event, std::vector<ScreenEvent>& events);
   void TakeKey(XEvent& event, std::vector<ScreenEvent>& events);
+  void NoteLoss(std::vector<ScreenEvent>& events);
+  [[nodiscard]] bool IsUnderOwnWindow() const;
+  [[nodiscard]] std::u16string TitleOf(::Window window) const;
   static int OnError(::Display* display, XErrorEvent* event);
+  static int OnIoError(::Display* display);
   static void OnGone(::Display* display, void* screen);
 
   ::Display* display_;
+  Atom nameProperty_;
+  Atom utf8_;
+  Cursor cursor_;
   ::XIM inputMethod_ = nullptr;
   ::XIC inputContext_ = nullptr;
   ::Window inputWindow_ = 0;
   bool alive_ = true;
   std::map<WindowHandle, ShownWindow> windows_;
   std::vector<WindowHandle> order_;
+  double scale_ = 1;             // pixels of the display for one of the scene
   WindowHandle foreground_ = 0;  // of the windows that are shown
+  std::uint64_t request_ = 0;    // for the foreground, that was followed last
+  bool hasFocus_ = false;        // the foreground window has the keyboard
+  bool isCovered_ = false;       // a window of another program lies on it
+  bool isLost_ = false;          // one of the two was told
+  std::bitset<256> keysDown_;    // by key code
   Scene shown_;
   CairoDrawing drawing_;
 };

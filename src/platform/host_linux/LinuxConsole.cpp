@@ -16,7 +16,8 @@ namespace panelglow::platform::host_linux {
 
 namespace {
 
-void WriteAll(int fd, std::string_view bytes) {
+// The error of the write that failed, 0 for none.
+int WriteAll(int fd, std::string_view bytes) {
   while (!bytes.empty()) {
     const ssize_t written = ::write(fd, bytes.data(), bytes.size());
     if (written >= 0) {
@@ -26,9 +27,10 @@ void WriteAll(int fd, std::string_view bytes) {
       pollfd ready{fd, POLLOUT, 0};
       ::poll(&ready, 1, -1);
     } else if (errno != EINTR) {
-      return;
+      return errno;
     }
   }
+  return 0;
 }
 
 sigset_t ControlSignals() {
@@ -36,6 +38,11 @@ sigset_t ControlSignals() {
   ::sigemptyset(&signals);
   ::sigaddset(&signals, SIGINT);
   ::sigaddset(&signals, SIGTERM);
+  ::sigaddset(&signals, SIGQUIT);
+  struct sigaction hangUp {};
+  if (::sigaction(SIGHUP, nullptr, &hangUp) != 0 || hangUp.sa_handler != SIG_IGN) {
+    ::sigaddset(&signals, SIGHUP);
+  }
   return signals;
 }
 
@@ -46,7 +53,13 @@ LinuxConsole::LinuxConsole() { std::signal(SIGPIPE, SIG_IGN); }
 void LinuxConsole::Write(std::string_view bytes) {
   CurrentThread::CheckEndRequest();
   const std::lock_guard<std::mutex> lock(output_);
-  WriteAll(STDOUT_FILENO, bytes);
+  const int error = WriteAll(STDOUT_FILENO, bytes);
+  outputError_ = outputError_ == 0 ? error : outputError_;
+}
+
+std::string LinuxConsole::OutputProblem() {
+  const std::lock_guard<std::mutex> lock(output_);
+  return outputError_ == 0 ? std::string() : std::generic_category().message(outputError_);
 }
 
 void LinuxConsole::WriteError(std::string_view bytes) { WriteAll(STDERR_FILENO, bytes); }

@@ -7,14 +7,16 @@
 
 namespace panelglow::platform::host_linux {
 
-/// SIGINT is control type 0, SIGTERM type 1. Once a handler is installed neither ends the process, whatever the
-/// handler answers. Has to outlive the program's threads.
+/// SIGINT is control type 0; SIGTERM, SIGQUIT and SIGHUP (the terminal was closed) are type 1. Once a handler is
+/// installed none of them ends the process, whatever the handler answers; a SIGHUP that whoever started the program
+/// had it ignore, as nohup does, stays ignored. Has to outlive the program's threads.
 class LinuxConsole : public Console {
  public:
   /// A reader that goes away is no signal any more, but an error that Write overlooks.
   LinuxConsole();
 
   void Write(std::string_view bytes) override;
+  std::string OutputProblem() override;
   void WriteError(std::string_view bytes) override;
 
   /// Waits for a handler that runs. An empty handler lets all later events pass unnoticed.
@@ -24,7 +26,8 @@ class LinuxConsole : public Console {
   void StartListening();
   void Listen();
 
-  std::mutex output_;  // keeps lines whole that the system takes in pieces
+  std::mutex output_;    // keeps lines whole that the system takes in pieces
+  int outputError_ = 0;  // of the first write that failed; by output_
   std::mutex handlerGuard_;
   std::function<bool(std::uint32_t)> handler_;  // by handlerGuard_
   bool isArmed_ = false;                        // by handlerGuard_

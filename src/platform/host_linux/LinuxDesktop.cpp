@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdio>
 #include <string>
+#include <system_error>
 #include <thread>
 #include <utility>
 
@@ -25,9 +26,7 @@ void LinuxDesktop::Open() {
     screen_.reset(open(&error));
   }
   if (!screen_) {
-    const std::string line = "panelglow-diags: windows cannot be shown: " + error + "\n";
-    std::fputs(line.c_str(), stderr);
-    windows_ = std::make_unique<desktop::WindowSystem>(host_, 0, 0);
+    OpenNone(error);
     return;
   }
   windows_ = std::make_unique<desktop::WindowSystem>(host_, screen_->Width(), screen_->Height());
@@ -38,8 +37,22 @@ void LinuxDesktop::Open() {
   sigset_t before;
   ::sigfillset(&all);
   ::pthread_sigmask(SIG_SETMASK, &all, &before);
-  std::thread([this] { RunScreen(); }).detach();
+  try {
+    std::thread([this] { RunScreen(); }).detach();
+  } catch (const std::system_error& failure) {
+    screen_.reset();
+    OpenNone(std::string("no thread for it starts: ") + failure.what());
+  }
   ::pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
+
+// The first of the two sentences that people may get about the display.
+void LinuxDesktop::OpenNone(const std::string& reason) {
+  const std::string line = "panelglow-diags: no window can be shown, since " + reason +
+                           ". Prompts are passed over and the LED test ends unanswered: start it in a session with a "
+                           "display, or set DISPLAY.\n";
+  std::fputs(line.c_str(), stderr);
+  windows_ = std::make_unique<desktop::WindowSystem>(host_, 0, 0);
 }
 
 template <class Use>
@@ -74,22 +87,6 @@ void LinuxDesktop::NoteChanges() {
   }
 }
 
-void LinuxDesktop::Inject(const desktop::ScreenEvent& event) {
-  using Kind = desktop::ScreenEvent::Kind;
-  switch (event.kind) {
-    case Kind::kMouseDown:
-    case Kind::kMouseUp:
-      windows_->MouseButton(event.x, event.y, event.kind == Kind::kMouseDown);
-      break;
-    case Kind::kMouseMove:
-      windows_->MouseMove(event.x, event.y);
-      break;
-    case Kind::kKey:
-      windows_->Key(event.virtualKey, event.character, event.alt);
-      break;
-  }
-}
-
 void LinuxDesktop::RunScreen() {
   DeviceEvents devices;
   std::uint64_t shown = 0;
@@ -108,7 +105,7 @@ void LinuxDesktop::RunScreen() {
     {
       const LinuxWindowHost::Guard guard(host_);
       for (const desktop::ScreenEvent& event : events) {
-        Inject(event);
+        windows_->Take(event);
       }
       for (const std::uint32_t event : devices.Take()) {
         windows_->Broadcast(message::kDeviceChange, event);
@@ -122,7 +119,12 @@ void LinuxDesktop::RunScreen() {
       screen_->Show(scene);
     }
   }
-  std::fputs("panelglow-diags: the display is gone\n", stderr);
+  std::fputs(
+      "panelglow-diags: the display is gone. Open windows end unanswered and the LEDs are put back: start the test "
+      "again when there is a display.\n",
+      stderr);
+  const LinuxWindowHost::Guard guard(host_);
+  windows_->LoseScreen();
 }
 
 int LinuxDesktop::ScreenWidth() {
@@ -252,6 +254,10 @@ WindowHandle LinuxDesktop::ForegroundWindow() {
 
 void LinuxDesktop::SetActiveWindow(WindowHandle window) {
   return With([&](Desktop& desktop) { return desktop.SetActiveWindow(window); });
+}
+
+void LinuxDesktop::SetLanguage(std::string_view locale) {
+  return With([&](Desktop& desktop) { return desktop.SetLanguage(locale); });
 }
 
 void LinuxDesktop::AttachInput(WindowHandle other, bool attach) {

@@ -1,10 +1,11 @@
 // The windows of this machine: the window logic under a lock, shown on the display that DISPLAY names. The display is
 // opened, and a thread for it started, when the first thing is asked of this object; without a display every window
-// fails to be made.
+// fails to be made, and when the display goes away every message loop ends.
 #pragma once
 
 #include <memory>
 #include <mutex>
+#include <string>
 
 #include "platform/Desktop.h"
 #include "platform/desktop/Screen.h"
@@ -52,6 +53,7 @@ class LinuxDesktop : public Desktop {
   bool SetForegroundWindow(WindowHandle window) override;
   WindowHandle ForegroundWindow() override;
   void SetActiveWindow(WindowHandle window) override;
+  void SetLanguage(std::string_view locale) override;
   void AttachInput(WindowHandle other, bool attach) override;
   std::uint32_t SetTimer(WindowHandle window, std::uint32_t timer, std::uint32_t period_ms,
                          TimerProcedure procedure) override;
@@ -77,7 +79,7 @@ class LinuxDesktop : public Desktop {
 
   void Open();
   void RunScreen();
-  void Inject(const desktop::ScreenEvent& event);
+  void OpenNone(const std::string& reason);
   void NoteChanges();
 
   posix::LazyDrawing& drawing_;

@@ -36,7 +36,7 @@ struct LinuxHost {
   LinuxMutexes mutexes;
   profile::ProfileFilesOnFiles profiles{files};
   LinuxThreads threads;
-  posix::LazyXmlDocuments xmlDocuments;
+  posix::LazyXmlDocuments xmlDocuments{files};
   AbsentDevices devices;
   Host host{.cameras = devices,
             .clock = clock,

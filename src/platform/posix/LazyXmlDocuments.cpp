@@ -9,10 +9,10 @@ namespace panelglow::platform::posix {
 
 std::unique_ptr<XmlDocument> LazyXmlDocuments::Create() {
   std::call_once(once_, [this] {
-    using Getter = XmlDocuments* (*)();
+    using Maker = XmlDocuments* (*)(Files&);
     std::string error;
-    if (const auto get = reinterpret_cast<Getter>(LoadSymbol("panelglow-xml", "PanelglowXmlDocuments", error))) {
-      documents_ = get();
+    if (const auto make = reinterpret_cast<Maker>(LoadSymbol("panelglow-xml", "PanelglowXmlDocumentsOnFiles", error))) {
+      documents_.reset(make(files_));
     } else {
       std::fprintf(stderr, "structured documents are not available: %s\n", error.c_str());
     }

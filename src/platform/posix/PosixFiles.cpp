@@ -15,6 +15,7 @@
 #include <thread>
 
 #include "platform/posix/Descriptor.h"
+#include "platform/posix/TemporaryFile.h"
 
 namespace panelglow::platform::posix {
 
@@ -93,14 +94,6 @@ bool WriteAll(int fd, std::string_view bytes) {
   return true;
 }
 
-// True while `fd` is still the file that `path` names: another writer may have put a new one in its place.
-bool IsCurrent(int fd, const std::string& path) {
-  struct stat opened {};
-  struct stat named {};
-  return ::fstat(fd, &opened) == 0 && ::stat(path.c_str(), &named) == 0 && opened.st_ino == named.st_ino &&
-         opened.st_dev == named.st_dev;
-}
-
 // Opens and locks; without the lock when it is not to be had in time. `pause` lets some time pass between two tries.
 Descriptor OpenLocked(const std::string& path, int flags, const std::function<void()>& pause) {
   Descriptor file = OpenRegular(path, flags);
@@ -124,23 +117,19 @@ enum class Replacement { kDone, kNoSpace, kNotPossible };
 // Puts a new file with `bytes` in the place of `path`, with the owner and the rights of the old one. Otherwise
 // nothing is changed: the bytes found no space, or the folder does not take a new file under this name.
 Replacement ReplaceFile(const std::string& path, std::string_view bytes, const struct stat& old) {
-  std::string temporary = path + ".XXXXXX";
-  const Descriptor file(::mkostemp(temporary.data(), O_CLOEXEC));
+  TemporaryFile file(path);
   if (!file) {
     return Replacement::kNotPossible;
   }
-  Replacement result = Replacement::kNotPossible;
-  struct stat made {};
   if (!WriteAll(file.Get(), bytes) || ::fsync(file.Get()) != 0) {
-    result = Replacement::kNoSpace;
-  } else if (::fstat(file.Get(), &made) == 0 &&
-             ((made.st_uid == old.st_uid && made.st_gid == old.st_gid) ||
-              ::fchown(file.Get(), old.st_uid, old.st_gid) == 0) &&
-             ::fchmod(file.Get(), old.st_mode & 07777U) == 0 && ::rename(temporary.c_str(), path.c_str()) == 0) {
-    return Replacement::kDone;
+    return Replacement::kNoSpace;
   }
-  ::unlink(temporary.c_str());
-  return result;
+  struct stat made {};
+  const bool done = ::fstat(file.Get(), &made) == 0 &&
+                    ((made.st_uid == old.st_uid && made.st_gid == old.st_gid) ||
+                     ::fchown(file.Get(), old.st_uid, old.st_gid) == 0) &&
+                    ::fchmod(file.Get(), old.st_mode & 07777U) == 0 && file.TakePlace();
+  return done ? Replacement::kDone : Replacement::kNotPossible;
 }
 
 // Writes into the file itself; puts the old content back when that fails half-way.

@@ -35,6 +35,14 @@ std::string WideBytes(std::u16string_view text) {
   return bytes;
 }
 
+// `edited` in the form of the file that `bytes` are; just these when the text is the same.
+std::string WideEdit(const std::string& bytes, const wstring& edited) {
+  if (edited == WideOf(bytes)) {
+    return bytes;
+  }
+  return IsWide(bytes) ? WideBytes(edited) : CodePageFromWide(edited);
+}
+
 std::optional<wstring> Widened(std::optional<std::string_view> text) {
   return text ? std::optional<wstring>(WideFromCodePage(*text)) : std::nullopt;
 }
@@ -91,38 +99,31 @@ std::size_t ProfileFilesOnFiles::GetSection(std::string_view section, std::span<
 
 bool ProfileFilesOnFiles::SetValue(std::string_view section, std::optional<std::string_view> key,
                                    std::optional<std::string_view> value, std::string_view path) {
-  const std::optional<std::string> bytes = ReadToEdit(path);
-  if (!bytes) {
-    return false;
-  }
-  if (!IsWide(*bytes)) {
-    return files_.WriteLocked(path, WithValue<char>(*bytes, section, key, value));
-  }
   const std::optional<wstring> wideKey = Widened(key);
   const std::optional<wstring> wideValue = Widened(value);
-  return files_.WriteLocked(
-      path, WideBytes(WithValue<char16_t>(WideOf(*bytes), WideFromCodePage(section), wideKey, wideValue)));
+  const wstring wideSection = WideFromCodePage(section);
+  return Edit(path, [&](const std::string& bytes) {
+    return IsWide(bytes) ? WideEdit(bytes, WithValue<char16_t>(WideOf(bytes), wideSection, wideKey, wideValue))
+                         : WithValue<char>(bytes, section, key, value);
+  });
 }
 
 bool ProfileFilesOnFiles::SetValue(std::u16string_view section, std::optional<std::u16string_view> key,
                                    std::optional<std::u16string_view> value, std::u16string_view path) {
-  const std::string file = Utf8FromWide(path);
-  const std::optional<std::string> bytes = ReadToEdit(file);
-  if (!bytes) {
-    return false;
-  }
-  const wstring edited = WithValue<char16_t>(WideOf(*bytes), section, key, value);
-  return files_.WriteLocked(file, IsWide(*bytes) ? WideBytes(edited) : CodePageFromWide(edited));
+  return Edit(Utf8FromWide(path), [&](const std::string& bytes) {
+    return WideEdit(bytes, WithValue<char16_t>(WideOf(bytes), section, key, value));
+  });
 }
 
-// An absent file is edited like an empty one. One that is there but cannot be read must not be replaced by its one
-// new line.
-std::optional<std::string> ProfileFilesOnFiles::ReadToEdit(std::string_view path) {
-  std::optional<std::string> bytes = files_.ReadLocked(path);
-  if (!bytes && !files_.CanRead(path)) {
-    bytes.emplace();
+// An absent file is edited like an empty one, and made. One that is there but cannot be read must not be replaced by
+// its one new line, and one that stays the same is not written.
+bool ProfileFilesOnFiles::Edit(std::string_view path, const std::function<std::string(const std::string&)>& edit) {
+  const std::optional<std::string> bytes = files_.ReadLocked(path);
+  if (!bytes && files_.CanRead(path)) {
+    return false;
   }
-  return bytes;
+  const std::string edited = edit(bytes.value_or(std::string()));
+  return (bytes && edited == *bytes) || files_.WriteLocked(path, edited);
 }
 
 }  // namespace panelglow::platform::profile

@@ -1,6 +1,7 @@
 // The profile services over the files of any backend. Nothing is cached: each call reads the file anew.
 #pragma once
 
+#include <functional>
 #include <string>
 
 #include "platform/Files.h"
@@ -23,7 +24,7 @@ class ProfileFilesOnFiles : public ProfileFiles {
                 std::optional<std::u16string_view> value, std::u16string_view path) override;
 
  private:
-  std::optional<std::string> ReadToEdit(std::string_view path);
+  bool Edit(std::string_view path, const std::function<std::string(const std::string&)>& edit);
 
   Files& files_;
 };

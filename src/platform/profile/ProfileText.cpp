@@ -10,6 +10,9 @@ template <class Char>
 using View = std::basic_string_view<Char>;
 
 template <class Char>
+constexpr Char kBlanks[] = {Char(' '), Char('\t'), Char(0)};
+
+template <class Char>
 constexpr bool IsBlank(Char c) {
   return c == Char(' ') || c == Char('\t');
 }
@@ -86,7 +89,8 @@ std::optional<Header<Char>> NextHeader(View<Char> text, std::size_t from) {
     const std::size_t end = LineEnd(text, bracket);
     const std::size_t close = text.substr(0, end).find(Char(']'), bracket);
     if (close != View<Char>::npos) {
-      return Header<Char>{line, NextLine(text, end), TrimBlanks(text.substr(bracket + 1, close - bracket - 1))};
+      return Header<Char>{line, NextLine(text, end),
+                          TrimBlanks(BeforeNul(text.substr(bracket + 1, close - bracket - 1)))};
     }
   }
   return std::nullopt;
@@ -116,11 +120,11 @@ struct Line {
   std::size_t begin = 0;
   std::size_t end = 0;                    // position of the line end
   std::size_t next = 0;                   // begin of the next line
-  View<Char> content;                     // without blanks around it
+  View<Char> content;                     // up to a NUL, without blanks around it
   std::size_t equals = View<Char>::npos;  // in content
 
   [[nodiscard]] View<Char> Key() const { return TrimBlanks(content.substr(0, equals)); }
-  [[nodiscard]] View<Char> Value() const { return TrimBlanks(BeforeNul(content.substr(equals + 1))); }
+  [[nodiscard]] View<Char> Value() const { return TrimBlanks(content.substr(equals + 1)); }
   [[nodiscard]] bool IsEntry() const { return equals != View<Char>::npos; }
 };
 
@@ -132,7 +136,7 @@ void EachLine(View<Char> text, std::size_t begin, std::size_t end, Use use) {
     line.begin = at;
     line.end = std::min(LineEnd(text, at), end);
     line.next = NextLine(text, line.end);
-    line.content = TrimBlanks(text.substr(at, line.end - at));
+    line.content = TrimBlanks(BeforeNul(text.substr(at, line.end - at)));
     at = line.next;
     if (line.content.empty() || line.content.front() == Char(';')) {
       continue;
@@ -149,6 +153,14 @@ View<Char> WithoutQuotes(View<Char> value) {
   const bool quoted = value.size() >= 2 && value.front() == value.back() &&
                       (value.front() == Char('"') || value.front() == Char('\''));
   return quoted ? value.substr(1, value.size() - 2) : value;
+}
+
+// An empty name would end the list.
+template <class Char>
+void AppendName(std::basic_string<Char>& list, View<Char> name) {
+  if (!name.empty()) {
+    list.append(name).push_back(Char(0));
+  }
 }
 
 template <class Char>
@@ -182,7 +194,7 @@ template <class Char>
 std::basic_string<Char> SectionNames(View<Char> text) {
   std::basic_string<Char> names;
   for (std::optional<Header<Char>> header = NextHeader(text, 0); header; header = NextHeader(text, header->body)) {
-    names.append(header->name).push_back(Char(0));
+    AppendName(names, header->name);
   }
   return names;
 }
@@ -193,7 +205,7 @@ std::basic_string<Char> KeyNames(View<Char> text, View<Char> section) {
   if (const std::optional<Section<Char>> found = FindSection(text, section)) {
     EachLine(text, found->body, found->end, [&](const Line<Char>& line) {
       if (line.IsEntry()) {
-        names.append(line.Key()).push_back(Char(0));
+        AppendName(names, line.Key());
       }
       return false;
     });
@@ -211,7 +223,7 @@ std::basic_string<Char> SectionLines(View<Char> text, View<Char> section) {
         lines.push_back(Char('='));
         lines.append(line.Value());
       } else {
-        lines.append(BeforeNul(line.content));
+        lines.append(line.content);
       }
       lines.push_back(Char(0));
       return false;
@@ -231,8 +243,7 @@ std::basic_string<Char> WithValue(View<Char> text, View<Char> section, std::opti
   }
   std::basic_string<Char> entry;
   if (value) {
-    entry.append(TrimBlanks(*key));
-    entry.push_back(Char('='));
+    entry.append(TrimBlanks(*key)).push_back(Char('='));
     entry.append(*value);
   }
   if (!found) {
@@ -256,9 +267,15 @@ std::basic_string<Char> WithValue(View<Char> text, View<Char> section, std::opti
     }
     return old.has_value();
   });
+  if (old && value) {
+    // The key keeps its spelling and the blanks around it.
+    const View<Char> rest = text.substr(text.find(Char('='), old->begin) + 1);
+    const std::size_t blanks = std::min(rest.find_first_not_of(kBlanks<Char>), rest.size());
+    const std::size_t from = std::min(text.size() - rest.size() + blanks, old->end);
+    return result.replace(from, old->end - from, *value);
+  }
   if (old) {
-    return value ? result.replace(old->begin, old->end - old->begin, entry)
-                 : result.erase(old->begin, old->next - old->begin);
+    return result.erase(old->begin, old->next - old->begin);
   }
   if (value) {
     if (behindLast > 0 && !IsLineEnd(result[behindLast - 1])) {

@@ -65,22 +65,26 @@ class Section {
     return Get<std::string>(key, {});
   }
 
-  std::vector<std::uint8_t> Bytes(std::string_view key) {
-    std::vector<std::uint8_t> bytes;
+  std::vector<std::uint8_t> Bytes(std::string_view key) { return Numbers<std::uint8_t>(key); }
+
+  template <class Number>
+  std::vector<Number> Numbers(std::string_view key) {
+    std::vector<Number> numbers;
     if (const toml::node* node = Node(key)) {
       const toml::array* array = node->as_array();
       if (array == nullptr) {
-        Fail(*node, "\"" + path_ + std::string(key) + "\" must be a list of bytes");
+        Fail(*node, "\"" + path_ + std::string(key) + "\" must be a list of numbers");
       }
       for (const toml::node& element : *array) {
-        const std::optional<std::uint8_t> byte = element.value<std::uint8_t>();
-        if (!byte) {
-          Fail(element, "\"" + path_ + std::string(key) + "\" holds a value that is no byte");
+        const std::optional<Number> number = element.value<Number>();
+        if (!number) {
+          Fail(element, "\"" + path_ + std::string(key) + "\" holds a value that is no number of " +
+                            std::to_string(8 * sizeof(Number)) + " bits");
         }
-        bytes.push_back(*byte);
+        numbers.push_back(*number);
       }
     }
-    return bytes;
+    return numbers;
   }
 
   /// Calls `use` with each table of a list of tables, or with the one table under `key`.
@@ -141,23 +145,29 @@ class Section {
     Refuse(key, "must be one of " + all);
   }
 
-  /// The table under `key`: hexadecimal addresses without 0x, each with a byte.
-  template <class Address>
-  std::map<Address, std::uint8_t> AddressedBytes(std::string_view key) {
-    std::map<Address, std::uint8_t> bytes;
+  /// The table under `key`: hexadecimal addresses without 0x, each with a number.
+  template <class Address, class Number>
+  std::map<Address, Number> Addressed(std::string_view key) {
+    std::map<Address, Number> numbers;
     Each(key, [&](Section& section) {
       for (const auto& [name, node] : section.Raw()) {
         Address address = 0;
         const std::string_view digits = name.str();
         const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), address, 16);
-        const std::optional<std::uint8_t> value = node.template value<std::uint8_t>();
+        const std::optional<Number> value = node.template value<Number>();
         if (error != std::errc() || end != digits.data() + digits.size() || !value) {
-          section.Fail(node, "\"" + path_ + std::string(key) + "\" holds hexadecimal addresses with one byte each");
+          section.Fail(node, "\"" + path_ + std::string(key) + "\" holds hexadecimal addresses with one number of " +
+                                 std::to_string(8 * sizeof(Number)) + " bits each");
         }
-        bytes[address] = *value;
+        numbers[address] = *value;
       }
     });
-    return bytes;
+    return numbers;
+  }
+
+  template <class Address>
+  std::map<Address, std::uint8_t> AddressedBytes(std::string_view key) {
+    return Addressed<Address, std::uint8_t>(key);
   }
 
   [[nodiscard]] const toml::table& Raw() {

@@ -40,13 +40,18 @@ class Device {
   /// nothing for a device that only answers accesses.
   [[nodiscard]] virtual std::optional<Microseconds> NextEvent() const { return {}; }
 
+  /// When what the device has under way (a step of its firmware, a command on its link) comes to its end; nothing
+  /// when nothing is, or when it never will. A lamp that blinks is not under way: it is a state.
+  [[nodiscard]] virtual std::optional<Microseconds> UnderWayUntil() const { return {}; }
+
   /// Lets the device do what it has had to do by now. It is called when NextEvent() has come, not before each access.
   virtual void Advance() {}
 
   /// The address (port or memory) whose writes move a pin, for the fault "a write that lies".
   [[nodiscard]] virtual std::optional<std::uint64_t> RegisterOf(std::string_view /*pin*/) const { return {}; }
 
-  /// All register contents as text, one per line: what a run must leave as it found it.
+  /// All register contents as text, one per line: what a run must leave as it found it. Of a device that has
+  /// something under way it tells only what it has done so far.
   [[nodiscard]] virtual std::string State() const = 0;
 };
 

@@ -106,8 +106,11 @@ void ReadDisk(Section& section, MachineDescription& machine) {
     section.Refuse("controller", "names no [[controller]]");
   }
   disk.instanceId = InstanceId(section);
-  disk.path = section.Get<std::string>("path", "\\\\.\\PHYSICALDRIVE" + std::to_string(machine.disks.size()));
   disk.interfacePath = section.Get<std::string>("interface_path", DiskInterfacePath(disk.instanceId));
+  const auto drives = std::count_if(machine.disks.begin(), machine.disks.end(),
+                                    [](const DiskSetup& other) { return !other.interfacePath.empty(); });
+  disk.path = section.Get<std::string>(
+      "path", disk.interfacePath.empty() ? "" : "\\\\.\\PHYSICALDRIVE" + std::to_string(drives));
   disk.description = section.Get<std::string>("description", "Disk drive");
   disk.size_bytes = section.Get<std::uint64_t>("size", kDefaultDiskBytes);
   disk.latency_us = section.Get<std::uint32_t>("latency_us", kDefaultLatency_us);

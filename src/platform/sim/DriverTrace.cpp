@@ -2,16 +2,15 @@
 
 #include <array>
 
+#include "platform/DriverRecords.h"
+
 namespace panelglow::platform::sim {
 
 namespace {
 
+// A field of a record, 0 where the record is too short for it.
 std::uint64_t Number(const std::vector<std::byte>& bytes, std::size_t offset, std::size_t width) {
-  std::uint64_t value = 0;
-  for (std::size_t i = 0; i < width && offset + i < bytes.size(); ++i) {
-    value |= std::to_integer<std::uint64_t>(bytes[offset + i]) << (8 * i);
-  }
-  return value;
+  return offset + width <= bytes.size() ? driver::NumberAt(bytes, offset, width) : 0;
 }
 
 std::string Hex(std::uint64_t value, int digits) {
@@ -35,19 +34,19 @@ std::string Describe(const DriverRequest& request) {
       "simulated " + std::to_string(request.time) + " us thread " + std::to_string(request.thread) + " ";
   const std::string failed = request.result == 0 ? "" : " error " + std::to_string(request.result);
   switch (request.code) {
-    case 0x220004:
-    case 0x220008:
-    case 0x22000C: {
-      const auto width = static_cast<int>(Number(request.in, 4, 4));
-      return head + "in" + std::to_string(8 * width) + " " + Hex(Number(request.in, 0, 4), 4) + " -> " +
-             Hex(Number(request.out, 0, 4), 2 * width) + failed;
+    case driver::kInportByte:
+    case driver::kInportWord:
+    case driver::kInportDword: {
+      const auto width = static_cast<int>(Number(request.in, driver::kPortWidth, 4));
+      return head + "in" + std::to_string(8 * width) + " " + Hex(Number(request.in, driver::kPortNumber, 4), 4) +
+             " -> " + Hex(Number(request.out, 0, 4), 2 * width) + failed;
     }
-    case 0x220010:
-    case 0x220014:
-    case 0x220018: {
-      const auto width = static_cast<int>(Number(request.in, 4, 4));
-      return head + "out" + std::to_string(8 * width) + " " + Hex(Number(request.in, 0, 4), 4) + " <- " +
-             Hex(Number(request.in, 8, 4), 2 * width) + failed;
+    case driver::kOutportByte:
+    case driver::kOutportWord:
+    case driver::kOutportDword: {
+      const auto width = static_cast<int>(Number(request.in, driver::kPortWidth, 4));
+      return head + "out" + std::to_string(8 * width) + " " + Hex(Number(request.in, driver::kPortNumber, 4), 4) +
+             " <- " + Hex(Number(request.in, driver::kPortValue, 4), 2 * width) + failed;
     }
     case DriverRequest::kMappedRead:
       return head + "memory " + Hex(Number(request.in, 0, 8), 8) + " ->" + Bytes(request.out);

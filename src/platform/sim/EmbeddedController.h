@@ -82,6 +82,7 @@ class EmbeddedController : public Device {
 
   [[nodiscard]] std::optional<bool> Signal(std::string_view pin) const override;
   [[nodiscard]] std::optional<Microseconds> NextEvent() const override;
+  [[nodiscard]] std::optional<Microseconds> UnderWayUntil() const override { return NextEvent(); }
   void Advance() override;
   [[nodiscard]] std::optional<std::uint64_t> RegisterOf(std::string_view /*pin*/) const override {
     return setup_.commandPort;

@@ -49,6 +49,7 @@ class HdaCodec : public Device {
 
   [[nodiscard]] std::optional<bool> Signal(std::string_view pin) const override;
   [[nodiscard]] std::optional<Microseconds> NextEvent() const override;
+  [[nodiscard]] std::optional<Microseconds> UnderWayUntil() const override { return NextEvent(); }
   void Advance() override;
   [[nodiscard]] std::optional<std::uint64_t> RegisterOf(std::string_view pin) const override;
   [[nodiscard]] std::string State() const override;

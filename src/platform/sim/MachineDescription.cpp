@@ -1,5 +1,6 @@
 #include "platform/sim/MachineDescription.h"
 
+#include <algorithm>
 #include <charconv>
 #include <sstream>
 
@@ -61,6 +62,8 @@ void ReadDriver(Section& section, DriverDescription& driver) {
   driver.createError = section.Get("create_error", driver.createError);
   driver.startError = section.Get("start_error", driver.startError);
   driver.version = section.Get("version", driver.version);
+  driver.registers = section.Addressed<std::uint32_t, std::uint64_t>("msr");
+  driver.refused = section.Numbers<std::uint32_t>("refused");
   section.Each("service", [&](Section& service) {
     driver.services.push_back(
         {service.Required("name"), service.Get("running", false), service.Get<std::uint32_t>("start_error", 0)});
@@ -113,9 +116,18 @@ void ReadEvent(Section& section, MachineDescription& machine) {
   machine.events.push_back(event);
 }
 
+// What a name stands for must be one thing: reports and faults go by it.
+template <class Named>
+void RefuseSecond(Section& section, const std::vector<Named>& earlier, const std::string& name) {
+  if (std::any_of(earlier.begin(), earlier.end(), [&](const Named& other) { return other.name == name; })) {
+    section.Refuse("name", "is the name of another one, too: \"" + name + "\"");
+  }
+}
+
 void ReadLed(Section& section, MachineDescription& machine) {
   Led led;
   led.name = section.Required("name");
+  RefuseSecond(section, machine.leds, led.name);
   led.symbol = section.Required("symbol");
   led.color = section.Required("color");
   led.device = section.Required("device");
@@ -177,7 +189,11 @@ MachineDescription ParseMachine(std::string_view text, std::string_view source) 
   root.Each("firmware", [&](Section& section) { ReadFirmware(section, machine.firmware); });
   root.Each("driver", [&](Section& section) { ReadDriver(section, machine.driver); });
   root.Each("pci", [&](Section& section) { ReadPci(section, machine); });
-  root.Each("chip", [&](Section& section) { machine.chips.push_back(ReadChip(section)); });
+  root.Each("chip", [&](Section& section) {
+    ChipDescription chip = ReadChip(section);
+    RefuseSecond(section, machine.chips, chip.name);
+    machine.chips.push_back(std::move(chip));
+  });
   ReadDevices(root, machine);
   root.Each("firmware_call", [&](Section& section) { machine.firmwareCall = ReadFirmwareCall(section); });
   root.Each("led", [&](Section& section) { ReadLed(section, machine); });

@@ -64,6 +64,7 @@ class MailboxController : public Device {
 
   [[nodiscard]] std::optional<bool> Signal(std::string_view pin) const override;
   [[nodiscard]] std::optional<Microseconds> NextEvent() const override;
+  [[nodiscard]] std::optional<Microseconds> UnderWayUntil() const override { return NextEvent(); }
   void Advance() override;
   [[nodiscard]] std::optional<std::uint64_t> RegisterOf(std::string_view pin) const override;
   /// Memory, run-time registers and configuration mode; not the mailbox, which every user sets before use.

@@ -5,6 +5,7 @@
 // jumps. The same seed gives the same run; another seed another interleaving.
 #pragma once
 
+#include <algorithm>
 #include <chrono>
 #include <condition_variable>
 #include <cstdint>
@@ -49,6 +50,9 @@ class Scheduler {
   void Spend(Microseconds duration);
 
   void SleepFor(Microseconds duration) { Spend(duration); }
+
+  /// Time passes with nobody running: for what silicon still does when the program's run is over.
+  void PassTo(Microseconds when) { now_ = std::max(now_, when); }
 
   ThreadId Start(const std::string& name, std::function<void()> body);
   [[nodiscard]] bool HasEnded(ThreadId thread) const;

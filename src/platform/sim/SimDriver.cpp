@@ -3,7 +3,12 @@
 #include <algorithm>
 #include <array>
 
+#include "platform/DriverRecords.h"
+
 namespace panelglow::platform::sim {
+
+using driver::NumberAt;
+using driver::PutNumber;
 
 namespace {
 
@@ -14,29 +19,8 @@ constexpr std::uint32_t kErrorInvalidFunction = 1;
 constexpr std::uint32_t kErrorInvalidParameter = 87;
 constexpr std::uint8_t kPciNotFound = 0x86;
 
-// Wire format of the requests that this machine answers.
-constexpr std::uint32_t kVersion = 0x220000;
-constexpr std::uint32_t kReadFirmwareWord = 0x22001C;
-constexpr std::uint32_t kReadFirmwareByte = 0x220020;
-constexpr std::uint32_t kFindPciDevice = 0x22003C;
-constexpr std::uint32_t kFindPciClass = 0x220058;
-constexpr std::uint32_t kMapMemory = 0x2200A8;
-constexpr std::uint32_t kUnmapMemory = 0x2200C8;
-constexpr std::uint32_t kReadMsr = 0x222498;
-
-std::uint64_t Get(std::span<const std::byte> bytes, std::size_t offset, std::size_t width) {
-  std::uint64_t value = 0;
-  for (std::size_t i = 0; i < width; ++i) {
-    value |= std::to_integer<std::uint64_t>(bytes[offset + i]) << (8 * i);
-  }
-  return value;
-}
-
-void Put(std::span<std::byte> bytes, std::size_t offset, std::size_t width, std::uint64_t value) {
-  for (std::size_t i = 0; i < width; ++i) {
-    bytes[offset + i] = static_cast<std::byte>(value >> (8 * i));
-  }
-}
+// What a driver reports for a request that its hardware did not carry out.
+constexpr std::uint32_t kErrorGeneralFailure = 31;
 
 }  // namespace
 
@@ -62,19 +46,23 @@ class SimDriver::LinkedDevice : public DriverDevice {
     return result;
   }
 
-  void ReadMapped(std::uint64_t mapped, std::span<std::byte> bytes) override {
+  std::uint32_t ReadMapped(std::uint64_t mapped, std::size_t width) override {
     driver_.scheduler_.Spend(kRequestCost_us);
     const std::uint64_t address = driver_.PhysicalAddress(mapped);
-    for (std::size_t i = 0; i < bytes.size(); ++i) {
+    std::vector<std::byte> bytes(width);
+    for (std::size_t i = 0; i < width; ++i) {
       bytes[i] = static_cast<std::byte>(driver_.buses_.ReadMemory(address + i));
     }
     Note(DriverRequest::kMappedRead, address, bytes);
+    return static_cast<std::uint32_t>(NumberAt(bytes, 0, width));
   }
 
-  void WriteMapped(std::uint64_t mapped, std::span<const std::byte> bytes) override {
+  void WriteMapped(std::uint64_t mapped, std::size_t width, std::uint32_t value) override {
     driver_.scheduler_.Spend(kRequestCost_us);
     const std::uint64_t address = driver_.PhysicalAddress(mapped);
-    for (std::size_t i = 0; i < bytes.size(); ++i) {
+    std::vector<std::byte> bytes(width);
+    PutNumber(bytes, 0, width, value);
+    for (std::size_t i = 0; i < width; ++i) {
       driver_.buses_.WriteMemory(address + i, std::to_integer<std::uint8_t>(bytes[i]));
     }
     Note(DriverRequest::kMappedWrite, address, bytes);
@@ -85,7 +73,7 @@ class SimDriver::LinkedDevice : public DriverDevice {
   void Note(std::uint32_t code, std::uint64_t address, std::span<const std::byte> bytes) {
     if (driver_.trace_.IsWanted()) {
       std::vector<std::byte> where(8);
-      Put(where, 0, 8, address);
+      PutNumber(where, 0, 8, address);
       driver_.trace_.Add({driver_.scheduler_.Now(),
                           driver_.scheduler_.Current(),
                           code,
@@ -201,117 +189,148 @@ std::uint64_t SimDriver::PhysicalAddress(std::uint64_t mapped) const {
 
 // ---- requests
 
+// A refused request is carried out all the same: whoever does not look at the result takes what stands in the record.
 std::uint32_t SimDriver::Answer(std::uint32_t code, std::span<std::byte> in, std::span<std::byte> out) {
-  if (code >= 0x220004 && code <= 0x220018) {
-    return AnswerPort(code, in, out);
-  }
+  const std::uint32_t result = CarryOut(code, in, out);
+  const std::vector<std::uint32_t>& refused = description_.refused;
+  return std::find(refused.begin(), refused.end(), code) == refused.end() ? result : kErrorGeneralFailure;
+}
+
+std::uint32_t SimDriver::CarryOut(std::uint32_t code, std::span<std::byte> in, std::span<std::byte> out) {
   switch (code) {
-    case kVersion:
+    case driver::kGetVersion:
       if (out.size() < 4) {
         return kErrorInvalidParameter;
       }
-      Put(out, 0, 4, description_.version);
+      PutNumber(out, 0, 4, description_.version);
       return 0;
-    case kReadFirmwareWord:
-    case kReadFirmwareByte:
+    case driver::kInportByte:
+    case driver::kInportWord:
+    case driver::kInportDword:
+    case driver::kOutportByte:
+    case driver::kOutportWord:
+    case driver::kOutportDword:
+      return AnswerPort(code, in, out);
+    case driver::kReadFirmwareWord:
+    case driver::kReadFirmwareByte:
       return AnswerFirmware(code, in, out);
-    case kFindPciDevice:
-    case kFindPciClass:
-      if (in.size() != 16 || out.size() != 16) {
-        return kErrorInvalidParameter;
-      }
-      std::copy(in.begin(), in.end(), out.begin());
-      return AnswerPciSearch(code, out);
-    case kMapMemory:
-      if ((in.size() != 20 && in.size() != 40) || out.size() != in.size()) {
-        return kErrorInvalidParameter;
-      }
-      std::copy(in.begin(), in.end(), out.begin());
-      return MapMemory(out);
-    case kUnmapMemory:
-      return in.size() == 20 && mappings_.erase(Get(in, 8, 4)) != 0 ? 0 : kErrorInvalidParameter;
-    case kReadMsr:
-      return kErrorInvalidParameter;
+    case driver::kUnmapPhysicalMemory:
+      return in.size() == driver::kMapSize32 && mappings_.erase(NumberAt(in, 8, 4)) != 0 ? 0 : kErrorInvalidParameter;
     default:
-      break;
+      return AnswerInPlace(code, in, out);
   }
-  if (code >= 0x220040 && code <= 0x220054 && in.size() == 16 && out.size() == 16) {
-    std::copy(in.begin(), in.end(), out.begin());
-    return AnswerPci(code, out);
+}
+
+// Requests whose answer stands in the record that was sent.
+std::uint32_t SimDriver::AnswerInPlace(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
+  const auto copied = [&](std::initializer_list<std::size_t> sizes) {
+    const bool fits = in.size() == out.size() && std::find(sizes.begin(), sizes.end(), in.size()) != sizes.end();
+    if (fits) {
+      std::copy(in.begin(), in.end(), out.begin());
+    }
+    return fits;
+  };
+  switch (code) {
+    case driver::kFindPciDevice:
+    case driver::kFindPciClass:
+      return copied({driver::kSearchSize}) ? AnswerPciSearch(code, out) : kErrorInvalidParameter;
+    case driver::kReadPciConfigByte:
+    case driver::kReadPciConfigWord:
+    case driver::kReadPciConfigDword:
+    case driver::kWritePciConfigByte:
+    case driver::kWritePciConfigWord:
+    case driver::kWritePciConfigDword:
+      return copied({driver::kPciSize}) ? AnswerPci(code, out) : kErrorInvalidParameter;
+    case driver::kMapPhysicalMemory:
+      return copied({driver::kMapSize32, driver::kMapSize64}) ? MapMemory(out) : kErrorInvalidParameter;
+    case driver::kReadMsr: {
+      const auto found =
+          in.size() == driver::kMsrSize
+              ? description_.registers.find(static_cast<std::uint32_t>(NumberAt(in, driver::kMsrIndex, 4)))
+              : description_.registers.end();
+      if (found == description_.registers.end() || !copied({driver::kMsrSize})) {
+        return kErrorInvalidParameter;
+      }
+      PutNumber(out, 0, driver::kMsrSize, found->second);
+      return 0;
+    }
+    default:
+      return kErrorInvalidFunction;
   }
-  return kErrorInvalidFunction;
 }
 
 std::uint32_t SimDriver::AnswerPort(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
-  if (in.size() != 12) {
+  if (in.size() != driver::kPortSize) {
     return kErrorInvalidParameter;
   }
-  const auto port = static_cast<std::uint16_t>(Get(in, 0, 4));
-  const auto width = static_cast<unsigned>(Get(in, 4, 4));
+  const auto port = static_cast<std::uint16_t>(NumberAt(in, driver::kPortNumber, 4));
+  const auto width = static_cast<unsigned>(NumberAt(in, driver::kPortWidth, 4));
   constexpr std::array<unsigned, 3> kWidths{1, 2, 4};
-  if (width != kWidths[((code - 0x220004) / 4) % 3]) {
+  if (width != kWidths[((code - driver::kInportByte) / 4) % 3]) {
     return kErrorInvalidParameter;
   }
-  if (code >= 0x220010) {
-    buses_.WritePort(port, width, static_cast<std::uint32_t>(Get(in, 8, 4)));
+  if (code >= driver::kOutportByte) {
+    buses_.WritePort(port, width, static_cast<std::uint32_t>(NumberAt(in, driver::kPortValue, 4)));
     return 0;
   }
   if (out.size() != 4) {
     return kErrorInvalidParameter;
   }
-  Put(out, 0, 4, buses_.ReadPort(port, width));
+  PutNumber(out, 0, 4, buses_.ReadPort(port, width));
   return 0;
 }
 
 std::uint32_t SimDriver::AnswerPci(std::uint32_t code, std::span<std::byte> record) {
-  const auto location = static_cast<std::uint16_t>(Get(record, 4, 2));
-  const auto offset = static_cast<std::uint16_t>(Get(record, 6, 2));
+  const auto location = static_cast<std::uint16_t>(NumberAt(record, driver::kPciLocation, 2));
+  const auto offset = static_cast<std::uint16_t>(NumberAt(record, driver::kPciRegister, 2));
   if (buses_.FindPci(location) == nullptr) {
-    Put(record, 8, 1, kPciNotFound);
+    PutNumber(record, driver::kPciStatus, 1, kPciNotFound);
     return 0;
   }
-  const bool write = code >= 0x22004C;
-  const unsigned width = 1U << ((code - (write ? 0x22004CU : 0x220040U)) / 4);
+  const bool write = code >= driver::kWritePciConfigByte;
+  const unsigned width = 1U << ((code - (write ? driver::kWritePciConfigByte : driver::kReadPciConfigByte)) / 4);
   std::uint32_t value = 0;
   for (unsigned i = 0; i < width; ++i) {
     const auto at = static_cast<std::uint16_t>(offset + i);
     if (write) {
-      buses_.WritePciByte(location, at, static_cast<std::uint8_t>(Get(record, i, 1)));
+      buses_.WritePciByte(location, at, static_cast<std::uint8_t>(NumberAt(record, driver::kPciValue + i, 1)));
     } else {
       value |= static_cast<std::uint32_t>(buses_.ReadPciByte(location, at)) << (8 * i);
     }
   }
   if (!write) {
-    Put(record, 0, 4, value);
+    PutNumber(record, driver::kPciValue, 4, value);
   }
-  Put(record, 8, 1, 0);
+  PutNumber(record, driver::kPciStatus, 1, 0);
   return 0;
 }
 
 std::uint32_t SimDriver::AnswerPciSearch(std::uint32_t code, std::span<std::byte> record) {
-  auto index = static_cast<unsigned>(Get(record, 8, 2));
+  auto index = static_cast<unsigned>(NumberAt(record, driver::kSearchIndex, 2));
   for (const PciFunction& function : buses_.PciFunctions()) {
     const auto dword = [&](std::uint16_t offset) {
       const auto found = function.registers.find(offset);
       return found == function.registers.end() ? 0U : found->second;
     };
-    const bool matches = code == kFindPciClass ? (dword(8) >> 8U) == Get(record, 0, 4)
-                                               : dword(0) == (Get(record, 4, 2) | Get(record, 6, 2) << 16U);
+    const bool matches = code == driver::kFindPciClass
+                             ? (dword(8) >> 8U) == NumberAt(record, driver::kSearchClass, 4)
+                             : dword(0) == (NumberAt(record, driver::kSearchVendor, 2) |
+                                            NumberAt(record, driver::kSearchDevice, 2) << 16U);
     if (matches && index-- == 0) {
-      Put(record, 10, 2, function.location);
-      Put(record, 12, 1, 0);
+      PutNumber(record, driver::kSearchLocation, 2, function.location);
+      PutNumber(record, driver::kSearchStatus, 1, 0);
       return 0;
     }
   }
-  Put(record, 12, 1, kPciNotFound);
+  PutNumber(record, driver::kSearchStatus, 1, kPciNotFound);
   return 0;
 }
 
 std::uint32_t SimDriver::MapMemory(std::span<std::byte> record) {
-  const bool wide = record.size() == 40;
+  const bool wide = record.size() == driver::kMapSize64;
   const std::size_t field = wide ? 8 : 4;
-  const std::uint64_t address = Get(record, 0, field);
-  const std::uint64_t length = Get(record, field, field);
+  const std::uint64_t address = NumberAt(record, 0, field);
+  const std::uint64_t length = NumberAt(record, field, field);
   constexpr std::uint64_t kLargestMapping = 1U << 20U;
   if (length == 0 || length > kLargestMapping) {
     return kErrorInvalidParameter;
@@ -322,20 +341,20 @@ std::uint32_t SimDriver::MapMemory(std::span<std::byte> record) {
   if (nextMapping_ > 0x70000000) {
     nextMapping_ = 0x10000000;  // the oldest mappings are long copied
   }
-  Put(record, 2 * field, field, mapped);
+  PutNumber(record, 2 * field, field, mapped);
   return 0;
 }
 
 std::uint32_t SimDriver::AnswerFirmware(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
-  if (in.size() != 6 || out.size() != 2) {
+  if (in.size() != driver::kFirmwareSize || out.size() != driver::kFirmwareAnswerSize) {
     return kErrorInvalidParameter;
   }
-  const std::uint64_t address = Get(in, 0, 2) * 16 + Get(in, 2, 2);
+  const std::uint64_t address = NumberAt(in, 0, 2) * 16 + NumberAt(in, 2, 2);
   std::uint64_t value = buses_.ReadMemory(address);
-  if (code == kReadFirmwareWord) {
+  if (code == driver::kReadFirmwareWord) {
     value |= static_cast<std::uint64_t>(buses_.ReadMemory(address + 1)) << 8U;
   }
-  Put(out, 0, 2, value);
+  PutNumber(out, 0, 2, value);
   return 0;
 }
 

@@ -48,6 +48,8 @@ class SimDriver : public DriverDevices, public ServiceManager {
   class LinkedDevice;
 
   std::uint32_t Answer(std::uint32_t code, std::span<std::byte> in, std::span<std::byte> out);
+  std::uint32_t CarryOut(std::uint32_t code, std::span<std::byte> in, std::span<std::byte> out);
+  std::uint32_t AnswerInPlace(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out);
   std::uint32_t AnswerPort(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out);
   std::uint32_t AnswerPci(std::uint32_t code, std::span<std::byte> record);
   std::uint32_t AnswerPciSearch(std::uint32_t code, std::span<std::byte> record);

@@ -54,7 +54,7 @@ const char* NameOf(LedFault fault) {
 //   edge <microseconds> <index> <0|1>
 //   press <microseconds> <what>
 //   end <microseconds>
-//   before <register = value>, after <register = value>: registers that a run left changed
+//   before <register = value>, after <register = value>: registers that a run left changed, when silicon has settled
 //   owned <mutex>: a lock that is still held
 void WriteReport(Simulation& simulation, const std::string& path) {
   std::ofstream file(path, std::ios::binary);
@@ -74,7 +74,7 @@ void WriteReport(Simulation& simulation, const std::string& path) {
   }
   file << "end " << simulation.Time().Now() << '\n';
   std::istringstream before(simulation.InitialState());
-  std::istringstream after(simulation.HardwareState());
+  std::istringstream after(simulation.SettledState());
   std::string was;
   std::string is;
   while (std::getline(before, was) && std::getline(after, is)) {

@@ -149,9 +149,8 @@ std::unique_ptr<RawDisk> SimRawDisks::Open(std::string_view path) {
   context_.scheduler.Spend(kOpenCost_us);
   for (DiskDevice* disk : disks_) {
     const DiskSetup& setup = disk->Setup();
-    const bool isNamed =
-        EqualNames(path, setup.path) || (!setup.interfacePath.empty() && EqualNames(path, setup.interfacePath));
-    if (isNamed && setup.fault != DiskSetup::Fault::kNoOpen && !disk->IsGone() &&
+    const bool isNamed = EqualNames(path, setup.path) || EqualNames(path, setup.interfacePath);
+    if (isNamed && !path.empty() && setup.fault != DiskSetup::Fault::kNoOpen && !disk->IsGone() &&
         !context_.buses.IsRemoved(setup.name)) {
       return std::make_unique<Handle>(*disk, context_);
     }

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdio>
 #include <string_view>
 #include <utility>
 
@@ -86,6 +87,7 @@ desktop::Scene SimScreen::PanelScene(const FrontPanel& panel, const std::string&
   window.frame = {kPanelX, kPanelY, kPanelX + kPanelWidth, kPanelY + kHeading + rows * kRow + 8};
   window.client = window.frame;
   window.clip = window.frame;
+  window.text = WideFromUtf8(machineName);
   window.background = kPanelColor;
   window.raisedFrame = true;
   desktop::TextOperation heading = Line(14, 6, machineName, kHeadingFont, kText);
@@ -115,24 +117,34 @@ void SimScreen::Look() {
     return;
   }
   looked_ = now;
-  using Kind = desktop::ScreenEvent::Kind;
   for (const desktop::ScreenEvent& event : screen_->TakeEvents()) {
-    if (event.kind == Kind::kKey) {
-      windows_.Key(event.virtualKey, event.character, event.alt);
-    } else if (event.kind == Kind::kMouseMove) {
-      windows_.MouseMove(event.x, event.y);
-    } else {
-      windows_.MouseButton(event.x, event.y, event.kind == Kind::kMouseDown);
-    }
+    windows_.Take(event);
   }
   panelScreen_->TakeEvents();
+  if (!screen_->IsAlive()) {
+    LoseScreen();
+    return;
+  }
   if (std::exchange(shown_, windows_.Revision()) != windows_.Revision()) {
     screen_->Show(windows_.MakeScene());
   }
   if (!panelShown_ || changesShown_ != panel_.TimeLine().size()) {
-    panelScreen_->Show(PanelScene(panel_, machineName_));
+    desktop::Scene panel = PanelScene(panel_, machineName_);
+    panel.width = windows_.ScreenWidth();  // as large, on this display, as the windows beside it
+    panel.height = windows_.ScreenHeight();
+    panelScreen_->Show(panel);
     changesShown_ = panel_.TimeLine().size();
     panelShown_ = true;
+  }
+}
+
+void SimScreen::LoseScreen() {
+  if (!std::exchange(isLost_, true)) {
+    std::fputs(
+        "simulation: the display is gone. Open windows end unanswered: start the run again when there is a "
+        "display.\n",
+        stderr);
+    windows_.LoseScreen();
   }
 }
 

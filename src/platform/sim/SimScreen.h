@@ -25,6 +25,8 @@ class SimScreen {
   [[nodiscard]] static desktop::Scene PanelScene(const FrontPanel& panel, const std::string& machineName);
 
  private:
+  void LoseScreen();
+
   desktop::WindowSystem& windows_;
   const FrontPanel& panel_;
   std::string machineName_;
@@ -33,6 +35,7 @@ class SimScreen {
   std::uint64_t shown_ = 0;
   std::size_t changesShown_ = 0;
   bool panelShown_ = false;
+  bool isLost_ = false;
   std::chrono::steady_clock::time_point looked_;
 };
 

@@ -9,6 +9,7 @@
 #include <cstdlib>
 #include <ctime>
 #include <map>
+#include <system_error>
 
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
@@ -58,6 +59,10 @@ class SimThreads : public Threads {
  public:
   explicit SimThreads(Scheduler& scheduler) : scheduler_(scheduler) {}
   ThreadHandle Start(const std::string& name, std::function<void()> body) override {
+    if (refused_ != 0) {
+      --refused_;
+      return 0;
+    }
     const ThreadHandle thread = scheduler_.Start(name, std::move(body));
     scheduler_.Spend(10);
     return thread;
@@ -71,8 +76,11 @@ class SimThreads : public Threads {
   void Close(ThreadHandle /*thread*/) override {}
   void Terminate(ThreadHandle thread) override { scheduler_.Terminate(thread); }
 
+  void RefuseNext(unsigned count) { refused_ = count; }
+
  private:
   Scheduler& scheduler_;
+  unsigned refused_ = 0;
 };
 
 class SimConsole : public Console {
@@ -90,10 +98,14 @@ class SimConsole : public Console {
         continue;
       }
       if (written <= 0) {
+        outputError_ = outputError_ == 0 ? errno : outputError_;
         return;
       }
       bytes.remove_prefix(static_cast<std::size_t>(written));
     }
+  }
+  std::string OutputProblem() override {
+    return outputError_ == 0 ? std::string() : std::generic_category().message(outputError_);
   }
   void WriteError(std::string_view bytes) override {
     if (capture_) {
@@ -109,6 +121,7 @@ class SimConsole : public Console {
       scheduler_.Start("console control", [handler = handler_, type] { handler(type); });
     }
   }
+  [[nodiscard]] bool IsHeard() const { return handler_ != nullptr; }
   [[nodiscard]] const std::string& Output() const { return output_; }
   [[nodiscard]] const std::string& Errors() const { return errors_; }
   void Clear() {
@@ -121,6 +134,7 @@ class SimConsole : public Console {
   bool capture_;
   std::string output_;
   std::string errors_;
+  int outputError_ = 0;  // of the first write that failed
   std::function<bool(std::uint32_t)> handler_;
 };
 
@@ -361,6 +375,26 @@ struct Simulation::Parts {
     });
   }
 
+  // Lets all chips come to the end of what they have under way. One can set the next one going only a few times.
+  void Settle() {
+    constexpr int kMostSteps = 100;
+    for (int step = 0; step < kMostSteps; ++step) {
+      std::optional<Microseconds> end;
+      for (const Device* chip : chips) {
+        if (const std::optional<Microseconds> until = chip->UnderWayUntil()) {
+          end = std::min(end.value_or(*until), *until);
+        }
+      }
+      if (!end) {
+        return;
+      }
+      scheduler.PassTo(*end);
+      for (Device* chip : chips) {
+        chip->Advance();
+      }
+    }
+  }
+
   SimulationOptions options;
   MachineDescription description;
   Scheduler scheduler;
@@ -389,7 +423,7 @@ struct Simulation::Parts {
   desktop::WindowSystem windows;
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
-  posix::LazyXmlDocuments xmlDocuments;
+  posix::LazyXmlDocuments xmlDocuments{files};
   Host host;
   std::unique_ptr<Operator> person;
   std::unique_ptr<SimScreen> screen;
@@ -459,7 +493,8 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
       if (parts_->screen) {
         parts_->screen->Look();
       }
-      for (std::uint32_t type = 0; type < 2; ++type) {
+      // What comes before the program listens waits for that, as it does between two hand-overs.
+      for (std::uint32_t type = 0; type < 2 && parts_->console.IsHeard(); ++type) {
         if (g_pendingSignals[type] != 0) {
           g_pendingSignals[type] = 0;
           RaiseConsole(type);
@@ -493,8 +528,13 @@ const MachineDescription& Simulation::Description() const { return parts_->descr
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
 const std::string& Simulation::Errors() const { return parts_->console.Errors(); }
 void Simulation::ClearOutput() { parts_->console.Clear(); }
+void Simulation::RefuseThreads(unsigned count) { parts_->threads.RefuseNext(count); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
 std::string Simulation::HardwareState() { return parts_->buses.State(); }
+std::string Simulation::SettledState() {
+  parts_->Settle();
+  return HardwareState();
+}
 const std::string& Simulation::InitialState() const { return parts_->initialState; }
 bool Simulation::IsMutexOwned(std::string_view name) const { return parts_->mutexes.IsOwned(name); }
 

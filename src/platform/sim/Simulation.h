@@ -63,14 +63,21 @@ class Simulation {
   [[nodiscard]] const std::string& Errors() const;
   void ClearOutput();
 
+  /// The next `count` threads that the program asks for do not start, as on a system that has no more of them.
+  void RefuseThreads(unsigned count);
+
   /// A console control event, delivered on a thread of its own.
   void RaiseConsole(std::uint32_t type);
 
   /// Saves a picture of the screen as "<number>-<what>.png" when there is a folder for it.
   void Screenshot(std::string_view what);
 
-  /// All registers and lock keys as text; for comparing before and after.
+  /// All registers and lock keys as text, as they are at this moment.
   [[nodiscard]] std::string HardwareState();
+
+  /// The same once the silicon has finished what is under way; for comparing before and after. Time passes for it,
+  /// but no thread runs.
+  [[nodiscard]] std::string SettledState();
 
   /// The same at the very start of the machine.
   [[nodiscard]] const std::string& InitialState() const;

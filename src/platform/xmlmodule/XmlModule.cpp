@@ -1,18 +1,19 @@
 // Structured XML documents by libxml2. A module of its own: it is loaded when the first document is made, so that a
 // run without one does not pay for it.
+#include <libxml/SAX2.h>
 #include <libxml/parser.h>
 #include <libxml/tree.h>
 #include <libxml/xmlschemas.h>
 
 #include <algorithm>
-#include <fstream>
-#include <iterator>
 #include <limits>
 #include <memory>
 #include <optional>
 #include <string>
 
+#include "platform/Files.h"
 #include "platform/XmlDocuments.h"
+#include "platform/xmlmodule/SimpleXmlText.h"
 
 namespace panelglow::platform {
 
@@ -31,8 +32,8 @@ using SchemaParser = std::unique_ptr<xmlSchemaParserCtxt, Deleter<xmlSchemaFreeP
 using Schema = std::unique_ptr<xmlSchema, Deleter<xmlSchemaFree>>;
 using Validator = std::unique_ptr<xmlSchemaValidCtxt, Deleter<xmlSchemaFreeValidCtxt>>;
 
+constexpr int kDeepestElement = 256;
 constexpr const char* kSchemaInstance = "http://www.w3.org/2001/XMLSchema-instance";
-constexpr std::size_t kLargestFile_bytes = std::size_t{64} << 20U;
 
 const xmlChar* Xml(const std::string& text) { return reinterpret_cast<const xmlChar*>(text.c_str()); }
 
@@ -46,20 +47,6 @@ std::string PathOf(const xmlNode* node) {
   std::string text = Plain(path);
   xmlFree(path);
   return text;
-}
-
-std::optional<std::string> ReadFile(std::string_view path) {
-  std::string native(path);
-  std::replace(native.begin(), native.end(), '\\', '/');
-  std::ifstream file(native, std::ios::binary | std::ios::ate);
-  const auto size = file ? static_cast<std::streamoff>(file.tellg()) : std::streamoff{-1};
-  if (size < 0 || static_cast<std::size_t>(size) > kLargestFile_bytes) {
-    return std::nullopt;
-  }
-  file.seekg(0);
-  std::string bytes(static_cast<std::size_t>(size), '\0');
-  file.read(bytes.data(), size);
-  return file.bad() || file.gcount() != size ? std::nullopt : std::optional<std::string>(std::move(bytes));
 }
 
 // What callbacks of one operation report.
@@ -87,7 +74,11 @@ using ErrorRecord = const xmlError*;
 using ErrorRecord = xmlError*;
 #endif
 
+// A warning, as of a name space that is no absolute address, does not make a document one that is not well formed.
 void NoteParseError(void* userData, ErrorRecord error) {
+  if (error->level == XML_ERR_WARNING) {
+    return;
+  }
   auto* context = static_cast<xmlParserCtxt*>(userData);
   static_cast<Findings*>(context->_private)->Add(error, context->node);
 }
@@ -106,8 +97,26 @@ void RefuseDocumentType(void* userData, const xmlChar* name, const xmlChar*, con
   xmlStopParser(context);
 }
 
+// The parser's own limit of nesting does not hold for documents of any size.
+void StartElement(void* userData, const xmlChar* name, const xmlChar* prefix, const xmlChar* address, int spaceCount,
+                  const xmlChar** spaces, int attributeCount, int defaultedCount, const xmlChar** attributes) {
+  auto* context = static_cast<xmlParserCtxt*>(userData);
+  if (context->nodeNr >= kDeepestElement) {
+    static_cast<Findings*>(context->_private)
+        ->problems.push_back({XML_ERR_INTERNAL_ERROR,
+                              "elements are nested deeper than " + std::to_string(kDeepestElement) + " levels\n",
+                              ""});
+    context->wellFormed = 0;
+    xmlStopParser(context);
+    return;
+  }
+  xmlSAX2StartElementNs(userData, name, prefix, address, spaceCount, spaces, attributeCount, defaultedCount,
+                        attributes);
+}
+
 xmlParserInputPtr RefuseEntity(const char*, const char*, xmlParserCtxtPtr) { return nullptr; }
 
+// Of any size.
 Document Parse(const std::string& bytes, Findings& findings) {
   const ParserContext context(xmlNewParserCtxt());
   if (!context || bytes.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
@@ -115,9 +124,10 @@ Document Parse(const std::string& bytes, Findings& findings) {
   }
   context->_private = &findings;
   context->sax->internalSubset = RefuseDocumentType;
+  context->sax->startElementNs = StartElement;
   context->sax->serror = NoteParseError;
   Document document(xmlCtxtReadMemory(context.get(), bytes.data(), static_cast<int>(bytes.size()), nullptr, nullptr,
-                                      XML_PARSE_NONET | XML_PARSE_COMPACT));
+                                      XML_PARSE_NONET | XML_PARSE_COMPACT | XML_PARSE_HUGE));
   if (context->wellFormed == 0 || !findings.problems.empty()) {
     document.reset();
   }
@@ -126,6 +136,8 @@ Document Parse(const std::string& bytes, Findings& findings) {
 
 class LibXmlDocument : public XmlDocument {
  public:
+  explicit LibXmlDocument(Files& files) : files_(files) {}
+
   bool Load(std::string_view path, XmlProblem& problem) override {
     Findings findings;
     document_ = LoadFile(path, findings);
@@ -173,6 +185,13 @@ class LibXmlDocument : public XmlDocument {
                                         : std::string(reinterpret_cast<char*>(bytes), static_cast<std::size_t>(size));
     xmlFree(bytes);
     return text;
+  }
+
+  std::optional<std::string> SimpleText(XmlProblem& problem) override {
+    if (!document_) {
+      throw XmlComponentError("no document is loaded");
+    }
+    return SimpleXmlText(*document_, problem);
   }
 
   std::vector<XmlProblem> LoadAndValidate(std::string_view path) override {
@@ -237,8 +256,8 @@ class LibXmlDocument : public XmlDocument {
     return problems;
   }
 
-  static Document LoadFile(std::string_view path, Findings& findings) {
-    const std::optional<std::string> bytes = ReadFile(path);
+  Document LoadFile(std::string_view path, Findings& findings) {
+    const std::optional<std::string> bytes = files_.Read(path);
     if (!bytes) {
       findings.problems.push_back({XML_IO_LOAD_ERROR, "the file cannot be read\n", ""});
       return nullptr;
@@ -246,8 +265,8 @@ class LibXmlDocument : public XmlDocument {
     return Parse(*bytes, findings);
   }
 
-  static Schema LoadSchema(const std::string& path, Findings& findings) {
-    const std::optional<std::string> bytes = path.empty() ? std::nullopt : ReadFile(path);
+  Schema LoadSchema(const std::string& path, Findings& findings) {
+    const std::optional<std::string> bytes = path.empty() ? std::nullopt : files_.Read(path);
     if (!bytes) {
       return nullptr;
     }
@@ -262,23 +281,27 @@ class LibXmlDocument : public XmlDocument {
     return Schema(xmlSchemaParse(parser.get()));
   }
 
+  Files& files_;
   Document document_;
 };
 
 class LibXmlDocuments : public XmlDocuments {
  public:
-  LibXmlDocuments() {
+  explicit LibXmlDocuments(Files& files) : files_(files) {
     xmlInitParser();
     xmlSetExternalEntityLoader(RefuseEntity);
   }
-  std::unique_ptr<XmlDocument> Create() override { return std::make_unique<LibXmlDocument>(); }
+  std::unique_ptr<XmlDocument> Create() override { return std::make_unique<LibXmlDocument>(files_); }
+
+ private:
+  Files& files_;
 };
 
 }  // namespace
 
 }  // namespace panelglow::platform
 
-extern "C" panelglow::platform::XmlDocuments* PanelglowXmlDocuments() {
-  static panelglow::platform::LibXmlDocuments documents;
-  return &documents;
+/// The caller owns what is returned; `files` has to outlive it.
+extern "C" panelglow::platform::XmlDocuments* PanelglowXmlDocumentsOnFiles(panelglow::platform::Files& files) {
+  return new panelglow::platform::LibXmlDocuments(files);
 }

@@ -39,8 +39,12 @@ TEST_F(Output, LimitsThePercentageAndReportsVerdicts) {
   CDMout::UpdatePercentage(-1);
   CDMout::UpdatePercentage(42);
   CDMout::UpdatePercentage(150);
-  CDMout::TestFailed(1234567, "why");
-  EXPECT_EQ(Lines(), "UpdatePercentage 0\nUpdatePercentage 42\nUpdatePercentage 100\nTestFailed 1234567 \"why\"\n");
+  CDMout::TestFailed(1234567, "why\nnot");
+  CDMout::TestFailed("why\r\nnot");
+  CDMout::ReportFailure("a\rb");
+  EXPECT_EQ(Lines(),
+            "UpdatePercentage 0\nUpdatePercentage 42\nUpdatePercentage 100\nTestFailed 1234567 \"why not\"\n"
+            "TestFailed why not\nReportFailure a b\n");
 }
 
 TEST_F(Output, LogsOnOneLineWithoutEscaping) {

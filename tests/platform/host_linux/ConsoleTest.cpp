@@ -23,7 +23,7 @@ TEST(ConsoleTest, InterruptsArriveByTypeAndNeverEndTheProcess) {
       });
       ::kill(::getpid(), SIGINT);  // nobody listens yet
       Tell(pipe, 'r');
-      while (events < 3) {
+      while (events < 5) {
         TheHost().clock.Sleep(1);
       }
       TheHost().console.SetControlHandler(nullptr);
@@ -32,23 +32,50 @@ TEST(ConsoleTest, InterruptsArriveByTypeAndNeverEndTheProcess) {
       return 7;
     });
     EXPECT_EQ(child.Read(2), "r0");
-    child.Signal(SIGTERM);
-    EXPECT_EQ(child.Read(1), "1");
+    for (const int breaking : {SIGTERM, SIGQUIT, SIGHUP}) {
+      child.Signal(breaking);
+      EXPECT_EQ(child.Read(1), "1") << breaking;
+    }
     child.Signal(SIGINT);
     EXPECT_EQ(child.Read(1), "0");
     EXPECT_EQ(child.Wait(), 7);
   }
 }
 
-TEST(ConsoleTest, AReaderThatHasGoneIsNoError) {
+TEST(ConsoleTest, AHangUpThatWasToBeIgnoredStaysIgnored) {
+  ChildProcess child([](int pipe) {
+    std::signal(SIGHUP, SIG_IGN);  // as nohup does
+    std::atomic<bool> ended{false};
+    TheHost().console.SetControlHandler([&](std::uint32_t type) {
+      Tell(pipe, static_cast<char>('0' + type));
+      ended = type == 0;
+      return true;
+    });
+    ::kill(::getpid(), SIGHUP);
+    ::kill(::getpid(), SIGINT);
+    while (!ended) {
+      TheHost().clock.Sleep(1);
+    }
+    return 7;
+  });
+  EXPECT_EQ(child.Wait(), 7);
+  EXPECT_EQ(child.Read(2), "0");
+}
+
+TEST(ConsoleTest, AReaderThatHasGoneStopsNobodyAndIsRemembered) {
   ChildProcess child([](int pipe) {
     ::dup2(pipe, STDOUT_FILENO);
     ::close(pipe);
+    TheHost().console.Write("read");
+    const bool wasWhole = TheHost().console.OutputProblem().empty();
     pollfd gone{STDOUT_FILENO, 0, 0};
     ::poll(&gone, 1, -1);
     TheHost().console.Write("nobody reads this");
-    return 7;
+    ::dup2(::open("/dev/null", O_WRONLY), STDOUT_FILENO);
+    TheHost().console.Write("what came before is lost all the same");
+    return wasWhole && TheHost().console.OutputProblem() == "Broken pipe" ? 7 : 8;
   });
+  EXPECT_EQ(child.Read(4), "read");
   child.ClosePipe();
   EXPECT_EQ(child.Wait(), 7);
 }

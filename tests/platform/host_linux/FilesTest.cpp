@@ -129,6 +129,28 @@ TEST_F(FilesTest, ALockedWriteThatFindsNoSpaceKeepsTheOldContent) {
   EXPECT_EQ(Entries(), 1U) << "neither the new file nor a temporary one";
 }
 
+// Too large a file ends the writer in the midst of its write. What it leaves is the next writer's to remove; a file
+// that another one is still writing is not, nor is one of another name.
+TEST_F(FilesTest, WhatAKilledWriterLeftIsRemovedByTheNextOneAndNothingElse) {
+  Put("log.xml", "old");
+  for (const char* name : {"log.xml.panelglow-alive1", "log.xml.panelglow-other", "log.xml.backup", "log.xml2"}) {
+    Put(name, "");
+  }
+  const posix::Descriptor alive(::open("log.xml.panelglow-alive1", O_RDONLY | O_CLOEXEC));
+  ASSERT_EQ(::flock(alive.Get(), LOCK_EX), 0);
+  for (const bool isKilled : {true, false}) {
+    ChildProcess child([isKilled](int) {
+      const rlimit limit{4096, 4096};
+      ::setrlimit(RLIMIT_FSIZE, &limit);
+      return files().WriteLocked("log.xml", isKilled ? std::string(10'000, 'x') : "new") ? 7 : 8;
+    });
+    EXPECT_EQ(child.Wait(), isKilled ? -SIGXFSZ : 7);
+    EXPECT_EQ(files().Read("log.xml"), isKilled ? "old" : "new");
+    EXPECT_EQ(Entries(), isKilled ? 6U : 5U);
+  }
+  EXPECT_TRUE(fs::exists("log.xml.panelglow-alive1"));
+}
+
 // What a user who is not root meets: a folder that takes no new file, and another user's file that all may write.
 TEST_F(FilesTest, AFileThatCannotBeReplacedIsWrittenInPlace) {
   for (const fs::perms rights : {fs::perms(0755), fs::perms(01777)}) {

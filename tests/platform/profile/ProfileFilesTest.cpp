@@ -34,6 +34,7 @@ class MemoryFiles : public Files {
   std::optional<std::string> ReadLocked(std::string_view path) override { return Read(path); }
   bool Write(std::string_view path, std::string_view bytes) override {
     content[std::string(path)] = bytes;
+    ++writes;
     return true;
   }
   bool WriteLocked(std::string_view path, std::string_view bytes) override { return Write(path, bytes); }
@@ -45,6 +46,7 @@ class MemoryFiles : public Files {
 
   std::map<std::string, std::string> content;
   bool unreadable = false;
+  int writes = 0;
 };
 
 std::string Utf16(std::u16string_view text) {
@@ -146,6 +148,12 @@ TEST_F(ProfileFilesTest, TheListsOfASectionHaveItsLinesAndItsKeys) {
   EXPECT_EQ(List("S"), "a\0c\0d\0"s);
   EXPECT_EQ(Lines("t"), "");
   EXPECT_EQ(Lines("u"), "");
+  // What has no name is in no list: an empty text would end it.
+  text = "[]\nx=1\n[s]\na=1\n\0\n=2\nb\0c=3\nd=4\n[ \0]\n[t]\n\0"s;
+  EXPECT_EQ(List(std::nullopt), "s\0t\0"s);
+  EXPECT_EQ(Lines("s"), "a=1\0=2\0b\0d=4\0"s);
+  EXPECT_EQ(List("s"), "a\0d\0"s);
+  EXPECT_EQ(Lines("t"), "");
 }
 
 TEST_F(ProfileFilesTest, WhatDoesNotFitIsCutAndItsLengthTellsSo) {
@@ -210,7 +218,7 @@ TEST_F(ProfileFilesTest, WritingLeavesAllOtherLinesAsTheyWere) {
   };
   const std::string file = "; top\r\n\r\n[a]\r\n x = 1 ; n\r\n;x=2\r\nplain\r\n\r\n[b]\r\ny=\"2\"";
   const std::vector<Case> cases{
-      {file, "A", "X", "new ", "; top\r\n\r\n[a]\r\nX=new \r\n;x=2\r\nplain\r\n\r\n[b]\r\ny=\"2\""},
+      {file, "A", "X", "new ", "; top\r\n\r\n[a]\r\n x = new \r\n;x=2\r\nplain\r\n\r\n[b]\r\ny=\"2\""},
       {file, "a", "z", "3", "; top\r\n\r\n[a]\r\n x = 1 ; n\r\n;x=2\r\nplain\r\nz=3\r\n\r\n[b]\r\ny=\"2\""},
       {file, "b", "z", "3", file + "\r\nz=3\r\n"},
       {file, "c", "z", " 'q' ", file + "\r\n[c]\r\nz= 'q' \r\n"},
@@ -219,6 +227,8 @@ TEST_F(ProfileFilesTest, WritingLeavesAllOtherLinesAsTheyWere) {
       {file, "b", "missing", std::nullopt, file},
       {file, "c", std::nullopt, std::nullopt, file},
       {"[a]\nx=1\nx=2\n[a]\nx=3\n", "a", "x", std::nullopt, "[a]\nx=2\n[a]\nx=3\n"},
+      {"[a]\nKey =\n", "a", "key", "1", "[a]\nKey =1\n"},
+      {"[a]\nKey=\t \nb=", "a", "key", "1", "[a]\nKey=\t 1\nb="},
       {"[a]", "a", "y", "2", "[a]\r\ny=2\r\n"},
       {"", "a", "y", "\xE4", "[a]\r\ny=\xE4\r\n"},
       {Utf16(u"[\u4E2D]\nx=\u4E2D\n[a]\n"), "a", "y", "\x80", Utf16(u"[\u4E2D]\nx=\u4E2D\n[a]\ny=\u20AC\n")},
@@ -247,9 +257,16 @@ TEST_F(ProfileFilesTest, EveryByteOfANarrowFileSurvivesAWideWrite) {
   EXPECT_EQ(Value("s", "key"), "\x80?");
 }
 
-TEST_F(ProfileFilesTest, AMissingFileIsCreatedByADeletionToo) {
+TEST_F(ProfileFilesTest, AMissingFileIsCreatedByADeletionTooAndOneThatStaysTheSameIsNotWritten) {
   EXPECT_TRUE(profiles.SetValue("s", "key", std::nullopt, "new.ini"));
   EXPECT_EQ(files.content.at("new.ini"), "");
+  EXPECT_EQ(files.writes, 1);
+  for (const std::string& same : {"[s]\nkey=1\n"s, "[s]\nKEY = 1"s, Utf16(u"[s]\nkey=1\n") + "!"}) {
+    text = same;
+    EXPECT_TRUE(profiles.SetValue("s", "key", "1", kPath));
+    EXPECT_TRUE(profiles.SetValue(u"s"sv, u"other"sv, std::nullopt, u"test.ini"sv));
+    EXPECT_EQ(files.writes, 1) << same;
+  }
 }
 
 TEST_F(ProfileFilesTest, AFileThatCannotBeReadIsNotReplaced) {

@@ -3,7 +3,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cstring>
 #include <fstream>
 #include <memory>
 #include <sstream>
@@ -49,16 +48,19 @@ class Bench {
     }
   }
 
+  // Byte by byte, as a program may.
   void WriteMemory(std::uint64_t address, std::uint32_t value, std::size_t width) {
-    std::vector<std::byte> bytes(width);
-    std::memcpy(bytes.data(), &value, width);
-    device_->WriteMapped(Map(address), bytes);
+    const std::uint64_t mapped = Map(address);
+    for (std::size_t i = 0; i < width; ++i) {
+      device_->WriteMapped(mapped + i, 1, value >> (8 * i) & 0xFFU);
+    }
   }
   std::uint32_t ReadMemory(std::uint64_t address, std::size_t width) {
-    std::vector<std::byte> bytes(width);
-    device_->ReadMapped(Map(address), bytes);
+    const std::uint64_t mapped = Map(address);
     std::uint32_t value = 0;
-    std::memcpy(&value, bytes.data(), width);
+    for (std::size_t i = 0; i < width; ++i) {
+      value |= device_->ReadMapped(mapped + i, 1) << (8 * i);
+    }
     return value;
   }
 

@@ -53,6 +53,14 @@ TEST(HdaCodec, ALampGlowsWhenItsPinIsEnabledAnOutputAndLow) {
   }
 }
 
+TEST(HdaCodec, ACommandOnTheLinkCountsInTheComparisonOnceItIsCarried) {
+  Bench bench(MachineText("codec-notebook.toml"));
+  bench.WriteMemory(kBase + 0x60, 0x00171601, 4);
+  bench.WriteMemory(kBase + 0x68, kBusy, 2);
+  EXPECT_EQ(bench.machine.HardwareState(), bench.machine.InitialState());
+  EXPECT_NE(bench.machine.SettledState(), bench.machine.InitialState());
+}
+
 TEST(HdaCodec, ACommandTakesItsTimeOnTheLink) {
   Bench bench(MachineText("codec-notebook.toml"));
   bench.WriteMemory(kBase + 0x60, 0x001F0011, 4);  // the number of GPIO pins

@@ -99,6 +99,20 @@ TEST(MailboxController, TheConfigurationPortsSpeakAfterTheirKey) {
   EXPECT_EQ(bench.In(0x4F), 0xFF);
 }
 
+// What is under way at the end of a run belongs to what the run did.
+TEST(MailboxController, AStepThatIsUnderWayCountsInTheComparisonOnceItHasEnded) {
+  Bench bench(MachineText("mailbox-notebook.toml"));
+  SelectPage(bench, 0x4008);
+  WriteByte(bench, 0x1021, 0x02);
+  const std::string before = bench.machine.HardwareState();
+  Step(bench, 0x86, 0x12);
+  Step(bench, 0x82, 0x02, 10'000);
+  EXPECT_EQ(bench.machine.HardwareState(), before);
+  const Microseconds began = bench.machine.Time().Now();
+  EXPECT_THAT(bench.machine.SettledState(), HasSubstr("40081021:12"));
+  EXPECT_NEAR(static_cast<double>(bench.machine.Time().Now() - began), 35'000, 100);
+}
+
 TEST(MailboxController, AHangingOneStaysBusy) {
   Bench bench(MachineText("mailbox-notebook.toml", "kind = \"mailbox-controller\"", "fault = \"stuck-busy\""));
   SelectPage(bench, 0x4008);

@@ -7,9 +7,9 @@
 #include <unistd.h>
 
 #include <atomic>
-#include <thread>
-
+#include <csignal>
 #include <filesystem>
+#include <thread>
 
 #include "platform/sim/Operator.h"
 
@@ -40,6 +40,22 @@ pin = "1"
 active_low = true
 )";
 
+constexpr const char* kTwoOfOneName = R"([[led]]
+name = "power"
+symbol = "power"
+color = "green"
+device = "keyboard"
+pin = "caps-lock"
+
+[[led]]
+# line 9
+symbol = "power"
+color = "green"
+device = "keyboard"
+pin = "num-lock"
+name = "power"
+)";
+
 TEST(Simulation, AMistakeInAMachinesFileIsNamedWithItsLine) {
   struct Case {
     const char* text;
@@ -53,6 +69,11 @@ TEST(Simulation, AMistakeInAMachinesFileIsNamedWithItsLine) {
       {"[[chip]]\nname = \"a\"\nkind = \"gpio-block\"\nbase = \"x\"", "machine:4: \"chip.base\" has the wrong type"},
       {"[[chip]]\nname = \"a\"\nkind = \"memory-registers\"\ninitial = [256]", "machine:4: "},
       {"[[led]]\nname = \"a\"\nsymbol = \"b\"\ncolor = \"c\"\ndevice = \"none\"\npin = \"0\"", "no pin \"0\""},
+      {kTwoOfOneName, "machine:14: \"led.name\" is the name of another one, too: \"power\""},
+      {"chip = [{name = \"a\", kind = \"legacy-panel\"}, {name = \"a\", kind = \"legacy-panel\"}]",
+       "\"chip.name\" is the name of another one"},
+      {"driver = {refused = [-1]}", "\"driver.refused\" holds a value that is no number of 32 bits"},
+      {"driver = {msr = {\"1G\" = 1}}", "\"driver.msr\" holds hexadecimal addresses"},
       {"[[event]]\nat_ms = 5", "\"event.console\" is missing"},
       {"[pci]\n[pci.registers]\n3 = 1", "a PCI register is"},
   };
@@ -113,6 +134,24 @@ TEST(Simulation, ASimulatedDriveRootNeverReachesTheRealSystem) {
   EXPECT_EQ(files.Read("\\panelglow-test.ctl"), "x");
   EXPECT_FALSE(std::filesystem::exists("/panelglow-test.ctl"));
   EXPECT_FALSE(files.CanRead("C:\\ProgramData\\x"));
+}
+
+TEST(Simulation, AnInterruptThatComesBeforeTheProgramListensIsHeardOnceItDoes) {
+  std::vector<std::uint32_t> heard;
+  {
+    Simulation machine("", {.captureOutput = false});
+    std::raise(SIGINT);
+    machine.Time().SleepFor(1000);
+    machine.TheMachine().console.SetControlHandler([&](std::uint32_t type) {
+      heard.push_back(type);
+      return true;
+    });
+    machine.Time().SleepFor(1000);
+  }
+  for (const int number : {SIGINT, SIGTERM, SIGHUP, SIGQUIT}) {
+    std::signal(number, SIG_DFL);
+  }
+  EXPECT_EQ(heard, std::vector<std::uint32_t>{kControlC});
 }
 
 // The files of the current folder are real, and so are the other processes that use them.

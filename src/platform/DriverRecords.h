@@ -1,13 +1,14 @@
-// The wire format of requests to the privileged driver: control codes, record sizes, field offsets. Numbers are
-// little-endian.
+// The wire format of requests to the privileged driver, which the program sends and a driver answers: control codes,
+// record sizes, field offsets. Numbers are little-endian.
 #pragma once
 
 #include <array>
 #include <cstddef>
 #include <cstdint>
 #include <span>
+#include <stdexcept>
 
-namespace panelglow::driver {
+namespace panelglow::platform::driver {
 
 // ---- control codes (device type 0x22, any access, buffered)
 inline constexpr std::uint32_t kGetVersion = 0x220000;
@@ -53,14 +54,43 @@ inline constexpr std::size_t kSearchIndex = 8;      // u16
 inline constexpr std::size_t kSearchLocation = 10;  // u16, answer
 inline constexpr std::size_t kSearchStatus = 12;    // u8, preset; 0 is success
 
-// ---- physical memory mapping request, by word size of the system: address, length, mapped address
+// ---- physical memory mapping request, by word size of the system: address, length, mapped address, each a word of
+// it
 inline constexpr std::size_t kMapSize32 = 20;
 inline constexpr std::size_t kMapSize64 = 40;
 
-// ---- model-specific register and firmware segment requests
+// ---- model-specific register request: 0 and the register's index, u32 each; the answer is its 64 bits
 inline constexpr std::size_t kMsrSize = 8;
+inline constexpr std::size_t kMsrIndex = 4;
+
+// ---- firmware segment request: segment u16, offset u16, 0
 inline constexpr std::size_t kFirmwareSize = 6;
 inline constexpr std::size_t kFirmwareAnswerSize = 2;
+
+/// Throws std::out_of_range for a field that a record does not have: the numbers above are wrong then.
+inline void RequireField(std::span<const std::byte> record, std::size_t offset, std::size_t width) {
+  if (offset + width > record.size()) {
+    throw std::out_of_range("a field behind the end of a driver's record");
+  }
+}
+
+/// The number of `width` bytes at `offset` of a record.
+inline std::uint64_t NumberAt(std::span<const std::byte> record, std::size_t offset, std::size_t width) {
+  RequireField(record, offset, width);
+  std::uint64_t value = 0;
+  for (std::size_t i = 0; i < width; ++i) {
+    value |= std::to_integer<std::uint64_t>(record[offset + i]) << (8 * i);
+  }
+  return value;
+}
+
+/// Stores the low `width` bytes of `value` there.
+inline void PutNumber(std::span<std::byte> record, std::size_t offset, std::size_t width, std::uint64_t value) {
+  RequireField(record, offset, width);
+  for (std::size_t i = 0; i < width; ++i) {
+    record[offset + i] = static_cast<std::byte>(value >> (8 * i));
+  }
+}
 
 /// What a status field holds before the driver has answered, and what an absent driver answers.
 inline constexpr std::uint8_t kNoAnswer = 0x81;
@@ -71,18 +101,12 @@ class DriverRecord {
  public:
   /// Stores the low `width` bytes of `value`.
   DriverRecord& Set(std::size_t offset, std::size_t width, std::uint64_t value) {
-    for (std::size_t i = 0; i < width; ++i) {
-      bytes_.at(offset + i) = static_cast<std::byte>(value >> (8 * i));
-    }
+    PutNumber(bytes_, offset, width, value);
     return *this;
   }
 
   [[nodiscard]] std::uint64_t Get(std::size_t offset, std::size_t width) const {
-    std::uint64_t value = 0;
-    for (std::size_t i = 0; i < width; ++i) {
-      value |= std::to_integer<std::uint64_t>(bytes_.at(offset + i)) << (8 * i);
-    }
-    return value;
+    return NumberAt(bytes_, offset, width);
   }
 
   [[nodiscard]] std::span<std::byte> Bytes() { return bytes_; }
@@ -91,4 +115,4 @@ class DriverRecord {
   std::array<std::byte, Size> bytes_{};
 };
 
-}  // namespace panelglow::driver
+}  // namespace panelglow::platform::driver
