@@ -194,6 +194,15 @@ HdaCodecSetup ReadHdaCodec(Section& section) {
   return setup;
 }
 
+// ---- floppy controller
+
+FloppyControllerSetup ReadFloppyController(Section& section) {
+  FloppyControllerSetup setup;
+  setup.base = section.Get("base", setup.base);
+  setup.digitalOutput = section.Get("output", setup.digitalOutput);
+  return setup;
+}
+
 }  // namespace
 
 ChipDescription ReadChip(Section& section) {
@@ -206,6 +215,8 @@ ChipDescription ReadChip(Section& section) {
     chip.setup = ReadEmbeddedController(section);
   } else if (chip.kind == "mailbox-controller") {
     chip.setup = ReadMailbox(section);
+  } else if (chip.kind == "floppy-controller") {
+    chip.setup = ReadFloppyController(section);
   } else if (chip.kind == "hda-codec") {
     chip.setup = ReadHdaCodec(section);
   } else {

@@ -7,6 +7,7 @@
 #include "platform/Text.h"
 #include "platform/sim/ChipReader.h"
 #include "platform/sim/DescriptionSection.h"
+#include "platform/sim/DeviceReader.h"
 
 namespace panelglow::platform::sim {
 
@@ -193,6 +194,7 @@ MachineDescription ParseMachine(std::string_view text, std::string_view source) 
     RefuseSecond(section, machine.chips, chip.name);
     machine.chips.push_back(std::move(chip));
   });
+  ReadDevices(root, machine);
   root.Each("firmware_call", [&](Section& section) { machine.firmwareCall = ReadFirmwareCall(section); });
   root.Each("led", [&](Section& section) { ReadLed(section, machine); });
   root.Each("event", [&](Section& section) { ReadEvent(section, machine); });

@@ -12,8 +12,13 @@
 #include <vector>
 
 #include "platform/Management.h"
+#include "platform/sim/AdapterDevice.h"
+#include "platform/sim/CameraDevice.h"
+#include "platform/sim/ControllerDescription.h"
+#include "platform/sim/DiskDevice.h"
 #include "platform/sim/EmbeddedController.h"
 #include "platform/sim/FirmwareCall.h"
+#include "platform/sim/FloppyController.h"
 #include "platform/sim/FrontPanel.h"
 #include "platform/sim/HdaCodec.h"
 #include "platform/sim/MailboxController.h"
@@ -32,7 +37,9 @@ struct ChipDescription {
   std::string kind;
 
   // Of a kind that has a setup of its own; the others are told by the keys below.
-  std::variant<std::monostate, SuperIoSetup, EmbeddedControllerSetup, MailboxControllerSetup, HdaCodecSetup> setup;
+  std::variant<std::monostate, SuperIoSetup, EmbeddedControllerSetup, MailboxControllerSetup, HdaCodecSetup,
+               FloppyControllerSetup>
+      setup;
 
   std::uint64_t base = 0;
   std::uint8_t outputs = 0xFF;
@@ -62,6 +69,7 @@ struct DriverDescription {
 struct PciFunction {
   std::uint16_t location = 0;
   std::map<std::uint16_t, std::uint32_t> registers;  // dword offset to value
+  std::string controller;                            // instance id of the storage controller that it is, if one
 };
 
 struct ProcessorDescription {
@@ -122,6 +130,12 @@ struct MachineDescription {
   std::vector<ScriptedEvent> events;
   std::vector<Peer> peers;
   std::vector<ManagementTable> management;
+  std::vector<ControllerDescription> controllers;
+  std::vector<DiskSetup> disks;
+  std::vector<CameraSetup> cameras;
+  std::vector<AdapterSetup> adapters;
+  std::vector<EnumeratedDescription> enumerated;
+  std::vector<std::string> libraries;  // that can be loaded
 };
 
 /// Reads a machine's file. `source` names it in errors. Throws MachineError.

@@ -34,7 +34,7 @@ struct Knowledge {
 };
 
 // What a trained person knows: which button stands for which lamp.
-constexpr std::array<Knowledge, 14> kKnowledge{{
+constexpr std::array<Knowledge, 15> kKnowledge{{
     {"num-lock", {"green", "white", "blue"}, 1003},
     {"caps-lock", {"green", "white", "blue"}, 1006},
     {"scroll-lock", {"green", "white", "blue"}, 1009},
@@ -46,6 +46,7 @@ constexpr std::array<Knowledge, 14> kKnowledge{{
     {"drive", {"red", "amber", ""}, 1016},
     {"network", {"green", "white", "blue"}, 1018},
     {"webcam", {"green", "white", "blue"}, 1024},
+    {"floppy", {"green", "white", "amber"}, 1001},
     {"touchpad", {"amber", "white", "green"}, 1025},
     {"speaker-mute", {"amber", "white", "red"}, 1026},
     {"microphone-mute", {"amber", "white", "red"}, 1027},

@@ -1,58 +1,49 @@
 #include "platform/sim/SimManagement.h"
 
-#include <algorithm>
-#include <cctype>
-#include <sstream>
-
 #include "platform/Text.h"
+#include "platform/sim/AsciiCase.h"
 #include "platform/sim/FirmwareTable.h"
+#include "platform/sim/WqlQuery.h"
 
 namespace panelglow::platform::sim {
 
 namespace {
 
-std::string Lower(std::string_view text) {
-  std::string lowered(text);
-  std::transform(lowered.begin(), lowered.end(), lowered.begin(),
-                 [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
-  return lowered;
-}
-
 constexpr std::string_view kFirmwareNameSpace = "root\\wmi";
+constexpr std::string_view kDeviceNameSpace = "root\\cimv2";
 constexpr std::string_view kThisMachine = "\\\\.\\";  // may stand in front of a namespace
 
 // A call goes down into the firmware and back.
 constexpr Microseconds kCallCost_us = 2000;
 
+// A query about devices asks their drivers.
+constexpr Microseconds kDeviceQueryCost_us = 3000;
+
 }  // namespace
 
 class SimManagement::Connection : public ManagementConnection {
  public:
-  Connection(SimManagement& owner, const Tables& tables, bool reachesFirmware)
-      : owner_(owner), tables_(tables), reachesFirmware_(reachesFirmware) {}
+  Connection(SimManagement& owner, const Tables& tables, std::string_view nameSpace)
+      : owner_(owner),
+        tables_(tables),
+        reachesDevices_(nameSpace == kDeviceNameSpace),
+        reachesFirmware_(nameSpace == kFirmwareNameSpace) {}
 
-  // "SELECT ... FROM class": whole tables only; a condition is a query that this service does not understand.
-  std::optional<std::vector<ManagementRow>> Query(std::u16string_view query) override {
-    std::istringstream words(Lower(Utf8FromWide(query)));
-    std::string word;
-    std::string previous;
-    std::string className;
-    bool select = false;
-    while (words >> word) {
-      select = select || word == "select";
-      if (!className.empty()) {
-        return std::nullopt;
-      }
-      if (previous == "from") {
-        className = word;
-      }
-      previous = word;
-    }
-    const auto table = tables_.find(className);
-    if (!select || table == tables_.end()) {
+  std::optional<std::vector<ManagementRow>> Query(std::u16string_view text) override {
+    const std::optional<WqlQuery> query = ParseWql(Utf8FromWide(text));
+    if (!query) {
       return std::nullopt;
     }
-    return table->second;
+    if (!query->resultClass.empty()) {
+      return Ask([&] { return owner_.devices_.Associated(*query); });
+    }
+    const auto table = tables_.find(Lowered(query->className));
+    std::optional<std::vector<ManagementRow>> rows =
+        table != tables_.end() ? table->second : Ask([&] { return owner_.devices_.Rows(query->className); });
+    if (rows && query->condition) {
+      std::erase_if(*rows, [&](const ManagementRow& row) { return !Fulfils(row, *query->condition); });
+    }
+    return rows;
   }
 
   ManagementCallResult Call(const ManagementCall& call) override {
@@ -66,15 +57,25 @@ class SimManagement::Connection : public ManagementConnection {
   }
 
  private:
+  template <class Question>
+  std::optional<std::vector<ManagementRow>> Ask(Question question) {
+    if (!reachesDevices_) {
+      return std::nullopt;
+    }
+    owner_.scheduler_.Spend(kDeviceQueryCost_us);
+    return question();
+  }
+
   SimManagement& owner_;
   const Tables& tables_;
+  bool reachesDevices_;
   bool reachesFirmware_;
 };
 
-SimManagement::SimManagement(const MachineDescription& machine, Scheduler& scheduler, FirmwareCall* firmware,
-                             std::function<void()> moved)
-    : scheduler_(scheduler), firmware_(firmware), moved_(std::move(moved)) {
-  nameSpaces_["root\\cimv2"];
+SimManagement::SimManagement(const MachineDescription& machine, const DeviceTables& devices, Scheduler& scheduler,
+                             FirmwareCall* firmware, std::function<void()> moved)
+    : devices_(devices), scheduler_(scheduler), firmware_(firmware), moved_(std::move(moved)) {
+  nameSpaces_[std::string(kDeviceNameSpace)];
   Tables& wmi = nameSpaces_["root\\wmi"];
   if (machine.firmware.inManagement) {
     const std::vector<std::uint8_t> table = BuildFirmwareTable(machine.firmware);
@@ -88,7 +89,7 @@ SimManagement::SimManagement(const MachineDescription& machine, Scheduler& sched
     wmi["tmbbintm"].push_back(firmware_->Instance());
   }
   for (const ManagementTable& table : machine.management) {
-    nameSpaces_[Lower(table.nameSpace)][Lower(table.className)] = table.rows;
+    nameSpaces_[Lowered(table.nameSpace)][Lowered(table.className)] = table.rows;
   }
 }
 
@@ -96,12 +97,12 @@ std::unique_ptr<ManagementConnection> SimManagement::Connect(std::string_view na
   if (nameSpace.substr(0, kThisMachine.size()) == kThisMachine) {
     nameSpace.remove_prefix(kThisMachine.size());
   }
-  const auto found = nameSpaces_.find(Lower(nameSpace));
+  const auto found = nameSpaces_.find(Lowered(nameSpace));
   if (found == nameSpaces_.end()) {
     error = {ManagementStep::kConnect, 0x8004100E};  // the namespace does not exist
     return nullptr;
   }
-  return std::make_unique<Connection>(*this, found->second, found->first == kFirmwareNameSpace);
+  return std::make_unique<Connection>(*this, found->second, found->first);
 }
 
 }  // namespace panelglow::platform::sim

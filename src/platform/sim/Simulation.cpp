@@ -11,20 +11,16 @@
 #include <map>
 #include <system_error>
 
-#include "platform/AbsentDevices.h"
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
 #include "platform/posix/PosixFiles.h"
 #include "platform/profile/ProfileFilesOnFiles.h"
-#include "platform/sim/FintekSuperIo.h"
+#include "platform/sim/ChipMaker.h"
 #include "platform/sim/FirmwareTable.h"
-#include "platform/sim/GpioBlock.h"
-#include "platform/sim/IteSuperIo.h"
 #include "platform/sim/KeyboardDevice.h"
-#include "platform/sim/LegacyPanelBlock.h"
-#include "platform/sim/MemoryRegisters.h"
 #include "platform/sim/Operator.h"
+#include "platform/sim/SimDevices.h"
 #include "platform/sim/SimDriver.h"
 #include "platform/sim/SimHost.h"
 #include "platform/sim/SimManagement.h"
@@ -263,51 +259,6 @@ class SimWindowHost : public desktop::WindowHost {
   Scheduler& scheduler_;
 };
 
-// Builds the chips that have a setup of their own; null for the others.
-struct DeviceMaker {
-  const Scheduler& time;
-
-  std::unique_ptr<Device> operator()(std::monostate /*none*/) const { return nullptr; }
-  std::unique_ptr<Device> operator()(const SuperIoSetup& setup) const {
-    switch (setup.family) {
-      case SuperIoFamily::kIte:
-        return std::make_unique<IteSuperIo>(setup, time);
-      case SuperIoFamily::kFintek:
-        return std::make_unique<FintekSuperIo>(setup, time);
-      default:
-        return std::make_unique<SuperIo>(setup, time);
-    }
-  }
-  std::unique_ptr<Device> operator()(const EmbeddedControllerSetup& setup) const {
-    return std::make_unique<EmbeddedController>(setup, time);
-  }
-  std::unique_ptr<Device> operator()(const MailboxControllerSetup& setup) const {
-    return std::make_unique<MailboxController>(setup, time);
-  }
-  std::unique_ptr<Device> operator()(const HdaCodecSetup& setup) const {
-    return std::make_unique<HdaCodec>(setup, time);
-  }
-};
-
-std::unique_ptr<Device> MakeDevice(const ChipDescription& chip, const Scheduler& time) {
-  if (std::unique_ptr<Device> device = std::visit(DeviceMaker{time}, chip.setup)) {
-    return device;
-  }
-  if (chip.kind == "gpio-block") {
-    return std::make_unique<GpioBlock>(static_cast<std::uint16_t>(chip.base), chip.outputs, chip.inputs,
-                                       chip.initial.empty() ? std::uint8_t{0} : chip.initial.front());
-  }
-  if (chip.kind == "memory-registers") {
-    return std::make_unique<MemoryRegisters>(chip.base, chip.initial);
-  }
-  if (chip.kind == "legacy-panel") {
-    return std::make_unique<LegacyPanelBlock>(static_cast<std::uint16_t>(chip.base));
-  }
-  throw MachineError("chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
-                     "\" (gpio-block, memory-registers, legacy-panel, super-io, embedded-controller, "
-                     "mailbox-controller, hda-codec)");
-}
-
 Simulation* g_current = nullptr;
 
 volatile std::sig_atomic_t g_pendingSignals[2] = {0, 0};
@@ -324,13 +275,15 @@ struct Simulation::Parts {
         buses(description.pci),
         keyboardDevice(AttachKeyboard(buses)),
         firmwareCall(AttachFirmwareCall(buses, description)),
+        devices(description, {scheduler, buses, [this] { LookAtPanel(); }}),
+        chips(devices.Parts()),
         panel(description.leds,
               [this](const std::string& device, const std::string& pin) {
                 const Device* found = buses.Find(device);
                 return found == nullptr ? std::optional<bool>() : found->Signal(pin);
               }),
         driver(description.driver, buses, scheduler, trace, [this] { LookAtPanel(); }),
-        management(description, scheduler, firmwareCall, [this] { LookAtPanel(); }),
+        management(description, devices.tables, scheduler, firmwareCall, [this] { LookAtPanel(); }),
         mutexes(scheduler, description.peers, options.realFiles),
         clock(scheduler, description.startTime + static_cast<std::time_t>(simulationOptions.seed * 7919 % 86400)),
         threads(scheduler),
@@ -344,24 +297,24 @@ struct Simulation::Parts {
         windowHost(scheduler),
         windows(windowHost, description.screenWidth, description.screenHeight),
         images(drawing),
-        host{.cameras = devices,
+        host{.cameras = devices.cameras,
              .clock = clock,
-             .connections = devices,
+             .connections = devices.connections,
              .console = console,
              .cpu = cpu,
              .desktop = windows,
-             .deviceTree = devices,
+             .deviceTree = devices.tree,
              .drivers = driver,
              .environment = environment,
              .files = files,
              .images = images,
              .keyboard = keyboard,
              .management = management,
-             .modules = devices,
+             .modules = devices.modules,
              .mutexes = mutexes,
              .profiles = profiles,
-             .rawDisks = devices,
-             .registry = devices,
+             .rawDisks = devices.disks,
+             .registry = devices.registry,
              .services = driver,
              .threads = threads,
              .touchpad = touchpad,
@@ -387,7 +340,7 @@ struct Simulation::Parts {
 
   void AttachChips() {
     for (const ChipDescription& chip : description.chips) {
-      std::unique_ptr<Device> device = MakeDevice(chip, scheduler);
+      std::unique_ptr<Device> device = MakeChip(chip, scheduler);
       chips.push_back(device.get());
       buses.Attach(chip.name, std::move(device));
     }
@@ -448,7 +401,8 @@ struct Simulation::Parts {
   Buses buses;
   KeyboardDevice& keyboardDevice;
   FirmwareCall* firmwareCall;
-  std::vector<Device*> chips;
+  SimDevices devices;
+  std::vector<Device*> chips;           // those that may act by themselves
   std::optional<Microseconds> awaited;  // the chips' next event, when one is ahead
   DriverTrace trace;
   FrontPanel panel;
@@ -470,7 +424,6 @@ struct Simulation::Parts {
   posix::LazyDrawing drawing;
   posix::DrawnImages images;
   posix::LazyXmlDocuments xmlDocuments{files};
-  AbsentDevices devices;
   Host host;
   std::unique_ptr<Operator> person;
   std::unique_ptr<SimScreen> screen;
