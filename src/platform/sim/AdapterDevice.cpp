@@ -35,6 +35,11 @@ std::optional<Microseconds> AdapterDevice::NextEvent() const {
   return next == changes_.end() ? std::nullopt : std::optional<Microseconds>(next->at);
 }
 
+std::optional<Microseconds> AdapterDevice::UnderWayUntil() const {
+  return changes_.empty() || changes_.back().at <= time_.Now() ? std::nullopt
+                                                               : std::optional<Microseconds>(changes_.back().at);
+}
+
 std::optional<std::uint64_t> AdapterDevice::RegisterOf(std::string_view pin) const {
   return pin == "link" ? std::optional<std::uint64_t>(DoorContext::kOrders) : std::nullopt;
 }

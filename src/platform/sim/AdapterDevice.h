@@ -34,6 +34,7 @@ class AdapterDevice : public Device {
   /// Pin "link".
   [[nodiscard]] std::optional<bool> Signal(std::string_view pin) const override;
   [[nodiscard]] std::optional<Microseconds> NextEvent() const override;
+  [[nodiscard]] std::optional<Microseconds> UnderWayUntil() const override;
   [[nodiscard]] std::optional<std::uint64_t> RegisterOf(std::string_view pin) const override;
   [[nodiscard]] std::string State() const override;
 

@@ -1,6 +1,8 @@
 #include "platform/sim/SimCameras.h"
 
 #include <algorithm>
+#include <iterator>
+#include <utility>
 
 namespace panelglow::platform::sim {
 

@@ -39,6 +39,7 @@ class SimDevices {
   DeviceInventory inventory_;
 
  public:
+  // The services; they stand on what is above.
   SimDeviceTree tree;
   DeviceTables tables;
   SimRegistry registry;

@@ -285,6 +285,34 @@ TEST(SimulatedDisk, GlowsThroughItsTrafficAndALittleLongerAndStaysAsItWas) {
   EXPECT_EQ(machine.HardwareState(), machine.InitialState());
 }
 
+// From a controller of the management service to its disk and to the lamp, as a person would look whether the file is
+// right.
+TEST(SimulatedDisk, OfEachMachineIsFoundOnItsControllerAndLightsItsLamp) {
+  for (const auto& [file, lamps] : {std::pair{"drives-desktop.toml", "sata-drive sas-drive nvme-drive "},
+                                    std::pair{"office-notebook.toml", "drive "}}) {
+    Simulation machine(MachineText(file));
+    platform::Host& host = machine.TheMachine();
+    ManagementError error;
+    const auto connection = host.management.Connect("ROOT\\CIMV2", error);
+    std::string lit;
+    for (const char16_t* query : {u"SELECT * FROM Win32_IDEController", u"SELECT * FROM Win32_SCSIController"}) {
+      for (const ManagementRow& row : connection->Query(query).value()) {
+        const auto& id = std::get<wstring>(std::get<ManagementScalar>(row.Find(u"PNPDeviceID")->content));
+        const DeviceNode node = host.deviceTree.Child(host.deviceTree.Locate(Utf8FromWide(id)));
+        const auto list =
+            host.deviceTree.Open(host.deviceTree.InstanceId(node).value_or(R"(none\)"), 18, kDiskInterface);
+        if (!list) {
+          continue;  // a controller without a disk
+        }
+        EXPECT_EQ(Disk(machine, list->Interface(0)->path).Read(), 0x8000U);
+        lit += machine.Panel().Leds()[machine.Panel().TimeLine().back().led].name + " ";
+        machine.Time().SleepFor(100'000);
+      }
+    }
+    EXPECT_EQ(lit, lamps) << file;
+  }
+}
+
 TEST(SimulatedDisk, IsIllInTheWayOfItsFault) {
   struct Case {
     const char* change;
@@ -415,6 +443,11 @@ TEST(SimulatedAdapter, FollowsTheOrdersOfTheConnectionManagerAlsoOfACallerThatIs
   threads.Terminate(cutter);
   EXPECT_EQ(machine.HardwareState(), machine.InitialState());
   EXPECT_EQ(Edges(machine, "wire").size(), 3U);  // lit at the start, cut, back
+  const ThreadHandle careless = threads.Start("careless", [&] { wire->Disconnect(); });
+  machine.Time().SleepFor(300'000);
+  threads.Terminate(careless);
+  EXPECT_EQ(machine.HardwareState(), machine.InitialState());
+  EXPECT_THAT(machine.SettledState(), HasSubstr("adapter wire = down"));
 }
 
 // Takes the steps in their order and says at which it came to an end.
