@@ -44,6 +44,32 @@ TEST(SystemLedTest, EachKindOfOperatorGetsHisVerdictByTheStartButtonAndTheFixedB
   }
 }
 
+TEST(SystemLedTest, DrivesFloppyCameraAndLinkBlinkByWhatReallyLightsThem) {
+  struct Case {
+    const char* machine;
+    Lines leds;
+    std::vector<const char*> lamps;
+  };
+  for (const Case& c : {Case{"drives-desktop.toml",
+                             {"-HDDOnControllers=all", "-FloppyDrv=true", "-NetworkLED=true"},
+                             {"sata-drive", "sas-drive", "nvme-drive", "floppy-drive", "network"}},
+                        Case{"drives-desktop.toml", {"-HDDOnControllers=any"}, {"sata-drive"}},
+                        Case{"drives-desktop.toml", {"-IDEHardDrive=true"}, {"sata-drive"}},
+                        Case{"office-notebook.toml", {"-WebcamLED=true"}, {"camera"}}}) {
+    const Installation installation;
+    SimulatedRun run = RunOf(installation, c.leds, "perfect");
+    run.machine = installation.Machine(c.machine);
+    run.arguments.emplace_back("-Retries=0");
+    SCOPED_TRACE(run.Describe());
+    const Outcome outcome = run.In(installation);
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.output << outcome.errors;
+    for (const char* lamp : c.lamps) {
+      EXPECT_GE(outcome.TimesLit(lamp), 2U) << lamp;
+    }
+    EXPECT_THAT(outcome.leftBehind, IsEmpty());
+  }
+}
+
 TEST(SystemLedTest, WithoutALedThereIsNothingToTest) {
   for (const Lines& arguments : {Lines{}, Lines{"-NoLED=true"}, Lines{"-AcknowledgeRetry=true"}}) {
     const Installation installation;

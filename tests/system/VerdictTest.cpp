@@ -62,6 +62,8 @@ const std::vector<Machine>& Machines() {
        "mailbox configuration mode"},  // its class opens its chip's configuration ports and does not close them
       {"codec-notebook.toml", "CodecNotebook", {{"speaker-mute", 570, 570, 2}, {"microphone-mute", 570, 570, 2}}},
       {"casl-notebook.toml", "FirmwareNotebook", {{"power-white", 500, 500, 2}}},
+      {"drives-desktop.toml", "DrivesDesktop", {{"sata-drive", 500, 500, 80}, {"nvme-drive", 500, 500, 80}}},
+      {"office-notebook.toml", "OfficeNotebook", {{"drive", 500, 500, 80}, {"camera", 500, 500, 5}}},
   };
   return kMachines;
 }

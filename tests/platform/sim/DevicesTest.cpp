@@ -296,7 +296,8 @@ TEST(SimulatedDisk, OfEachMachineIsFoundOnItsControllerAndLightsItsLamp) {
     const auto connection = host.management.Connect("ROOT\\CIMV2", error);
     std::string lit;
     for (const char16_t* query : {u"SELECT * FROM Win32_IDEController", u"SELECT * FROM Win32_SCSIController"}) {
-      for (const ManagementRow& row : connection->Query(query).value()) {
+      const std::optional<std::vector<ManagementRow>> rows = connection->Query(query);
+      for (const ManagementRow& row : rows.value()) {
         const auto& id = std::get<wstring>(std::get<ManagementScalar>(row.Find(u"PNPDeviceID")->content));
         const DeviceNode node = host.deviceTree.Child(host.deviceTree.Locate(Utf8FromWide(id)));
         const auto list =
