@@ -57,7 +57,8 @@ constexpr std::array<BoardRow, 6> kBoardClasses{{{"generic", MakeGeneric},
 // Boards of the oldest kind, still to be written.
 constexpr std::array<std::string_view, 2> kOldestClasses{"Lantern", "Orchard"};
 
-constexpr const char* kLegacyPorts = "the ports of the oldest desktops are used for its LEDs";
+constexpr const char* kLegacyPorts =
+    "a test that knows the ports of the oldest desktops uses them for power and drive";
 
 // `what` is named by `setting` and cannot be had.
 [[noreturn]] void RefuseNotBuilt(const std::string& what, const Setting& setting, const std::string& served) {

@@ -5,6 +5,7 @@
 #include <stdexcept>
 #include <utility>
 
+#include "config/FileLock.h"
 #include "config/XmlObject.h"
 #include "harness/CmdLineParser.h"
 #include "harness/base/CDMUtil.h"
@@ -166,6 +167,7 @@ bool WriteLog(const std::string& path, const std::string& diagnosticName, const 
   if (file.empty()) {
     return false;
   }
+  const FileLock turn(file);  // two runs at once both leave their record
   OldLog log{Element("DiagnosticsData"), false, {}};
   if (FileExists(file)) {
     log = ReadLog(file);
@@ -178,7 +180,14 @@ bool WriteLog(const std::string& path, const std::string& diagnosticName, const 
     log.root->SetAttribute("Version", kFormatVersion);
   }
   log.root->AddChild(DiagnosticElement(diagnosticName, details));
-  return log.root->TrySaveToFile(file, false, false);
+  const bool saved = log.root->TrySaveToFile(file, false, false);
+  if (!saved) {
+    Notices::Tell(
+        "The structured log " + file +
+        " cannot be written, and has no record of this run: make room, or allow it, or name another file by "
+        "-DataCollectionFile.");
+  }
+  return saved;
 }
 
 }  // namespace

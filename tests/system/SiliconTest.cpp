@@ -151,8 +151,8 @@ TEST(SystemSilicon, AGoodRunTellsPeopleNothing) {
   EXPECT_EQ(
       unknown.errors,
       "panelglow-diags: This machine's board is not known: its system id is \"7E40\", and section [7E40] is not "
-      "in .\\mbdetect.ini and .\\mbtest.ini; without \"platform\" or \"chips\" there, the ports of the oldest "
-      "desktops are used for its LEDs.\n");
+      "in .\\mbdetect.ini and .\\mbtest.ini; without \"platform\" or \"chips\" there, a test that knows the "
+      "ports of the oldest desktops uses them for power and drive.\n");
 }
 
 // A command of the docs, typed from the folder that the docs name.

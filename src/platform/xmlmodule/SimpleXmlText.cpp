@@ -176,6 +176,10 @@ class Writer {
         Refuse(*node, "text stands behind an element");
       }
     }
+    if (behindChild) {
+      // In front of a child stands what lays the file out, new at each writing.
+      text.erase(text.find_last_not_of(" \t\r\n") + 1);
+    }
     if (!IsBlank(text)) {
       WriteEscaped(text);
     }
