@@ -15,7 +15,6 @@
 
 #include "config/FileLock.h"
 
-
 namespace panelglow {
 
 class FileParser {

@@ -317,7 +317,8 @@ class Desktop {
   virtual std::intptr_t Send(const Message& message) = 0;
   virtual void Post(const Message& message) = 0;
 
-  /// Blocks until the calling thread has a message. False for the quit message, and when there is no display any more.
+  /// Blocks until the calling thread has a message. False for the quit message, and when there is no display any
+  /// more.
   virtual bool GetMessage(Message& message) = 0;
 
   /// Handles the keyboard rules of a dialog (Tab, arrows, Enter, Escape, mnemonics) for a message of `dialog` or one

@@ -55,7 +55,6 @@ constexpr std::uint32_t kTicksPerSecond = 1000 / kTick_ms;
 constexpr std::uint32_t kStopTimer = 1;
 constexpr std::uint32_t kStopPeriod_ms = 5000;
 
-
 // Button sets by style: the buttons in order, and the default one. Every other style has the first set.
 struct ButtonSet {
   std::array<int, 3> results;

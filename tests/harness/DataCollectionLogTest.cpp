@@ -141,11 +141,10 @@ TEST(DataCollectionLog, AFileThatCannotBeAddedToWithoutALossStaysAsItIsAndPeople
   };
   for (const auto& [before, reason] : kCases) {
     const std::string log = LogOf(" log.xml ", before);
-    EXPECT_THAT(log,
-                ::testing::StartsWith(before +
-                                      "LogMessage 14 8 \"XML file is corrupted! The subtest will continue "
-                                      "without writing data to the XML file.\" \"\"\npanelglow-diags: The "
-                                      "structured log log.xml is left as it is, without a record of this run: "));
+    EXPECT_THAT(log, ::testing::StartsWith(
+                         before + "LogMessage 14 8 \"XML file is corrupted! The subtest will continue "
+                                  "without writing data to the XML file.\" \"\"\npanelglow-diags: The "
+                                  "structured log log.xml is left as it is, without a record of this run: "));
     EXPECT_THAT(log, ::testing::HasSubstr(reason));
   }
   EXPECT_EQ(LogOf("", ""), "no file\n");

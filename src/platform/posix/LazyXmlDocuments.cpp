@@ -11,7 +11,8 @@ std::unique_ptr<XmlDocument> LazyXmlDocuments::Create() {
   std::call_once(once_, [this] {
     using Maker = XmlDocuments* (*)(Files&);
     std::string error;
-    if (const auto make = reinterpret_cast<Maker>(LoadSymbol("panelglow-xml", "PanelglowXmlDocumentsOnFiles", error))) {
+    if (const auto make =
+            reinterpret_cast<Maker>(LoadSymbol("panelglow-xml", "PanelglowXmlDocumentsOnFiles", error))) {
       documents_.reset(make(files_));
     } else {
       std::fprintf(stderr, "structured documents are not available: %s\n", error.c_str());

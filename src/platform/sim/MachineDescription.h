@@ -69,7 +69,7 @@ struct DriverDescription {
 struct PciFunction {
   std::uint16_t location = 0;
   std::map<std::uint16_t, std::uint32_t> registers;  // dword offset to value
-  std::string controller = {};                            // instance id of the storage controller that it is, if one
+  std::string controller = {};                       // instance id of the storage controller that it is, if one
 };
 
 struct ProcessorDescription {
