@@ -22,9 +22,6 @@ namespace fs = std::filesystem;
 
 const fs::path kTop = PANELGLOW_SOURCE_DIR;
 
-// Its commands are not marked yet.
-constexpr const char* kUnmarked = "writing-a-platform.md";
-
 std::string TextOf(const fs::path& path) {
   std::ifstream file(path, std::ios::binary);
   std::ostringstream text;
@@ -70,7 +67,7 @@ std::vector<Block> BlocksOf(const fs::path& page) {
 std::vector<Block> AllBlocks() {
   std::vector<fs::path> pages{kTop / "README.md", kTop / "machines/README.md"};
   for (const fs::directory_entry& entry : fs::directory_iterator(kTop / "docs")) {
-    if (entry.path().extension() == ".md" && entry.path().filename() != kUnmarked) {
+    if (entry.path().extension() == ".md") {
       pages.push_back(entry.path());
     }
   }

@@ -176,29 +176,5 @@ TEST(SystemSilicon, AGoodRunTellsPeopleNothing) {
       "ports of the oldest desktops uses them for power and drive.\n");
 }
 
-// A command of the docs, typed from the folder that the docs name.
-TEST(SystemSilicon, TheCommandOfTheDocsPasses) {
-  const std::string docs = Golden("../../docs/writing-a-platform.md");
-  const std::string program = "../build/release/bin/panelglow-sim ";
-  const std::size_t at = docs.find(program);
-  ASSERT_NE(at, std::string::npos);
-  std::string command = docs.substr(at + program.size(), docs.find("\n\n", at) - at - program.size());
-  for (const auto& [typed, here] : {std::pair{"\\\n", ""},
-                                    {"--trace /tmp/trace.txt ", ""},
-                                    {"../machines/", PANELGLOW_SOURCE_DIR "/machines/"}}) {
-    const std::size_t place = command.find(typed);
-    ASSERT_NE(place, std::string::npos) << typed;
-    command.replace(place, std::string(typed).size(), here);
-  }
-  std::vector<std::string> arguments;
-  std::istringstream words(command);
-  for (std::string word; words >> word;) {
-    arguments.push_back(word);
-  }
-  const Installation installation;
-  const Outcome outcome = RunProgram("panelglow-sim", arguments, installation.Path(""), {});
-  EXPECT_EQ(outcome.exitCode, 0) << outcome.output << outcome.errors;
-}
-
 }  // namespace
 }  // namespace panelglow::systemtest
