@@ -17,8 +17,8 @@
 #include "controller/PanelView.h"
 #include "controller/ProtocolFollower.h"
 #include "controller/RunReport.h"
-#include "platform/sim/Operator.h"
 #include "platform/sim/SimHost.h"
+#include "platform/sim/person/Operator.h"
 
 namespace {
 

@@ -12,12 +12,12 @@
 
 #include "platform/Host.h"
 #include "platform/desktop/WindowSystem.h"
-#include "platform/sim/Buses.h"
 #include "platform/sim/DriverTrace.h"
-#include "platform/sim/FrontPanel.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
 #include "platform/sim/SimFiles.h"
+#include "platform/sim/base/Scheduler.h"
+#include "platform/sim/person/FrontPanel.h"
+#include "platform/sim/silicon/Buses.h"
 
 namespace panelglow::platform::sim {
 
