@@ -86,7 +86,7 @@ int Check(const Options& options) {
         machine.Break(led, kind);
       }
       if (!options.person.empty()) {
-        const sim::Operator person(machine, options.person);
+        const sim::Operator person(machine.Seat(), {}, options.person);
       }
     } catch (const sim::MachineError& error) {
       return Complain(kWrongCall, error.what());

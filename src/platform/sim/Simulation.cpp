@@ -282,9 +282,7 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
   p.LookAtPanel();
   p.initialState = p.buses.State();
   if (!options.operatorPolicy.empty()) {
-    p.person = std::make_unique<Operator>(
-        OperatorSeat{p.scheduler, p.panel, p.windows, [this](std::string_view what) { Screenshot(what); }},
-        p.description.leds, options.operatorPolicy);
+    p.person = std::make_unique<Operator>(Seat(), p.description.leds, options.operatorPolicy);
   }
   p.former = g_current;
   g_current = this;
@@ -303,6 +301,9 @@ DriverTrace& Simulation::Trace() { return parts_->trace; }
 SimFiles& Simulation::DiskFiles() { return parts_->files; }
 desktop::WindowSystem& Simulation::Windows() { return parts_->windows; }
 Operator* Simulation::Person() { return parts_->person.get(); }
+OperatorSeat Simulation::Seat() {
+  return {parts_->scheduler, parts_->panel, parts_->windows, [this](std::string_view what) { Screenshot(what); }};
+}
 const MachineDescription& Simulation::Description() const { return parts_->description; }
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
 const std::string& Simulation::Errors() const { return parts_->console.Errors(); }

@@ -22,6 +22,7 @@
 namespace panelglow::platform::sim {
 
 class Operator;
+struct OperatorSeat;
 
 struct SimulationOptions {
   std::uint64_t seed = 1;
@@ -55,6 +56,8 @@ class Simulation {
   SimFiles& DiskFiles();
   desktop::WindowSystem& Windows();
   Operator* Person();
+  /// What a person at this machine has in front of them.
+  OperatorSeat Seat();
   [[nodiscard]] const MachineDescription& Description() const;
 
   /// What the program has written to standard output, when it is captured.

@@ -122,8 +122,7 @@ TEST(Simulation, AnImpossibleFaultIsRefused) {
 TEST(Simulation, AnOperatorThatDoesNotExistIsRefused) {
   Simulation machine("");
   for (const char* policy : {"", "perfekt", "wrong:x", "script:/no/such/file"}) {
-    EXPECT_THROW(Operator({machine.Time(), machine.Panel(), machine.Windows(), {}}, {}, policy), MachineError)
-        << policy;
+    EXPECT_THROW(Operator(machine.Seat(), {}, policy), MachineError) << policy;
   }
 }
 
