@@ -331,10 +331,16 @@ void Simulation::Break(std::string_view led, std::string_view fault) {
                        "\": no such LED, or no such partner (swapped:OTHER, shorted:OTHER)");
   }
   const Led& broken = parts_->panel.Leds()[*parts_->panel.Find(led)];
+  FirmwareCall* const firmware = broken.device == kFirmware ? parts_->firmwareCall : nullptr;
   if (kind == LedFault::kAbsentChip) {
     parts_->buses.Remove(broken.device);
+    if (firmware != nullptr) {
+      firmware->GoAway();
+    }
   }
-  if (kind == LedFault::kLyingWrite) {
+  if (kind == LedFault::kLyingWrite && firmware != nullptr) {
+    firmware->IgnoreOrders();
+  } else if (kind == LedFault::kLyingWrite) {
     const Device* device = parts_->buses.Find(broken.device);
     if (const std::optional<std::uint64_t> address = device->RegisterOf(broken.pin)) {
       parts_->buses.IgnoreWrites(broken.device, *address);

@@ -94,7 +94,7 @@ ManagementCallResult FirmwareCall::Call(const ManagementCall& call) {
   if (call.inputClass != kInputClass) {
     return {ManagementCallStep::kGetInputClass, {}};
   }
-  if (Utf8FromWide(call.objectPath) != setup_.path) {
+  if (isGone_ || Utf8FromWide(call.objectPath) != setup_.path) {
     return {ManagementCallStep::kExecute, {}};
   }
 
@@ -145,7 +145,7 @@ std::optional<Bytes> FirmwareCall::AnswerWireless(std::uint32_t command, const B
   bool found = false;
   for (FirmwareCallSetup::Radio& radio : setup_.radios) {
     if (input[2] == kAllRadios || input[2] == radio.number) {
-      radio.on = input[3] == 1;
+      radio.on = ignoresOrders_ ? radio.on : input[3] == 1;
       found = true;
     }
   }

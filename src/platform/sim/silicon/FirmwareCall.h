@@ -61,6 +61,11 @@ class FirmwareCall : public Device {
   [[nodiscard]] ManagementRow Instance() const;
   [[nodiscard]] ManagementCallResult Call(const ManagementCall& call);
 
+  /// From now on orders are answered as ever and change nothing.
+  void IgnoreOrders() { ignoresOrders_ = true; }
+  /// From now on no call reaches the firmware.
+  void GoAway() { isGone_ = true; }
+
   [[nodiscard]] std::optional<bool> Signal(std::string_view pin) const override;
   [[nodiscard]] std::string State() const override;
 
@@ -73,6 +78,8 @@ class FirmwareCall : public Device {
   [[nodiscard]] std::optional<Bytes> AnswerThermal(std::uint32_t command, const Bytes& input);
 
   FirmwareCallSetup setup_;
+  bool ignoresOrders_ = false;
+  bool isGone_ = false;
 };
 
 }  // namespace panelglow::platform::sim
