@@ -2,22 +2,22 @@
 
 #include <algorithm>
 
-#include "board/chips/CaslChip.h"
-#include "board/chips/EcChip.h"
-#include "board/chips/EcIt8512Chip.h"
-#include "board/chips/EcIt8518Chip.h"
-#include "board/chips/EcWpc8763Chip.h"
-#include "board/chips/GCodecChip.h"
-#include "board/chips/GEcChip.h"
-#include "board/chips/GEcIt8519Chip.h"
-#include "board/chips/GFintekChip.h"
-#include "board/chips/GIoSpaceChip.h"
-#include "board/chips/GIt8702Chip.h"
-#include "board/chips/GIteChip.h"
-#include "board/chips/GMemorySpaceChip.h"
-#include "board/chips/GSioChip.h"
-#include "board/chips/SmscKbc1126Chip.h"
-#include "board/chips/SmscMec1322Chip.h"
+#include "board/chips/ec/EcChip.h"
+#include "board/chips/ec/EcIt8512Chip.h"
+#include "board/chips/ec/EcIt8518Chip.h"
+#include "board/chips/ec/EcWpc8763Chip.h"
+#include "board/chips/ec/SmscKbc1126Chip.h"
+#include "board/chips/ec/SmscMec1322Chip.h"
+#include "board/chips/firmware/CaslChip.h"
+#include "board/chips/generic/GCodecChip.h"
+#include "board/chips/generic/GEcChip.h"
+#include "board/chips/generic/GEcIt8519Chip.h"
+#include "board/chips/generic/GFintekChip.h"
+#include "board/chips/generic/GIoSpaceChip.h"
+#include "board/chips/generic/GIt8702Chip.h"
+#include "board/chips/generic/GIteChip.h"
+#include "board/chips/generic/GMemorySpaceChip.h"
+#include "board/chips/generic/GSioChip.h"
 
 namespace panelglow {
 

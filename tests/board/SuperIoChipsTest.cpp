@@ -6,8 +6,8 @@
 
 #include "board/BoardBench.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/GFintekChip.h"
-#include "board/chips/GIt8702Chip.h"
+#include "board/chips/generic/GFintekChip.h"
+#include "board/chips/generic/GIt8702Chip.h"
 #include "platform/Host.h"
 
 namespace panelglow {

@@ -23,9 +23,6 @@ constexpr std::uint8_t kClockBankRegister = 0xAA;
 
 constexpr std::uint32_t kLatchSettle_ms = 250;
 
-// False for a bit that the word does not have: bit numbers come from files.
-bool HasBit(std::uint32_t word, int bit) { return bit >= 0 && bit < 32 && (word >> bit & 1U) != 0; }
-
 }  // namespace
 
 Chip::Chip() : Chip("chip") {}
@@ -92,26 +89,26 @@ bool Chip::RestorePowerButtonState() {
 
 // ---- latched status ports
 
-bool Chip::ReadLatchedPort(std::uint16_t port, int bit, bool& value) {
+bool Chip::ReadLatchedPort(std::uint16_t port, std::uint32_t mask, bool& value) {
   const std::uint8_t status = devio.InportByte(port);
-  value = HasBit(status, bit);
+  value = (status & mask) != 0;
   if (value) {
     devio.OutportByte(port, status);
   }
   return true;
 }
 
-bool Chip::ReadLatchedPortDword(std::uint16_t port, int bit, bool& value) {
+bool Chip::ReadLatchedPortDword(std::uint16_t port, std::uint32_t mask, bool& value) {
   lastStatus = devio.InportDword(port);
-  value = HasBit(lastStatus, bit);
+  value = (lastStatus & mask) != 0;
   if (value) {
     platform::TheHost().clock.Sleep(kLatchSettle_ms);
-    ClearLatchedPortDword(port, bit);
+    ClearLatchedPortDword(port, mask);
   }
   return true;
 }
 
-bool Chip::ClearLatchedPortDword(std::uint16_t port, int /*bit*/) {
+bool Chip::ClearLatchedPortDword(std::uint16_t port, std::uint32_t /*mask*/) {
   devio.OutportDword(port, devio.InportDword(port));
   devio.OutportByte(kClockBankIndex, kClockBankRegister);
   devio.OutportByte(kClockBankData, 0);
