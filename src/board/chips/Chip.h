@@ -11,6 +11,8 @@
 #include <utility>
 #include <vector>
 
+#include "board/parts/Lines.h"
+#include "board/parts/PowerButton.h"
 #include "hw/CDevio.h"
 
 namespace panelglow {
@@ -18,9 +20,9 @@ namespace panelglow {
 class Chip {
  public:
   // States of a GPIO line.
-  static constexpr int kAsserted = 3;
-  static constexpr int kNotAsserted = 4;
-  static constexpr int kNoSuchLine = -1;
+  static constexpr int kAsserted = kLineAsserted;
+  static constexpr int kNotAsserted = kLineNotAsserted;
+  static constexpr int kNoSuchLine = kNoSuchLineState;
 
   Chip();
   virtual ~Chip() = default;
@@ -160,8 +162,7 @@ class Chip {
   std::uint32_t lastStatus = 0;  // last value of a latched status read
 
  private:
-  std::uint8_t powerButtonPort = 0;   // port 0x458 as SavePowerButtonState found it
-  std::uint16_t powerButtonMask = 0;  // port 0xF802 as ArmPowerButton found it
+  PowerButton powerButton;
 };
 
 }  // namespace panelglow

@@ -1,6 +1,7 @@
 #include "board/chips/ec/EcChip.h"
 
 #include "board/parts/Bits.h"
+#include "board/parts/RowOf.h"
 
 namespace panelglow {
 
@@ -64,12 +65,12 @@ void EcChip::WriteEcWord(std::uint16_t address, std::uint8_t value) {
 }
 
 std::uint32_t EcChip::ReadFanTach(int fan, int /*arg*/) {
-  if (fan != 1 && fan != 2) {
+  const auto* addresses = RowOf(kTachAddresses, fan);
+  if (addresses == nullptr) {
     return kNoTach;
   }
-  const auto& addresses = kTachAddresses[fan - 1];
-  const std::uint8_t low = ReadEc(addresses[0]);
-  const std::uint8_t high = ReadEc(addresses[1]);
+  const std::uint8_t low = ReadEc((*addresses)[0]);
+  const std::uint8_t high = ReadEc((*addresses)[1]);
   WriteEcWord(kFanControl, kAutomatic);
   return WordOf(high, low);
 }
@@ -79,11 +80,12 @@ int EcChip::TachToRpm(std::uint32_t raw, int /*multiplier*/) {
 }
 
 bool EcChip::SetFanPwm(int fan, int value) {
-  if (fan != 1 && fan != 2) {
+  const std::uint16_t* duty = RowOf(kDuty, fan);
+  if (duty == nullptr) {
     return false;
   }
   WriteEcWord(kFanControl, kManual);
-  WriteEcWord(kDuty[fan - 1], LowByte(static_cast<std::uint32_t>(value)));
+  WriteEcWord(*duty, LowByte(static_cast<std::uint32_t>(value)));
   return true;
 }
 

@@ -1,6 +1,7 @@
 #include "board/chips/ec/EcIt8512Chip.h"
 
 #include "board/parts/Bits.h"
+#include "board/parts/RowOf.h"
 
 namespace panelglow {
 
@@ -25,11 +26,12 @@ constexpr int kNoTemperature = 255;
 }  // namespace
 
 std::uint32_t EcIt8512Chip::ReadFanTach(int fan, int /*arg*/) {
-  if (fan != 1 && fan != 2) {
+  const auto* addresses = RowOf(kTachAddresses, fan);
+  if (addresses == nullptr) {
     return kNoTach;
   }
-  const std::uint8_t low = ReadEc(kTachAddresses[fan - 1][0]);
-  const std::uint8_t high = ReadEc(kTachAddresses[fan - 1][1]);
+  const std::uint8_t low = ReadEc((*addresses)[0]);
+  const std::uint8_t high = ReadEc((*addresses)[1]);
   Send(kAutomaticFanCommand, {1});
   Send(kAutomaticFanCommand, {2});
   return WordOf(high, low);
@@ -40,23 +42,25 @@ void EcIt8512Chip::Write8512(std::uint16_t address, std::uint8_t value) {
 }
 
 bool EcIt8512Chip::SetFanPwm(int fan, int value) {
-  if (fan != 1 && fan != 2) {
+  const std::uint16_t* duty = RowOf(kDuty, fan);
+  if (duty == nullptr) {
     return false;
   }
   Send(kManualFanCommand, {1});
   Send(kManualFanCommand, {2});
-  Write8512(kDuty[fan - 1], LowByte(static_cast<std::uint32_t>(value)));
+  Write8512(*duty, LowByte(static_cast<std::uint32_t>(value)));
   return true;
 }
 
 bool EcIt8512Chip::SetFanFullSpeed(int fan) { return SetFanPwm(fan, kFullDuty); }
 
 bool EcIt8512Chip::ReadTemperature(int zone, int& value) {
-  if (zone != 1 && zone != 2) {
+  const std::uint8_t* address = RowOf(kTemperatures, zone);
+  if (address == nullptr) {
     value = kNoTemperature;
     return false;
   }
-  value = ReadEc(kTemperatures[zone - 1]);
+  value = ReadEc(*address);
   return true;
 }
 

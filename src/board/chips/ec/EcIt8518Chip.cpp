@@ -1,7 +1,8 @@
 #include "board/chips/ec/EcIt8518Chip.h"
 
-#include "board/parts/Bits.h"
-#include "harness/base/CDMUtil.h"
+#include "board/parts/BitName.h"
+#include "board/parts/Lines.h"
+#include "board/parts/RowOf.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -21,12 +22,6 @@ constexpr std::uint32_t kPulse_ms = 10;
 constexpr std::uint32_t kNoTach = 0xFFFF;
 constexpr int kNoTemperature = 255;
 
-// The mask of a bit named by its number; 0 for a bit that a byte does not have.
-std::uint8_t MaskOf(const std::string& bitName) {
-  const int bit = CDMUtil::ToInt(bitName);
-  return bit >= 0 && bit < 8 ? static_cast<std::uint8_t>(1U << static_cast<unsigned>(bit)) : std::uint8_t{0};
-}
-
 }  // namespace
 
 std::uint32_t EcIt8518Chip::ReadFanTach(int fan, int /*arg*/) {
@@ -38,11 +33,12 @@ std::uint32_t EcIt8518Chip::ReadFanTach(int fan, int /*arg*/) {
 }
 
 bool EcIt8518Chip::ReadTemperature(int zone, int& value) {
-  if (zone != 1 && zone != 2) {
+  const std::uint8_t* address = RowOf(kTemperatures, zone);
+  if (address == nullptr) {
     value = kNoTemperature;
     return false;
   }
-  value = ReadEc(kTemperatures[zone - 1]);
+  value = ReadEc(*address);
   return true;
 }
 
@@ -55,14 +51,14 @@ bool EcIt8518Chip::SetPowerLed(std::uint8_t mode) {
 int EcIt8518Chip::ReadLineByNames(std::uint32_t offset, const std::string& bitName, const std::string& clearBitName) {
   const std::uint8_t reg = LowByte(offset);
   if (!clearBitName.empty()) {
-    const std::uint8_t clear = MaskOf(clearBitName);
+    const std::uint8_t clear = LowByte(MaskOfBitName(clearBitName, 8));
     devio.OutportByte(kStatusPort, reg);
     devio.OutportByte(kDataPort, clear);
     platform::TheHost().clock.Sleep(kPulse_ms);
     devio.OutportByte(kStatusPort, reg);
     devio.OutportByte(kDataPort, 0);
   }
-  return (ReadEc(reg) & MaskOf(bitName)) != 0 ? kAsserted : kNotAsserted;
+  return LineState((ReadEc(reg) & MaskOfBitName(bitName, 8)) != 0);
 }
 
 }  // namespace panelglow

@@ -2,6 +2,7 @@
 
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
+#include "board/parts/ProbeConfigPort.h"
 #include "board/parts/Sequence.h"
 #include "platform/Host.h"
 
@@ -16,11 +17,7 @@ constexpr std::array<const char*, 12> kListKeys{
     "chargeled.green.savemux.sequence",  "chargeled.green.enablemux.sequence", "chargeled.red.assert.sequence",
     "chargeled.red.deassert.sequence",   "chargeled.red.savemux.sequence",     "chargeled.red.enablemux.sequence"};
 
-// Configuration port: at one of two places, found by what the first one answers.
-constexpr std::uint16_t kFirstConfigPort = 0x2E;
-constexpr std::uint16_t kSecondConfigPort = 0x4E;
-constexpr std::uint8_t kEnterKey = 0x55;
-constexpr std::uint8_t kNobody = 0xFF;
+constexpr std::uint8_t kEnterKey = 0x55;  // of the configuration mode
 
 // Mailbox.
 constexpr std::uint16_t kMailboxIndex = 0x200;
@@ -51,9 +48,7 @@ constexpr int kDefaultWait_ms = 30;
 
 SmscMec1322Chip::SmscMec1322Chip() : EcChip("smsc_mec1322") {
   static_assert(kListKeys.size() == kListCount);
-  devio.OutportByte(kFirstConfigPort, kEnterKey);
-  const bool isSecond = devio.InportByte(kFirstConfigPort + 1) == kNobody;
-  devio.OutportByte(isSecond ? kSecondConfigPort : kFirstConfigPort, kEnterKey);
+  devio.OutportByte(ProbeConfigPort(devio, std::array{kEnterKey}), kEnterKey);
   const std::string section = ReadIniValue("chip.smsc_mec1322.data", name);
   for (std::size_t i = 0; i < kListKeys.size(); ++i) {
     lists[i] = ParsePairs<std::uint16_t>(ReadChipSetting(section, kListKeys[i], ""));

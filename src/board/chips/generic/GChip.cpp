@@ -1,6 +1,7 @@
 #include "board/chips/generic/GChip.h"
 
 #include "board/base/IniReader.h"
+#include "board/parts/IndexedPorts.h"
 #include "board/parts/Sequence.h"
 #include "harness/base/CDMUtil.h"
 
@@ -100,13 +101,11 @@ std::uint8_t GChip::ReadPort(std::uint16_t base, std::uint16_t offset) {
 }
 
 std::uint8_t GChip::ReadIndexed(std::uint16_t indexPort, std::uint8_t reg) {
-  devio.OutportByte(indexPort, reg);
-  return devio.InportByte(static_cast<std::uint16_t>(indexPort + 1));
+  return IndexedPorts(devio, indexPort).Read(reg);
 }
 
 void GChip::WriteIndexed(std::uint16_t indexPort, std::uint8_t reg, std::uint8_t value) {
-  devio.OutportByte(indexPort, reg);
-  devio.OutportByte(static_cast<std::uint16_t>(indexPort + 1), value);
+  IndexedPorts(devio, indexPort).Write(reg, value);
 }
 
 }  // namespace panelglow

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "board/chips/Chip.h"
+#include "board/parts/SavedRegisters.h"
 
 namespace panelglow {
 
@@ -43,8 +44,8 @@ class GChip : public Chip {
   [[nodiscard]] std::vector<Number> ReadNumberedList(const std::string& countKey, const std::string& prefix,
                                                      const std::string& suffix) const;
 
-  std::string section;                     // chip file section; empty until loaded
-  std::vector<std::uint8_t> savedFanData;  // values read by SaveFanState
+  std::string section;  // chip file section; empty until loaded
+  SavedRegisters savedFans;
   std::vector<std::uint8_t> fanSaveRegs;
   std::uint32_t fanRestoreSleep = 0;  // ms
   std::vector<std::uint32_t> tachRegs;
@@ -54,7 +55,7 @@ class GChip : public Chip {
   std::vector<std::uint16_t> tempLimitRegs;
   std::uint8_t powerLedLdn = 0;
   std::vector<std::uint8_t> powerLedStateRegs;
-  std::vector<std::uint8_t> savedPowerLedData;  // values read by SavePowerLedState
+  SavedRegisters savedPowerLed;
 };
 
 }  // namespace panelglow

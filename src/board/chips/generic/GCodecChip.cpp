@@ -1,9 +1,9 @@
 #include "board/chips/generic/GCodecChip.h"
 
-#include <cstddef>
-
 #include "board/base/IniReader.h"
 #include "board/base/mblib_exception.h"
+#include "board/parts/Bits.h"
+#include "board/parts/PhysicalRegisters.h"
 #include "board/parts/Sequence.h"
 #include "platform/Host.h"
 
@@ -77,22 +77,13 @@ void GCodecChip::ParseVerbList(const Setting& setting, std::vector<std::uint32_t
 
 // ---- immediate commands
 
+// A read that fails is 0.
 std::uint32_t GCodecChip::ReadRegister(std::uint16_t offset, std::uint32_t length) {
-  std::array<std::byte, kVerbBytes> bytes{};
-  devio.ReadPhysicalMemory(hdaBar + offset, length, bytes);
-  std::uint32_t value = 0;
-  for (std::uint32_t i = length; i-- > 0;) {
-    value = value << 8U | std::to_integer<std::uint32_t>(bytes[i]);
-  }
-  return value;
+  return PhysicalRegisters(devio, hdaBar).Read(offset, length).value_or(0);
 }
 
 void GCodecChip::WriteRegister(std::uint16_t offset, std::uint32_t length, std::uint32_t value) {
-  std::array<std::byte, kVerbBytes> bytes{};
-  for (std::uint32_t i = 0; i < length; ++i) {
-    bytes[i] = static_cast<std::byte>(value >> (8 * i));
-  }
-  devio.WritePhysicalMemory(hdaBar + offset, length, bytes);
+  PhysicalRegisters(devio, hdaBar).Write(offset, length, value);
 }
 
 // Looks again while the controller is busy, as long as there are looks left.
@@ -163,7 +154,7 @@ bool GCodecChip::SetGpio(std::uint16_t bit, bool asserted) {
   if (stateSetVerbs.size() != kVerbs) {
     return false;
   }
-  const std::uint32_t mask = bit < 32 ? 1U << bit : 0;
+  const std::uint32_t mask = MaskOfBit(bit, 32);
   SendVerb(SetVerb(0, mask));
   SendVerb(SetVerb(1, mask));
   SendVerb(SetVerb(2, mask) ^ (asserted ? mask : 0));
@@ -175,7 +166,7 @@ bool GCodecChip::BlinkGpio(std::uint16_t bit) {
   if (stateSetVerbs.size() != kVerbs) {
     return false;
   }
-  const std::uint32_t mask = bit < 32 ? 1U << bit : 0;
+  const std::uint32_t mask = MaskOfBit(bit, 32);
   SendVerb(SetVerb(0, mask));
   SendVerb(SetVerb(1, mask));
   std::uint32_t value = SetVerb(2, mask);

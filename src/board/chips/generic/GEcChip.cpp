@@ -5,6 +5,7 @@
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
 #include "board/parts/NumberedLists.h"
+#include "board/parts/RpmOf.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -21,7 +22,6 @@ constexpr std::uint8_t kUsualQueryCmd = 0x84;
 
 constexpr double kTachPeriod_s = 2.7826087e-5;  // of one count of the tachometer
 constexpr double kSecondsPerMinute = 60.0;
-constexpr std::uint32_t kTachStopped = 0xFFFF;
 
 }  // namespace
 

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "board/chips/generic/GEcChip.h"
+#include "board/parts/RpmOf.h"
 
 namespace panelglow {
 
@@ -11,7 +12,6 @@ class GEcIt8519Chip : public GEcChip {
   GEcIt8519Chip() : GEcChip("g_ec_it8519") {}
 
   int TachToRpm(std::uint32_t raw, int /*multiplier*/) override {
-    constexpr std::uint32_t kTachStopped = 0xFFFF;
     return raw >= kTachStopped ? 0 : static_cast<int>(raw);
   }
 };

@@ -1,11 +1,17 @@
 #include "board/chips/generic/GFintekChip.h"
 
+#include <algorithm>
 #include <array>
+#include <optional>
 
 #include "board/base/IniReader.h"
 
+#include "board/parts/Bits.h"
+#include "board/parts/ClearedLatch.h"
+#include "board/parts/ConfigMode.h"
+#include "board/parts/Lines.h"
+#include "board/parts/RpmOf.h"
 #include "board/parts/Sequence.h"
-#include "platform/Host.h"
 
 namespace panelglow {
 
@@ -13,20 +19,14 @@ namespace {
 
 constexpr int kTachClock = 1'500'000;
 constexpr std::uint32_t kTachOverflow = 4095;  // of the 12-bit counter
-constexpr std::uint32_t kTachStopped = 0xFFFF;
 
 constexpr int kIntrusionLine = 237;
 constexpr std::uint8_t kIntrusionStatus = 0x03;  // environment register; its bit is cleared by writing it
 constexpr std::uint8_t kIntrusion = 0x01;
 constexpr std::uint32_t kClearSettle_ms = 10;
 
-// GPIO groups: first line, last line, configuration register with the levels. A line's bit is its place in the group.
-struct GpioGroup {
-  int first;
-  int last;
-  std::uint8_t levelReg;
-};
-constexpr std::array<GpioGroup, 5> kGpioGroups{
+// GPIO groups: first line, last line, configuration register with the levels.
+constexpr std::array<LineRange, 5> kGpioGroups{
     {{0, 5, 0xF2}, {10, 17, 0xE2}, {20, 27, 0xD2}, {30, 33, 0xC2}, {40, 45, 0xB2}}};
 
 }  // namespace
@@ -45,9 +45,7 @@ void GFintekChip::LoadBlinkLists() {
 void GFintekChip::ParsePairList(const Setting& setting, PairList& list) { list = ParsePairs<std::uint8_t>(setting); }
 
 bool GFintekChip::RunPairList(const PairList& list) {
-  for (const auto& [reg, value] : list) {
-    WriteEnvRegister(reg, value);
-  }
+  Run(StepsOf(list), environment);
   return true;
 }
 
@@ -64,10 +62,7 @@ bool GFintekChip::ReadFanRpm(int fan, int& rpm, int multiplier) {
 }
 
 int GFintekChip::TachToRpm(std::uint32_t raw, int /*multiplier*/) {
-  if (raw == 0 || raw == kTachOverflow || raw >= kTachStopped) {
-    return 0;
-  }
-  return kTachClock / static_cast<int>(raw);
+  return raw == kTachOverflow ? 0 : RpmOf(kTachClock, std::min(raw, kTachStopped));
 }
 
 bool GFintekChip::ReadIntrusionLatch(int line, bool /*clearFirst*/, bool& value) {
@@ -78,11 +73,7 @@ bool GFintekChip::ReadIntrusionLatch(int line, bool /*clearFirst*/, bool& value)
 
 int GFintekChip::ReadLine(int line) {
   if (line == kIntrusionLine) {
-    if ((ReadEnvRegister(kIntrusionStatus) & kIntrusion) != 0) {
-      WriteEnvRegister(kIntrusionStatus, kIntrusion);
-    }
-    platform::TheHost().clock.Sleep(kClearSettle_ms);
-    return (ReadEnvRegister(kIntrusionStatus) & kIntrusion) != 0 ? kAsserted : kNotAsserted;
+    return LineState(ReadClearedLatch(environment, {0, kIntrusionStatus}, kIntrusion, kClearSettle_ms));
   }
   std::uint8_t reg = 0;
   std::uint8_t mask = 0;
@@ -91,18 +82,16 @@ int GFintekChip::ReadLine(int line) {
   }
   const ConfigMode mode(*this);
   SelectLogicalDevice(gpioLdn);
-  return (ReadConfigRegister(reg) & mask) != 0 ? kAsserted : kNotAsserted;
+  return LineState((ReadConfigRegister(reg) & mask) != 0);
 }
 
 bool GFintekChip::MapGpioLine(int line, std::uint8_t& reg, std::uint8_t& mask) {
-  for (const GpioGroup& group : kGpioGroups) {
-    if (line >= group.first && line <= group.last) {
-      reg = group.levelReg;
-      mask = static_cast<std::uint8_t>(1U << static_cast<unsigned>(line - group.first));
-      return true;
-    }
+  const std::optional<LinePlace> found = FindLine(kGpioGroups, line);
+  if (found) {
+    reg = LowByte(found->place);
+    mask = LowByte(found->mask);
   }
-  return false;
+  return found.has_value();
 }
 
 }  // namespace panelglow

@@ -14,8 +14,7 @@ namespace panelglow {
 
 class GFintekChip : public GSioChip {
  public:
-  /// Register and value, in the order of the writes.
-  using PairList = std::vector<std::pair<std::uint8_t, std::uint8_t>>;
+  using GSioChip::PairList;
 
   GFintekChip() : GSioChip("g_fintek") {}
 

@@ -5,18 +5,16 @@
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
 #include "board/parts/NumberedLists.h"
-#include "platform/Host.h"
+#include "board/parts/Step.h"
 
 namespace panelglow {
 
 namespace {
 
-constexpr std::uint8_t kKeepAll = 0xFF;
-constexpr std::uint8_t kFansOn = 0x70;        // of the fan main control register: tachometers 1 to 3
-constexpr std::uint8_t kNoFanControl = 0xF7;  // of the fan control register
-constexpr std::uint8_t kNoRamp = 0x3F;        // of the ramp rate register
-constexpr std::uint8_t kStart = 0x01;         // of the configuration register: the monitor runs
-constexpr std::uint8_t kStopped = 0xFE;
+constexpr std::uint8_t kFansOn = 0x70;      // of the fan main control register: tachometers 1 to 3
+constexpr std::uint8_t kFanControl = 0x08;  // of the fan control register
+constexpr std::uint8_t kRamp = 0xC0;        // of the ramp rate register
+constexpr std::uint8_t kStart = 0x01;       // of the configuration register: the monitor runs
 
 }  // namespace
 
@@ -29,15 +27,10 @@ void GIt8702Chip::Initialize() {
   fanRampRateReg = readRegister("fan_ramp_rate.reg");
 }
 
-void GIt8702Chip::Change(std::uint8_t reg, std::uint8_t keep, std::uint8_t set) {
-  WriteEnvRegister(reg, static_cast<std::uint8_t>((ReadEnvRegister(reg) & keep) | set));
-}
-
 bool GIt8702Chip::EnterManualFanMode() {
-  Change(fanMainControlReg, kKeepAll, kFansOn);
-  Change(fanControlReg, kNoFanControl, 0);
-  Change(fanRampRateReg, kNoRamp, 0);
-  Change(configReg, kStopped, 0);
+  Run(Steps{SetBits({0, fanMainControlReg}, kFansOn), ClearBits({0, fanControlReg}, kFanControl),
+            ClearBits({0, fanRampRateReg}, kRamp), ClearBits({0, configReg}, kStart)},
+      environment);
   return true;
 }
 
@@ -46,17 +39,12 @@ std::string GIt8702Chip::FanIntegrityText() const {
 }
 
 bool GIt8702Chip::RestoreFanState() {
-  if (savedFanData.empty()) {
-    return true;
-  }
-  CheckFanIntegrity();
-  for (std::size_t i = savedFanData.size(); i-- > 1;) {
-    WriteSavedFanRegister(i);
-  }
-  WriteEnvRegister(fanSaveRegs.front(), savedFanData.front() | kStart);
-  savedFanData.clear();
-  if (fanRestoreSleep != 0) {
-    platform::TheHost().clock.Sleep(fanRestoreSleep);
+  if (savedFans.Holds()) {
+    CheckFanIntegrity();
+    const RegisterId starter{0, fanSaveRegs.front()};
+    savedFans.Restore(environment, RegistersAt(0, {fanSaveRegs.rbegin(), fanSaveRegs.rend() - 1}));
+    environment.Write(starter, savedFans.At(starter) | kStart);
+    EndFanRestore();
   }
   return true;
 }

@@ -2,7 +2,6 @@
 // automatic mode. Serves the chip name "g_it8702".
 #pragma once
 
-#include <array>
 #include <cstdint>
 
 #include "board/chips/generic/GIteChip.h"
@@ -24,8 +23,6 @@ class GIt8702Chip : public GIteChip {
   [[nodiscard]] std::string FanIntegrityText() const override;
 
  private:
-  void Change(std::uint8_t reg, std::uint8_t keep, std::uint8_t set);
-
   std::uint8_t configReg = 0;
   std::uint8_t fanMainControlReg = 0;
   std::uint8_t fanControlReg = 0;

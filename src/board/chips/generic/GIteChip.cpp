@@ -3,6 +3,8 @@
 #include "board/base/IniReader.h"
 #include "board/base/mblib_exception.h"
 #include "board/parts/Bits.h"
+#include "board/parts/ConfigMode.h"
+#include "board/parts/Step.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
 
@@ -50,6 +52,7 @@ void GIteChip::Initialize() {
 }
 
 void GIteChip::ExitConfigMode() {
+  // The index stands still between the read and the write.
   devio.OutportByte(indexPort, kConfigureControl);
   devio.OutportByte(dataPort, devio.InportByte(dataPort) | kReturnToWaitForKey);
 }
@@ -80,12 +83,12 @@ int GIteChip::ReadLine(int line) {
   }
   platform::Clock& clock = platform::TheHost().clock;
   // The first reads give what was latched before; what counts is the state behind them.
-  WriteEnvRegister(kConfiguration, ReadEnvRegister(kConfiguration) | kClearIntrusion);
+  Run(Steps{SetBits({0, kConfiguration}, kClearIntrusion)}, environment);
   ReadEnvRegister(kInterruptStatus1);
   clock.Sleep(kClearSettle_ms);
   ReadEnvRegister(kInterruptStatus1);
   clock.Sleep(kStatusSettle_ms);
-  return (ReadEnvRegister(kInterruptStatus1) & kIntrusion) != 0 ? kAsserted : kNotAsserted;
+  return LineState((ReadEnvRegister(kInterruptStatus1) & kIntrusion) != 0);
 }
 
 // ---- blink lists

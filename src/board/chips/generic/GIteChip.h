@@ -42,7 +42,6 @@ class GIteChip : public GSioChip {
   explicit GIteChip(std::string chipName) : GSioChip(std::move(chipName)) {}
 
  private:
-  using PairList = std::vector<std::pair<std::uint8_t, std::uint8_t>>;
   PairList ParseBlinkList(const std::string& key);
   std::uint8_t BlinkValue(const std::string& token, const std::string& key, const Setting& setting);
 

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "board/chips/generic/MaskedLedChip.h"
+#include "board/parts/PhysicalRegisters.h"
 
 namespace panelglow {
 
@@ -22,7 +23,8 @@ class GMemorySpaceChip : public MaskedLedChip {
   void WriteRegisterByte(std::uint32_t address, std::uint8_t value) override;
 
  private:
-  std::uint32_t gpioBar;  // physical address of the GPIO block
+  PhysicalRegisters memory;  // of the whole address space
+  std::uint32_t gpioBar;     // physical address of the GPIO block
 };
 
 }  // namespace panelglow

@@ -5,7 +5,9 @@
 
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
+#include "board/parts/ConfigMode.h"
 #include "board/parts/NumberedLists.h"
+#include "board/parts/RpmOf.h"
 #include "board/parts/Sequence.h"
 #include "platform/Host.h"
 
@@ -22,7 +24,6 @@ constexpr std::uint8_t kGpioLdn = 7;
 constexpr int kGpioBarReg = 0x6263;
 
 constexpr std::int64_t kTachClock = 1'350'000;
-constexpr std::uint32_t kTachStopped = 0xFFFF;
 constexpr int kHottest = 126;  // a raw temperature from here on is no temperature
 constexpr int kNoTemperature = 255;
 
@@ -84,59 +85,28 @@ std::uint16_t GSioChip::FindBar(const BarKeys& keys) {
 
 // ---- the part's protocol
 
-GSioChip::ConfigMode::~ConfigMode() noexcept(false) {
-  try {
-    chip_.ExitConfigMode();
-  } catch (const platform::ThreadTerminated&) {
-    chip_.ExitConfigMode();  // undisturbed now
-    throw;
-  }
-}
+void GSioChip::EnterConfigMode() { ConfigPorts().Send(enterSequence); }
 
-void GSioChip::EnterConfigMode() {
-  for (const std::uint8_t key : enterSequence) {
-    devio.OutportByte(indexPort, key);
-  }
-}
-
-void GSioChip::ExitConfigMode() {
-  for (const std::uint8_t key : exitSequence) {
-    devio.OutportByte(indexPort, key);
-  }
-}
+void GSioChip::ExitConfigMode() { ConfigPorts().Send(exitSequence); }
 
 void GSioChip::SelectLogicalDevice(std::uint8_t ldn) { WriteConfigRegister(kLogicalDeviceNumber, ldn); }
 
-std::uint8_t GSioChip::ReadConfigRegister(std::uint8_t reg) {
-  devio.OutportByte(indexPort, reg);
-  return devio.InportByte(dataPort);
+std::uint8_t GSioChip::ReadConfigRegister(std::uint8_t reg) { return ConfigPorts().Read(reg); }
+
+void GSioChip::WriteConfigRegister(std::uint8_t reg, std::uint8_t value) { ConfigPorts().Write(reg, value); }
+
+IndexedPorts GSioChip::EnvPorts() const {
+  return {devio, static_cast<std::uint16_t>(hwmBar + envIndexReg), static_cast<std::uint16_t>(hwmBar + envDataReg)};
 }
 
-void GSioChip::WriteConfigRegister(std::uint8_t reg, std::uint8_t value) {
-  devio.OutportByte(indexPort, reg);
-  devio.OutportByte(dataPort, value);
-}
+std::uint8_t GSioChip::ReadEnvRegister(std::uint8_t reg) { return EnvPorts().Read(reg); }
 
-std::uint8_t GSioChip::ReadEnvRegister(std::uint8_t reg) {
-  devio.OutportByte(static_cast<std::uint16_t>(hwmBar + envIndexReg), reg);
-  return devio.InportByte(static_cast<std::uint16_t>(hwmBar + envDataReg));
-}
-
-void GSioChip::WriteEnvRegister(std::uint8_t reg, std::uint8_t value) {
-  devio.OutportByte(static_cast<std::uint16_t>(hwmBar + envIndexReg), reg);
-  devio.OutportByte(static_cast<std::uint16_t>(hwmBar + envDataReg), value);
-}
+void GSioChip::WriteEnvRegister(std::uint8_t reg, std::uint8_t value) { EnvPorts().Write(reg, value); }
 
 // ---- fans
 
 bool GSioChip::SaveFanState() {
-  if (savedFanData.empty()) {
-    std::vector<std::uint8_t> values;  // all or nothing: a save that is interrupted is none
-    for (const std::uint8_t reg : fanSaveRegs) {
-      values.push_back(ReadEnvRegister(reg));
-    }
-    savedFanData = std::move(values);
-  }
+  savedFans.SaveOnce(environment, RegistersAt(0, fanSaveRegs));
   return true;
 }
 
@@ -145,27 +115,26 @@ std::string GSioChip::FanIntegrityText() const {
 }
 
 void GSioChip::CheckFanIntegrity() const {
-  if (savedFanData.size() != fanSaveRegs.size()) {
+  if (savedFans.Count() != fanSaveRegs.size()) {
     throw mblib_exception(FanIntegrityText() + std::to_string(fanSaveRegs.size()) +
-                          ") differs from saved data list size (" + std::to_string(savedFanData.size()) + ")");
+                          ") differs from saved data list size (" + std::to_string(savedFans.Count()) + ")");
   }
 }
 
-void GSioChip::WriteSavedFanRegister(std::size_t index) { WriteEnvRegister(fanSaveRegs[index], savedFanData[index]); }
-
 bool GSioChip::RestoreFanState() {
-  if (savedFanData.empty()) {
-    return true;
+  if (savedFans.Holds()) {
+    CheckFanIntegrity();
+    savedFans.Restore(environment, RegistersAt(0, {fanSaveRegs.rbegin(), fanSaveRegs.rend()}));
+    EndFanRestore();
   }
-  CheckFanIntegrity();
-  for (std::size_t i = savedFanData.size(); i-- > 0;) {
-    WriteSavedFanRegister(i);
-  }
-  savedFanData.clear();
+  return true;
+}
+
+void GSioChip::EndFanRestore() {
+  savedFans.Forget();
   if (fanRestoreSleep != 0) {
     platform::TheHost().clock.Sleep(fanRestoreSleep);
   }
-  return true;
 }
 
 // A tach entry holds the low byte's register in its low byte, the high byte's register in the next.
@@ -176,10 +145,7 @@ std::uint32_t GSioChip::ReadFanTach(int fan, int /*arg*/) {
 }
 
 int GSioChip::TachToRpm(std::uint32_t raw, int multiplier) {
-  if (raw == 0 || raw >= kTachStopped) {
-    return 0;
-  }
-  return static_cast<int>(multiplier * kTachClock / (std::int64_t{raw} * 2));
+  return RpmOf(multiplier * kTachClock, std::min(raw, kTachStopped) * 2, kTachStopped * 2);
 }
 
 bool GSioChip::SetFanPwm(int fan, int value) {
@@ -206,9 +172,8 @@ int GSioChip::MapTemperature(int raw) { return raw < kHottest ? raw : kNoTempera
 
 // Line 23 is bit 3 of the second GPIO port.
 int GSioChip::ReadLine(int line) {
-  const int bit = line % 10;
-  const std::uint8_t level = devio.InportByte(static_cast<std::uint16_t>(gpioBar + line / 10 - 1));
-  return bit >= 0 && bit < 8 && (level >> bit & 1U) != 0 ? kAsserted : kNotAsserted;
+  const std::uint8_t levels = devio.InportByte(static_cast<std::uint16_t>(gpioBar + line / 10 - 1));
+  return LineState((levels & MaskOfBit(line % 10, 8)) != 0);
 }
 
 // ---- power LED
@@ -219,47 +184,47 @@ bool GSioChip::IsPowerLedRedSupported(bool& supported) {
 }
 
 bool GSioChip::SavePowerLedState() {
-  if (savedPowerLedData.empty()) {
-    std::vector<std::uint8_t> values;  // all or nothing: a save that is interrupted is none
+  if (!savedPowerLed.Holds()) {
     const ConfigMode mode(*this);
     SelectLogicalDevice(powerLedLdn);
-    for (const std::uint8_t reg : powerLedStateRegs) {
-      values.push_back(ReadConfigRegister(reg));
-    }
-    savedPowerLedData = std::move(values);
+    savedPowerLed.SaveOnce(config, RegistersAt(powerLedLdn, powerLedStateRegs));
   }
-  return savedPowerLedData.size() == powerLedStateRegs.size();
+  return savedPowerLed.Count() == powerLedStateRegs.size();
 }
 
 bool GSioChip::RestorePowerLedState() {
-  if (savedPowerLedData.empty()) {
+  if (!savedPowerLed.Holds()) {
     return true;
   }
-  if (savedPowerLedData.size() != powerLedStateRegs.size()) {
+  if (savedPowerLed.Count() != powerLedStateRegs.size()) {
     throw mblib_exception("power LED state restore inegrity check: power led state reg list size (" +
                           std::to_string(powerLedStateRegs.size()) + ") differs from saved data list size (" +
-                          std::to_string(savedPowerLedData.size()) + ")");
+                          std::to_string(savedPowerLed.Count()) + ")");
   }
   {
     const ConfigMode mode(*this);
     SelectLogicalDevice(powerLedLdn);
-    for (std::size_t i = 0; i < powerLedStateRegs.size(); ++i) {
-      WriteConfigRegister(powerLedStateRegs[i], savedPowerLedData[i]);
-    }
+    savedPowerLed.Restore(config, RegistersAt(powerLedLdn, powerLedStateRegs));
   }
-  savedPowerLedData.clear();
+  savedPowerLed.Forget();
   return true;
 }
 
-bool GSioChip::RunBlinkList(const std::vector<std::pair<std::uint8_t, std::uint8_t>>& list) {
+Steps GSioChip::StepsOf(const PairList& list) {
+  Steps steps;
+  for (const auto& [reg, value] : list) {
+    steps.push_back(Put({0, reg}, value));
+  }
+  return steps;
+}
+
+bool GSioChip::RunBlinkList(const PairList& list) {
   if (list.empty()) {
     return false;
   }
   const ConfigMode mode(*this);
   SelectLogicalDevice(powerLedLdn);
-  for (const auto& [reg, value] : list) {
-    WriteConfigRegister(reg, value);
-  }
+  Run(StepsOf(list), config);
   return true;
 }
 

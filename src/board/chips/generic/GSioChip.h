@@ -8,6 +8,9 @@
 #include <vector>
 
 #include "board/chips/generic/GChip.h"
+#include "board/parts/IndexedPorts.h"
+#include "board/parts/RegistersOf.h"
+#include "board/parts/Step.h"
 
 namespace panelglow {
 
@@ -45,30 +48,31 @@ class GSioChip : public GChip {
   virtual void WriteEnvRegister(std::uint8_t reg, std::uint8_t value);
 
  protected:
-  explicit GSioChip(std::string chipName) : GChip(std::move(chipName)) {}
+  explicit GSioChip(std::string chipName)
+      : GChip(std::move(chipName)),
+        config(*this, &GSioChip::ReadConfigRegister, &GSioChip::WriteConfigRegister),
+        environment(*this, &GSioChip::ReadEnvRegister, &GSioChip::WriteEnvRegister) {}
 
-  /// The part is in configuration mode for the life of the object.
-  class ConfigMode {
-   public:
-    explicit ConfigMode(GSioChip& chip) : chip_(chip) { chip_.EnterConfigMode(); }
-    /// Throws platform::ThreadTerminated when the thread is told to end on the way out; the mode is left then, too.
-    ~ConfigMode() noexcept(false);
-    ConfigMode(const ConfigMode&) = delete;
-    ConfigMode& operator=(const ConfigMode&) = delete;
-
-   private:
-    GSioChip& chip_;
-  };
+  /// Register and value, in the order of the writes.
+  using PairList = std::vector<std::pair<std::uint8_t, std::uint8_t>>;
 
   /// Writes configuration registers of the power LED's logical device in order; false for an empty list.
-  bool RunBlinkList(const std::vector<std::pair<std::uint8_t, std::uint8_t>>& list);
+  bool RunBlinkList(const PairList& list);
 
-  /// Values of the registers, from the last one down.
-  void WriteSavedFanRegister(std::size_t index);
+  /// The writes of a list as steps on registers of one place.
+  static Steps StepsOf(const PairList& list);
+
+  /// The save is over: the fans get their time to follow.
+  void EndFanRestore();
 
   /// The start of the text for saved fan registers that do not fit their list.
   [[nodiscard]] virtual std::string FanIntegrityText() const;
   void CheckFanIntegrity() const;
+
+  [[nodiscard]] IndexedPorts ConfigPorts() const { return {devio, indexPort, dataPort}; }
+
+  RegistersOf<GSioChip> config;       // of the selected logical device
+  RegistersOf<GSioChip> environment;  // the hardware monitor
 
   std::uint8_t indexPort = 0;
   std::uint8_t dataPort = 0;
@@ -83,6 +87,7 @@ class GSioChip : public GChip {
  private:
   struct BarKeys;
   std::uint16_t FindBar(const BarKeys& keys);
+  [[nodiscard]] IndexedPorts EnvPorts() const;
 };
 
 }  // namespace panelglow
