@@ -8,6 +8,8 @@
 #include "board/chips/ec/EcWpc8763Chip.h"
 #include "board/chips/ec/SmscKbc1126Chip.h"
 #include "board/chips/ec/SmscMec1322Chip.h"
+#include "board/chips/fin/FinChip.h"
+#include "board/chips/fin/FinF71808aChip.h"
 #include "board/chips/firmware/CaslChip.h"
 #include "board/chips/generic/GCodecChip.h"
 #include "board/chips/generic/GEcChip.h"
@@ -40,12 +42,12 @@ constexpr ChipRow kRows[] = {
     {7, "ec_wpc8763", Make<EcWpc8763Chip>},
     {8, "ec_it8512", Make<EcIt8512Chip>},
     {9, "ec_it8518", Make<EcIt8518Chip>},
-    {10, "fin", nullptr},
+    {10, "fin", Make<FinChip>},
     {11, "fin_f8000", nullptr},
     {12, "fin_f71858", nullptr},
     {13, "fin_f71855", nullptr},
     {14, "fin_f71863", nullptr},
-    {15, "fin_f71808a", nullptr},
+    {15, "fin_f71808a", Make<FinF71808aChip>},
     {16, "fin_f71808e", nullptr},
     {17, "hudson", nullptr},
     {19, "intelc200", nullptr},
