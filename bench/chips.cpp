@@ -12,8 +12,8 @@
 #include "board/MotherBoard.h"
 #include "board/base/BoardDevio.h"
 #include "board/base/IniReader.h"
-#include "board/chips/GEcChip.h"
-#include "board/chips/GSioChip.h"
+#include "board/chips/generic/GEcChip.h"
+#include "board/chips/generic/GSioChip.h"
 #include "platform/Host.h"
 #include "platform/sim/Simulation.h"
 

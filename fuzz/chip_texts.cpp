@@ -5,7 +5,7 @@
 #include "FuzzTarget.h"
 #include "board/MotherBoard.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/Sequence.h"
+#include "board/parts/Sequence.h"
 #include "harness/base/CDMException.h"
 
 namespace panelglow::fuzz {

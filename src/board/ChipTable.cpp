@@ -2,22 +2,24 @@
 
 #include <algorithm>
 
-#include "board/chips/CaslChip.h"
-#include "board/chips/EcChip.h"
-#include "board/chips/EcIt8512Chip.h"
-#include "board/chips/EcIt8518Chip.h"
-#include "board/chips/EcWpc8763Chip.h"
-#include "board/chips/GCodecChip.h"
-#include "board/chips/GEcChip.h"
-#include "board/chips/GEcIt8519Chip.h"
-#include "board/chips/GFintekChip.h"
-#include "board/chips/GIoSpaceChip.h"
-#include "board/chips/GIt8702Chip.h"
-#include "board/chips/GIteChip.h"
-#include "board/chips/GMemorySpaceChip.h"
-#include "board/chips/GSioChip.h"
-#include "board/chips/SmscKbc1126Chip.h"
-#include "board/chips/SmscMec1322Chip.h"
+#include "board/chips/ec/EcChip.h"
+#include "board/chips/ec/EcIt8512Chip.h"
+#include "board/chips/ec/EcIt8518Chip.h"
+#include "board/chips/ec/EcWpc8763Chip.h"
+#include "board/chips/ec/SmscKbc1126Chip.h"
+#include "board/chips/ec/SmscMec1322Chip.h"
+#include "board/chips/fin/FinChip.h"
+#include "board/chips/fin/FinF71808aChip.h"
+#include "board/chips/firmware/CaslChip.h"
+#include "board/chips/generic/GCodecChip.h"
+#include "board/chips/generic/GEcChip.h"
+#include "board/chips/generic/GEcIt8519Chip.h"
+#include "board/chips/generic/GFintekChip.h"
+#include "board/chips/generic/GIoSpaceChip.h"
+#include "board/chips/generic/GIt8702Chip.h"
+#include "board/chips/generic/GIteChip.h"
+#include "board/chips/generic/GMemorySpaceChip.h"
+#include "board/chips/generic/GSioChip.h"
 
 namespace panelglow {
 
@@ -40,12 +42,12 @@ constexpr ChipRow kRows[] = {
     {7, "ec_wpc8763", Make<EcWpc8763Chip>},
     {8, "ec_it8512", Make<EcIt8512Chip>},
     {9, "ec_it8518", Make<EcIt8518Chip>},
-    {10, "fin", nullptr},
+    {10, "fin", Make<FinChip>},
     {11, "fin_f8000", nullptr},
     {12, "fin_f71858", nullptr},
     {13, "fin_f71855", nullptr},
     {14, "fin_f71863", nullptr},
-    {15, "fin_f71808a", nullptr},
+    {15, "fin_f71808a", Make<FinF71808aChip>},
     {16, "fin_f71808e", nullptr},
     {17, "hudson", nullptr},
     {19, "intelc200", nullptr},

@@ -3,12 +3,14 @@
 #include <algorithm>
 #include <array>
 #include <set>
+#include <utility>
 #include <vector>
 
 #include "board/base/IniReader.h"
 #include "board/base/NotBuiltException.h"
 #include "board/base/SelectedSystem.h"
 #include "board/chips/NoneChip.h"
+#include "board/parts/Bits.h"
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/Notices.h"
@@ -151,10 +153,22 @@ std::unique_ptr<MotherBoard> MotherBoard::Instance(const std::string& detectIniP
   return nullptr;
 }
 
-MotherBoard::MotherBoard(const std::string& systemIdText)
-    : lock(platform::TheHost().mutexes, kBoardMutex), systemId(SystemIdOf(systemIdText)), className("generic") {
+MotherBoard::MotherBoard(std::string boardClass, std::uint16_t boardId)
+    : lock(platform::TheHost().mutexes, kBoardMutex), systemId(boardId), className(std::move(boardClass)) {
+  for (std::unique_ptr<Chip>& chip : chips) {
+    chip = std::make_unique<NoneChip>();
+  }
+}
+
+void MotherBoard::Place(std::string_view chipName) {
+  if (const ChipRow* row = FindChipRow(chipName); row != nullptr && row->make != nullptr) {
+    chips[row->place - 1] = row->make();
+  }
+}
+
+MotherBoard::MotherBoard(const std::string& systemIdText) : MotherBoard("generic", SystemIdOf(systemIdText)) {
   const Setting list = ReadName("chips", "");
-  chips[kPlainChipPlace - 1] = std::make_unique<Chip>();
+  Place("chip");
   if (list.text.empty()) {
     BuildAllChips();
     return;
@@ -168,41 +182,44 @@ MotherBoard::MotherBoard(const std::string& systemIdText)
       TellOf(list, "the chip \"" + name + "\" is not built into this version; what it serves is not there");
     }
   }
-  BuildListedChips(listed);
+  BuildListedChips();
 }
 
-void MotherBoard::BuildListedChips(const std::vector<std::string>& names) {
-  for (const bool genericFamilies : {false, true}) {  // these two come last
-    for (const ChipRow& row : ChipRows()) {
-      const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
-      const bool isListed = std::find(names.begin(), names.end(), row.name) != names.end();
-      std::unique_ptr<Chip>& chip = chips[row.place - 1];
-      if (isGeneric == genericFamilies && isListed && !chip && row.make != nullptr) {
-        chip = row.make();
-      }
+void MotherBoard::BuildListedChips() {
+  const auto isListed = [this](std::string_view name) {
+    return std::find(listed.begin(), listed.end(), name) != listed.end();
+  };
+  for (const ChipRow& row : ChipRows()) {
+    const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
+    if (!isGeneric && row.place != kPlainChipPlace && isListed(row.name)) {
+      Place(row.name);
+    }
+  }
+  // The two generic families come last; of each the first that is listed.
+  for (const std::size_t place : {kGenericSuperIoPlace, kGenericEcPlace}) {
+    const std::span<const ChipRow> rows = ChipRows();
+    const auto found = std::find_if(rows.begin(), rows.end(),
+                                    [&](const ChipRow& row) { return row.place == place && isListed(row.name); });
+    if (found != rows.end()) {
+      Place(found->name);
     }
   }
   for (const std::size_t place : {kGenericSuperIoPlace, kGenericEcPlace}) {
     InitializeGeneric(place);
   }
-  for (std::unique_ptr<Chip>& chip : chips) {
-    if (!chip) {
-      chip = std::make_unique<NoneChip>();
-    }
-  }
 }
 
 // The generic super-I/O and embedded controller need the chip file and have a second stage of construction.
 void MotherBoard::InitializeGeneric(std::size_t place) {
-  const std::unique_ptr<Chip>& chip = chips[place - 1];
-  if (!chip) {
+  Chip& chip = ChipAt(place);
+  if (chip.GetName() == kNoChip) {
     return;
   }
   IniReader& reader = IniReader::Instance();
   if (!reader.IsChipIniPresent()) {
     throw mblib_exception("missing chipset settings file: " + reader.GetChipIniPath());
   }
-  chip->Initialize();
+  chip.Initialize();
 }
 
 // Without a list every class is built in its place; of the generic families the plainest, without its second stage.
@@ -212,7 +229,7 @@ void MotherBoard::BuildAllChips() {
     const auto next = row + 1;
     const bool isPlainest = next == rows.end() || next->place != row->place;  // the last row of a place
     if (row->place != kPlainChipPlace && isPlainest) {
-      chips[row->place - 1] = row->make != nullptr ? row->make() : std::make_unique<NoneChip>();
+      Place(row->name);
     }
   }
 }
@@ -377,12 +394,12 @@ bool MotherBoard::IsPowerButtonPressed(bool& pressed) { return ChipOf(powerButto
 
 bool MotherBoard::ReadLatchedBit(std::uint16_t port, int bit) {
   bool value = false;
-  chips[kPlainChipPlace - 1]->ReadLatchedPortDword(port, bit, value);
+  ChipAt(kPlainChipPlace).ReadLatchedPortDword(port, MaskOfBit(bit, 32), value);
   return value;
 }
 
 bool MotherBoard::ClearLatchedBit(std::uint16_t port, int bit) {
-  return chips[kPlainChipPlace - 1]->ClearLatchedPortDword(port, bit);
+  return ChipAt(kPlainChipPlace).ClearLatchedPortDword(port, MaskOfBit(bit, 32));
 }
 
 }  // namespace panelglow

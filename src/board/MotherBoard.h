@@ -10,6 +10,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "board/ChipTable.h"
@@ -39,7 +40,7 @@ class MotherBoard {
   MotherBoard& operator=(const MotherBoard&) = delete;
 
   /// The chip of a name in the class table; the plain chip for an empty or unknown name. Owned by the board.
-  [[nodiscard]] Chip& GetChip(const std::string& chipName) { return *chips[ChipPlaceOf(chipName) - 1]; }
+  [[nodiscard]] Chip& GetChip(const std::string& chipName) { return ChipAt(ChipPlaceOf(chipName)); }
 
   [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
   [[nodiscard]] const std::string& GetClassName() const { return className; }
@@ -106,11 +107,20 @@ class MotherBoard {
   virtual bool ArmPowerButton();
   virtual bool IsPowerButtonPressed(bool& pressed);
 
-  // ---- latched status bits, by the plain chip
+  // ---- latched status bits, by number, of the chip in the first place
   virtual bool ReadLatchedBit(std::uint16_t port, int bit);
   virtual bool ClearLatchedBit(std::uint16_t port, int bit);
 
  protected:
+  /// For the classes with a list of chips of their own: the chip "none" in every place.
+  MotherBoard(std::string boardClass, std::uint16_t boardId);
+
+  /// Builds the class of a name of the chip table in its place; a class that this version does not have stays "none".
+  void Place(std::string_view chipName);
+
+  /// `place` counts from 1.
+  [[nodiscard]] Chip& ChipAt(std::size_t place) { return *chips[place - 1]; }
+
   /// The chip that serves one LED (or the button): found at first use by the name in the INI files, unless a board
   /// class has preset that name.
   struct ChipChoice {
@@ -139,14 +149,14 @@ class MotherBoard {
   ChipChoice powerButton{"test.powerbutton.chip", "power button", ""};
 
  private:
-  void BuildListedChips(const std::vector<std::string>& names);
+  void BuildListedChips();
   void BuildAllChips();
   void InitializeGeneric(std::size_t place);
   [[nodiscard]] std::string WhyNothing(const ChipChoice& choice) const;
 
   platform::NamedMutexLock lock;  // in front of the chips: given up behind them, also when the construction fails
-  std::array<std::unique_ptr<Chip>, kChipPlaces> chips;
-  std::vector<std::string> listed;  // the value of "chips", in names; none: every class
+  std::array<std::unique_ptr<Chip>, kChipPlaces> chips;  // never null
+  std::vector<std::string> listed;                       // the value of "chips", in names; none: every class
   std::uint16_t systemId;
   std::string className;
 };

@@ -3,8 +3,8 @@
 
 #include "board/BoardBench.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/GMemorySpaceChip.h"
-#include "board/chips/Sequence.h"
+#include "board/chips/generic/GMemorySpaceChip.h"
+#include "board/parts/Sequence.h"
 
 namespace panelglow {
 namespace {
@@ -175,8 +175,8 @@ TEST(Chip, ThePlainChipKnowsThePowerButtonAndLatchedBits) {
     EXPECT_EQ(bench.Traffic([&] { EXPECT_FALSE(board->ReadLatchedBit(0xA30, bit)); }), "0A30->FFFF1212 ");
   }
   Chip& chip = board->GetChip("");
-  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 1, out) && out); }), "0A30->12 0A30<-12 ");
-  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 0, out) && !out); }), "0A30->12 ");
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 0x02, out) && out); }), "0A30->12 0A30<-12 ");
+  EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 0x01, out) && !out); }), "0A30->12 ");
 }
 
 // A generic chip that shows what it has read.

@@ -6,14 +6,14 @@
 
 #include "board/BoardBench.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/CaslChip.h"
-#include "board/chips/EcIt8512Chip.h"
-#include "board/chips/EcIt8518Chip.h"
-#include "board/chips/EcWpc8763Chip.h"
-#include "board/chips/GCodecChip.h"
-#include "board/chips/GEcIt8519Chip.h"
-#include "board/chips/SmscKbc1126Chip.h"
-#include "board/chips/SmscMec1322Chip.h"
+#include "board/chips/ec/EcIt8512Chip.h"
+#include "board/chips/ec/EcIt8518Chip.h"
+#include "board/chips/ec/EcWpc8763Chip.h"
+#include "board/chips/ec/SmscKbc1126Chip.h"
+#include "board/chips/ec/SmscMec1322Chip.h"
+#include "board/chips/firmware/CaslChip.h"
+#include "board/chips/generic/GCodecChip.h"
+#include "board/chips/generic/GEcIt8519Chip.h"
 #include "harness/base/CDMException.h"
 
 namespace panelglow {

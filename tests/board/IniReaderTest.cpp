@@ -7,7 +7,7 @@
 
 #include "board/BoardBench.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/Sequence.h"
+#include "board/parts/Sequence.h"
 #include "harness/base/Notices.h"
 
 namespace panelglow {

@@ -208,12 +208,12 @@ TEST(MotherBoard, AClassOrChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
     EXPECT_THAT(refusal([] { MotherBoard::Instance(".\\mbdetect.ini"); }), ::testing::HasSubstr(oldest));
   }
 
-  bench.SetFiles("[7D10]\nplatform=generic\nchips=fin,g_iospace\n",
-                 "[Common]\ntest.powerled.chip=Fin\ntest.hdled.chip=g_iospace\ntest.chargeled.chip=ich\n", "");
+  bench.SetFiles("[7D10]\nplatform=generic\nchips=videochip,g_iospace\n",
+                 "[Common]\ntest.powerled.chip=VideoChip\ntest.hdled.chip=g_iospace\ntest.chargeled.chip=ich\n", "");
   const std::unique_ptr<MotherBoard> board = BoardBench::Board();
   const std::string noChip = refusal([&] { board->RequireDrivable(MotherBoard::Led::kPower); });
-  EXPECT_EQ(noChip,
-            ".\\mbtest.ini, section [Common], key \"test.powerled.chip\": the chip \"fin\" " + end + "the power LED");
+  EXPECT_EQ(noChip, ".\\mbtest.ini, section [Common], key \"test.powerled.chip\": the chip \"videochip\" " + end +
+                        "the power LED");
   EXPECT_EQ(refusal([&] { board->AssertPowerLedGreen(); }), noChip);
   board->RequireDrivable(MotherBoard::Led::kHd);
   board->RequireDrivable(MotherBoard::Led::kCharge);  // which no list holds: that is another mistake

@@ -4,10 +4,10 @@
 
 #include <functional>
 
-#include "board/BoardBench.h"
+#include "board/ChipCases.h"
 #include "board/base/mblib_exception.h"
-#include "board/chips/GFintekChip.h"
-#include "board/chips/GIt8702Chip.h"
+#include "board/chips/generic/GFintekChip.h"
+#include "board/chips/generic/GIt8702Chip.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -52,20 +52,10 @@ class SuperIoBench : public BoardBench {
   }
 };
 
-// What an operation answers, and what it does on the ports.
-struct Case {
-  std::function<int(Chip&)> ask;
-  int answer;
-  std::string traffic;
-};
-
 template <class Class>
-void Expect(SuperIoBench&& bench, const std::string& text, const std::vector<Case>& cases) {
+void Expect(SuperIoBench&& bench, const std::string& text, const std::vector<ChipCase>& cases) {
   const auto chip = bench.Make<Class>(text);
-  for (std::size_t i = 0; i < cases.size(); ++i) {
-    SCOPED_TRACE(chip->GetName() + " " + std::to_string(i));
-    EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(cases[i].ask(*chip), cases[i].answer); }), cases[i].traffic);
-  }
+  ExpectCases(bench, *chip, cases);
   EXPECT_THAT(bench.machine.HardwareState(), ::testing::HasSubstr("configuration mode = closed"));
 }
 
@@ -81,8 +71,8 @@ std::string TextOf(const std::function<void()>& action) {
 // ---- the power LED
 
 // On a class that leaves configuration mode by `exit` and has blink lists that come to these requests, or none.
-std::vector<Case> LedCases(const std::string& exit, bool deasserts, const std::string& green,
-                           const std::string& red) {
+std::vector<ChipCase> LedCases(const std::string& exit, bool deasserts, const std::string& green,
+                               const std::string& red) {
   const auto run = [&](const std::string& list) { return list.empty() ? list : kEnterLed + list + exit; };
   return {{&Chip::RestorePowerLedState, true, ""},
           {&Chip::SavePowerLedState, true, run("002E<-26 002F->0C 002E<-F8 002F->16 ")},

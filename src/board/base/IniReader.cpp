@@ -195,11 +195,12 @@ int IniReader::ReadIniInt(const std::string& key, status_t& status, int defaultV
   return ReadNumber(result, from.section + " " + key, defaultValue);
 }
 
-unsigned int IniReader::ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue) {
+unsigned int IniReader::ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue,
+                                        unsigned bits) {
   const Sources from = GetSources();
   const Result result = LookUp(from, key);
   status = result.status;
-  return ReadNumber(result, from.section + " " + key, defaultValue);
+  return ReadNumber(result, from.section + " " + key, defaultValue, bits);
 }
 
 std::string IniReader::ReadChipValue(const std::string& chipSection, const std::string& key, status_t& status,
@@ -289,6 +290,26 @@ int ReadIniInt(const std::string& key, int defaultValue) {
 unsigned int ReadIniUnsigned(const std::string& key, unsigned int defaultValue) {
   IniReader::status_t status = IniReader::kNotFound;
   return IniReader::Instance().ReadIniUnsigned(key, status, defaultValue);
+}
+
+std::uint8_t ReadIniByte(const std::string& key, std::uint8_t defaultValue) {
+  IniReader::status_t status = IniReader::kNotFound;
+  return static_cast<std::uint8_t>(IniReader::Instance().ReadIniUnsigned(key, status, defaultValue, 8));
+}
+
+std::uint16_t ReadIniWord(const std::string& key, std::uint16_t defaultValue) {
+  IniReader::status_t status = IniReader::kNotFound;
+  return static_cast<std::uint16_t>(IniReader::Instance().ReadIniUnsigned(key, status, defaultValue, 16));
+}
+
+std::uint16_t ReadIniWordUnlessZero(const std::string& key, std::uint16_t defaultValue) {
+  const std::uint16_t value = ReadIniWord(key, defaultValue);
+  return value == 0 ? defaultValue : value;
+}
+
+std::uint32_t ReadIniUnsignedUnlessZero(const std::string& key, std::uint32_t defaultValue) {
+  const std::uint32_t value = ReadIniUnsigned(key, defaultValue);
+  return value == 0 ? defaultValue : value;
 }
 
 std::string ReadChipValue(const std::string& chipSection, const std::string& key, const std::string& defaultValue) {

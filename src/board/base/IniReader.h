@@ -35,7 +35,9 @@ class IniReader {
   /// default. Numbers are decimal, or hexadecimal behind "0x"; any other text is 0, and people are told of it.
   std::string ReadIniValue(const std::string& key, status_t& status, const std::string& defaultValue);
   int ReadIniInt(const std::string& key, status_t& status, int defaultValue);
-  unsigned int ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue);
+  /// People are told of a number that does not fit into `bits`, which is what the caller keeps of it.
+  unsigned int ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue,
+                               unsigned bits = 32);
 
   /// Typed reads of a chip section; "chip.<section>.<key>" in the layered files comes first.
   std::string ReadChipValue(const std::string& chipSection, const std::string& key, status_t& status,
@@ -102,6 +104,15 @@ std::string ReadIniValue(const std::string& key, const std::string& defaultValue
 std::string ReadIniValue(const std::string& key, IniReader::status_t& status, const std::string& defaultValue);
 int ReadIniInt(const std::string& key, int defaultValue);
 unsigned int ReadIniUnsigned(const std::string& key, unsigned int defaultValue);
+
+// Numbers of 8 and 16 bits without sign: the low bits of what ReadIniUnsigned gives.
+std::uint8_t ReadIniByte(const std::string& key, std::uint8_t defaultValue);
+std::uint16_t ReadIniWord(const std::string& key, std::uint16_t defaultValue);
+
+// The same with the default for a value of 0, too, as an address that is "undef".
+std::uint16_t ReadIniWordUnlessZero(const std::string& key, std::uint16_t defaultValue);
+std::uint32_t ReadIniUnsignedUnlessZero(const std::string& key, std::uint32_t defaultValue);
+
 std::string ReadChipValue(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
 Setting ReadChipSetting(const std::string& chipSection, const std::string& key, const std::string& defaultValue);
 int ReadChipInt(const std::string& chipSection, const std::string& key, int defaultValue);

@@ -11,6 +11,8 @@
 #include <utility>
 #include <vector>
 
+#include "board/parts/Lines.h"
+#include "board/parts/PowerButton.h"
 #include "hw/CDevio.h"
 
 namespace panelglow {
@@ -18,9 +20,9 @@ namespace panelglow {
 class Chip {
  public:
   // States of a GPIO line.
-  static constexpr int kAsserted = 3;
-  static constexpr int kNotAsserted = 4;
-  static constexpr int kNoSuchLine = -1;
+  static constexpr int kAsserted = kLineAsserted;
+  static constexpr int kNotAsserted = kLineNotAsserted;
+  static constexpr int kNoSuchLine = kNoSuchLineState;
 
   Chip();
   virtual ~Chip() = default;
@@ -46,23 +48,35 @@ class Chip {
   virtual void RestoreFanControl(int /*fan*/) {}
 
   // ---- temperatures, degrees Celsius
-  virtual bool ReadProcessorTemperature(int /*zone*/, int& /*value*/, bool /*flag*/,
+
+  /// A processor's temperature: with `allCores` the mean of its cores, which GetCoreTemperatures then gives one by
+  /// one; else that of its first core.
+  virtual bool ReadProcessorTemperature(int /*zone*/, int& /*value*/, bool /*allCores*/,
                                         const std::string& /*zoneName*/) {
     return false;
   }
+
+  /// The cores of the last ReadProcessorTemperature with `allCores`; empty when it read none.
+  [[nodiscard]] virtual std::vector<int> GetCoreTemperatures() const { return {}; }
   virtual bool ReadVirtualTemperature(int /*zone*/, bool /*flag*/, int& /*value*/) { return false; }
   virtual bool ReadTemperature(int /*zone*/, int& /*value*/) { return false; }
   virtual bool ReadLowLimitTemperature(int /*zone*/, int& /*value*/) { return false; }
   virtual bool ReadThreshold(int /*zone*/, int& /*value*/) { return false; }
   virtual int MapTemperature(int raw) { return raw; }
   virtual void ReservedOperation21() {}
-  virtual bool ReadEnvironmentRegister(std::uint8_t /*reg*/, std::uint8_t& /*value*/) { return false; }
+
+  /// A register of the hardware monitor; where it has banks, the bank stands in the high byte of the number.
+  virtual bool ReadEnvironmentRegister(std::uint16_t /*reg*/, std::uint8_t& /*value*/) { return false; }
 
   // ---- lines, switches, locks
+
+  /// A bit (0 to 7) of a configuration register of a logical device.
   virtual bool ReadConfigBit(std::uint8_t ldn, std::uint8_t reg, int bit, bool& value);
   virtual bool ReadIntrusionLatch(int /*line*/, bool /*clearFirst*/, bool& /*value*/) { return false; }
-  virtual bool LockHood(int /*line*/, int /*wait_ms*/) { return false; }
-  virtual bool UnlockHood(int /*line*/, int /*wait_ms*/) { return false; }
+
+  /// With `check` the line must show the lock's new state for the result to be true.
+  virtual bool LockHood(int /*line*/, bool /*check*/) { return false; }
+  virtual bool UnlockHood(int /*line*/, bool /*check*/) { return false; }
   virtual int ReadLineByNames(std::uint32_t /*offset*/, const std::string& /*bitName*/,
                               const std::string& /*clearBitName*/) {
     return 0;
@@ -124,12 +138,12 @@ class Chip {
   virtual bool AssertMicrophoneLed() { return false; }
   virtual bool DeassertMicrophoneLed() { return false; }
 
-  // ---- latched status ports
+  // ---- latched status ports; asked by mask, which is what the keys of the test buttons hold
 
-  /// Reads a status byte whose set bits are cleared by writing them back; `value` is the bit as it was.
-  virtual bool ReadLatchedPort(std::uint16_t port, int bit, bool& value);
-  virtual bool ReadLatchedPortDword(std::uint16_t port, int bit, bool& value);
-  virtual bool ClearLatchedPortDword(std::uint16_t port, int bit);
+  /// Reads a status byte whose set bits are cleared by writing them back; `value` is whether one of the mask was set.
+  virtual bool ReadLatchedPort(std::uint16_t port, std::uint32_t mask, bool& value);
+  virtual bool ReadLatchedPortDword(std::uint16_t port, std::uint32_t mask, bool& value);
+  virtual bool ClearLatchedPortDword(std::uint16_t port, std::uint32_t mask);
 
   // ---- others
   virtual bool DetectDashCable(int /*line*/, const std::string& /*idList*/) { return false; }
@@ -148,8 +162,7 @@ class Chip {
   std::uint32_t lastStatus = 0;  // last value of a latched status read
 
  private:
-  std::uint8_t powerButtonPort = 0;   // port 0x458 as SavePowerButtonState found it
-  std::uint16_t powerButtonMask = 0;  // port 0xF802 as ArmPowerButton found it
+  PowerButton powerButton;
 };
 
 }  // namespace panelglow

@@ -1,0 +1,34 @@
+// The power button in a chipset's power management block: a control byte, a word that enables its events, and a
+// status byte in which a press is latched.
+#pragma once
+
+#include <cstdint>
+
+#include "hw/CDevio.h"
+
+namespace panelglow {
+
+struct PowerButtonPorts {
+  std::uint16_t control;
+  std::uint16_t enable;
+  std::uint16_t status;
+};
+
+/// While armed, a press is latched and switches nothing off.
+class PowerButton {
+ public:
+  PowerButton(CDevio& client, PowerButtonPorts at) : devio(&client), ports(at) {}
+
+  void Save();
+  void Arm();
+  [[nodiscard]] bool IsPressed() const;
+  void Restore() const;
+
+ private:
+  CDevio* devio;
+  PowerButtonPorts ports;
+  std::uint8_t savedControl = 0;  // as Save found it
+  std::uint16_t savedEnable = 0;  // as Arm found it
+};
+
+}  // namespace panelglow
