@@ -74,7 +74,6 @@ class CustomLEDTest : public FrontPanelTest {
   std::string uiValidationFile;
   std::string buttonDefinitionFile;
   std::string buttonDefinitionValidationFile;
-  std::string massStorageIniFile;
   std::string sectionId;
   wstring beginPromptText;
   wstring beginPromptMedia;

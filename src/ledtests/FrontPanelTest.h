@@ -103,6 +103,7 @@ class FrontPanelTest : public CDMDiag {
   std::string iniFile;
   std::string testIni;
   std::string chipIni;
+  std::string massStorageIniFile;
 
   CDevio& driver;
   LegacyPanelPorts legacyPorts;

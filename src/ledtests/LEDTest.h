@@ -36,7 +36,6 @@ class LEDTest : public FrontPanelTest {
   void MakeDialogRules();
 
   std::set<std::string, std::less<>> selected;  // functions of the LEDs to be tested
-  std::string massStorageIniFile;
   bool acknowledgeRetry = false;
   int retryPrompt = 0;
 };

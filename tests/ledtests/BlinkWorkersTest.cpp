@@ -100,6 +100,31 @@ TEST(BlinkWorkers, ThreeModelsHaveTheirLegacyRegistersElsewhere) {
   }
 }
 
+// As when a worker overruns its turn: the two share the word that stops them, and nothing else.
+TEST(BlinkWorkers, OfTwoDrivesAtOnceKeepEachTheirOwnBusy) {
+  Bench bench("drives-desktop.toml");
+  bench.test.massStorageIniFile = ".\\msctrl.ini";
+  bench.Prepare({"hdgreen"});
+  bench.test.hdControllers = "all";
+  bench.test.PrepareDeviceArray();
+  ASSERT_EQ(bench.test.hdCount, 3);
+  const platform::ThreadHandle first = bench.StartWorker("hdgreen");
+  LEDStruct& second = *bench.test.FindDevice(kFirstHdGreen + 1);
+  second.running = true;
+  bench.sim.Time().SleepFor(600'000);
+  const platform::ThreadHandle other =
+      platform::TheHost().threads.Start("worker", [&] { RunBlinkWorker(CustomBlinkCtrlHDLED, bench.test, second); });
+  bench.sim.Time().SleepFor(1'000'000);
+  bench.Entry("hdgreen").running = false;
+  second.running = false;
+  for (const platform::ThreadHandle worker : {first, other}) {
+    platform::TheHost().threads.Wait(worker, platform::Threads::kNoLimit);
+  }
+  EXPECT_EQ(bench.TimesLit("sata-drive"), 2);
+  EXPECT_EQ(bench.TimesLit("sas-drive"), 1);
+  EXPECT_EQ(bench.TimesLit("nvme-drive"), 0);
+}
+
 // What a slow part still needs for its last step.
 constexpr sim::Microseconds kSilicon_us = 100'000;
 
