@@ -283,6 +283,9 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
   }
   const std::string place = reader.ReadIniSetting(choice.key, "").place;
   const std::string chip = "the chip \"" + choice.name + "\" (" + (place.empty() ? choice.key : place) + ")";
+  if (choice.name == kNoChip) {
+    return chip + " stands for no chip at all";
+  }
   if (FindChipRow(choice.name) == nullptr) {
     return chip + " does not exist";
   }
@@ -290,10 +293,14 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
     return chip + " is not in the list of the key \"chips\"";
   }
   std::string missing;
-  for (const std::string& section :
-       std::set<std::string>{choice.name, ReadIniValue("chip." + choice.name + ".data", "")}) {
+  const std::string dataKey = "chip." + choice.name + ".data";
+  const Setting data = reader.ReadIniSetting(dataKey, choice.name);
+  for (const std::string& section : std::set<std::string>{choice.name, data.text}) {
     const std::string keys = reader.MissingKeys(section, choice.settings);
     missing += keys.empty() ? "" : "; without a value in [" + section + "]: " + keys;
+  }
+  if (!data.place.empty() && !reader.HasChipSection(data.text)) {
+    missing += "; " + reader.GetChipIniPath() + " has no section [" + data.text + "], which " + data.place + " names";
   }
   return chip + " has nothing for it" + missing;
 }

@@ -1,5 +1,6 @@
 // Which of a board's files and sections answers a look-up, and how its text is read.
 #include "board/base/IniReader.h"
+#include "board/chips/ec/SmscMec1322Chip.h"
 
 #include <gtest/gtest.h>
 
@@ -86,9 +87,12 @@ TEST(IniReader, NumbersAreDecimalOrPrefixedAndEveryReadIsRecorded) {
 
 TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
   BoardBench bench;
-  bench.SetFiles("[7D10]\na=OxF9\nb=0xFFFFFFFF\nc=-1\nchip.g_ec.d=F8h\ngood=0x20\nempty=undef\n", "",
-                 "[g_ec]\ne=0x1F9\nf=255\ng=-128\nh=0x10000\ni=0xFFFF\nj=0xF9 x\n"
-                 "list=B40:1.300,0x10:undef\n[parts]\nbase=g_ce\n");
+  bench.SetFiles(
+      "[7D10]\na=OxF9\nb=0xFFFFFFFF\nc=-1\nchip.g_ec.d=F8h\ngood=0x20\nempty=undef\n"
+      "test.panelglow.waittime=-1\n",
+      "",
+      "[g_ec]\ne=0x1F9\nf=255\ng=-128\nh=0x10000\ni=0xFFFF\nj=0xF9 x\n"
+      "list=B40:1.300,0x10:undef\n[parts]\nbase=g_ce\n");
   IniReader& reader = IniReader::Instance("7D10", kFiles[0], kFiles[1], kFiles[2]);
   const std::string detect = ".\\mbdetect.ini, section [7D10], key ";
   const std::string chip = ".\\chip.ini, section [g_ec], key ";
@@ -118,6 +122,8 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
            "\"list\": \"300\" does not fit into 8 bits and counts as 0x2C"},
       {[&] { EXPECT_THROW(ParsePairs<std::uint8_t>(ReadChipSetting("g_ec", "i", "")), mblib_exception); },
        chip + "\"i\": malformed sequence entry: '0xFFFF'. should be: 'cmd:data[.data]*,...'"},
+      {[] { const SmscMec1322Chip part; },
+       "\"test.panelglow.waittime\" is -1 and counts as 0: it is the wait of each step in ms, 0 to 10000"},
       {[&] { ReadChipByte("parts", "x", 1); },
        ".\\chip.ini, section [parts], key \"base\": there is no section [g_ce]"},
   };

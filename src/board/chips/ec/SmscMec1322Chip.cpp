@@ -1,9 +1,13 @@
 #include "board/chips/ec/SmscMec1322Chip.h"
 
+#include <algorithm>
+
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
 #include "board/parts/ProbeConfigPort.h"
 #include "board/parts/Sequence.h"
+#include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -43,6 +47,7 @@ constexpr int kMostReads = 11;  // a read, and ten repeats while the controller 
 
 constexpr int kTachClock = 0x3C0000;
 constexpr int kDefaultWait_ms = 30;
+constexpr int kLongestWait_ms = 10'000;
 
 }  // namespace
 
@@ -53,7 +58,13 @@ SmscMec1322Chip::SmscMec1322Chip() : EcChip("smsc_mec1322") {
   for (std::size_t i = 0; i < kListKeys.size(); ++i) {
     lists[i] = ParsePairs<std::uint16_t>(ReadChipSetting(section, kListKeys[i], ""));
   }
-  waitTime = static_cast<std::uint32_t>(ReadIniInt("test.panelglow.waittime", kDefaultWait_ms));
+  const int wanted_ms = ReadIniInt("test.panelglow.waittime", kDefaultWait_ms);
+  waitTime = static_cast<std::uint32_t>(std::clamp(wanted_ms, 0, kLongestWait_ms));
+  if (waitTime != static_cast<std::uint32_t>(wanted_ms)) {
+    Notices::Tell("\"test.panelglow.waittime\" is " + CDMUtil::ToString(wanted_ms) + " and counts as " +
+                  CDMUtil::ToString(waitTime) + ": it is the wait of each step in ms, 0 to " +
+                  CDMUtil::ToString(kLongestWait_ms) + ".");
+  }
 }
 
 bool SmscMec1322Chip::RunList(List which) {

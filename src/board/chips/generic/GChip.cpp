@@ -16,12 +16,7 @@ constexpr std::uint32_t kMostNumberedKeys = 256;  // a list without end in a fil
 
 void GChip::LoadConfiguration() {
   if (section.empty()) {
-    IniReader& reader = IniReader::Instance();
-    const Setting chosen = reader.ReadIniSetting("chip." + name + ".data", name);
-    section = chosen.text;
-    if (!chosen.place.empty() && !reader.HasChipSection(section)) {
-      TellOf(chosen, reader.GetChipIniPath() + " has no section [" + section + "]");
-    }
+    section = ReadIniValue("chip." + name + ".data", name);
   }
   LoadFanConfiguration();
   LoadTemperatureConfiguration();
