@@ -6,6 +6,14 @@
 #include <utility>
 #include <vector>
 
+#include "board/Cbb.h"
+#include "board/Cobble.h"
+#include "board/IchWin.h"
+#include "board/Lantern.h"
+#include "board/Orchard.h"
+#include "board/Saddle.h"
+#include "board/Sb7Sch5.h"
+#include "board/Thicket.h"
 #include "board/base/IniReader.h"
 #include "board/base/NotBuiltException.h"
 #include "board/base/SelectedSystem.h"
@@ -42,22 +50,22 @@ using BoardFactory = std::unique_ptr<MotherBoard> (*)(const std::string& systemI
 
 struct BoardRow {
   std::string_view name;
-  BoardFactory make;  // null: a class still to be written
+  BoardFactory make;
 };
 
-std::unique_ptr<MotherBoard> MakeGeneric(const std::string& systemId) {
-  return std::make_unique<MotherBoard>(systemId);
+template <class Board>
+std::unique_ptr<MotherBoard> Make(const std::string& systemId) {
+  return std::make_unique<Board>(systemId);
 }
 
-constexpr std::array<BoardRow, 6> kBoardClasses{{{"generic", MakeGeneric},
-                                                 {"ich_win", nullptr},
-                                                 {"sb7sch5", nullptr},
-                                                 {"cbb", nullptr},
-                                                 {"mistral", nullptr},
-                                                 {"cobble", nullptr}}};
+constexpr std::array<BoardRow, 6> kBoardClasses{{{"generic", Make<MotherBoard>},
+                                                 {"ich_win", Make<IchWin>},
+                                                 {"sb7sch5", Make<Sb7Sch5>},
+                                                 {"cbb", Make<Cbb>},
+                                                 {"mistral", Make<Thicket>},
+                                                 {"cobble", Make<Cobble>}}};
 
-// Boards of the oldest kind, still to be written.
-constexpr std::array<std::string_view, 2> kOldestClasses{"Lantern", "Orchard"};
+constexpr std::uint16_t kSaddleId = 0x2A78;  // of the "Lantern" boards the one that is a "Saddle"
 
 constexpr const char* kLegacyPorts =
     "a test that knows the ports of the oldest desktops uses them for power and drive";
@@ -129,26 +137,36 @@ std::unique_ptr<MotherBoard> MotherBoard::Instantiate(const std::string& detectI
     }
     return nullptr;
   }
-  if (found->make == nullptr) {
-    RefuseNotBuilt("the board class", wanted, "this machine's LEDs");
-  }
   return found->make(systemId);
 }
 
 std::unique_ptr<MotherBoard> MotherBoard::Instance(const std::string& detectIniPath) {
   constexpr std::size_t kValueBuffer = 1024;
   constexpr const char* kKey = "MotherboardClass";
+  constexpr std::size_t kLongestId = 4;  // in digits
   std::uint16_t id = 0;
   Tsk_GetSystemID(id);
-  const std::string section = CDMUtil::ToUpper(CDMUtil::ToHexString(id));
-  std::string name(kValueBuffer, '\0');
-  name.resize(platform::TheHost().profiles.GetValue(section, kKey, "", name, detectIniPath));
-  const Setting wanted(name, detectIniPath + ", section [" + section + "], key \"" + kKey + "\"");
-  if (std::find(kOldestClasses.begin(), kOldestClasses.end(), name) != kOldestClasses.end()) {
-    RefuseNotBuilt("the board class", wanted, "this machine's LEDs");
+  std::string section = CDMUtil::ToUpper(CDMUtil::ToHexString(id));
+  const auto look = [&] {
+    std::string value(kValueBuffer, '\0');
+    value.resize(platform::TheHost().profiles.GetValue(section, kKey, "", value, detectIniPath));
+    return value;
+  };
+  std::string name = look();
+  while (name.empty() && section.size() < kLongestId) {
+    section.insert(0, "0");
+    name = look();
+  }
+  if (name == "Lantern") {
+    return id == kSaddleId ? std::unique_ptr<MotherBoard>(std::make_unique<Saddle>(id))
+                           : std::make_unique<Lantern>(id);
+  }
+  if (name == "Orchard") {
+    return std::make_unique<Orchard>(id);
   }
   if (!name.empty()) {
-    TellOf(wanted, "there is no board class \"" + name + "\"; " + kLegacyPorts);
+    TellOf({name, detectIniPath + ", section [" + section + "], key \"" + kKey + "\""},
+           "there is no board class \"" + name + "\"; " + kLegacyPorts);
   }
   return nullptr;
 }

@@ -23,14 +23,13 @@ class MotherBoard {
  public:
   /// A board by the INI data of this system (or of `systemIdOverride`); null when the data selects no class of this
   /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException
-  /// 990431 when the chip file is missing, mblib_exception for chip data that cannot be used, and NotBuiltException
-  /// for a class that this version does not have.
+  /// 990431 when the chip file is missing, and mblib_exception for chip data that cannot be used.
   static std::unique_ptr<MotherBoard> Instantiate(const std::string& detectIniPath, const std::string& testIniPath,
                                                   const std::string& chipIniPath, const std::string& classKey,
                                                   const std::string& systemIdOverride);
 
-  /// A board of the oldest kind by the key "MotherboardClass"; null when there is none of that name. Throws
-  /// NotBuiltException for one that this version does not have.
+  /// A board of the oldest kind by the key "MotherboardClass" in this system's section, whose name is the id in
+  /// upper-case hexadecimal, with or without leading zeroes; null when there is none of that name.
   static std::unique_ptr<MotherBoard> Instance(const std::string& detectIniPath);
 
   /// The generic class. `systemIdText` is the system id as hexadecimal text.
@@ -139,6 +138,8 @@ class MotherBoard {
   /// The chip's operation. People are told when the LED cannot be lit, or be darkened once it was lit.
   bool SwitchOn(ChipChoice& choice, bool (Chip::*operation)());
   bool SwitchOff(ChipChoice& choice, bool (Chip::*operation)());
+
+  std::string temperatureChipName;  // of the chip whose temperature is watched, where a class presets it
 
   ChipChoice powerLed{"test.powerled.chip", "power LED", "powerled."};
   ChipChoice chargeLed{"test.chargeled.chip", "charge LED", "chargeled."};

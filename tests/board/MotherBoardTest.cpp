@@ -183,8 +183,138 @@ TEST(MotherBoard, EachLedAsksTheChipOfItsOwnKeyAndNoOther) {
   EXPECT_FALSE(board->AssertSpeakerLed() || board->DeassertSpeakerLed());
 }
 
+TEST(MotherBoard, TheSmallClassesHaveTheirOwnChipsAndPowerLed) {
+  struct Case {
+    const char* platform;
+    const char* systemId;
+    const char* name;
+    std::vector<const char*> chips;
+    const char* ledChip;  // that the power LED asks, whatever the files say; empty: that of the files
+  };
+  BoardBench bench;
+  for (const Case& c :
+       {Case{"ich_win", "7D10", "Ich_win", {"win_wpcd376", "ich"}, "win_wpcd376"},
+        Case{"SB7sch5", "7D10", "SB7sch5", {"sio", "sbx"}, "sio"},
+        Case{"mistral", "7D10", "Thicket", {"ich", "ite", "acpi"}, "ite"},
+        Case{"cobble", "7D10", "Cobble", {"adt", "acpi", "ich", "sio"}, ""},
+        Case{"cbb", "0B1C", "CBB", {"fin"}, "fin"}, Case{"cbb", "B38", "CBB", {"fin"}, "fin"},
+        Case{"cbb", "0B34", "CBB", {"win"}, "win"}, Case{"cbb", "0B44", "CBB", {"win_w83202g"}, "win_w83202g"},
+        Case{"cbb", "7D10", "CBB", {}, ""}}) {
+    SCOPED_TRACE(c.platform + std::string(" ") + c.systemId);
+    SMBIOSDiscovery::Instance().productText = c.systemId;
+    bench.SetFiles(std::string("[Common]\nplatform=") + c.platform + "\nchips=g_iospace\n",
+                   "[Common]\ntest.powerled.chip=g_iospace\n", "");
+    const std::unique_ptr<MotherBoard> board = BoardBench::Board(c.systemId);
+    ASSERT_NE(board, nullptr);
+    EXPECT_EQ(board->GetClassName(), c.name);
+    for (const ChipRow& row : ChipRows()) {
+      const bool wanted = row.make != nullptr && std::count(c.chips.begin(), c.chips.end(), row.name) != 0;
+      const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
+      EXPECT_EQ(board->GetChip(std::string(row.name)).GetName(), wanted ? std::string(row.name) : "none")
+          << row.name << isGeneric;
+    }
+    Notices::Forget();
+    bench.machine.ClearOutput();
+    std::string asked;
+    try {
+      board->AssertPowerLedGreen();
+      asked = bench.machine.Errors();
+    } catch (const NotBuiltException& refused) {
+      asked = refused.what();
+    }
+    if (*c.ledChip == '\0') {
+      EXPECT_THAT(asked, ::testing::HasSubstr("\"g_iospace\""));
+    } else {
+      EXPECT_THAT(asked, ::testing::Not(::testing::HasSubstr("\"g_iospace\"")));
+    }
+  }
+  SMBIOSDiscovery::Instance().productText = "7D10";
+}
+
+// Absent hardware reads as ones.
+TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
+  struct Row {
+    std::function<bool(MotherBoard&)> act;
+    bool answer;
+    const char* traffic;
+  };
+  struct Case {
+    const char* systemId;
+    const char* section;
+    const char* wanted;
+    const char* name;
+    bool red;
+    std::vector<Row> rows;
+  };
+  const auto pressed = [](MotherBoard& board) {
+    bool value = false;
+    return board.IsPowerButtonPressed(value) && value;
+  };
+  const std::vector<Row> kEventButton = {
+      {[](MotherBoard& board) { return board.SavePowerButton(); }, true, "0402->FFFF "},
+      {[](MotherBoard& board) { return board.ArmPowerButton(); }, true, "0402->FFFF 0402<-FEFE "},
+      {pressed, true, "0400->FFFF "},
+      {[](MotherBoard& board) { return board.RestorePowerButton(); }, true, "0400<-0100 0402<-FFFF "},
+  };
+  const std::vector<Row> kOrchard = {
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, false, ""},
+      {[](MotherBoard& board) { return board.SavePowerLedState(); }, true,
+       "002E<-25 002F<-58 002E<-07 002F<-07 002E<-F0 002F<-04 002E<-F1 002F<-03 002E<-F0 002F<-06 002E<-F1 "
+       "002F<-03 "},
+      {[](MotherBoard& board) { return board.AssertPowerLedGreen(); }, true, "0420<-40 "},
+      {[](MotherBoard& board) { return board.AssertPowerLedRed(); }, true, "0420<-10 "},
+      {[](MotherBoard& board) { return board.DeassertPowerLed(); }, true, "0420<-00 "},
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, true, "0420<-40 002E<-25 002F<-40 "},
+      {[](MotherBoard& board) { return board.SavePowerButton(); }, true, "0458->FF "},
+      {[](MotherBoard& board) { return board.ArmPowerButton(); }, true, "0458<-FD F802->FFFF F802<-0000 F801<-01 "},
+      {pressed, true, "F801->FF "},
+      {[](MotherBoard& board) { return board.RestorePowerButton(); }, true, "F801<-01 F802<-FFFF 0458<-FF "},
+  };
+  const std::vector<Row> kLantern = {
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, false, ""},
+      {[](MotherBoard& board) { return board.SavePowerLedState(); }, true,
+       "002E<-87 002E<-87 002E<-2A 002F->FF 002F<-FD "},
+      {[](MotherBoard& board) { return board.AssertPowerLedGreen(); }, false, ""},
+      {[](MotherBoard& board) { return board.DeassertPowerLed(); }, false, ""},
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, true, "002E<-2A 002F<-FF 002E<-AA "},
+  };
+  const std::vector<Row> kSaddle = {
+      {[](MotherBoard& board) { return board.SavePowerLedState(); }, true, "004E<-87 004E<-87 004E<-2A 004F->FF "},
+      {[](MotherBoard& board) { return board.AssertPowerLedGreen(); }, true, "004E<-2A 004F<-40 "},
+      {[](MotherBoard& board) { return board.AssertPowerLedRed(); }, false, ""},
+      {[](MotherBoard& board) { return board.DeassertPowerLed(); }, true, "004E<-2A 004F<-00 "},
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, true, "004E<-2A 004F<-FF 004E<-AA "},
+  };
+  BoardBench bench;
+  for (const Case& c : {Case{"0A58", "A58", "Orchard", "Orchard", true, kOrchard},
+                        Case{"A58", "0A58", "Lantern", "Lantern", false, kLantern},
+                        Case{"A58", "A58", "Lantern", "Lantern", false, kEventButton},
+                        Case{"2A78", "2A78", "Lantern", "Saddle", false, kSaddle},
+                        Case{"2A78", "2A78", "Lantern", "Saddle", false, kEventButton}}) {
+    SCOPED_TRACE(c.name);
+    SMBIOSDiscovery::Instance().productText = c.systemId;
+    const std::string base = "PowerIOBaseAddr=0x400\n";
+    bench.SetFiles("[" + std::string(c.section) + "]\nMotherboardClass=" + c.wanted + "\n" + base + "[" + c.systemId +
+                       "]\n" + base,
+                   "", "");
+    EXPECT_EQ(BoardBench::Board(c.systemId), nullptr);
+    const std::unique_ptr<MotherBoard> board = MotherBoard::Instance(".\\mbdetect.ini");
+    ASSERT_NE(board, nullptr);
+    EXPECT_EQ(board->GetClassName(), c.name);
+    bool red = !c.red;
+    EXPECT_TRUE(board->IsPowerLedRedSupported(red));
+    EXPECT_EQ(red, c.red);
+    for (const Row& row : c.rows) {
+      EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(row.act(*board), row.answer) << row.traffic; }), row.traffic);
+    }
+  }
+  bench.SetFiles("[2A78]\nMotherboardClass=lantern\n", "", "");
+  EXPECT_EQ(MotherBoard::Instance(".\\mbdetect.ini"), nullptr);
+  SMBIOSDiscovery::Instance().productText = "7D10";
+}
+
 // What the board's files name and this version does not have is nothing for other hardware's code.
-TEST(MotherBoard, AClassOrChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
+TEST(MotherBoard, AChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
   BoardBench bench;
   Notices::Forget();
   SMBIOSDiscovery::Instance().productText = "7D10";
@@ -197,17 +327,6 @@ TEST(MotherBoard, AClassOrChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
     return "none";
   };
   const std::string end = "is not built into this version, which cannot drive ";
-  bench.SetFiles("[7D10]\nplatform=CBB\n", "", "");
-  const std::string noClass = refusal([] { BoardBench::Board(); });
-  EXPECT_EQ(noClass, ".\\mbdetect.ini, section [7D10], key \"platform\": the board class \"cbb\" " + end +
-                         "this machine's LEDs");
-  EXPECT_EQ(bench.machine.Errors(), "panelglow-diags: " + noClass + ".\n");
-  for (const char* oldest : {"Lantern", "Orchard"}) {
-    bench.SetFiles(std::string("[7D10]\nMotherboardClass=") + oldest + "\n", "", "");
-    EXPECT_EQ(BoardBench::Board(), nullptr);
-    EXPECT_THAT(refusal([] { MotherBoard::Instance(".\\mbdetect.ini"); }), ::testing::HasSubstr(oldest));
-  }
-
   bench.SetFiles("[7D10]\nplatform=generic\nchips=videochip,g_iospace\n",
                  "[Common]\ntest.powerled.chip=VideoChip\ntest.hdled.chip=g_iospace\ntest.chargeled.chip=ich\n", "");
   const std::unique_ptr<MotherBoard> board = BoardBench::Board();

@@ -110,22 +110,7 @@ TEST(SystemSilicon, AWrongWordInTheIniFilesShowsOnThePanelOrInWhatIsLeftBehind) 
   }
 }
 
-// A board that this version cannot drive is no unknown one: the ports of other boards are left alone.
-TEST(SystemSilicon, ABoardClassThatIsNotBuiltEndsTheRunBeforeAnyPortIsTouched) {
-  for (const char* words : {"platform=cbb", "MotherboardClass=Orchard"}) {
-    const Installation installation;
-    installation.Write("mbdetect.ini", std::string("[7E40]\n") + words + "\n");
-    const Outcome outcome = LedRun(installation.Machine("unknown-board.toml"), "Desktop").In(installation);
-    EXPECT_TRUE(outcome.IsOrderly());
-    EXPECT_EQ(outcome.exitCode, 1);
-    EXPECT_THAT(outcome.errors, HasSubstr("is not built into this version, which cannot drive this machine's LEDs."));
-    EXPECT_THAT(outcome.Tagged("ReportFailure"), IsEmpty());  // no LED is blamed
-    EXPECT_THAT(outcome.leftBehind, IsEmpty());
-    EXPECT_EQ(outcome.TimesLit("power-green") + outcome.TimesLit("power-red") + outcome.TimesLit("drive-red"), 0U);
-  }
-}
-
-// The same of a chip that a LED is given to: nobody is blamed for its darkness.
+// A LED that is given to a chip which this version cannot drive: nobody is blamed for its darkness.
 TEST(SystemSilicon, AChipThatIsNotBuiltEndsTheRunOfALedThatHangsOnIt) {
   const std::pair<const char*, std::vector<std::string>> kRuns[] = {
       {"test.powerled.chip=videochip", {"-subtest=CustomLEDTest", "-SectionID=Desktop"}},

@@ -1,0 +1,64 @@
+#include "board/Lantern.h"
+
+#include <array>
+#include <utility>
+
+namespace panelglow {
+
+namespace {
+
+constexpr std::uint32_t kFanDivisor = 1'500'000;
+constexpr std::array<std::uint8_t, 2> kEnterKeys{0x87, 0x87};
+constexpr std::array<std::uint8_t, 1> kExitKeys{0xAA};
+
+// The LED's pin in the register of the multi-function pins. It is written to this port in every model.
+constexpr std::uint16_t kPinPort = 0x2F;
+constexpr std::uint8_t kNotForLed = 0x02;
+constexpr std::uint8_t kForLed = 0x05;
+
+}  // namespace
+
+Lantern::Lantern(std::string boardClass, std::uint16_t boardId, std::uint16_t indexPort)
+    : OldestBoard(std::move(boardClass), boardId,
+                  {.fanDivisor = kFanDivisor, .indexPort = indexPort, .fanLatched = false}),
+      button(devio, ReadFlatWord("PowerIOBaseAddr"), PowerEventButton::Check::kNone) {}
+
+std::uint8_t Lantern::OpenAndKeep() {
+  isOpen = true;
+  superIo.Send(kEnterKeys);
+  const std::uint8_t pins = superIo.Read(kPinRegister);
+  savedPins = pins;
+  return pins;
+}
+
+bool Lantern::SavePowerLedState() {
+  const std::uint8_t pins = OpenAndKeep();
+  devio.OutportByte(kPinPort, static_cast<std::uint8_t>((pins & ~kNotForLed) | kForLed));
+  return true;
+}
+
+bool Lantern::RestorePowerLedState() {
+  if (!isOpen) {
+    return false;
+  }
+  if (savedPins) {
+    superIo.Write(kPinRegister, *savedPins);
+  }
+  superIo.Send(kExitKeys);
+  savedPins.reset();
+  isOpen = false;
+  return true;
+}
+
+bool Lantern::SavePowerButton() {
+  button.Save();
+  return true;
+}
+bool Lantern::RestorePowerButton() { return button.Restore(); }
+bool Lantern::ArmPowerButton() { return button.Arm(); }
+bool Lantern::IsPowerButtonPressed(bool& pressed) {
+  pressed = button.IsPressed();
+  return true;
+}
+
+}  // namespace panelglow
