@@ -268,6 +268,7 @@ TEST(GEcChip, FansAndSensorsGoByTheRegistersOfTheFile) {
     EXPECT_THAT(action, ThrowsMessage<mblib_exception>(text));
   }
   EXPECT_EQ(ec->TachToRpm(1000, 1), 2156);
+  EXPECT_EQ(ec->TachToRpm(0, 1) + ec->TachToRpm(0xFFFF, 1), 0);
   EXPECT_EQ(GEcIt8519Chip().TachToRpm(0xFFFE, 1), 0xFFFE);
   EXPECT_EQ(GEcIt8519Chip().TachToRpm(0xFFFF, 1), 0);
 }

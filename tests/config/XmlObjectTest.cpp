@@ -283,6 +283,15 @@ TEST(XmlObject, SetsFindsAndRemovesAttributesWithoutRegardToCase) {
   EXPECT_EQ(object.attributes.size(), 2U);
 }
 
+TEST(XmlObject, FindsAndSetsItsDeclaration) {
+  XmlObject object("<?xml version='1.1'?><a/>");
+  ASSERT_NE(object.FindDeclaration("version"), nullptr);
+  EXPECT_EQ(object.FindDeclaration("version")->value, "1.1");
+  EXPECT_EQ(object.FindDeclaration("encoding"), nullptr);
+  object.SetDeclaration("encoding", "UTF-8");
+  EXPECT_EQ(object.ToString(true), "<?xml version=\"1.1\" encoding=\"UTF-8\"?>\n<a/>");
+}
+
 TEST(XmlObject, HoldsTextsOfAnyLength) {
   for (const std::size_t length : {0U, 1U, 14U, 15U, 16U, 17U, 100'000U}) {
     const std::string text(length, 'x');

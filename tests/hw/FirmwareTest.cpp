@@ -142,6 +142,21 @@ TEST_F(Firmware, DescribesMemoryDevicesAndLeavesFlashOut) {
             "2 Installed Unknown; ");
 }
 
+TEST_F(Firmware, NamesAMemoryDeviceByItsTexts) {
+  Bytes fields(30, 0);
+  fields[8] = 0x10;
+  for (const std::size_t at :
+       {12, 13, 19, 20, 21, 22}) {  // two locators, maker, serial number, asset tag, part number
+    fields[at] = static_cast<std::uint8_t>(
+        1 + std::count_if(fields.begin() + 12, fields.end(), [](std::uint8_t text) { return text != 0; }));
+  }
+  const SMBIOSDiscovery found(Structure(17, fields, {"DIMM0", "Bank0", "Maker", "SN", "Tag", "PN"}));
+  const MemoryDeviceInfo& info = found.memoryDevices.at(0);
+  EXPECT_EQ(info.deviceLocator + " " + info.bankLocator + " " + info.manufacturer + " " + info.serial + " " +
+                info.assetTag + " " + info.partNumber,
+            "DIMM0 Bank0 Maker SN Tag PN");
+}
+
 TEST_F(Firmware, LeavesRecordsPastItsLimitsUnstored) {
   Bytes processor(32, 0);
   processor[20] = 0x41;
