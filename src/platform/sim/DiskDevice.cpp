@@ -1,10 +1,14 @@
 #include "platform/sim/DiskDevice.h"
 
+#include <fcntl.h>
+#include <sys/stat.h>
+
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
 
 #include "platform/sim/DoorContext.h"
+#include "platform/sim/MachineDescription.h"
 
 namespace panelglow::platform::sim {
 
@@ -23,6 +27,20 @@ std::uint64_t Hashed(std::uint64_t hash, std::span<const std::byte> bytes) {
 
 }  // namespace
 
+DiskDevice::DiskDevice(DiskSetup setup, const Scheduler& time) : setup_(std::move(setup)), time_(time) {
+  if (setup_.file.empty()) {
+    return;
+  }
+  file_ = posix::Descriptor(::open(setup_.file.c_str(), O_RDWR | O_CLOEXEC));
+  struct stat status {};
+  if (!file_ || ::fstat(file_.Get(), &status) != 0 ||
+      static_cast<std::uint64_t>(status.st_size) != setup_.size_bytes) {
+    throw MachineError("the disk \"" + setup_.name + "\" lives in the file " + setup_.file +
+                       ", which must be there and have the disk's size, " + std::to_string(setup_.size_bytes) +
+                       " bytes");
+  }
+}
+
 void DiskDevice::EndRequest() {
   --underWay_;
   litUntil_ = std::max(litUntil_, time_.Now() + setup_.glow_us);
@@ -38,12 +56,26 @@ DiskDevice::Page DiskDevice::OriginalPage(std::uint64_t number) const {
   return page;
 }
 
-DiskDevice::Page& DiskDevice::PageAt(std::uint64_t number) {
-  const auto found = pages_.find(number);
-  return found != pages_.end() ? found->second : pages_.emplace(number, OriginalPage(number)).first->second;
+DiskDevice::Page DiskDevice::PageInFile(std::uint64_t number) const {
+  Page page(kPageBytes);
+  if (::pread(file_.Get(), page.data(), page.size(), static_cast<off_t>(number * kPageBytes)) < 0) {
+    page.clear();  // differs from whatever was there
+  }
+  return page;
 }
 
-void DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
+DiskDevice::Page& DiskDevice::PageAt(std::uint64_t number) {
+  const auto found = pages_.find(number);
+  return found != pages_.end()
+             ? found->second
+             : pages_.emplace(number, file_ ? PageInFile(number) : OriginalPage(number)).first->second;
+}
+
+bool DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
+  if (file_) {
+    return ::pread(file_.Get(), bytes.data(), bytes.size(), static_cast<off_t>(position)) ==
+           static_cast<ssize_t>(bytes.size());
+  }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;
     const std::size_t part = std::min(bytes.size(), kPageBytes - offset);
@@ -51,9 +83,17 @@ void DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
     bytes = bytes.subspan(part);
     position += part;
   }
+  return true;
 }
 
-void DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes) {
+bool DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes) {
+  if (file_) {
+    for (std::uint64_t page = position / kPageBytes; page * kPageBytes < position + bytes.size(); ++page) {
+      PageAt(page);  // as it was
+    }
+    return ::pwrite(file_.Get(), bytes.data(), bytes.size(), static_cast<off_t>(position)) ==
+           static_cast<ssize_t>(bytes.size());
+  }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;
     const std::size_t part = std::min(bytes.size(), kPageBytes - offset);
@@ -61,6 +101,7 @@ void DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes)
     bytes = bytes.subspan(part);
     position += part;
   }
+  return true;
 }
 
 void DiskDevice::NoteForbiddenWrite(std::uint64_t position, std::size_t size_bytes) {
@@ -96,9 +137,10 @@ std::optional<std::uint64_t> DiskDevice::RegisterOf(std::string_view pin) const 
 std::uint64_t DiskDevice::ContentHash() const {
   std::uint64_t hash = kHashStart;
   for (const auto& [number, page] : pages_) {
-    if (page != OriginalPage(number)) {
+    const Page other = file_ ? PageInFile(number) : OriginalPage(number);
+    if (page != other) {
       hash = Hashed(hash, std::as_bytes(std::span(&number, 1)));
-      hash = Hashed(hash, page);
+      hash = Hashed(hash, file_ ? other : page);
     }
   }
   return hash;

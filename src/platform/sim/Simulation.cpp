@@ -475,6 +475,9 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
         case ScriptedEvent::Kind::kConsole:
           RaiseConsole(event.console);
           break;
+        case ScriptedEvent::Kind::kKill:
+          std::raise(SIGKILL);
+          break;
       }
     });
   }
@@ -586,9 +589,3 @@ Simulation& CurrentSimulation() {
 }
 
 }  // namespace panelglow::platform::sim
-
-namespace panelglow::platform {
-
-Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
-
-}  // namespace panelglow::platform
