@@ -17,8 +17,8 @@
 #include "controller/PanelView.h"
 #include "controller/ProtocolFollower.h"
 #include "controller/RunReport.h"
-#include "platform/sim/Operator.h"
 #include "platform/sim/SimHost.h"
+#include "platform/sim/person/Operator.h"
 
 namespace {
 
@@ -86,7 +86,7 @@ int Check(const Options& options) {
         machine.Break(led, kind);
       }
       if (!options.person.empty()) {
-        const sim::Operator person(machine, options.person);
+        const sim::Operator person(machine.Seat(), {}, options.person);
       }
     } catch (const sim::MachineError& error) {
       return Complain(kWrongCall, error.what());

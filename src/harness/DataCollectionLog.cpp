@@ -137,7 +137,7 @@ void RestoreComments(XmlObject& element) {
 OldLog ReadLog(const std::string& file) {
   const std::unique_ptr<platform::XmlDocument> document = platform::TheHost().xmlDocuments.Create();
   if (document == nullptr) {
-    return {{}, false, "the XML component (libpanelglow-xml.so), which reads it, is not there"};
+    return {{}, false, "the XML component, which reads it, is not there"};
   }
   platform::XmlProblem problem;
   std::optional<std::string> text;
@@ -145,7 +145,7 @@ OldLog ReadLog(const std::string& file) {
     text = document->SimpleText(problem);
   }
   if (!text) {
-    return {{}, true, Trim(problem.reason)};
+    return {{}, !problem.unread, Trim(problem.reason)};
   }
   try {
     OldLog log{XmlObject(*text), false, {}};
@@ -157,9 +157,9 @@ OldLog ReadLog(const std::string& file) {
 }
 
 void TellThatItIsLeft(const std::string& file, const OldLog& log) {
-  Notices::Tell("The structured log " + file +
-                " is left as it is, without a record of this run: " + log.problem.substr(0, kLongestReason) +
-                (log.damaged ? ". Mend it, or name another file by -DataCollectionFile." : "."));
+  Notices::Tell("The structured log " + file + " is left as it is, without a record of this run: " +
+                log.problem.substr(0, kLongestReason) + (log.damaged ? ". Mend it" : ". Make it readable") +
+                ", or name another file by -DataCollectionFile.");
 }
 
 bool WriteLog(const std::string& path, const std::string& diagnosticName, const SubtestDetails& details) {

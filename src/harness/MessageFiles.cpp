@@ -1,5 +1,6 @@
 #include "harness/MessageFiles.h"
 
+#include <algorithm>
 #include <array>
 #include <utility>
 
@@ -32,8 +33,10 @@ std::string MessageFilePath(const std::string& prefix, const std::string& progra
 // A number stands where the text should be.
 void TellIfMissing(bool exists, const std::string& path) {
   if (!exists) {
+    std::string shown = path;  // in this system's spelling
+    std::replace(shown.begin(), shown.end(), '\\', '/');
     Notices::Tell(
-        "The message file " + path +
+        "The message file " + shown +
         " is missing, so that numbers stand for texts: start the program in the folder of the installation.");
   }
 }

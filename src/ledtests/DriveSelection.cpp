@@ -5,6 +5,7 @@
 #include <set>
 
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "hw/SetupDI.h"
 #include "storage/ControllerNames.h"
 #include "storage/MSUtils.h"
@@ -33,6 +34,7 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
   CDMUtil::Split(selection.substr(0, kLongestName), wanted, ",");
   ControllerNames names(massStorageIni);
   std::vector<std::string> ids;
+  std::string named;  // the controllers with a disk, for people
   for (const HDD_CTRL_INFO& controller : FindControllers(massStorageIni)) {
     if (FindDiskOf(controller.pnpDeviceId).empty()) {
       continue;  // without a disk nothing can be lit
@@ -48,6 +50,13 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
     const std::string name = names.Find(controller.Ids()).substr(0, kLongestName);
     ids.insert(ids.end(), static_cast<std::size_t>(std::count(wanted.begin(), wanted.end(), name)),
                controller.pnpDeviceId);
+    named += (named.empty() ? "" : ", ") + (name.empty() ? "one without a name" : "\"" + name + "\"");
+  }
+  if (ids.empty()) {
+    Notices::Tell("No drive LED is tested: of the controllers that \"" + selection + "\" selects none has a disk. " +
+                  (named.empty() ? "No other has one either"
+                                 : "Those with a disk, by their names in " + massStorageIni + ": " + named) +
+                  ".");
   }
   return ids;
 }

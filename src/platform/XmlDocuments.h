@@ -16,6 +16,7 @@ struct XmlProblem {
   int code = 0;          // the component's own number
   std::string reason;    // one sentence, ended by a line end
   std::string location;  // path of the element, empty when unknown
+  bool unread = false;   // the file's content was not seen, and may be sound
 };
 
 /// A failure of the component itself, not of a document.

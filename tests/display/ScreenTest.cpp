@@ -12,6 +12,8 @@
 #include <X11/Xatom.h>
 
 #include "display/VirtualDisplay.h"
+#include "platform/desktop/Keys.h"
+#include "platform/drawingmodule/X11Keys.h"
 
 namespace panelglow::systemtest {
 namespace {
@@ -66,6 +68,28 @@ class ScreenTest : public ::testing::Test {
 
   VirtualDisplay display_;
 };
+
+TEST(X11Keys, OnlyLettersAndDigitsHaveTheirCharacterAsCode) {
+  namespace key = platform::desktop::key;
+  const std::pair<const char*, std::uint32_t> kCases[] = {{"a", 'A'},
+                                                          {"Z", 'Z'},
+                                                          {"7", '7'},
+                                                          {"dollar", 0},
+                                                          {"percent", 0},
+                                                          {"ampersand", 0},
+                                                          {"apostrophe", 0},
+                                                          {"parenleft", 0},
+                                                          {"period", 0},
+                                                          {"numbersign", 0},
+                                                          {"Home", key::kHome},
+                                                          {"Left", key::kLeft},
+                                                          {"Delete", key::kDelete},
+                                                          {"KP_Enter", key::kEnter},
+                                                          {"F1", 0}};
+  for (const auto& [name, code] : kCases) {
+    EXPECT_EQ(platform::desktop::VirtualKeyOf(XStringToKeysym(name)), code) << name;
+  }
+}
 
 TEST_F(ScreenTest, AHeldSpaceAnswersOnePrompt) {
   ChildProcess child([](int) {

@@ -96,7 +96,9 @@ TEST_F(Firmware, ReadsTheOtherStructures) {
   EXPECT_EQ(found.biosInfo.vendor + found.biosInfo.version + found.biosInfo.releaseDate, "Vendor1.203/01/2024");
   EXPECT_EQ(found.biosInfo.characteristics, 0x12345678U);
   EXPECT_EQ(found.systemInfo.uuid, "00112233-4455-6677-0809-0A0B0C0D0E0F");
-  EXPECT_EQ(found.systemInfo.sku + found.systemInfo.family, "SKUFamily");
+  EXPECT_EQ(found.systemInfo.manufacturer + found.systemInfo.productName + found.systemInfo.version +
+                found.systemInfo.serialNumber + found.systemInfo.sku + found.systemInfo.family,
+            "MakerProductVSNSKUFamily");
   EXPECT_EQ(found.chassisType, 3);
   ASSERT_EQ(found.processors.size(), 1U);
   const ProcessorInfo info = found.GetProcessor(0);

@@ -179,5 +179,22 @@ TEST(SystemBadInput, ADataCollectionPathThatCannotBeWrittenLeavesTheVerdictAlone
   }
 }
 
+// The program alone in a folder, without the components that lie beside it.
+TEST(SystemBadInput, AMissingXmlComponentIsNoCorruptFile) {
+  const Installation installation;
+  fs::copy_file(fs::path(PANELGLOW_BINARY_DIR) / "panelglow-diags-sim", installation.Path("alone"));
+  installation.Write("log.xml", "<DiagnosticsData/>");
+  const Outcome outcome =
+      RunProgram(installation.Path("alone").string(),
+                 {"-subtest=CustomLEDTest", "-SectionID=Desktop", "-DataCollectionFile=log.xml", "-Retries=0"},
+                 installation.Path(""), {{"PANELGLOW_SIM_MACHINE", installation.Machine("desktop.toml")}});
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_THAT(outcome.Tagged("TestFailed"), ElementsAre(HasSubstr("990638")));
+  EXPECT_THAT(outcome.output, Not(HasSubstr("corrupt")));
+  EXPECT_THAT(outcome.errors, HasSubstr("libpanelglow-xml.so cannot be loaded"));
+  EXPECT_THAT(outcome.errors, HasSubstr("log.xml is left as it is"));
+  EXPECT_EQ(installation.Read("log.xml"), "<DiagnosticsData/>");
+}
+
 }  // namespace
 }  // namespace panelglow::systemtest

@@ -61,7 +61,10 @@ const std::vector<Machine>& Machines() {
        {{"power-white", 550, 550, 2}, {"charge-white", 800, 800, 2}, {"charge-amber", 800, 800, 2}},
        "mailbox configuration mode"},  // its class opens its chip's configuration ports and does not close them
       {"codec-notebook.toml", "CodecNotebook", {{"speaker-mute", 570, 570, 2}, {"microphone-mute", 570, 570, 2}}},
-      {"casl-notebook.toml", "FirmwareNotebook", {{"power-white", 500, 500, 2}}},
+      {"casl-notebook.toml",
+       "FirmwareNotebook",
+       {{"power-white", 500, 500, 2}, {"wireless", 1000, 1000, 10}},
+       "radio 02"},  // was off: one call switches all radios, and they are put back as on when one was
       {"drives-desktop.toml", "DrivesDesktop", {{"sata-drive", 500, 500, 80}, {"nvme-drive", 500, 500, 80}}},
       {"office-notebook.toml", "OfficeNotebook", {{"drive", 500, 500, 80}, {"camera", 500, 500, 5}}},
   };

@@ -20,8 +20,8 @@
 #include "harness/DiagnosticManager.h"
 #include "ledtests/CustomLEDTest.h"
 #include "platform/posix/LazyDrawing.h"
-#include "platform/sim/SimScreen.h"
 #include "platform/sim/Simulation.h"
+#include "platform/sim/person/SimScreen.h"
 #include "prompts/PromptState.h"
 
 namespace {

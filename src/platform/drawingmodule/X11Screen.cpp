@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <array>
-#include <clocale>
 #include <cmath>
 #include <cstdlib>
 #include <utility>
@@ -294,8 +293,12 @@ void X11Screen::TakeEvent(XEvent& event, std::vector<ScreenEvent>& events) {
         mouse(ScreenEvent::Kind::kMouseMove, event.xmotion.x_root, event.xmotion.y_root);
       }
       break;
-    case KeyPress:
     case KeyRelease:
+      if (IsRepeated(event)) {
+        break;  // the press that follows is marked as a repeated one
+      }
+      [[fallthrough]];
+    case KeyPress:
       TakeKey(event, events);
       break;
     case KeymapNotify:  // follows each focus: keys that were pressed or released elsewhere
@@ -389,6 +392,16 @@ std::u16string X11Screen::TitleOf(::Window window) const {
     window = known && parent != root ? parent : 0;
   }
   return {};
+}
+
+// A display that cannot do without releases between the presses of a held key gives both the same time.
+bool X11Screen::IsRepeated(const XEvent& release) const {
+  if (XEventsQueued(display_, QueuedAfterReading) == 0 || !alive_) {
+    return false;
+  }
+  XEvent next{};
+  XPeekEvent(display_, &next);
+  return next.type == KeyPress && next.xkey.keycode == release.xkey.keycode && next.xkey.time == release.xkey.time;
 }
 
 void X11Screen::TakeKey(XEvent& event, std::vector<ScreenEvent>& events) {

@@ -49,6 +49,7 @@ class X11Screen : public Screen {
   void RaiseAll();
   void Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage);
   void TakeEvent(XEvent& event, std::vector<ScreenEvent>& events);
+  [[nodiscard]] bool IsRepeated(const XEvent& release) const;
   void TakeKey(XEvent& event, std::vector<ScreenEvent>& events);
   void NoteLoss(std::vector<ScreenEvent>& events);
   [[nodiscard]] bool IsUnderOwnWindow() const;

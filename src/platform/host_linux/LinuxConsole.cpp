@@ -5,12 +5,12 @@
 
 #include <cerrno>
 #include <csignal>
-#include <cstdio>
 #include <system_error>
 #include <thread>
 #include <utility>
 
 #include "platform/host_linux/CurrentThread.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -48,7 +48,11 @@ sigset_t ControlSignals() {
 
 }  // namespace
 
-LinuxConsole::LinuxConsole() { std::signal(SIGPIPE, SIG_IGN); }
+LinuxConsole::LinuxConsole() {
+  std::signal(SIGPIPE, SIG_IGN);
+  const sigset_t signals = ControlSignals();
+  ::pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+}
 
 void LinuxConsole::Write(std::string_view bytes) {
   CurrentThread::CheckEndRequest();
@@ -70,11 +74,8 @@ void LinuxConsole::SetControlHandler(std::function<bool(std::uint32_t)> handler)
   if (std::exchange(isArmed_, true)) {
     return;
   }
-  // From here on the signals stay with the process, also those that come before anybody listens; every thread that is
-  // started later inherits that. The listening thread is made when the program first waits for something: a start
-  // that only prints a text and ends does without.
-  const sigset_t signals = ControlSignals();
-  ::pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+  // The signals that have come so far are still there. The listening thread is made when the program first waits for
+  // something: a start that only prints a text and ends does without.
   CurrentThread::BeforeNextBlock([this] { StartListening(); });
 }
 
@@ -82,7 +83,8 @@ void LinuxConsole::StartListening() {
   try {
     std::thread([this] { Listen(); }).detach();
   } catch (const std::system_error& failure) {
-    std::fprintf(stderr, "interrupts will not be noticed: %s\n", failure.what());
+    posix::TellPeople(std::string("An interrupt will not be noticed, as no thread can be started: ") +
+                      failure.what() + ".");
   }
 }
 

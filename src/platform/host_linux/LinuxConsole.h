@@ -12,7 +12,9 @@ namespace panelglow::platform::host_linux {
 /// had it ignore, as nohup does, stays ignored. Has to outlive the program's threads.
 class LinuxConsole : public Console {
  public:
-  /// A reader that goes away is no signal any more, but an error that Write overlooks.
+  /// To be made on the process's first thread, before there are others. From here on a control signal stays with the
+  /// process until a handler listens, whenever it came; every thread that is started later inherits that. A reader
+  /// that goes away is no signal any more, but an error that Write remembers.
   LinuxConsole();
 
   void Write(std::string_view bytes) override;

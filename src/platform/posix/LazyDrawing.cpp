@@ -1,11 +1,11 @@
 #include "platform/posix/LazyDrawing.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <string>
 
 #include "platform/Text.h"
 #include "platform/posix/ModuleLoader.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::posix {
 
@@ -16,7 +16,8 @@ desktop::SceneDrawing* LazyDrawing::Get() {
     if (const auto make = reinterpret_cast<Maker>(LoadSymbol("panelglow-drawing", "PanelglowSceneDrawing", error))) {
       drawing_ = make();
     } else {
-      std::fprintf(stderr, "drawing is not available: %s\n", error.c_str());
+      TellPeople("Nothing can be shown, as libpanelglow-drawing.so cannot be loaded: " + error +
+                 ". Put it beside the program, or into ../lib.");
     }
   });
   return drawing_;

@@ -1,9 +1,9 @@
 #include "platform/posix/LazyXmlDocuments.h"
 
-#include <cstdio>
 #include <string>
 
 #include "platform/posix/ModuleLoader.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::posix {
 
@@ -15,7 +15,8 @@ std::unique_ptr<XmlDocument> LazyXmlDocuments::Create() {
             reinterpret_cast<Maker>(LoadSymbol("panelglow-xml", "PanelglowXmlDocumentsOnFiles", error))) {
       documents_.reset(make(files_));
     } else {
-      std::fprintf(stderr, "structured documents are not available: %s\n", error.c_str());
+      TellPeople("Structured documents can neither be read nor written, as libpanelglow-xml.so cannot be loaded: " +
+                 error + ". Put it beside the program, or into ../lib.");
     }
   });
   return documents_ == nullptr ? nullptr : documents_->Create();

@@ -9,7 +9,11 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
-#include <cstring>
+#include <mutex>
+#include <string>
+#include <system_error>
+
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::posix {
 
@@ -59,7 +63,11 @@ bool OwnedName::IsAvailable() {
   if (MakeSocket() || errno == EMFILE || errno == ENFILE || errno == ENOMEM || errno == ENOBUFS) {
     return true;
   }
-  std::fprintf(stderr, "locks between processes are not available: %s\n", std::strerror(errno));
+  static std::once_flag told;
+  std::call_once(told, [error = errno] {
+    TellPeople("Other runs on this machine cannot be kept waiting, as there are no local sockets: " +
+               std::generic_category().message(error) + ". Run one at a time.");
+  });
   return false;
 }
 

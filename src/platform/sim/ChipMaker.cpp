@@ -2,11 +2,11 @@
 
 #include <variant>
 
-#include "platform/sim/FintekSuperIo.h"
-#include "platform/sim/GpioBlock.h"
-#include "platform/sim/IteSuperIo.h"
-#include "platform/sim/LegacyPanelBlock.h"
-#include "platform/sim/MemoryRegisters.h"
+#include "platform/sim/silicon/FintekSuperIo.h"
+#include "platform/sim/silicon/GpioBlock.h"
+#include "platform/sim/silicon/IteSuperIo.h"
+#include "platform/sim/silicon/LegacyPanelBlock.h"
+#include "platform/sim/silicon/MemoryRegisters.h"
 
 namespace panelglow::platform::sim {
 

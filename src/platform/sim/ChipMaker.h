@@ -3,9 +3,9 @@
 
 #include <memory>
 
-#include "platform/sim/Device.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
+#include "platform/sim/silicon/Device.h"
 
 namespace panelglow::platform::sim {
 

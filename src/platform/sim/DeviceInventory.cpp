@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstdio>
 
-#include "platform/sim/AsciiCase.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

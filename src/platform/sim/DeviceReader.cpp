@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "platform/sim/AsciiCase.h"
 #include "platform/sim/DeviceInventory.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

@@ -4,8 +4,8 @@
 #include <variant>
 
 #include "platform/Text.h"
-#include "platform/sim/AsciiCase.h"
 #include "platform/sim/DeviceInventory.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

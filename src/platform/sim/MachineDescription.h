@@ -5,32 +5,27 @@
 #include <ctime>
 #include <map>
 #include <optional>
-#include <stdexcept>
 #include <string>
 #include <string_view>
 #include <variant>
 #include <vector>
 
 #include "platform/Management.h"
-#include "platform/sim/AdapterDevice.h"
-#include "platform/sim/CameraDevice.h"
 #include "platform/sim/ControllerDescription.h"
-#include "platform/sim/DiskDevice.h"
-#include "platform/sim/EmbeddedController.h"
-#include "platform/sim/FirmwareCall.h"
-#include "platform/sim/FloppyController.h"
-#include "platform/sim/FrontPanel.h"
-#include "platform/sim/HdaCodec.h"
-#include "platform/sim/MailboxController.h"
-#include "platform/sim/SuperIo.h"
+#include "platform/sim/base/MachineError.h"
+#include "platform/sim/person/FrontPanel.h"
+#include "platform/sim/silicon/AdapterDevice.h"
+#include "platform/sim/silicon/CameraDevice.h"
+#include "platform/sim/silicon/DiskDevice.h"
+#include "platform/sim/silicon/EmbeddedController.h"
+#include "platform/sim/silicon/FirmwareCall.h"
+#include "platform/sim/silicon/FloppyController.h"
+#include "platform/sim/silicon/HdaCodec.h"
+#include "platform/sim/silicon/MailboxController.h"
+#include "platform/sim/silicon/PciFunction.h"
+#include "platform/sim/silicon/SuperIo.h"
 
 namespace panelglow::platform::sim {
-
-/// A machine's file that cannot be used; the text names file, line and what to do.
-class MachineError : public std::runtime_error {
- public:
-  using std::runtime_error::runtime_error;
-};
 
 struct ChipDescription {
   std::string name;
@@ -64,12 +59,6 @@ struct DriverDescription {
   std::vector<ServiceDescription> services;               // registered before the run
   std::map<std::uint32_t, std::uint64_t> registers = {};  // model-specific ones of the processor, by index
   std::vector<std::uint32_t> refused = {};                // requests, by code, that it reports as failed
-};
-
-struct PciFunction {
-  std::uint16_t location = 0;
-  std::map<std::uint16_t, std::uint32_t> registers;  // dword offset to value
-  std::string controller = {};                       // instance id of the storage controller that it is, if one
 };
 
 struct ProcessorDescription {

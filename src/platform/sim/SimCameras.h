@@ -5,8 +5,8 @@
 #include <vector>
 
 #include "platform/Cameras.h"
-#include "platform/sim/CameraDevice.h"
-#include "platform/sim/DoorContext.h"
+#include "platform/sim/silicon/CameraDevice.h"
+#include "platform/sim/silicon/DoorContext.h"
 
 namespace panelglow::platform::sim {
 

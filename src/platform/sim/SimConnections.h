@@ -5,8 +5,8 @@
 #include <vector>
 
 #include "platform/Connections.h"
-#include "platform/sim/AdapterDevice.h"
-#include "platform/sim/DoorContext.h"
+#include "platform/sim/silicon/AdapterDevice.h"
+#include "platform/sim/silicon/DoorContext.h"
 
 namespace panelglow::platform::sim {
 

@@ -6,7 +6,7 @@
 
 #include "platform/DeviceTree.h"
 #include "platform/sim/DeviceInventory.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

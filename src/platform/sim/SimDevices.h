@@ -5,7 +5,6 @@
 #include <string>
 #include <vector>
 
-#include "platform/sim/Buses.h"
 #include "platform/sim/DeviceInventory.h"
 #include "platform/sim/DeviceTables.h"
 #include "platform/sim/MachineDescription.h"
@@ -15,6 +14,7 @@
 #include "platform/sim/SimModules.h"
 #include "platform/sim/SimRawDisks.h"
 #include "platform/sim/SimRegistry.h"
+#include "platform/sim/silicon/Buses.h"
 
 namespace panelglow::platform::sim {
 

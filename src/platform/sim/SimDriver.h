@@ -10,10 +10,10 @@
 
 #include "platform/DriverDevice.h"
 #include "platform/ServiceManager.h"
-#include "platform/sim/Buses.h"
 #include "platform/sim/DriverTrace.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
+#include "platform/sim/silicon/Buses.h"
 
 namespace panelglow::platform::sim {
 

@@ -7,7 +7,7 @@
 #include <string>
 
 #include "platform/Files.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

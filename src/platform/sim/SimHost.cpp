@@ -7,7 +7,7 @@
 #include <sstream>
 #include <string>
 
-#include "platform/sim/Operator.h"
+#include "platform/sim/person/Operator.h"
 
 namespace panelglow::platform::sim {
 

@@ -1,9 +1,9 @@
 #include "platform/sim/SimManagement.h"
 
 #include "platform/Text.h"
-#include "platform/sim/AsciiCase.h"
 #include "platform/sim/FirmwareTable.h"
 #include "platform/sim/WqlQuery.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

@@ -8,9 +8,9 @@
 
 #include "platform/Management.h"
 #include "platform/sim/DeviceTables.h"
-#include "platform/sim/FirmwareCall.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
+#include "platform/sim/silicon/FirmwareCall.h"
 
 namespace panelglow::platform::sim {
 

@@ -6,8 +6,8 @@
 #include <vector>
 
 #include "platform/Modules.h"
-#include "platform/sim/AsciiCase.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/AsciiCase.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

@@ -8,7 +8,7 @@
 #include "platform/NamedMutexes.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

@@ -5,7 +5,7 @@
 #include <new>
 #include <optional>
 
-#include "platform/sim/AsciiCase.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

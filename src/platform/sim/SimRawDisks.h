@@ -5,8 +5,8 @@
 #include <vector>
 
 #include "platform/RawDisks.h"
-#include "platform/sim/DiskDevice.h"
-#include "platform/sim/DoorContext.h"
+#include "platform/sim/silicon/DiskDevice.h"
+#include "platform/sim/silicon/DoorContext.h"
 
 namespace panelglow::platform::sim {
 

@@ -7,7 +7,7 @@
 
 #include "platform/Registry.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 

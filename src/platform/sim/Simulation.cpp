@@ -1,15 +1,11 @@
 #include "platform/sim/Simulation.h"
 
-#include <unistd.h>
-
 #include <algorithm>
-#include <cctype>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <ctime>
 #include <map>
-#include <system_error>
 
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
@@ -18,246 +14,27 @@
 #include "platform/profile/ProfileFilesOnFiles.h"
 #include "platform/sim/ChipMaker.h"
 #include "platform/sim/FirmwareTable.h"
-#include "platform/sim/KeyboardDevice.h"
-#include "platform/sim/Operator.h"
+#include "platform/sim/SimClock.h"
+#include "platform/sim/SimConsole.h"
+#include "platform/sim/SimCpu.h"
 #include "platform/sim/SimDevices.h"
 #include "platform/sim/SimDriver.h"
+#include "platform/sim/SimEnvironment.h"
 #include "platform/sim/SimHost.h"
+#include "platform/sim/SimInput.h"
 #include "platform/sim/SimManagement.h"
 #include "platform/sim/SimMutexes.h"
-#include "platform/sim/SimScreen.h"
+#include "platform/sim/SimThreads.h"
+#include "platform/sim/SimWindowHost.h"
+#include "platform/sim/person/Operator.h"
+#include "platform/sim/person/SimScreen.h"
+#include "platform/sim/silicon/KeyboardDevice.h"
 
 namespace panelglow::platform::sim {
 
 namespace {
 
-constexpr const char* kKeyboard = "keyboard";
 constexpr const char* kFirmware = "firmware";
-
-class SimClock : public Clock {
- public:
-  SimClock(Scheduler& scheduler, std::time_t start) : scheduler_(scheduler), start_(start) {}
-  std::uint32_t TickCount() override {
-    scheduler_.Spend(1);  // so that a loop that only reads the clock comes to its end
-    return static_cast<std::uint32_t>(scheduler_.Now() / 1000 + kBootTicks);
-  }
-  std::time_t WallTime() override { return start_ + static_cast<std::time_t>(scheduler_.Now() / 1'000'000); }
-  std::tm LocalTime(std::time_t seconds) override {
-    std::tm parts{};
-    gmtime_r(&seconds, &parts);  // a simulated machine stands at Greenwich
-    return parts;
-  }
-  void Sleep(std::uint32_t milliseconds) override { scheduler_.SleepFor(Microseconds{milliseconds} * 1000); }
-
- private:
-  static constexpr std::uint64_t kBootTicks = 0xFFFFD8F0;  // 10 s before the counter wraps
-  Scheduler& scheduler_;
-  std::time_t start_;
-};
-
-class SimThreads : public Threads {
- public:
-  explicit SimThreads(Scheduler& scheduler) : scheduler_(scheduler) {}
-  ThreadHandle Start(const std::string& name, std::function<void()> body) override {
-    if (refused_ != 0) {
-      --refused_;
-      return 0;
-    }
-    const ThreadHandle thread = scheduler_.Start(name, std::move(body));
-    scheduler_.Spend(10);
-    return thread;
-  }
-  bool Wait(ThreadHandle thread, std::uint32_t limit_ms) override {
-    if (limit_ms == kNoLimit) {
-      return scheduler_.WaitForEnd(thread, std::nullopt);
-    }
-    return scheduler_.WaitForEnd(thread, scheduler_.Now() + Microseconds{limit_ms} * 1000);
-  }
-  void Close(ThreadHandle /*thread*/) override {}
-  void Terminate(ThreadHandle thread) override { scheduler_.Terminate(thread); }
-
-  void RefuseNext(unsigned count) { refused_ = count; }
-
- private:
-  Scheduler& scheduler_;
-  unsigned refused_ = 0;
-};
-
-class SimConsole : public Console {
- public:
-  SimConsole(Scheduler& scheduler, bool capture) : scheduler_(scheduler), capture_(capture) {}
-  void Write(std::string_view bytes) override {
-    scheduler_.Spend(1);
-    if (capture_) {
-      output_ += bytes;
-      return;
-    }
-    while (!bytes.empty()) {
-      const ssize_t written = ::write(STDOUT_FILENO, bytes.data(), bytes.size());
-      if (written < 0 && errno == EINTR) {
-        continue;
-      }
-      if (written <= 0) {
-        outputError_ = outputError_ == 0 ? errno : outputError_;
-        return;
-      }
-      bytes.remove_prefix(static_cast<std::size_t>(written));
-    }
-  }
-  std::string OutputProblem() override {
-    return outputError_ == 0 ? std::string() : std::generic_category().message(outputError_);
-  }
-  void WriteError(std::string_view bytes) override {
-    if (capture_) {
-      errors_ += bytes;
-    } else {
-      std::fwrite(bytes.data(), 1, bytes.size(), stderr);
-    }
-  }
-  void SetControlHandler(std::function<bool(std::uint32_t)> handler) override { handler_ = std::move(handler); }
-
-  void Raise(std::uint32_t type) {
-    if (handler_) {
-      scheduler_.Start("console control", [handler = handler_, type] { handler(type); });
-    }
-  }
-  [[nodiscard]] bool IsHeard() const { return handler_ != nullptr; }
-  [[nodiscard]] const std::string& Output() const { return output_; }
-  [[nodiscard]] const std::string& Errors() const { return errors_; }
-  void Clear() {
-    output_.clear();
-    errors_.clear();
-  }
-
- private:
-  Scheduler& scheduler_;
-  bool capture_;
-  std::string output_;
-  std::string errors_;
-  int outputError_ = 0;  // of the first write that failed
-  std::function<bool(std::uint32_t)> handler_;
-};
-
-class SimEnvironment : public Environment {
- public:
-  explicit SimEnvironment(const std::map<std::string, std::string>& variables) : variables_(variables) {}
-  std::optional<std::string> Variable(std::string_view name) override {
-    const auto found = variables_.find(std::string(name));
-    return found == variables_.end() ? std::nullopt : std::optional<std::string>(found->second);
-  }
-
- private:
-  const std::map<std::string, std::string>& variables_;
-};
-
-class SimCpu : public Cpu {
- public:
-  explicit SimCpu(const MachineDescription& machine) : machine_(machine) {}
-  CpuidRegisters Cpuid(std::uint32_t leaf) override {
-    const bool amd = !machine_.firmware.processors.empty() &&
-                     machine_.firmware.processors.front().manufacturer.find("AMD") != std::string::npos;
-    if (leaf == 0) {
-      return amd ? CpuidRegisters{13, 0x68747541, 0x444D4163, 0x69746E65}
-                 : CpuidRegisters{13, 0x756E6547, 0x6C65746E, 0x49656E69};
-    }
-    return leaf == 1 ? CpuidRegisters{0x000306A9, 0, 0, 0} : CpuidRegisters{};
-  }
-  bool Is64BitSystem() override { return machine_.is64Bit; }
-
- private:
-  const MachineDescription& machine_;
-};
-
-class SimKeyboard : public Keyboard {
- public:
-  SimKeyboard(Scheduler& scheduler, Buses& buses, KeyboardDevice& device, std::function<void()> moved)
-      : scheduler_(scheduler), buses_(buses), device_(device), moved_(std::move(moved)) {}
-  void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) override {
-    scheduler_.Spend(20);
-    if (!buses_.IsRemoved(kKeyboard) && !buses_.IsIgnored(kKeyboard, virtualKey)) {
-      device_.Event(virtualKey, scanCode, flags);
-    }
-    moved_();
-  }
-
- private:
-  Scheduler& scheduler_;
-  Buses& buses_;
-  KeyboardDevice& device_;
-  std::function<void()> moved_;
-};
-
-// The vendor's touchpad interface: one touchpad with one LED property.
-class SimTouchpad : public Touchpad {
- public:
-  SimTouchpad(bool present, Scheduler& scheduler, Buses& buses, KeyboardDevice& device, std::function<void()> moved)
-      : present_(present), scheduler_(scheduler), buses_(buses), device_(device), moved_(std::move(moved)) {}
-
-  std::unique_ptr<TouchpadApi> Create() override { return present_ ? std::make_unique<Api>(*this) : nullptr; }
-
- private:
-  static constexpr std::int32_t kDevice = 3;
-  static constexpr std::int32_t kTypeTouchpad = 2;
-  static constexpr std::uint32_t kLedProperty = 0x10000171;
-
-  class Pad : public TouchpadDevice {
-   public:
-    explicit Pad(SimTouchpad& owner) : owner_(owner) {}
-    bool SetProperty(std::uint32_t property, std::int32_t value) override {
-      owner_.scheduler_.Spend(50);
-      if (property != kLedProperty) {
-        return false;
-      }
-      if (!owner_.buses_.IsIgnored(kKeyboard, KeyboardDevice::kTouchpadLed)) {
-        owner_.device_.SetTouchpadLed(value != 0);
-      }
-      owner_.moved_();
-      return true;
-    }
-
-   private:
-    SimTouchpad& owner_;
-  };
-
-  class Api : public TouchpadApi {
-   public:
-    explicit Api(SimTouchpad& owner) : owner_(owner) {}
-    bool FindDevice(std::int32_t connection, std::int32_t type, std::int32_t& handle) override {
-      if (connection != 0 || type != kTypeTouchpad || handle != -1) {
-        return false;
-      }
-      handle = kDevice;
-      return true;
-    }
-    std::unique_ptr<TouchpadDevice> OpenDevice(std::int32_t handle) override {
-      return handle == kDevice ? std::make_unique<Pad>(owner_) : nullptr;
-    }
-
-   private:
-    SimTouchpad& owner_;
-  };
-
-  bool present_;
-  Scheduler& scheduler_;
-  Buses& buses_;
-  KeyboardDevice& device_;
-  std::function<void()> moved_;
-};
-
-class SimWindowHost : public desktop::WindowHost {
- public:
-  explicit SimWindowHost(Scheduler& scheduler) : scheduler_(scheduler) {}
-  std::uint32_t CurrentThread() override { return scheduler_.Current(); }
-  std::uint64_t Now_ms() override { return scheduler_.Now() / 1000; }
-  void Block(const void* key, const std::string& what, std::optional<std::uint64_t> deadline_ms) override {
-    scheduler_.Block(key, what, deadline_ms ? std::optional<Microseconds>(*deadline_ms * 1000) : std::nullopt);
-  }
-  void Wake(const void* key) override { scheduler_.Wake(key); }
-  void Spend() override { scheduler_.Spend(1); }
-
- private:
-  Scheduler& scheduler_;
-};
 
 Simulation* g_current = nullptr;
 
@@ -508,7 +285,7 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
   p.LookAtPanel();
   p.initialState = p.buses.State();
   if (!options.operatorPolicy.empty()) {
-    p.person = std::make_unique<Operator>(*this, options.operatorPolicy);
+    p.person = std::make_unique<Operator>(Seat(), p.description.leds, options.operatorPolicy);
   }
   p.former = g_current;
   g_current = this;
@@ -527,6 +304,9 @@ DriverTrace& Simulation::Trace() { return parts_->trace; }
 SimFiles& Simulation::DiskFiles() { return parts_->files; }
 desktop::WindowSystem& Simulation::Windows() { return parts_->windows; }
 Operator* Simulation::Person() { return parts_->person.get(); }
+OperatorSeat Simulation::Seat() {
+  return {parts_->scheduler, parts_->panel, parts_->windows, [this](std::string_view what) { Screenshot(what); }};
+}
 const MachineDescription& Simulation::Description() const { return parts_->description; }
 const std::string& Simulation::Output() const { return parts_->console.Output(); }
 const std::string& Simulation::Errors() const { return parts_->console.Errors(); }
@@ -554,10 +334,16 @@ void Simulation::Break(std::string_view led, std::string_view fault) {
                        "\": no such LED, or no such partner (swapped:OTHER, shorted:OTHER)");
   }
   const Led& broken = parts_->panel.Leds()[*parts_->panel.Find(led)];
+  FirmwareCall* const firmware = broken.device == kFirmware ? parts_->firmwareCall : nullptr;
   if (kind == LedFault::kAbsentChip) {
     parts_->buses.Remove(broken.device);
+    if (firmware != nullptr) {
+      firmware->GoAway();
+    }
   }
-  if (kind == LedFault::kLyingWrite) {
+  if (kind == LedFault::kLyingWrite && firmware != nullptr) {
+    firmware->IgnoreOrders();
+  } else if (kind == LedFault::kLyingWrite) {
     const Device* device = parts_->buses.Find(broken.device);
     if (const std::optional<std::uint64_t> address = device->RegisterOf(broken.pin)) {
       parts_->buses.IgnoreWrites(broken.device, *address);

@@ -12,16 +12,17 @@
 
 #include "platform/Host.h"
 #include "platform/desktop/WindowSystem.h"
-#include "platform/sim/Buses.h"
 #include "platform/sim/DriverTrace.h"
-#include "platform/sim/FrontPanel.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/Scheduler.h"
 #include "platform/sim/SimFiles.h"
+#include "platform/sim/base/Scheduler.h"
+#include "platform/sim/person/FrontPanel.h"
+#include "platform/sim/silicon/Buses.h"
 
 namespace panelglow::platform::sim {
 
 class Operator;
+struct OperatorSeat;
 
 struct SimulationOptions {
   std::uint64_t seed = 1;
@@ -55,6 +56,8 @@ class Simulation {
   SimFiles& DiskFiles();
   desktop::WindowSystem& Windows();
   Operator* Person();
+  /// What a person at this machine has in front of them.
+  OperatorSeat Seat();
   [[nodiscard]] const MachineDescription& Description() const;
 
   /// What the program has written to standard output, when it is captured.

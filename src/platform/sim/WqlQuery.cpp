@@ -2,7 +2,7 @@
 
 #include <cctype>
 
-#include "platform/sim/AsciiCase.h"
+#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

@@ -119,7 +119,8 @@ xmlParserInputPtr RefuseEntity(const char*, const char*, xmlParserCtxtPtr) { ret
 // Of any size.
 Document Parse(const std::string& bytes, Findings& findings) {
   const ParserContext context(xmlNewParserCtxt());
-  if (!context || bytes.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
+  static_assert(Files::kLargestFile_bytes <= std::numeric_limits<int>::max());
+  if (!context) {
     throw XmlComponentError("the XML component has no memory left");
   }
   context->_private = &findings;
@@ -259,7 +260,8 @@ class LibXmlDocument : public XmlDocument {
   Document LoadFile(std::string_view path, Findings& findings) {
     const std::optional<std::string> bytes = files_.Read(path);
     if (!bytes) {
-      findings.problems.push_back({XML_IO_LOAD_ERROR, "the file cannot be read\n", ""});
+      findings.problems.push_back(
+          {XML_IO_LOAD_ERROR, "the file cannot be read, or is longer than 512 MiB\n", "", true});
       return nullptr;
     }
     return Parse(*bytes, findings);

@@ -197,6 +197,16 @@ TEST_F(DialogTest, SpaceThatIsHeldWhileTheFocusMovesPressesNothing) {
   Pump(20);
   EXPECT_TRUE(notes_.empty());
   EXPECT_FALSE(desktop_.MakeScene().windows.at(1).pressed);
+
+  desktop_.KeyDown(0x20, u' ', false, false);
+  Pump(10);
+  desktop_.LoseForeground(u"other");  // which gets the release
+  EXPECT_FALSE(desktop_.MakeScene().windows.at(1).pressed);
+  desktop_.SetForegroundWindow(dialog_);
+  notes_.clear();
+  desktop_.KeyUp(0x20, false);
+  Pump(20);
+  EXPECT_TRUE(notes_.empty());
 }
 
 TEST_F(DialogTest, TheFocusedButtonHasTheHeavyFrameAndTheDefaultOneWhenNoneIs) {

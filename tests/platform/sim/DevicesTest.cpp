@@ -8,7 +8,7 @@
 
 #include "platform/Text.h"
 #include "platform/sim/Bench.h"
-#include "platform/sim/DiskDevice.h"
+#include "platform/sim/silicon/DiskDevice.h"
 
 namespace panelglow::platform::sim {
 namespace {

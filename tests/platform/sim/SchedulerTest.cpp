@@ -1,5 +1,5 @@
 // Virtual time and the baton: order, determinism, termination, stuck machines.
-#include "platform/sim/Scheduler.h"
+#include "platform/sim/base/Scheduler.h"
 
 #include <gtest/gtest.h>
 

@@ -11,7 +11,7 @@
 #include <filesystem>
 #include <thread>
 
-#include "platform/sim/Operator.h"
+#include "platform/sim/person/Operator.h"
 
 namespace panelglow::platform::sim {
 namespace {
@@ -122,7 +122,7 @@ TEST(Simulation, AnImpossibleFaultIsRefused) {
 TEST(Simulation, AnOperatorThatDoesNotExistIsRefused) {
   Simulation machine("");
   for (const char* policy : {"", "perfekt", "wrong:x", "script:/no/such/file"}) {
-    EXPECT_THROW(Operator(machine, policy), MachineError) << policy;
+    EXPECT_THROW(Operator(machine.Seat(), {}, policy), MachineError) << policy;
   }
 }
 

@@ -1,0 +1,16 @@
+#include "platform/posix/TellPeople.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <string>
+
+namespace panelglow::platform::posix {
+
+void TellPeople(std::string_view sentence) {
+  const std::string line = std::string(program_invocation_short_name) + ": " + std::string(sentence) + "\n";
+  // One write, so that lines of several processes stay whole; who closed standard error wants to hear nothing.
+  [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, line.data(), line.size());
+}
+
+}  // namespace panelglow::platform::posix

@@ -1,0 +1,16 @@
+// One function in PCI configuration space.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <string>
+
+namespace panelglow::platform::sim {
+
+struct PciFunction {
+  std::uint16_t location = 0;
+  std::map<std::uint16_t, std::uint32_t> registers;  // dword offset to value
+  std::string controller = {};                       // instance id of the storage controller that it is, if one
+};
+
+}  // namespace panelglow::platform::sim
