@@ -375,3 +375,10 @@ Simulation& CurrentSimulation() {
 }
 
 }  // namespace panelglow::platform::sim
+
+namespace panelglow::platform {
+
+// Weak, so that a program may link a host of its own: a test that stands in for a service of the machine.
+[[gnu::weak]] Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
+
+}  // namespace panelglow::platform
