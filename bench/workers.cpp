@@ -197,6 +197,9 @@ void Phases(benchmark::State& state, panelglow::BlinkWorker worker, std::size_t 
   for (auto _ : state) {
     panelglow::CustomLEDTest test;
     panelglow::LEDStruct& entry = test.devices[0];
+    test.iniFile = ".\\mbdetect.ini";
+    test.testIni = ".\\mbtest.ini";
+    test.chipIni = ".\\chip.ini";
     test.ChangeDriveHandle(DriveFile::kPath);
     entry.running = true;
     g_watch = {};

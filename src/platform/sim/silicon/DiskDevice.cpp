@@ -1,8 +1,5 @@
 #include "platform/sim/silicon/DiskDevice.h"
 
-#include <fcntl.h>
-#include <sys/stat.h>
-
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
@@ -31,10 +28,9 @@ DiskDevice::DiskDevice(DiskSetup setup, const Scheduler& time) : setup_(std::mov
   if (setup_.file.empty()) {
     return;
   }
-  file_ = posix::Descriptor(::open(setup_.file.c_str(), O_RDWR | O_CLOEXEC));
-  struct stat status {};
-  if (!file_ || ::fstat(file_.Get(), &status) != 0 ||
-      static_cast<std::uint64_t>(status.st_size) != setup_.size_bytes) {
+  file_.reset(std::fopen(setup_.file.c_str(), "r+b"));
+  if (!file_ || std::setvbuf(file_.get(), nullptr, _IONBF, 0) != 0 || std::fseek(file_.get(), 0, SEEK_END) != 0 ||
+      static_cast<std::uint64_t>(std::ftell(file_.get())) != setup_.size_bytes) {
     throw MachineError("the disk \"" + setup_.name + "\" lives in the file " + setup_.file +
                        ", which must be there and have the disk's size, " + std::to_string(setup_.size_bytes) +
                        " bytes");
@@ -56,11 +52,14 @@ DiskDevice::Page DiskDevice::OriginalPage(std::uint64_t number) const {
   return page;
 }
 
+bool DiskDevice::SeekFile(std::uint64_t position) const {
+  return std::fseek(file_.get(), static_cast<long>(position), SEEK_SET) == 0;
+}
+
+// Shorter than a page at the end of the file.
 DiskDevice::Page DiskDevice::PageInFile(std::uint64_t number) const {
   Page page(kPageBytes);
-  if (::pread(file_.Get(), page.data(), page.size(), static_cast<off_t>(number * kPageBytes)) < 0) {
-    page.clear();  // differs from whatever was there
-  }
+  page.resize(SeekFile(number * kPageBytes) ? std::fread(page.data(), 1, page.size(), file_.get()) : 0);
   return page;
 }
 
@@ -73,8 +72,7 @@ DiskDevice::Page& DiskDevice::PageAt(std::uint64_t number) {
 
 bool DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
   if (file_) {
-    return ::pread(file_.Get(), bytes.data(), bytes.size(), static_cast<off_t>(position)) ==
-           static_cast<ssize_t>(bytes.size());
+    return SeekFile(position) && std::fread(bytes.data(), 1, bytes.size(), file_.get()) == bytes.size();
   }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;
@@ -91,8 +89,7 @@ bool DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes)
     for (std::uint64_t page = position / kPageBytes; page * kPageBytes < position + bytes.size(); ++page) {
       PageAt(page);  // as it was
     }
-    return ::pwrite(file_.Get(), bytes.data(), bytes.size(), static_cast<off_t>(position)) ==
-           static_cast<ssize_t>(bytes.size());
+    return SeekFile(position) && std::fwrite(bytes.data(), 1, bytes.size(), file_.get()) == bytes.size();
   }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;

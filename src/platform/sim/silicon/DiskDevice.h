@@ -2,13 +2,14 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdio>
 #include <map>
+#include <memory>
 #include <optional>
 #include <span>
 #include <string>
 #include <vector>
 
-#include "platform/posix/Descriptor.h"
 #include "platform/sim/silicon/Device.h"
 
 namespace panelglow::platform::sim {
@@ -65,6 +66,7 @@ class DiskDevice : public Device {
   using Page = std::vector<std::byte>;
 
   [[nodiscard]] Page OriginalPage(std::uint64_t number) const;
+  [[nodiscard]] bool SeekFile(std::uint64_t position) const;
   [[nodiscard]] Page PageInFile(std::uint64_t number) const;
   Page& PageAt(std::uint64_t number);
   [[nodiscard]] std::uint64_t ContentHash() const;
@@ -73,8 +75,11 @@ class DiskDevice : public Device {
   const Scheduler& time_;
   unsigned underWay_ = 0;
   Microseconds litUntil_ = 0;
-  posix::Descriptor file_;               // none: the content is in pages_
-  std::map<std::uint64_t, Page> pages_;  // by number, those that were touched; of a file as they were before
+  struct CloseFile {
+    void operator()(std::FILE* file) const { std::fclose(file); }
+  };
+  std::unique_ptr<std::FILE, CloseFile> file_;  // without a buffer; none: the content is in pages_
+  std::map<std::uint64_t, Page> pages_;         // by number, those that were touched; of a file as they were before
   std::size_t forbiddenWrites_ = 0;
   std::string firstForbidden_;
 };
