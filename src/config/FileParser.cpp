@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <limits>
+#include <map>
 
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -15,7 +16,8 @@ namespace {
 
 constexpr std::size_t kLineBuffer = 1024;
 constexpr std::size_t kBufferStep = 10240;
-constexpr std::size_t kMostSteps = 31;
+constexpr std::size_t kSteps[] = {1, 2, 4, 8, 16, 31};  // a list of n bytes is read with a total of about 4 n
+constexpr std::size_t kLargestNumbered = std::size_t{64} << 20U;
 constexpr std::size_t kConversionBuffer = 4096;
 
 platform::ProfileFiles& Profiles() { return platform::TheHost().profiles; }
@@ -53,7 +55,7 @@ std::string Stripped(std::string_view field) {
 FileParser::FileParser(const std::string& file) : path(file), lock(file) {}
 
 std::vector<std::string> FileParser::ReadList(const ListCall& call, bool mustHaveContent) {
-  for (std::size_t step = 1; step <= kMostSteps; ++step) {
+  for (const std::size_t step : kSteps) {
     std::string room(step * kBufferStep, '\xFF');
     const std::size_t length = call(std::span<char>(room.data(), room.size()));
     if (length == 0 && mustHaveContent) {
@@ -77,6 +79,37 @@ bool FileParser::ReadValue(const std::string& section, const std::string& key) {
   }
   SplitLine(std::string(line.data(), length));
   return true;
+}
+
+std::vector<std::string> FileParser::ReadNumberedValues(const std::string& section, const std::string& prefix) const {
+  std::string room(kBufferStep, '\0');
+  std::size_t length = 0;
+  while ((length = Profiles().GetSection(section, std::span<char>(room.data(), room.size()), path)) + 2 ==
+             room.size() &&
+         room.size() < kLargestNumbered) {
+    room.assign(room.size() * 2, '\0');
+  }
+  std::map<std::string, std::string> byKey;  // the first of a key counts
+  int keys = 0;
+  for (const std::string& line : TextsOf(std::string_view(room).substr(0, length))) {
+    const std::size_t equals = line.find('=');
+    if (equals != std::string::npos) {
+      byKey.emplace(CDMUtil::ToUpper(line.substr(0, equals)), line.substr(equals + 1));
+      ++keys;
+    }
+  }
+  std::vector<std::string> values;
+  for (int i = 0; i < keys; ++i) {
+    const auto found = byKey.find(CDMUtil::ToUpper(prefix + CDMUtil::ToString(i)));
+    values.push_back(found == byKey.end() ? std::string() : AsValue(found->second));
+  }
+  return values;
+}
+
+std::string FileParser::AsValue(std::string_view line) {
+  const bool isQuoted =
+      line.size() >= 2 && line.front() == line.back() && (line.front() == '"' || line.front() == '\'');
+  return std::string((isQuoted ? line.substr(1, line.size() - 2) : line).substr(0, kLineBuffer - 1));
 }
 
 void FileParser::SplitLine(const std::string& line) {

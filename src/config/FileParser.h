@@ -33,6 +33,17 @@ class FileParser {
   /// Reads one value and splits it into fields. False when there is none.
   bool ReadValue(const std::string& section, const std::string& key);
 
+  /// The values of the keys "<prefix>0", "<prefix>1" and so on, for as many numbers as the section has keys, as
+  /// ReadValue finds them: empty where there is none. One look at the file, however many they are.
+  [[nodiscard]] std::vector<std::string> ReadNumberedValues(const std::string& section,
+                                                            const std::string& prefix) const;
+
+  /// A line as it comes back when it has been written as a key's value.
+  [[nodiscard]] static std::string AsValue(std::string_view line);
+
+  /// Makes `line` the current one and splits it. Throws -1 for a quote that is not closed.
+  void SplitLine(const std::string& line);
+
   int CountSections();
 
   /// Without regard to ASCII case.
@@ -68,9 +79,6 @@ class FileParser {
   int ConvertToIni(const std::string& section, const std::string& prefix, bool clear, int firstNumber);
 
  protected:
-  /// Makes `line` the current one and splits it. Throws -1 for a quote that is not closed.
-  void SplitLine(const std::string& line);
-
   /// A profile call that fills a buffer with a list and returns its length.
   using ListCall = std::function<std::size_t(std::span<char>)>;
 

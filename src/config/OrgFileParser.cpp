@@ -23,12 +23,15 @@ bool OrgFileParser::NextLine() {
 }
 
 void OrgFileParser::AppendLines(const std::string& section) {
+  std::vector<platform::ProfileEntry> entries;
+  entries.reserve(lines.size());
   for (const std::string& line : lines) {
-    if (!platform::TheHost().profiles.SetValue(section, prefix + CDMUtil::ToString(nextEntry), line, targetPath)) {
-      throw kCannotRead;
-    }
-    ++nextEntry;
+    entries.emplace_back(prefix + CDMUtil::ToString(nextEntry + static_cast<int>(entries.size())), line);
   }
+  if (!platform::TheHost().profiles.SetValues(section, entries, targetPath)) {
+    throw kCannotRead;
+  }
+  nextEntry += static_cast<int>(entries.size());
 }
 
 void OrgFileParser::Reset() {

@@ -2,11 +2,15 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdio>
+#include <cstdlib>
 #include <memory>
 #include <mutex>
-#include <span>
+#include <optional>
 #include <string_view>
+#include <utility>
 
+#include "hw/CDevio.h"
 #include "hw/SetupDI.h"
 
 namespace panelglow {
@@ -14,70 +18,119 @@ namespace panelglow {
 namespace {
 
 constexpr std::size_t kPropertyBuffer = 1024;
+constexpr std::uint32_t kUnknownClass = 0xFFFFFF;  // all 24 bits
 
-std::string_view FirstText(std::string_view texts) { return texts.substr(0, texts.find('\0')); }
-
-// Up to `digits` hexadecimal digits at the beginning of a text.
-std::uint32_t HexAt(std::string_view text, std::size_t digits) {
-  std::uint32_t value = 0;
-  for (std::size_t i = 0; i < std::min(digits, text.size()); ++i) {
-    const char c = text[i];
-    const int digit = c >= '0' && c <= '9'   ? c - '0'
-                      : c >= 'A' && c <= 'F' ? c - 'A' + 10
-                      : c >= 'a' && c <= 'f' ? c - 'a' + 10
-                                             : -1;
-    if (digit < 0) {
-      break;
-    }
-    value = value << 4U | static_cast<std::uint32_t>(digit);
-  }
-  return value;
-}
-
-std::string_view From(std::string_view text, std::size_t position) {
-  return text.substr(std::min(position, text.size()));
-}
-
-// PCI\VEN_vvvv&DEV_dddd&SUBSYS_ssssuuuu&REV_rr: each number at its fixed place.
-void ParseHardwareIds(std::string_view texts, PciDevice& device) {
-  constexpr std::size_t kVendor = 8;
-  constexpr std::size_t kDevice = 17;
-  constexpr std::size_t kSubsystem = 29;
-  constexpr std::size_t kRevision = 42;
-  constexpr std::string_view kClassMark = "CC_";
-  const std::string_view id = FirstText(texts);
-  device.vendorId = static_cast<std::uint16_t>(HexAt(From(id, kVendor), 4));
-  device.deviceId = static_cast<std::uint16_t>(HexAt(From(id, kDevice), 4));
-  const std::uint32_t subsystem = HexAt(From(id, kSubsystem), 8);
+// PCI\VEN_vvvv&DEV_dddd&SUBSYS_ssssuuuu&REV_rr: texts of fixed length, and a number behind each. What stands behind a
+// number that is none is not read.
+void ParseHardwareIds(const std::string& texts, PciDevice& device) {
+  std::array<char, 9> between{};
+  unsigned vendor = 0;
+  unsigned id = 0;
+  unsigned subsystem = 0;
+  unsigned revision = 0;
+  // NOLINTNEXTLINE(cert-err34-c): the widths keep every number in range
+  std::sscanf(texts.c_str(), "%8s%4X%5s%4X%8s%8X%5s%2X", between.data(), &vendor, between.data(), &id, between.data(),
+              &subsystem, between.data(), &revision);
+  device.vendorId = static_cast<std::uint16_t>(vendor);
+  device.deviceId = static_cast<std::uint16_t>(id);
   device.subVendorId = static_cast<std::uint16_t>(subsystem & 0xFFFFU);
   device.subDeviceId = static_cast<std::uint16_t>(subsystem >> 16U);
-  device.revision = static_cast<std::uint8_t>(HexAt(From(id, kRevision), 2));
-  if (const std::size_t mark = texts.find(kClassMark); mark != std::string_view::npos) {
-    device.classCode = HexAt(texts.substr(mark + kClassMark.size()), 6);
+  device.revision = static_cast<std::uint8_t>(revision);
+  constexpr std::string_view kClassMark = "CC_";
+  if (const std::size_t mark = texts.find(kClassMark); mark != std::string::npos) {
+    // NOLINTNEXTLINE(cert-err34-c)
+    std::sscanf(texts.c_str() + mark + kClassMark.size(), "%6X", &device.classCode);
+    device.classCode &= kUnknownClass;  // a number may have a sign
   }
 }
 
-// A property's bytes as text; empty when the device has no such property.
-std::string ReadText(SetupDI& list, std::uint32_t property) {
+// A property of the list's present device; nothing when it has none.
+std::optional<std::string> ReadText(SetupDI& list, std::uint32_t property) {
   std::array<std::uint8_t, kPropertyBuffer> buffer{};
   std::uint32_t size = 0;
   std::uint32_t type = 0;
   if (!list.ReadDeviceProperty(property, buffer, size, type)) {
-    return {};
+    return std::nullopt;
   }
-  return {reinterpret_cast<const char*>(buffer.data()), size};
+  return std::string(reinterpret_cast<const char*>(buffer.data()), size);
+}
+
+std::string ReadFirstText(SetupDI& list, std::uint32_t property) {
+  const std::string texts = ReadText(list, property).value_or("");
+  return texts.substr(0, texts.find('\0'));
+}
+
+std::uint32_t ReadNumber(SetupDI& list, std::uint32_t property) {
+  std::array<std::uint8_t, 4> bytes{};
+  std::uint32_t size = 0;
+  std::uint32_t type = 0;
+  if (!list.ReadDeviceProperty(property, bytes, size, type) || size != bytes.size()) {
+    return 0;
+  }
+  return static_cast<std::uint32_t>(bytes[0] | bytes[1] << 8U | bytes[2] << 16U) |
+         static_cast<std::uint32_t>(bytes[3]) << 24U;
+}
+
+// The three numbers of "PCI bus 0, device 31, function 2", whose words are of the system's language; otherwise the
+// driver is asked where the device is.
+void ReadPlace(SetupDI& list, std::optional<CDevio>& driver, PciDevice& device) {
+  const std::string text = ReadFirstText(list, platform::kLocationProperty);
+  std::array<std::uint8_t, 3> place{};
+  std::size_t count = 0;
+  constexpr const char* kDigits = "0123456789";
+  for (std::size_t at = text.find_first_of(kDigits); at != std::string::npos && count < place.size();
+       at = text.find_first_of(kDigits, std::min(text.find_first_not_of(kDigits, at), text.size()))) {
+    place[count++] = static_cast<std::uint8_t>(std::strtoul(text.c_str() + at, nullptr, 10));
+  }
+  std::uint16_t location = 0;
+  if (count < place.size() && !driver) {
+    driver.emplace();
+  }
+  if (count < place.size() && driver->FindPciDevice(device.vendorId, device.deviceId,
+                                                    static_cast<std::uint16_t>(device.earlierEqual), location) == 0) {
+    place = {static_cast<std::uint8_t>(location >> 8U), static_cast<std::uint8_t>(location >> 3U & 31U),
+             static_cast<std::uint8_t>(location & 7U)};
+    count = place.size();
+  }
+  if (count == place.size()) {
+    device.bus = place[0];
+    device.device = place[1];
+    device.function = place[2];
+  }
+}
+
+struct Shared {
+  std::mutex guard;
+  std::unique_ptr<const PciDeviceList> list;  // by guard
+};
+
+Shared& TheShared() {
+  static Shared shared;
+  return shared;
 }
 
 }  // namespace
 
 const PciDeviceList& PciDeviceList::Instance() {
-  static std::mutex guard;
-  static std::unique_ptr<const PciDeviceList> list;
-  const std::lock_guard<std::mutex> lock(guard);
-  if (!list) {
-    list = std::make_unique<const PciDeviceList>();
+  Shared& shared = TheShared();
+  {
+    const std::lock_guard<std::mutex> lock(shared.guard);
+    if (shared.list) {
+      return *shared.list;
+    }
   }
-  return *list;
+  auto list = std::make_unique<const PciDeviceList>();  // not under the lock: others run meanwhile
+  const std::lock_guard<std::mutex> lock(shared.guard);
+  if (!shared.list) {
+    shared.list = std::move(list);
+  }
+  return *shared.list;
+}
+
+void PciDeviceList::Forget() {
+  Shared& shared = TheShared();
+  const std::lock_guard<std::mutex> lock(shared.guard);
+  shared.list.reset();
 }
 
 PciDeviceList::PciDeviceList() {
@@ -85,53 +138,46 @@ PciDeviceList::PciDeviceList() {
   if (!list.OpenDeviceList("PCI", platform::kPresentDevices | platform::kAllDeviceClasses, "")) {
     throw int{kNoInventory};
   }
+  std::optional<CDevio> driver;  // loaded when it is needed
   while (devices.size() < kMostDevices && list.NextDevice()) {
-    const std::string hardwareIds = ReadText(list, platform::kHardwareIdProperty);
-    if (hardwareIds.empty()) {
+    const std::optional<std::string> hardwareIds = ReadText(list, platform::kHardwareIdProperty);
+    if (!hardwareIds) {
       throw int{kNoInventory};
     }
     PciDevice device;
-    ParseHardwareIds(hardwareIds, device);
+    ParseHardwareIds(*hardwareIds, device);
     device.earlierEqual =
         static_cast<unsigned>(std::count_if(devices.begin(), devices.end(), [&](const PciDevice& other) {
           return other.vendorId == device.vendorId && other.deviceId == device.deviceId;
         }));
-    device.driverKey = FirstText(ReadText(list, platform::kDriverProperty));
-    device.description = FirstText(ReadText(list, platform::kDescriptionProperty));
-    device.location = FirstText(ReadText(list, platform::kLocationProperty));
+    device.driverKey = ReadFirstText(list, platform::kDriverProperty);
+    device.description = ReadFirstText(list, platform::kDescriptionProperty);
+    device.slot = ReadNumber(list, platform::kUiNumberProperty);
     device.instanceId = list.GetDeviceInstanceId();
-    std::array<std::uint8_t, 4> number{};
-    std::uint32_t size = 0;
-    std::uint32_t type = 0;
-    if (list.ReadDeviceProperty(platform::kUiNumberProperty, number, size, type) && size == number.size()) {
-      for (std::size_t i = number.size(); i-- > 0;) {
-        device.uiNumber = device.uiNumber << 8U | number[i];
-      }
-    }
-    devices.push_back(std::move(device));
+    ReadPlace(list, driver, device);
+    Add(std::move(device));
   }
+}
+
+void PciDeviceList::Add(PciDevice device) {
+  places[{device.vendorId, device.deviceId, device.subVendorId, device.subDeviceId}].push_back(devices.size());
+  devices.push_back(std::move(device));
 }
 
 int PciDeviceList::CountDevices(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subVendorId,
                                 std::uint32_t subDeviceId) const {
-  int count = 0;
-  PciDevice ignored;
-  while (FindDevice(vendorId, deviceId, subVendorId, subDeviceId, count + 1, ignored)) {
-    ++count;
-  }
-  return count;
+  const auto found = places.find({vendorId, deviceId, subVendorId, subDeviceId});
+  return found == places.end() ? 0 : static_cast<int>(found->second.size());
 }
 
 bool PciDeviceList::FindDevice(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subVendorId,
                                std::uint32_t subDeviceId, int n, PciDevice& out) const {
-  for (const PciDevice& device : devices) {
-    if (device.vendorId == vendorId && device.deviceId == deviceId && device.subVendorId == subVendorId &&
-        device.subDeviceId == subDeviceId && --n == 0) {
-      out = device;
-      return true;
-    }
+  const auto found = places.find({vendorId, deviceId, subVendorId, subDeviceId});
+  if (found == places.end() || n < 1 || static_cast<std::size_t>(n) > found->second.size()) {
+    return false;
   }
-  return false;
+  out = devices[found->second[static_cast<std::size_t>(n) - 1]];
+  return true;
 }
 
 }  // namespace panelglow

@@ -1,7 +1,9 @@
 #include "hw/WMIDiscovery.h"
 
+#include <mutex>
 #include <optional>
 #include <type_traits>
+#include <utility>
 
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -61,9 +63,40 @@ std::uint8_t ByteOf(const platform::ManagementScalar& scalar) {
 
 }  // namespace
 
-WMIDiscovery& WMIDiscovery::Instance() {
-  static WMIDiscovery shared("ROOT\\CIMV2");
+namespace {
+
+struct Shared {
+  std::mutex guard;
+  std::unique_ptr<WMIDiscovery> connection;  // by guard
+};
+
+Shared& TheShared() {
+  static Shared shared;
   return shared;
+}
+
+}  // namespace
+
+WMIDiscovery& WMIDiscovery::Instance() {
+  Shared& shared = TheShared();
+  {
+    const std::lock_guard<std::mutex> lock(shared.guard);
+    if (shared.connection) {
+      return *shared.connection;
+    }
+  }
+  auto connection = std::make_unique<WMIDiscovery>("ROOT\\CIMV2");  // not under the lock: others run meanwhile
+  const std::lock_guard<std::mutex> lock(shared.guard);
+  if (!shared.connection) {
+    shared.connection = std::move(connection);
+  }
+  return *shared.connection;
+}
+
+void WMIDiscovery::Forget() {
+  Shared& shared = TheShared();
+  const std::lock_guard<std::mutex> lock(shared.guard);
+  shared.connection.reset();
 }
 
 WMIDiscovery::WMIDiscovery(const std::string& nameSpace) {

@@ -19,6 +19,9 @@ class WMIDiscovery {
   /// call tries again.
   static WMIDiscovery& Instance();
 
+  /// Gives the shared connection and its tables up; for a process that runs one machine after the other, as tests do.
+  static void Forget();
+
   /// Connects to a namespace. Throws a std::string on failure.
   explicit WMIDiscovery(const std::string& nameSpace);
   virtual ~WMIDiscovery() = default;

@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 
 namespace panelglow {
 
@@ -50,6 +51,10 @@ bool CustomBlinkNotebookWirelessLed(FrontPanelTest& test, LEDStruct& entry);
 void CustomBlinkCtrlHDLED(FrontPanelTest& test, LEDStruct& entry);
 void CustomBlinkIdeHDLED(FrontPanelTest& test, LEDStruct& entry);
 void CustomBlinkScsiHDLED(FrontPanelTest& test, LEDStruct& entry);
+
+/// The activity thread of a drive LED: reads and writes back one block of the drive, over and over, until the test's
+/// thread state is no longer 1. Sets the state to 2 when the drive cannot be used.
+void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive);
 
 /// Runs a worker as a thread's body: what ends it by an exception is logged, since nobody waits for its result.
 void RunBlinkWorker(BlinkWorker worker, FrontPanelTest& test, LEDStruct& entry);

@@ -7,6 +7,7 @@
 #include "harness/base/CDMUtil.h"
 #include "harness/base/Notices.h"
 #include "hw/SetupDI.h"
+#include "storage/ControllerNames.h"
 #include "storage/MSUtils.h"
 
 namespace panelglow {
@@ -31,6 +32,7 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
                                             bool anyIsOne) {
   std::vector<std::string> wanted;
   CDMUtil::Split(selection.substr(0, kLongestName), wanted, ",");
+  ControllerNames names(massStorageIni);
   std::vector<std::string> ids;
   std::string named;  // the controllers with a disk, for people
   for (const HDD_CTRL_INFO& controller : FindControllers(massStorageIni)) {
@@ -45,9 +47,7 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
       ids.push_back(controller.pnpDeviceId);
       break;
     }
-    const std::string name = FindControllerDetails(controller.vendorId, controller.deviceId, controller.subDeviceId,
-                                                   controller.subVendorId, massStorageIni)
-                                 .substr(0, kLongestName);
+    const std::string name = names.Find(controller.Ids()).substr(0, kLongestName);
     ids.insert(ids.end(), static_cast<std::size_t>(std::count(wanted.begin(), wanted.end(), name)),
                controller.pnpDeviceId);
     named += (named.empty() ? "" : ", ") + (name.empty() ? "one without a name" : "\"" + name + "\"");
@@ -63,18 +63,7 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
 
 std::string FindControllerDetails(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subDeviceId,
                                   std::uint32_t subVendorId, const std::string& massStorageIni) {
-  if (massStorageIni.empty()) {
-    return {};
-  }
-  std::list<CTRL_INFO> records;
-  MSUtils::LoadInfoForControllersInSystem(records, massStorageIni, "SATA CONTROLLERS", true);
-  MSUtils::LoadInfoForControllersInSystem(records, massStorageIni, "SAS CONTROLLERS", false);
-  MSUtils::CopyControllerListInfo(records);
-  const auto found = std::find_if(records.begin(), records.end(), [&](const CTRL_INFO& record) {
-    return record.vendorId == vendorId && record.deviceId == deviceId && record.subDeviceId == subDeviceId &&
-           record.subVendorId == subVendorId;
-  });
-  return found == records.end() ? std::string() : found->name;
+  return ControllerNames(massStorageIni).Find({vendorId, deviceId, subVendorId, subDeviceId});
 }
 
 std::string FindDiskOf(const std::string& controllerId) {

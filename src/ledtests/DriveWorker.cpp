@@ -39,18 +39,6 @@ void KeepBusy(FrontPanelTest& test, platform::RawDisk& disk, std::span<std::byte
   }
 }
 
-// The activity thread; its result is the thread state.
-void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive) {
-  platform::RawDisks& disks = platform::TheHost().rawDisks;
-  const std::unique_ptr<platform::RawDisk> disk = disks.Open(drive);
-  const std::unique_ptr<platform::DiskBlock> block = disk ? disks.Allocate(kBlock_bytes) : nullptr;
-  if (!block) {
-    test.SetThreadState(kGaveUp);
-    return;
-  }
-  KeepBusy(test, *disk, block->Bytes());
-}
-
 // An activity thread that runs on its own; it ends by the thread state.
 class Activity {
  public:
@@ -101,6 +89,17 @@ void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::string&
 }
 
 }  // namespace
+
+void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive) {
+  platform::RawDisks& disks = platform::TheHost().rawDisks;
+  const std::unique_ptr<platform::RawDisk> disk = disks.Open(drive);
+  const std::unique_ptr<platform::DiskBlock> block = disk ? disks.Allocate(kBlock_bytes) : nullptr;
+  if (!block) {
+    test.SetThreadState(kGaveUp);
+    return;
+  }
+  KeepBusy(test, *disk, block->Bytes());
+}
 
 void CustomBlinkCtrlHDLED(FrontPanelTest& test, LEDStruct& entry) {
   const std::string disk = FindDiskOf(entry.controllerId);

@@ -9,9 +9,14 @@
 #include <cstddef>
 #include <optional>
 #include <span>
+#include <string>
 #include <string_view>
+#include <utility>
 
 namespace panelglow::platform {
+
+/// A key and its value.
+using ProfileEntry = std::pair<std::string, std::string>;
 
 /// Every read fills `buffer`, always ended by NUL, and returns the number of characters stored without the final
 /// NUL. A text that does not fit is cut: a single value returns size - 1; a list (names separated by one NUL, ended
@@ -38,6 +43,9 @@ class ProfileFiles {
                         std::optional<std::string_view> value, std::string_view path) = 0;
   virtual bool SetValue(std::u16string_view section, std::optional<std::u16string_view> key,
                         std::optional<std::u16string_view> value, std::u16string_view path) = 0;
+
+  /// Sets the values in turn, with the cost of one edit of the file. When it fails none is set.
+  virtual bool SetValues(std::string_view section, std::span<const ProfileEntry> entries, std::string_view path) = 0;
 };
 
 }  // namespace panelglow::platform

@@ -1,10 +1,14 @@
 // Storage controllers: as the mass-storage INI file knows them, and as they are found in the machine.
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <string>
 
 namespace panelglow {
+
+/// Vendor, device, subsystem vendor, subsystem device.
+using ControllerIds = std::array<std::uint32_t, 4>;
 
 struct CTRL_INFO {
   std::uint32_t vendorId = 0;  // PCI ids of 16 bits
@@ -15,6 +19,8 @@ struct CTRL_INFO {
   std::string name;
   bool sataFlag = true;     // as its section was loaded
   std::string productText;  // of a line of non-volatile storage
+
+  [[nodiscard]] ControllerIds Ids() const { return {vendorId, deviceId, subVendorId, subDeviceId}; }
 };
 
 struct HDD_CTRL_INFO : CTRL_INFO {

@@ -3,48 +3,41 @@
 #include <algorithm>
 #include <array>
 #include <cstdlib>
+#include <limits>
+#include <map>
 #include <memory>
+#include <string_view>
+#include <utility>
 
-#include "config/FileLock.h"
-#include "config/OrgFileParser.h"
-#include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
-#include "harness/base/CDMout.h"
 #include "hw/PciDeviceList.h"
 #include "hw/SetupDI.h"
 #include "platform/Host.h"
+#include "storage/ControllerSection.h"
 
 namespace panelglow {
 
 namespace {
 
-constexpr int kListUnusable = 990294;
-
-constexpr const char* kSataSection = "SATA CONTROLLERS";
-constexpr const char* kSasSection = "SAS CONTROLLERS";
-constexpr const char* kNvsSection = "NON VOLATILE STORAGE CONTROLLERS";
 constexpr const char* kDriveQueryLock = "_PanelglowDriveQuery";
-constexpr const char* kTemporaryFile = "\\tmpmsctrl.ini";
-constexpr const char* kKeyPrefix = "ENTRY";
-
-// Kinds that the code refers to.
-constexpr int kScsi = 2;
-constexpr int kStorageLibrary = 4;
-constexpr int kStorageLibraryIr = 5;
-constexpr int kManagement = 8;
-constexpr std::array<std::string_view, 8> kKindWords{"csmi", "scsi", "wind", "stor", "sto2", "cssc", "cswn", "wmi"};
-
-constexpr std::size_t kLongestWord = 512;  // with its NUL
-constexpr std::size_t kLongestName = 256;
-
 constexpr std::uint32_t kMassStorage = 1;  // base class of a PCI function
 
 // What the process knows. Records of the list are handed out by pointer and stay where they are.
 struct Knowledge {
   std::list<HDD_CTRL_INFO> controllers;
+  std::map<ControllerIds, HDD_CTRL_INFO*> byIds;  // the first of equal ones, as in the next
+  std::map<std::pair<std::uint32_t, std::uint32_t>, HDD_CTRL_INFO*> byVendorAndDevice;
   int nextControllerIndex = 0;
   MSUtils::UsedScsiPorts usedScsiPorts;
   bool firstLoad = true;
+
+  HDD_CTRL_INFO* Add(CTRL_INFO record) {
+    HDD_CTRL_INFO& added = controllers.emplace_back();
+    static_cast<CTRL_INFO&>(added) = std::move(record);
+    byIds.emplace(added.Ids(), &added);
+    byVendorAndDevice.emplace(std::pair(added.vendorId, added.deviceId), &added);
+    return &added;
+  }
 };
 
 Knowledge& Known() {
@@ -52,111 +45,18 @@ Knowledge& Known() {
   return knowledge;
 }
 
-[[noreturn]] void FailList(const std::string& file, const std::string& section) {
-  auto failure = std::make_unique<CDMException>(kListUnusable);
-  failure->addMessage(static_cast<LogOptions>(0), -1, file);
-  failure->addMessage(static_cast<LogOptions>(0), -1, section);
-  throw failure.release();  // owned by whoever catches it
-}
-
-// ---- the lines of a section
-
-// One line's fields are taken from the parser as they are needed; a number that a line lacks is that of the line
-// before.
-struct LineReader {
-  FileParser& parser;
-  bool isNvs;
-  bool sataFlag;
-  CTRL_INFO record = {};
-
-  void ReadIds() {
-    parser.NextFieldNumber(record.vendorId, 0);
-    parser.NextFieldNumber(record.deviceId, 0);
-    if (isNvs) {
-      parser.NextFieldString(record.productText);
-    } else {
-      parser.NextFieldNumber(record.subVendorId, 0);
-      parser.NextFieldNumber(record.subDeviceId, 0);
-    }
-  }
-  std::string ReadWord() {
-    std::array<char, kLongestWord> room{};
-    parser.NextFieldText(room);
-    return room.data();
-  }
-  std::string ReadName() {
-    std::array<char, kLongestName> room{' '};
-    parser.NextFieldText(room);
-    return room.data();
-  }
-};
-
-// Controllers of two libraries are reached through plain SCSI where the library is missing.
-int KindForThisMachine(int kind) {
-  if (kind != kStorageLibrary && kind != kStorageLibraryIr) {
-    return kind;
-  }
-  const std::string library = kind == kStorageLibrary ? "storelib.dll" : "storelibIR-2.dll";
-  if (platform::TheHost().modules.CanLoad(library)) {
-    return kind;
-  }
-  CDMout::LogMessage(LogOptions::Debug, kFreeText, "WARNING! Could not find " + library + ", switching to scsi!");
-  return kScsi;
-}
-
-void AddByInventory(LineReader& line, const std::string& word, std::list<CTRL_INFO>& out) {
-  CTRL_INFO& record = line.record;
-  if (PciDeviceList::Instance().CountDevices(record.vendorId, record.deviceId, record.subVendorId,
-                                             record.subDeviceId) == 0) {
-    return;
-  }
-  record.interfaceKind = KindForThisMachine(MSUtils::InterfaceKindOf(word));
-  record.sataFlag = line.sataFlag;
-  record.name = line.ReadName();
-  out.push_back(record);
-}
-
-// The name is taken by the first row that matches; a further one finds none left.
-void AddByManagement(LineReader& line, std::list<CTRL_INFO>& out) {
-  CTRL_INFO& record = line.record;
-  record.interfaceKind = kManagement;
-  WMIDiscovery& management = WMIDiscovery::Instance();
-  const int rows = management.RunQuery(u"SELECT * FROM Win32_SCSIController");
-  const std::string vendor = CDMUtil::ToHexString(static_cast<int>(record.vendorId));
-  const std::string device = CDMUtil::ToHexString(static_cast<int>(record.deviceId));
-  for (int row = 0; row < rows; ++row) {
-    std::string id;
-    management.GetCurrentValue(u"PNPDeviceID", id, row);
-    if (id.find(vendor) != std::string::npos && id.find(device) != std::string::npos &&
-        id.find(record.productText) != std::string::npos) {
-      record.sataFlag = line.sataFlag;
-      record.name = line.ReadName();
-      out.push_back(record);
-    }
-  }
-}
-
-// The section's lines under numbered keys in a file of their own, where they can be looked up by key.
-void WriteTemporaryFile(OrgFileParser& parser, const std::string& path, const std::string& iniPath,
-                        const std::string& section) {
-  platform::Files& files = platform::TheHost().files;
-  if (Known().firstLoad && files.CanRead(path)) {
-    Known().firstLoad = false;
-    files.Remove(path);
-  }
-  if (parser.ReadSection(section) == 0 || parser.ReadValue(section, std::string(kKeyPrefix) + "0")) {
-    FailList(iniPath, section);
-  }
-  parser.SetPrefix(kKeyPrefix);
-  parser.SetTargetPath(path);
-  parser.EraseSection(section);
-  parser.AppendLines(section);
+template <class Key>
+HDD_CTRL_INFO* Find(const std::map<Key, HDD_CTRL_INFO*>& records, const Key& key) {
+  const auto found = records.find(key);
+  return found == records.end() ? nullptr : found->second;
 }
 
 // ---- the rows of the management service
 
+// Larger ones are the largest, as in a system whose `long` has 32 bits.
 std::uint32_t NumberIn(const std::string& digits) {
-  return static_cast<std::uint32_t>(std::strtoul(digits.c_str(), nullptr, 0));
+  return static_cast<std::uint32_t>(
+      std::min<unsigned long>(std::strtoul(digits.c_str(), nullptr, 0), std::numeric_limits<std::uint32_t>::max()));
 }
 
 std::string Piece(const std::string& text, std::size_t position, std::size_t length) {
@@ -233,7 +133,7 @@ void DiscoverControllerRows(const wstring& tableName, int rows, const std::strin
     record->pnpDeviceId = id;
     record->uiNumber = UiNumberOf(id);
     record->controllerIndex = Known().nextControllerIndex++;
-    if (!isCard && record->interfaceKind != kManagement) {
+    if (!isCard && record->interfaceKind != kManagementKind) {
       if (isIde) {
         record->scsiPort = ScsiPortOfAssociated(id, wmi);
       } else {
@@ -257,43 +157,20 @@ void Discover(const wstring& tableName, const wstring& className, const std::str
 
 }  // namespace
 
-int MSUtils::InterfaceKindOf(const std::string& word) {
-  const auto found = std::find_if(kKindWords.begin(), kKindWords.end(),
-                                  [&](std::string_view kind) { return CDMUtil::EqualIgnoreCase(kind, word); });
-  return found == kKindWords.end() ? 1 : static_cast<int>(found - kKindWords.begin()) + 1;
-}
-
 void MSUtils::LoadInfoForControllersInSystem(std::list<CTRL_INFO>& out, const std::string& iniPath,
-                                             const std::string& section, bool sataFlag) {
-  OrgFileParser source(iniPath);  // its lock is held to the end
-  const std::string path = platform::TheHost().files.CurrentDirectory() + kTemporaryFile;
-  const FileLock turn(path);  // of another INI file's reader, too
-  WriteTemporaryFile(source, path, iniPath, section);
-  FileParser parser(path);
-  const int count = parser.CountKeys(section);
-  if (count == 0) {
-    FailList(path, section);
-  }
-  LineReader line{parser, section == kNvsSection, sataFlag};
-  for (int i = 0; i < count; ++i) {
-    if (!parser.ReadValue(section, kKeyPrefix + CDMUtil::ToString(i))) {
-      continue;
-    }
-    line.record.productText.clear();
-    line.ReadIds();
-    const std::string word = line.ReadWord();
-    if (line.isNvs && InterfaceKindOf(word) == kManagement) {
-      AddByManagement(line, out);
-    } else {
-      AddByInventory(line, word, out);
-    }
+                                             const std::string& section, bool sataFlag,
+                                             std::vector<std::string>* warnings) {
+  ControllerSection lines(iniPath, section, sataFlag);
+  lines.Load(out, Known().firstLoad);
+  if (warnings != nullptr) {
+    warnings->insert(warnings->end(), lines.Warnings().begin(), lines.Warnings().end());
   }
 }
 
 void MSUtils::CopyControllerListInfo(std::list<CTRL_INFO> records) {
   for (CTRL_INFO& record : records) {
     record.productText.clear();
-    static_cast<CTRL_INFO&>(Known().controllers.emplace_back()) = std::move(record);
+    Known().Add(std::move(record));
   }
 }
 
@@ -311,34 +188,33 @@ void MSUtils::DiscoverInfoListSCSIController(const std::string& iniPath, WMIDisc
 
 HDD_CTRL_INFO* MSUtils::LookupController(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subDeviceId,
                                          std::uint32_t subVendorId, const std::string& iniPath) {
-  std::list<HDD_CTRL_INFO>& known = Known().controllers;
-  if (!iniPath.empty() && known.empty()) {
-    std::list<CTRL_INFO> loaded;
-    LoadInfoForControllersInSystem(loaded, iniPath, kSataSection, true);
-    LoadInfoForControllersInSystem(loaded, iniPath, kSasSection, false);
-    CopyControllerListInfo(loaded);
+  if (!iniPath.empty()) {
+    if (Known().controllers.empty()) {
+      std::list<CTRL_INFO> loaded;
+      LoadInfoForControllersInSystem(loaded, iniPath, kSataSection, true);
+      LoadInfoForControllersInSystem(loaded, iniPath, kSasSection, false);
+      CopyControllerListInfo(loaded);
+    }
+    if (HDD_CTRL_INFO* known = Find(Known().byIds, ControllerIds{vendorId, deviceId, subVendorId, subDeviceId})) {
+      return known;
+    }
   }
-  const auto found =
-      iniPath.empty() ? known.end() : std::find_if(known.begin(), known.end(), [&](const auto& record) {
-        return record.vendorId == vendorId && record.deviceId == deviceId && record.subDeviceId == subDeviceId &&
-               record.subVendorId == subVendorId;
-      });
-  return found != known.end() ? &*found : AddUnlistedController(vendorId, deviceId, subDeviceId, subVendorId);
+  return AddUnlistedController(vendorId, deviceId, subDeviceId, subVendorId);
 }
 
 HDD_CTRL_INFO* MSUtils::LookupNvsController(std::uint32_t vendorId, std::uint32_t deviceId,
                                             const std::string& /*productText*/, const std::string& iniPath) {
-  std::list<HDD_CTRL_INFO>& known = Known().controllers;
-  if (!iniPath.empty() && known.empty()) {
-    std::list<CTRL_INFO> loaded;
-    LoadInfoForControllersInSystem(loaded, iniPath, kNvsSection, true);
-    CopyControllerListInfo(loaded);
+  if (!iniPath.empty()) {
+    if (Known().controllers.empty()) {
+      std::list<CTRL_INFO> loaded;
+      LoadInfoForControllersInSystem(loaded, iniPath, kNvsSection, true);
+      CopyControllerListInfo(loaded);
+    }
+    if (HDD_CTRL_INFO* known = Find(Known().byVendorAndDevice, std::pair(vendorId, deviceId))) {
+      return known;
+    }
   }
-  const auto found =
-      iniPath.empty() ? known.end() : std::find_if(known.begin(), known.end(), [&](const auto& record) {
-        return record.vendorId == vendorId && record.deviceId == deviceId;
-      });
-  return found != known.end() ? &*found : AddUnlistedController(vendorId, deviceId, 0, 0);
+  return AddUnlistedController(vendorId, deviceId, 0, 0);
 }
 
 HDD_CTRL_INFO* MSUtils::AddUnlistedController(std::uint32_t vendorId, std::uint32_t deviceId,
@@ -348,13 +224,13 @@ HDD_CTRL_INFO* MSUtils::AddUnlistedController(std::uint32_t vendorId, std::uint3
       (device.classCode >> 16U & 0xFFU) != kMassStorage) {
     return nullptr;
   }
-  HDD_CTRL_INFO& record = Known().controllers.emplace_back();
+  CTRL_INFO record;
   record.vendorId = vendorId;
   record.deviceId = deviceId;
   record.subVendorId = subVendorId;
   record.subDeviceId = subDeviceId;
-  record.interfaceKind = kScsi;
-  return &record;
+  record.interfaceKind = kScsiKind;
+  return Known().Add(std::move(record));
 }
 
 int MSUtils::FindScsiPort(const std::string& driverName, UsedScsiPorts& usedScsiPorts) {

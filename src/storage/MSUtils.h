@@ -19,9 +19,10 @@ class MSUtils {
 
   /// Appends the controllers of a section of the INI file that are in this machine, in file order. Throws a
   /// CDMException (990294) for a section that is missing, empty or holds the key "ENTRY0", and the integers and
-  /// strings of the parsers and the management service.
+  /// strings of the parsers and the management service. `warnings` takes the log lines that were written.
   static void LoadInfoForControllersInSystem(std::list<CTRL_INFO>& out, const std::string& iniPath,
-                                             const std::string& section, bool sataFlag);
+                                             const std::string& section, bool sataFlag,
+                                             std::vector<std::string>* warnings = nullptr);
 
   /// Appends the records to what the process knows.
   static void CopyControllerListInfo(std::list<CTRL_INFO> records);
@@ -35,9 +36,6 @@ class MSUtils {
 
   /// The path of the drive with this device instance id; empty when the management service knows none.
   static std::string GetDriveHandleStrUsingDevInstId(const std::string& devInstId);
-
-  /// "csmi" 1, "scsi" 2, "wind" 3, "stor" 4, "sto2" 5, "cssc" 6, "cswn" 7, "wmi" 8, in any case; any other word 1.
-  static int InterfaceKindOf(const std::string& word);
 
   // ---- look-ups; the record that they return is the process's own and stays. Null when there is none.
   static HDD_CTRL_INFO* LookupController(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subDeviceId,

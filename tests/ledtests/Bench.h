@@ -15,10 +15,13 @@
 #include "board/base/BoardDevio.h"
 #include "harness/CmdLineParser.h"
 #include "harness/DiagnosticManager.h"
+#include "hw/PciDeviceList.h"
+#include "hw/WMIDiscovery.h"
 #include "ledtests/BlinkWorkers.h"
 #include "ledtests/CustomLEDTest.h"
 #include "ledtests/LedKind.h"
 #include "platform/sim/Simulation.h"
+#include "storage/MSUtils.h"
 
 namespace panelglow::ledtest {
 
@@ -239,8 +242,11 @@ class Bench {
          << std::ifstream(fs::path(PANELGLOW_SOURCE_DIR) / "tests/ledtests/bench.toml").rdbuf();
     return text.str();
   }
-  // A new installation, which is the current folder.
+  // A new installation, which is the current folder; and nothing is known of the machine before.
   static sim::SimulationOptions EnterFolder(const std::string& person, std::uint64_t seed) {
+    MSUtils::Forget();
+    PciDeviceList::Forget();
+    WMIDiscovery::Forget();
     fs::current_path(fs::temp_directory_path());  // out of the folder of the bench before
     fs::remove_all(FolderPath());
     fs::copy(fs::path(PANELGLOW_SOURCE_DIR) / "installation", FolderPath(), fs::copy_options::recursive);

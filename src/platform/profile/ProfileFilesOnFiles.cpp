@@ -1,6 +1,7 @@
 #include "platform/profile/ProfileFilesOnFiles.h"
 
 #include <string>
+#include <vector>
 
 #include "platform/Text.h"
 #include "platform/profile/ProfileText.h"
@@ -112,6 +113,21 @@ bool ProfileFilesOnFiles::SetValue(std::u16string_view section, std::optional<st
                                    std::optional<std::u16string_view> value, std::u16string_view path) {
   return Edit(Utf8FromWide(path), [&](const std::string& bytes) {
     return WideEdit(bytes, WithValue<char16_t>(WideOf(bytes), section, key, value));
+  });
+}
+
+bool ProfileFilesOnFiles::SetValues(std::string_view section, std::span<const ProfileEntry> entries,
+                                    std::string_view path) {
+  return Edit(path, [&](const std::string& bytes) {
+    if (!IsWide(bytes)) {
+      return WithValues<char>(bytes, section, entries);
+    }
+    std::vector<std::pair<wstring, wstring>> wideEntries;
+    wideEntries.reserve(entries.size());
+    for (const auto& [key, value] : entries) {
+      wideEntries.emplace_back(WideFromCodePage(key), WideFromCodePage(value));
+    }
+    return WideEdit(bytes, WithValues<char16_t>(WideOf(bytes), WideFromCodePage(section), wideEntries));
   });
 }
 

@@ -22,6 +22,7 @@ class ProfileFilesOnFiles : public ProfileFiles {
                 std::string_view path) override;
   bool SetValue(std::u16string_view section, std::optional<std::u16string_view> key,
                 std::optional<std::u16string_view> value, std::u16string_view path) override;
+  bool SetValues(std::string_view section, std::span<const ProfileEntry> entries, std::string_view path) override;
 
  private:
   bool Edit(std::string_view path, const std::function<std::string(const std::string&)>& edit);

@@ -1,6 +1,7 @@
 #include "platform/profile/ProfileText.h"
 
 #include <algorithm>
+#include <set>
 
 namespace panelglow::platform::profile {
 
@@ -172,6 +173,43 @@ std::basic_string<Char> LineBreakOf(View<Char> text) {
   return {Char('\r'), Char('\n')};
 }
 
+template <class Char>
+using Entry = std::pair<std::basic_string<Char>, std::basic_string<Char>>;
+
+template <class Char>
+std::basic_string<Char> Lowered(View<Char> name) {
+  std::basic_string<Char> lowered(name);
+  std::transform(lowered.begin(), lowered.end(), lowered.begin(), Lower<Char>);
+  return lowered;
+}
+
+// Whether an entry is one line that is read back as this key with this value.
+template <class Char>
+bool IsOneLine(const Entry<Char>& entry) {
+  constexpr Char kEnds[] = {Char('\n'), Char('\r'), Char(0)};
+  const View<Char> ends(kEnds, std::size(kEnds));
+  const View<Char> key = TrimBlanks(View<Char>(entry.first));
+  return !key.empty() && key.front() != Char(';') && key.front() != Char('[') &&
+         key.find(Char('=')) == View<Char>::npos && key.find_first_of(ends) == View<Char>::npos &&
+         View<Char>(entry.second).find_first_of(ends) == View<Char>::npos;
+}
+
+// The text with `lines` behind the last line of the section, which is there.
+template <class Char>
+std::basic_string<Char> WithLines(View<Char> text, View<Char> section, View<Char> lines) {
+  const Section<Char> found = FindSection(text, section).value();
+  std::size_t behindLast = found.body;
+  EachLine(text, found.body, found.end, [&](const Line<Char>& line) {
+    behindLast = line.next;
+    return false;
+  });
+  std::basic_string<Char> result(text.substr(0, behindLast));
+  if (!result.empty() && !IsLineEnd(result.back())) {
+    result += LineBreakOf(text);
+  }
+  return result.append(lines).append(text.substr(behindLast));
+}
+
 }  // namespace
 
 template <class Char>
@@ -286,6 +324,52 @@ std::basic_string<Char> WithValue(View<Char> text, View<Char> section, std::opti
   return result;
 }
 
+// The keys that a section has.
+template <class Char>
+static std::set<std::basic_string<Char>> LoweredKeys(View<Char> text, View<Char> section) {
+  std::set<std::basic_string<Char>> keys;
+  const std::basic_string<Char> names = KeyNames(text, section);
+  for (std::size_t at = 0; at < names.size();) {
+    const View<Char> name = BeforeNul(View<Char>(names).substr(at));
+    keys.insert(Lowered(name));
+    at += name.size() + 1;
+  }
+  return keys;
+}
+
+// New keys are collected and go in together; whatever else there is, is set one by one.
+template <class Char>
+std::basic_string<Char> WithValues(View<Char> text, View<Char> section,
+                                   std::type_identity_t<std::span<const Entry<Char>>> entries) {
+  std::basic_string<Char> result(text);
+  std::basic_string<Char> fresh;
+  std::set<std::basic_string<Char>> keys = LoweredKeys(text, section);
+  bool exists = FindSection(text, section).has_value();
+  const auto flush = [&] {
+    if (!fresh.empty()) {
+      result = WithLines<Char>(result, section, fresh);
+      fresh.clear();
+    }
+  };
+  for (const Entry<Char>& entry : entries) {
+    const View<Char> key = TrimBlanks(View<Char>(entry.first));
+    const bool isNew = keys.insert(Lowered(key)).second;
+    if (exists && isNew && IsOneLine(entry)) {
+      fresh.append(key).push_back(Char('='));
+      fresh.append(entry.second).append(LineBreakOf<Char>(result));
+    } else {
+      flush();
+      result = WithValue<Char>(result, section, View<Char>(entry.first), View<Char>(entry.second));
+      exists = FindSection<Char>(result, section).has_value();
+      if (!IsOneLine(entry)) {
+        keys = LoweredKeys<Char>(result, section);  // it may be read back as any
+      }
+    }
+  }
+  flush();
+  return result;
+}
+
 template <class Char>
 std::size_t CopyText(View<Char> text, std::span<Char> buffer) {
   if (buffer.empty()) {
@@ -322,6 +406,8 @@ template std::u16string SectionLines(View<char16_t>, View<char16_t>);
 template std::string WithValue(View<char>, View<char>, std::optional<View<char>>, std::optional<View<char>>);
 template std::u16string WithValue(View<char16_t>, View<char16_t>, std::optional<View<char16_t>>,
                                   std::optional<View<char16_t>>);
+template std::string WithValues(View<char>, View<char>, std::span<const Entry<char>>);
+template std::u16string WithValues(View<char16_t>, View<char16_t>, std::span<const Entry<char16_t>>);
 template std::size_t CopyText(View<char>, std::span<char>);
 template std::size_t CopyText(View<char16_t>, std::span<char16_t>);
 template std::size_t CopyList(View<char>, std::span<char>);

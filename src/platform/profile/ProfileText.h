@@ -7,6 +7,8 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <type_traits>
+#include <utility>
 
 namespace panelglow::platform::profile {
 
@@ -35,6 +37,12 @@ template <class Char>
 std::basic_string<Char> WithValue(std::basic_string_view<Char> text, std::basic_string_view<Char> section,
                                   std::optional<std::basic_string_view<Char>> key,
                                   std::optional<std::basic_string_view<Char>> value);
+
+/// The text with the values of these keys set in turn, in one pass where the keys are new.
+template <class Char>
+std::basic_string<Char> WithValues(
+    std::basic_string_view<Char> text, std::basic_string_view<Char> section,
+    std::type_identity_t<std::span<const std::pair<std::basic_string<Char>, std::basic_string<Char>>>> entries);
 
 /// Copies a single text: cut to size - 1 characters, NUL behind it; returns the characters copied.
 template <class Char>

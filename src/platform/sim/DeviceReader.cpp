@@ -112,6 +112,7 @@ void ReadDisk(Section& section, MachineDescription& machine) {
   disk.path = section.Get<std::string>(
       "path", disk.interfacePath.empty() ? "" : "\\\\.\\PHYSICALDRIVE" + std::to_string(drives));
   disk.description = section.Get<std::string>("description", "Disk drive");
+  disk.file = section.Get<std::string>("file", "");
   disk.size_bytes = section.Get<std::uint64_t>("size", kDefaultDiskBytes);
   disk.latency_us = section.Get<std::uint32_t>("latency_us", kDefaultLatency_us);
   disk.glow_us = section.Get<std::uint32_t>("glow_us", kDefaultGlow_us);

@@ -110,6 +110,8 @@ void ReadEvent(Section& section, MachineDescription& machine) {
     }
   } else if (section.Get("fill_disk", false)) {
     event.kind = ScriptedEvent::Kind::kFillDisk;
+  } else if (section.Get("kill", false)) {
+    event.kind = ScriptedEvent::Kind::kKill;
   } else {
     event.console = section.Number<std::uint32_t>("console");  // an event that does nothing is a mistake
   }

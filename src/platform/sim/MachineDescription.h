@@ -79,7 +79,7 @@ struct FirmwareDescription {
 
 /// Something that happens at a moment of the run.
 struct ScriptedEvent {
-  enum class Kind { kWriteFile, kDeleteFile, kConsole, kFillDisk, kDevice };
+  enum class Kind { kWriteFile, kDeleteFile, kConsole, kFillDisk, kDevice, kKill };
   Microseconds at = 0;
   Kind kind = Kind::kConsole;
   std::string path;

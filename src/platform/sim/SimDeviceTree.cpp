@@ -157,13 +157,19 @@ std::unique_ptr<DeviceList> SimDeviceTree::Open(std::string_view enumerator, std
   const std::string prefix = enumerator.empty() ? std::string() : std::string(enumerator) + "\\";
   std::vector<DeviceNode> devices;
   const std::vector<InventoryEntry>& entries = inventory_.Entries();
-  for (std::size_t i = 0; i < entries.size(); ++i) {
-    const auto node = static_cast<DeviceNode>(i + 1);
-    const bool isNamed =
-        isInstance ? node == instance : EqualNames(entries[i].instanceId.substr(0, prefix.size()), prefix);
-    const bool hasInterface = !byInterface || (ofDisks && !entries[i].interfacePath.empty());
-    if (isNamed && hasInterface && ((flags & kPresentDevices) == 0 || inventory_.IsThere(node))) {
+  const auto add = [&](DeviceNode node) {
+    const bool hasInterface = !byInterface || (ofDisks && !entries[node - 1].interfacePath.empty());
+    if (hasInterface && ((flags & kPresentDevices) == 0 || inventory_.IsThere(node))) {
       devices.push_back(node);
+    }
+  };
+  if (isInstance) {
+    add(instance);  // there is none other to look at, however many devices there are
+  } else {
+    for (std::size_t i = 0; i < entries.size(); ++i) {
+      if (EqualNames(std::string_view(entries[i].instanceId).substr(0, prefix.size()), prefix)) {
+        add(static_cast<DeviceNode>(i + 1));
+      }
     }
   }
   return std::make_unique<List>(*this, std::move(devices), ofDisks);

@@ -72,7 +72,9 @@ class SimRawDisks::Handle : public RawDisk {
       return 0;
     }
     const std::span<std::byte> read = bytes.first(*size);
-    disk_.Load(position_, read);
+    if (!disk_.Load(position_, read)) {
+      return 0;
+    }
     lastRead_.assign(read.begin(), read.end());
     lastPosition_ = position_;
     position_ += *size;
@@ -88,10 +90,9 @@ class SimRawDisks::Handle : public RawDisk {
       disk_.NoteForbiddenWrite(position, bytes.size());
     }
     const std::optional<std::size_t> size = Request(bytes, DiskSetup::Fault::kWriteError);
-    if (!size) {
+    if (!size || !disk_.Store(position, bytes.first(*size))) {
       return 0;
     }
-    disk_.Store(position, bytes.first(*size));
     position_ += *size;
     return *size;
   }

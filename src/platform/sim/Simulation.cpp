@@ -252,6 +252,9 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
         case ScriptedEvent::Kind::kConsole:
           RaiseConsole(event.console);
           break;
+        case ScriptedEvent::Kind::kKill:
+          std::raise(SIGKILL);
+          break;
       }
     });
   }
@@ -375,6 +378,7 @@ Simulation& CurrentSimulation() {
 
 namespace panelglow::platform {
 
-Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
+// Weak, so that a program may link a host of its own: a test that stands in for a service of the machine.
+[[gnu::weak]] Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
 
 }  // namespace panelglow::platform

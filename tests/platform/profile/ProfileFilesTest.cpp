@@ -284,5 +284,40 @@ TEST_F(ProfileFilesTest, APathThatIsNoUtf8NamesTheSameFileForReadingAndWriting) 
   EXPECT_EQ(files.content.at(path), Utf16(u"[s]\r\nkey=1\r\n"));
 }
 
+// Whatever stands in the file and in the values, in either kind of file, with one edit.
+TEST_F(ProfileFilesTest, ValuesThatAreSetTogetherComeOutAsOneByOne) {
+  const std::string pieces[] = {"[s]", "[t]", "K0", "k1 ", "=", " = ", ";", "\r\n", "\n", "v", "\"", " ", "\0"s};
+  std::uint32_t random = 1;
+  const auto next = [&](std::size_t bound) {
+    random = random * 1664525U + 1013904223U;
+    return (random >> 16U) % bound;
+  };
+  const auto draw = [&](std::size_t most) {
+    std::string drawn;
+    for (std::size_t i = next(most + 1); i > 0; --i) {
+      drawn += pieces[next(std::size(pieces))];
+    }
+    return drawn;
+  };
+  for (int run = 0; run < 3000; ++run) {
+    const std::string content = draw(12);
+    std::vector<ProfileEntry> entries;
+    for (const char* key : {"K0", "k1", "K2", "k0 "}) {
+      entries.emplace_back(run % 3 == 0 ? key + draw(2) : key, draw(3));
+    }
+    const std::string start = run % 2 == 0 ? content : Utf16(WideFromCodePage(content));
+    files.content[kPath] = start;
+    for (const auto& [key, value] : entries) {
+      profiles.SetValue("s"sv, std::string_view(key), std::string_view(value), kPath);
+    }
+    const std::string expected = files.content[kPath];
+    files.content[kPath] = start;
+    files.writes = 0;
+    EXPECT_TRUE(profiles.SetValues("s", entries, kPath));
+    ASSERT_EQ(files.content[kPath], expected) << "run " << run << " of\n" << content;
+    EXPECT_LE(files.writes, 1);
+  }
+}
+
 }  // namespace
 }  // namespace panelglow::platform

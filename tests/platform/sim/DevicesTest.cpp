@@ -1,6 +1,9 @@
 // The devices of a simulated machine behind every service that tells of them, and their lamps.
 #include <gmock/gmock.h>
 
+#include <unistd.h>
+
+#include <cstdio>
 #include <functional>
 
 #include "platform/Text.h"
@@ -393,6 +396,29 @@ TEST(SimulatedDisk, TakesOnlyWholeSectorsAndEndsARequestWhoseThreadIsEnded) {
   threads.Terminate(reader);
   machine.Time().SleepFor(31'000);
   EXPECT_FALSE(machine.Panel().IsLit("first"));
+}
+
+TEST(SimulatedDisk, LivesInAFileOfItsSize) {
+  const std::string path = testing::TempDir() + "panelglow-disk-" + std::to_string(::getpid());
+  const std::string change = "file = '" + path + "'\nsize = 0x110000";
+  std::ofstream(path, std::ios::binary) << std::string(0x110000, 'x');
+  {
+    Simulation machine(DevicesText("first", change));
+    Disk disk(machine);
+    EXPECT_EQ(disk.Read(), 0x8000U);
+    EXPECT_EQ(disk.Write(), 0x8000U);
+    EXPECT_EQ(machine.HardwareState(), machine.InitialState());
+    disk.block->Bytes()[9] = std::byte{'y'};
+    EXPECT_EQ(disk.Write(), 0x8000U);
+    EXPECT_NE(machine.HardwareState(), machine.InitialState());
+  }
+  std::ostringstream content;
+  content << std::ifstream(path, std::ios::binary).rdbuf();
+  EXPECT_EQ(content.str().find('y'), 0x100009U);
+  std::ofstream(path, std::ios::binary) << "short";
+  EXPECT_THROW(Simulation(DevicesText("first", change)), MachineError);
+  std::remove(path.c_str());
+  EXPECT_THROW(Simulation(DevicesText("first", change)), MachineError);
 }
 
 TEST(SimulatedAdapter, FollowsTheOrdersOfTheConnectionManagerAlsoOfACallerThatIsEnded) {

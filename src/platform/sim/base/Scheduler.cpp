@@ -13,12 +13,15 @@ namespace panelglow::platform::sim {
 
 namespace {
 
-// The simulated thread that the current real thread runs, per scheduler.
+// The simulated thread that the current real thread runs.
 struct CurrentThread {
   const Scheduler* scheduler = nullptr;
   ThreadId id = 0;
 };
 thread_local CurrentThread t_current;
+
+// Those of the machines that exist around the present one; a machine made on a thread gives it back at its end.
+thread_local std::vector<CurrentThread> t_outer;
 
 }  // namespace
 
@@ -28,6 +31,7 @@ Scheduler::Scheduler(const Options& options)
   main->id = nextThread_++;
   main->name = "main";
   holder_ = main->id;
+  t_outer.push_back(t_current);
   t_current = {this, main->id};
   threads_.emplace(main->id, std::move(main));
 }
@@ -35,7 +39,8 @@ Scheduler::Scheduler(const Options& options)
 Scheduler::~Scheduler() {  // NOLINT(bugprone-exception-escape)
   EndThreads();
   ReapEnded();
-  t_current = {};
+  t_current = t_outer.back();
+  t_outer.pop_back();
 }
 
 void Scheduler::EndThreads() {

@@ -4,6 +4,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include "platform/sim/base/MachineError.h"
 #include "platform/sim/silicon/DoorContext.h"
 
 namespace panelglow::platform::sim {
@@ -23,6 +24,19 @@ std::uint64_t Hashed(std::uint64_t hash, std::span<const std::byte> bytes) {
 
 }  // namespace
 
+DiskDevice::DiskDevice(DiskSetup setup, const Scheduler& time) : setup_(std::move(setup)), time_(time) {
+  if (setup_.file.empty()) {
+    return;
+  }
+  file_.reset(std::fopen(setup_.file.c_str(), "r+b"));
+  if (!file_ || std::setvbuf(file_.get(), nullptr, _IONBF, 0) != 0 || std::fseek(file_.get(), 0, SEEK_END) != 0 ||
+      static_cast<std::uint64_t>(std::ftell(file_.get())) != setup_.size_bytes) {
+    throw MachineError("the disk \"" + setup_.name + "\" lives in the file " + setup_.file +
+                       ", which must be there and have the disk's size, " + std::to_string(setup_.size_bytes) +
+                       " bytes");
+  }
+}
+
 void DiskDevice::EndRequest() {
   --underWay_;
   litUntil_ = std::max(litUntil_, time_.Now() + setup_.glow_us);
@@ -38,12 +52,28 @@ DiskDevice::Page DiskDevice::OriginalPage(std::uint64_t number) const {
   return page;
 }
 
-DiskDevice::Page& DiskDevice::PageAt(std::uint64_t number) {
-  const auto found = pages_.find(number);
-  return found != pages_.end() ? found->second : pages_.emplace(number, OriginalPage(number)).first->second;
+bool DiskDevice::SeekFile(std::uint64_t position) const {
+  return std::fseek(file_.get(), static_cast<long>(position), SEEK_SET) == 0;
 }
 
-void DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
+// Shorter than a page at the end of the file.
+DiskDevice::Page DiskDevice::PageInFile(std::uint64_t number) const {
+  Page page(kPageBytes);
+  page.resize(SeekFile(number * kPageBytes) ? std::fread(page.data(), 1, page.size(), file_.get()) : 0);
+  return page;
+}
+
+DiskDevice::Page& DiskDevice::PageAt(std::uint64_t number) {
+  const auto found = pages_.find(number);
+  return found != pages_.end()
+             ? found->second
+             : pages_.emplace(number, file_ ? PageInFile(number) : OriginalPage(number)).first->second;
+}
+
+bool DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
+  if (file_) {
+    return SeekFile(position) && std::fread(bytes.data(), 1, bytes.size(), file_.get()) == bytes.size();
+  }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;
     const std::size_t part = std::min(bytes.size(), kPageBytes - offset);
@@ -51,9 +81,16 @@ void DiskDevice::Load(std::uint64_t position, std::span<std::byte> bytes) {
     bytes = bytes.subspan(part);
     position += part;
   }
+  return true;
 }
 
-void DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes) {
+bool DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes) {
+  if (file_) {
+    for (std::uint64_t page = position / kPageBytes; page * kPageBytes < position + bytes.size(); ++page) {
+      PageAt(page);  // as it was
+    }
+    return SeekFile(position) && std::fwrite(bytes.data(), 1, bytes.size(), file_.get()) == bytes.size();
+  }
   while (!bytes.empty()) {
     const std::size_t offset = position % kPageBytes;
     const std::size_t part = std::min(bytes.size(), kPageBytes - offset);
@@ -61,6 +98,7 @@ void DiskDevice::Store(std::uint64_t position, std::span<const std::byte> bytes)
     bytes = bytes.subspan(part);
     position += part;
   }
+  return true;
 }
 
 void DiskDevice::NoteForbiddenWrite(std::uint64_t position, std::size_t size_bytes) {
@@ -96,9 +134,10 @@ std::optional<std::uint64_t> DiskDevice::RegisterOf(std::string_view pin) const 
 std::uint64_t DiskDevice::ContentHash() const {
   std::uint64_t hash = kHashStart;
   for (const auto& [number, page] : pages_) {
-    if (page != OriginalPage(number)) {
+    const Page other = file_ ? PageInFile(number) : OriginalPage(number);
+    if (page != other) {
       hash = Hashed(hash, std::as_bytes(std::span(&number, 1)));
-      hash = Hashed(hash, page);
+      hash = Hashed(hash, file_ ? other : page);
     }
   }
   return hash;
