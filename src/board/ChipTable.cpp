@@ -25,6 +25,10 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/ite/Ite8721Chip.h"
+#include "board/chips/ite/Ite8758Chip.h"
+#include "board/chips/ite/Ite8772Chip.h"
+#include "board/chips/ite/IteChip.h"
 
 namespace panelglow {
 
@@ -57,10 +61,10 @@ constexpr ChipRow kRows[] = {
     {17, "hudson", nullptr},
     {19, "intelc200", nullptr},
     {18, "ich", nullptr},
-    {20, "ite", nullptr},
-    {21, "ite_8758", nullptr},
-    {22, "ite_8721", nullptr},
-    {23, "ite_8772", nullptr},
+    {20, "ite", Make<IteChip>},
+    {21, "ite_8758", Make<Ite8758Chip>},
+    {22, "ite_8721", Make<Ite8721Chip>},
+    {23, "ite_8772", Make<Ite8772Chip>},
     {24, "mcp", nullptr},
     {25, "nuv_w83667", nullptr},
     {26, "nuv_nct5571", nullptr},
