@@ -38,8 +38,8 @@ void FinCurveChip::Flatten(RegisterId curve, std::uint8_t duty) {
 
 bool FinCurveChip::WriteDuty(int fan, int value) {
   if (fan <= 0 && takesAllFans) {
-    for (auto curve = fans.duties.rbegin(); curve != fans.duties.rend(); ++curve) {
-      Flatten(*curve, DutyOf(value));
+    for (std::size_t last = fans.duties.size(); last > 0; --last) {
+      Flatten(fans.duties[last - 1], DutyOf(value));
     }
     return true;
   }
