@@ -10,6 +10,11 @@
 #include "board/chips/ec/SmscMec1322Chip.h"
 #include "board/chips/fin/FinChip.h"
 #include "board/chips/fin/FinF71808aChip.h"
+#include "board/chips/fin/FinF71808eChip.h"
+#include "board/chips/fin/FinF71855Chip.h"
+#include "board/chips/fin/FinF71858Chip.h"
+#include "board/chips/fin/FinF71863Chip.h"
+#include "board/chips/fin/FinF8000Chip.h"
 #include "board/chips/firmware/CaslChip.h"
 #include "board/chips/generic/GCodecChip.h"
 #include "board/chips/generic/GEcChip.h"
@@ -20,6 +25,10 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/ite/Ite8721Chip.h"
+#include "board/chips/ite/Ite8758Chip.h"
+#include "board/chips/ite/Ite8772Chip.h"
+#include "board/chips/ite/IteChip.h"
 
 namespace panelglow {
 
@@ -43,19 +52,19 @@ constexpr ChipRow kRows[] = {
     {8, "ec_it8512", Make<EcIt8512Chip>},
     {9, "ec_it8518", Make<EcIt8518Chip>},
     {10, "fin", Make<FinChip>},
-    {11, "fin_f8000", nullptr},
-    {12, "fin_f71858", nullptr},
-    {13, "fin_f71855", nullptr},
-    {14, "fin_f71863", nullptr},
+    {11, "fin_f8000", Make<FinF8000Chip>},
+    {12, "fin_f71858", Make<FinF71858Chip>},
+    {13, "fin_f71855", Make<FinF71855Chip>},
+    {14, "fin_f71863", Make<FinF71863Chip>},
     {15, "fin_f71808a", Make<FinF71808aChip>},
-    {16, "fin_f71808e", nullptr},
+    {16, "fin_f71808e", Make<FinF71808eChip>},
     {17, "hudson", nullptr},
     {19, "intelc200", nullptr},
     {18, "ich", nullptr},
-    {20, "ite", nullptr},
-    {21, "ite_8758", nullptr},
-    {22, "ite_8721", nullptr},
-    {23, "ite_8772", nullptr},
+    {20, "ite", Make<IteChip>},
+    {21, "ite_8758", Make<Ite8758Chip>},
+    {22, "ite_8721", Make<Ite8721Chip>},
+    {23, "ite_8772", Make<Ite8772Chip>},
     {24, "mcp", nullptr},
     {25, "nuv_w83667", nullptr},
     {26, "nuv_nct5571", nullptr},

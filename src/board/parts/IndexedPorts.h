@@ -28,6 +28,9 @@ class IndexedPorts {
     devio->OutportByte(data, value);
   }
 
+  /// The index stands still between the read and the write.
+  void SetBits(std::uint8_t reg, std::uint8_t bits) const { devio->OutportByte(data, Read(reg) | bits); }
+
   /// Bytes for the index port alone, as the keys of a configuration mode.
   void Send(std::span<const std::uint8_t> keys) const {
     for (const std::uint8_t key : keys) {

@@ -113,7 +113,7 @@ int FinChip::MapTemperature(int raw) { return raw == kNoSensor ? kNoTemperature 
 // ---- lines
 
 bool FinChip::ReadIntrusionLatch(int line, bool /*clearFirst*/, bool& value) {
-  value = (devio.InportWord(static_cast<std::uint16_t>(pmbar + line)) & 1U) != 0;
+  value = (devio.InportWord(static_cast<std::uint16_t>(pmbar + static_cast<unsigned>(line))) & 1U) != 0;
   return true;
 }
 

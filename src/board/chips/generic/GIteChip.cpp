@@ -4,6 +4,7 @@
 #include "board/base/mblib_exception.h"
 #include "board/parts/Bits.h"
 #include "board/parts/ConfigMode.h"
+#include "board/parts/LedLineMap.h"
 #include "board/parts/Step.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -33,8 +34,6 @@ constexpr int kIntrusionLine = 237;
 constexpr std::uint32_t kClearSettle_ms = 10;
 constexpr std::uint32_t kStatusSettle_ms = 100;
 
-constexpr std::uint8_t kNoMap = 255;
-
 [[noreturn]] void Refuse(const std::string& failure, const Setting& setting) {
   TellOf(setting, failure);
   throw mblib_exception(failure);
@@ -51,11 +50,7 @@ void GIteChip::Initialize() {
   LoadBlinkLists();
 }
 
-void GIteChip::ExitConfigMode() {
-  // The index stands still between the read and the write.
-  devio.OutportByte(indexPort, kConfigureControl);
-  devio.OutportByte(dataPort, devio.InportByte(dataPort) | kReturnToWaitForKey);
-}
+void GIteChip::ExitConfigMode() { ConfigPorts().SetBits(kConfigureControl, kReturnToWaitForKey); }
 
 std::uint32_t GIteChip::ReadChipId() {
   const ConfigMode mode(*this);
@@ -116,7 +111,7 @@ std::uint8_t GIteChip::BlinkValue(const std::string& token, const std::string& k
   for (const auto& [color, line] : {std::pair{"primary", primaryLine}, std::pair{"secondary", secondaryLine}}) {
     if (token == std::string(color) + "_led") {
       const std::uint8_t map = MapGpioLine(line);
-      if (map == kNoMap) {
+      if (map == kNoLedLineMap) {
         Refuse(std::string("invalid ") + color + " led map. Check powerled.color." + color + ".gpio entry.", setting);
       }
       return map;
@@ -128,12 +123,6 @@ std::uint8_t GIteChip::BlinkValue(const std::string& token, const std::string& k
   return LowByte(NumberIn(token, 8, setting));
 }
 
-// Eight lines in each group of ten, five groups; the map leaves no gaps.
-std::uint8_t GIteChip::MapGpioLine(int line) {
-  if (line < 10 || line > 57 || line % 10 > 7) {
-    return kNoMap;
-  }
-  return static_cast<std::uint8_t>(line - 2 * (line / 10));
-}
+std::uint8_t GIteChip::MapGpioLine(int line) { return LedLineMap(line); }
 
 }  // namespace panelglow

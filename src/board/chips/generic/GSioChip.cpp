@@ -6,6 +6,7 @@
 #include "board/base/IniReader.h"
 #include "board/parts/Bits.h"
 #include "board/parts/ConfigMode.h"
+#include "board/parts/LevelPorts.h"
 #include "board/parts/NumberedLists.h"
 #include "board/parts/RpmOf.h"
 #include "board/parts/Sequence.h"
@@ -170,11 +171,7 @@ bool GSioChip::ReadLowLimitTemperature(int zone, int& value) {
 
 int GSioChip::MapTemperature(int raw) { return raw < kHottest ? raw : kNoTemperature; }
 
-// Line 23 is bit 3 of the second GPIO port.
-int GSioChip::ReadLine(int line) {
-  const std::uint8_t levels = devio.InportByte(static_cast<std::uint16_t>(gpioBar + line / 10 - 1));
-  return LineState((levels & MaskOfBit(line % 10, 8)) != 0);
-}
+int GSioChip::ReadLine(int line) { return ReadLevelLine(devio, gpioBar, line); }
 
 // ---- power LED
 
