@@ -20,6 +20,7 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/win/WinChip.h"
 
 namespace panelglow {
 
@@ -65,7 +66,7 @@ constexpr ChipRow kRows[] = {
     {30, "sio", nullptr},
     {31, "smbus_device", nullptr},
     {32, "smsc5407", nullptr},
-    {33, "win", nullptr},
+    {33, "win", Make<WinChip>},
     {34, "win_w83202g", nullptr},
     {35, "win_wpcd376", nullptr},
     {36, "vt1211", nullptr},
