@@ -20,6 +20,7 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvW83667Chip.h"
 #include "board/chips/win/WinChip.h"
 
@@ -60,7 +61,7 @@ constexpr ChipRow kRows[] = {
     {23, "ite_8772", nullptr},
     {24, "mcp", nullptr},
     {25, "nuv_w83667", Make<NuvW83667Chip>},
-    {26, "nuv_nct5571", nullptr},
+    {26, "nuv_nct5571", Make<NuvNct5571Chip>},
     {27, "nuv_nct5572", nullptr},
     {28, "sbx", nullptr},
     {29, "sb710", nullptr},
