@@ -21,6 +21,7 @@
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
+#include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvW83667Chip.h"
 #include "board/chips/win/WinChip.h"
 
@@ -62,7 +63,7 @@ constexpr ChipRow kRows[] = {
     {24, "mcp", nullptr},
     {25, "nuv_w83667", Make<NuvW83667Chip>},
     {26, "nuv_nct5571", Make<NuvNct5571Chip>},
-    {27, "nuv_nct5572", nullptr},
+    {27, "nuv_nct5572", Make<NuvNct5572Chip>},
     {28, "sbx", nullptr},
     {29, "sb710", nullptr},
     {30, "sio", nullptr},
