@@ -24,6 +24,7 @@
 #include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvW83667Chip.h"
 #include "board/chips/win/WinChip.h"
+#include "board/chips/win/WinW83202gChip.h"
 
 namespace panelglow {
 
@@ -70,7 +71,7 @@ constexpr ChipRow kRows[] = {
     {31, "smbus_device", nullptr},
     {32, "smsc5407", nullptr},
     {33, "win", Make<WinChip>},
-    {34, "win_w83202g", nullptr},
+    {34, "win_w83202g", Make<WinW83202gChip>},
     {35, "win_wpcd376", nullptr},
     {36, "vt1211", nullptr},
     {37, "nuv_npcd378h", nullptr},
