@@ -25,6 +25,7 @@
 #include "board/chips/win/NuvW83667Chip.h"
 #include "board/chips/win/WinChip.h"
 #include "board/chips/win/WinW83202gChip.h"
+#include "board/chips/win/WinWpcd376Chip.h"
 
 namespace panelglow {
 
@@ -72,7 +73,7 @@ constexpr ChipRow kRows[] = {
     {32, "smsc5407", nullptr},
     {33, "win", Make<WinChip>},
     {34, "win_w83202g", Make<WinW83202gChip>},
-    {35, "win_wpcd376", nullptr},
+    {35, "win_wpcd376", Make<WinWpcd376Chip>},
     {36, "vt1211", nullptr},
     {37, "nuv_npcd378h", nullptr},
     {38, "smsc_sch5327b", nullptr},
