@@ -22,6 +22,7 @@
 #include "board/chips/generic/GSioChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
+#include "board/chips/win/NuvNpcd378hChip.h"
 #include "board/chips/win/NuvW83667Chip.h"
 #include "board/chips/win/WinChip.h"
 #include "board/chips/win/WinW83202gChip.h"
@@ -75,7 +76,7 @@ constexpr ChipRow kRows[] = {
     {34, "win_w83202g", Make<WinW83202gChip>},
     {35, "win_wpcd376", Make<WinWpcd376Chip>},
     {36, "vt1211", nullptr},
-    {37, "nuv_npcd378h", nullptr},
+    {37, "nuv_npcd378h", Make<NuvNpcd378hChip>},
     {38, "smsc_sch5327b", nullptr},
     {39, "g_fintek", Make<GFintekChip>},
     {39, "g_it8702", Make<GIt8702Chip>},
