@@ -20,6 +20,7 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/sio/SioChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvNpcd378hChip.h"
@@ -69,7 +70,7 @@ constexpr ChipRow kRows[] = {
     {27, "nuv_nct5572", Make<NuvNct5572Chip>},
     {28, "sbx", nullptr},
     {29, "sb710", nullptr},
-    {30, "sio", nullptr},
+    {30, "sio", Make<SioChip>},
     {31, "smbus_device", nullptr},
     {32, "smsc5407", nullptr},
     {33, "win", Make<WinChip>},
