@@ -21,6 +21,7 @@
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
 #include "board/chips/sio/SioChip.h"
+#include "board/chips/sio/SmscSch5327bChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvNpcd378hChip.h"
@@ -78,7 +79,7 @@ constexpr ChipRow kRows[] = {
     {35, "win_wpcd376", Make<WinWpcd376Chip>},
     {36, "vt1211", nullptr},
     {37, "nuv_npcd378h", Make<NuvNpcd378hChip>},
-    {38, "smsc_sch5327b", nullptr},
+    {38, "smsc_sch5327b", Make<SmscSch5327bChip>},
     {39, "g_fintek", Make<GFintekChip>},
     {39, "g_it8702", Make<GIt8702Chip>},
     {39, "g_ite", Make<GIteChip>},
