@@ -21,6 +21,7 @@
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
 #include "board/chips/sio/SioChip.h"
+#include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
@@ -73,7 +74,7 @@ constexpr ChipRow kRows[] = {
     {29, "sb710", nullptr},
     {30, "sio", Make<SioChip>},
     {31, "smbus_device", nullptr},
-    {32, "smsc5407", nullptr},
+    {32, "smsc5407", Make<Smsc5407Chip>},
     {33, "win", Make<WinChip>},
     {34, "win_w83202g", Make<WinW83202gChip>},
     {35, "win_wpcd376", Make<WinWpcd376Chip>},
