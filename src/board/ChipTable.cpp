@@ -23,6 +23,7 @@
 #include "board/chips/sio/SioChip.h"
 #include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
+#include "board/chips/sio/Vt1211Chip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvNpcd378hChip.h"
@@ -78,7 +79,7 @@ constexpr ChipRow kRows[] = {
     {33, "win", Make<WinChip>},
     {34, "win_w83202g", Make<WinW83202gChip>},
     {35, "win_wpcd376", Make<WinWpcd376Chip>},
-    {36, "vt1211", nullptr},
+    {36, "vt1211", Make<Vt1211Chip>},
     {37, "nuv_npcd378h", Make<NuvNpcd378hChip>},
     {38, "smsc_sch5327b", Make<SmscSch5327bChip>},
     {39, "g_fintek", Make<GFintekChip>},
