@@ -20,6 +20,7 @@
 #include "board/chips/generic/GIteChip.h"
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
+#include "board/chips/sensor/AdtChip.h"
 #include "board/chips/sio/SioChip.h"
 #include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
@@ -45,7 +46,7 @@ std::unique_ptr<Chip> Make() {
 // gets its factory here.
 constexpr ChipRow kRows[] = {
     {1, "chip", Make<Chip>},
-    {2, "adt", nullptr},
+    {2, "adt", Make<AdtChip>},
     {3, "adt_sio11", nullptr},
     {4, "acpi", nullptr},
     {5, "casl", Make<CaslChip>},
