@@ -21,6 +21,7 @@
 #include "board/chips/generic/GMemorySpaceChip.h"
 #include "board/chips/generic/GSioChip.h"
 #include "board/chips/sensor/AdtChip.h"
+#include "board/chips/sensor/AdtSio11Chip.h"
 #include "board/chips/sio/SioChip.h"
 #include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
@@ -47,7 +48,7 @@ std::unique_ptr<Chip> Make() {
 constexpr ChipRow kRows[] = {
     {1, "chip", Make<Chip>},
     {2, "adt", Make<AdtChip>},
-    {3, "adt_sio11", nullptr},
+    {3, "adt_sio11", Make<AdtSio11Chip>},
     {4, "acpi", nullptr},
     {5, "casl", Make<CaslChip>},
     {6, "ec", Make<EcChip>},
