@@ -29,6 +29,19 @@
 #include "board/chips/ite/Ite8758Chip.h"
 #include "board/chips/ite/Ite8772Chip.h"
 #include "board/chips/ite/IteChip.h"
+#include "board/chips/sensor/AdtChip.h"
+#include "board/chips/sensor/AdtSio11Chip.h"
+#include "board/chips/sio/SioChip.h"
+#include "board/chips/sio/Smsc5407Chip.h"
+#include "board/chips/sio/SmscSch5327bChip.h"
+#include "board/chips/sio/Vt1211Chip.h"
+#include "board/chips/win/NuvNct5571Chip.h"
+#include "board/chips/win/NuvNct5572Chip.h"
+#include "board/chips/win/NuvNpcd378hChip.h"
+#include "board/chips/win/NuvW83667Chip.h"
+#include "board/chips/win/WinChip.h"
+#include "board/chips/win/WinW83202gChip.h"
+#include "board/chips/win/WinWpcd376Chip.h"
 
 namespace panelglow {
 
@@ -43,8 +56,8 @@ std::unique_ptr<Chip> Make() {
 // gets its factory here.
 constexpr ChipRow kRows[] = {
     {1, "chip", Make<Chip>},
-    {2, "adt", nullptr},
-    {3, "adt_sio11", nullptr},
+    {2, "adt", Make<AdtChip>},
+    {3, "adt_sio11", Make<AdtSio11Chip>},
     {4, "acpi", nullptr},
     {5, "casl", Make<CaslChip>},
     {6, "ec", Make<EcChip>},
@@ -66,20 +79,20 @@ constexpr ChipRow kRows[] = {
     {22, "ite_8721", Make<Ite8721Chip>},
     {23, "ite_8772", Make<Ite8772Chip>},
     {24, "mcp", nullptr},
-    {25, "nuv_w83667", nullptr},
-    {26, "nuv_nct5571", nullptr},
-    {27, "nuv_nct5572", nullptr},
+    {25, "nuv_w83667", Make<NuvW83667Chip>},
+    {26, "nuv_nct5571", Make<NuvNct5571Chip>},
+    {27, "nuv_nct5572", Make<NuvNct5572Chip>},
     {28, "sbx", nullptr},
     {29, "sb710", nullptr},
-    {30, "sio", nullptr},
+    {30, "sio", Make<SioChip>},
     {31, "smbus_device", nullptr},
-    {32, "smsc5407", nullptr},
-    {33, "win", nullptr},
-    {34, "win_w83202g", nullptr},
-    {35, "win_wpcd376", nullptr},
-    {36, "vt1211", nullptr},
-    {37, "nuv_npcd378h", nullptr},
-    {38, "smsc_sch5327b", nullptr},
+    {32, "smsc5407", Make<Smsc5407Chip>},
+    {33, "win", Make<WinChip>},
+    {34, "win_w83202g", Make<WinW83202gChip>},
+    {35, "win_wpcd376", Make<WinWpcd376Chip>},
+    {36, "vt1211", Make<Vt1211Chip>},
+    {37, "nuv_npcd378h", Make<NuvNpcd378hChip>},
+    {38, "smsc_sch5327b", Make<SmscSch5327bChip>},
     {39, "g_fintek", Make<GFintekChip>},
     {39, "g_it8702", Make<GIt8702Chip>},
     {39, "g_ite", Make<GIteChip>},

@@ -1,6 +1,7 @@
 // What a chip's fans are, as registers of its hardware monitor. Fans count from `firstFan`.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -15,6 +16,16 @@ struct RegisterPair {
   RegisterId first;
   RegisterId second;
 };
+
+/// `count` pairs of neighbours, from the register `first` on.
+inline std::vector<RegisterPair> RegisterPairs(std::uint8_t place, std::uint8_t first, std::size_t count) {
+  std::vector<RegisterPair> pairs;
+  for (std::size_t i = 0; i < count; ++i) {
+    const auto reg = static_cast<std::uint8_t>(first + 2 * i);
+    pairs.push_back({{place, reg}, {place, static_cast<std::uint8_t>(reg + 1)}});
+  }
+  return pairs;
+}
 
 /// Which of a pair's registers comes first.
 enum class PairOrder : std::uint8_t { kLowFirst, kHighFirst };
