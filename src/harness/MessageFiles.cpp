@@ -33,8 +33,10 @@ std::string MessageFilePath(const std::string& prefix, const std::string& progra
 // A number stands where the text should be.
 void TellIfMissing(bool exists, const std::string& path) {
   if (!exists) {
-    std::string shown = path;  // in this system's spelling
-    std::replace(shown.begin(), shown.end(), '\\', '/');
+    std::string shown = path;
+    if (shown.find('/') != std::string::npos) {
+      std::replace(shown.begin(), shown.end(), '\\', '/');  // our last separator in a folder of another spelling
+    }
     Notices::Tell(
         "The message file " + shown +
         " is missing, so that numbers stand for texts: start the program in the folder of the installation.");

@@ -43,7 +43,7 @@ TEST(SystemSilicon, AStuckPartEndsTheRunWithItsLampsVerdict) {
        "stuck-busy",
        {"770133", "770148", "770149"}},
       {"codec-notebook.toml", "CodecNotebook", "kind = \"hda-codec\"", "stuck-busy", {"770146"}},
-      {"casl-notebook.toml", "FirmwareNotebook", "[firmware_call]", "wrong-signature", {}},
+      {"casl-notebook.toml", "FirmwareNotebook", "[firmware_call]", "wrong-signature", {"770146"}},
   };
   constexpr std::uint64_t kLongest_us = 60'000'000;
   for (const Case& c : kCases) {
