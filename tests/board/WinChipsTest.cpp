@@ -1,0 +1,639 @@
+// What the Winbond, SMSC and VIA classes with registers in code, and the monitors behind an SMBus, do on the ports,
+// request by request.
+#include <gmock/gmock.h>
+
+#include <algorithm>
+#include <climits>
+#include <cstdio>
+#include <memory>
+
+#include "board/ChipCases.h"
+#include "board/ChipTable.h"
+#include "platform/Host.h"
+
+namespace panelglow {
+namespace {
+
+// ---- requests
+
+std::string Hex(unsigned port) {
+  char text[8];
+  std::snprintf(text, sizeof text, "%04X", port);
+  return text;
+}
+
+// "F3->21 30<-01": registers behind an index port and the data port above it.
+std::string At(unsigned index, const std::string& requests) {
+  std::vector<std::string> words;
+  CDMUtil::Split(requests, words, " ");
+  std::string text;
+  for (const std::string& word : words) {
+    text += Hex(index) + "<-" + word.substr(0, 2) + " " + Hex(index + 1) + word.substr(2) + " ";
+  }
+  return text;
+}
+
+// The same, with all that each single access needs around it.
+template <class Around>
+std::string Each(const std::string& requests, Around around) {
+  std::vector<std::string> words;
+  CDMUtil::Split(requests, words, " ");
+  std::string text;
+  for (const std::string& word : words) {
+    text += around(word);
+  }
+  return text;
+}
+
+// The Winbond line at 0x4E, or where it is told to be; its monitor's base is 0x290.
+std::string Open(const std::string& requests, unsigned port = 0x4E) {
+  return Hex(port) + "<-87 " + Hex(port) + "<-87 " + requests + Hex(port) + "<-AA ";
+}
+std::string Config(const char* device, const std::string& requests, unsigned port = 0x4E) {
+  return Each(requests, [&](const std::string& request) {
+    return Open(At(port, std::string("07<-") + device + " " + request), port);
+  });
+}
+std::string Monitor(const char* bank, const std::string& requests, unsigned port = 0x4E) {
+  return Each(requests, [&](const std::string& request) {
+    return Open(At(port, "07<-0B 30<-01 60->02 61->90") + At(0x295, std::string("4E<-") + bank + " " + request),
+                port);
+  });
+}
+
+// A byte of a device behind an SMBus host.
+std::string Smbus(const std::string& host, const char* address, const std::string& requests, const char* status) {
+  return Each(requests, [&](const std::string& word) {
+    const std::string start = host + "2<-" + address + " " + host + "3<-" + word.substr(0, 2) + " ";
+    const std::string end = "20ms " + host + "1->" + status + " ";
+    return word[2] == '<' ? start + host + "4" + word.substr(2) + " " + host + "0<-06 " + end
+                          : start + host + "0<-07 " + end + host + "4" + word.substr(2) + " " + host + "0->07 ";
+  });
+}
+
+// ---- hardware
+
+std::string SuperIo(unsigned port, const std::string& enter, const std::string& devices) {
+  return "[[chip]]\nname = \"s\"\nkind = \"super-io\"\nbase = " + std::to_string(port) + "\nenter = [" + enter +
+         "]\n" + devices;
+}
+std::string Device(int number, const std::string& registers) {
+  return "[[chip.device]]\nnumber = " + std::to_string(number) + "\n[chip.device.registers]\n" + registers + "\n";
+}
+std::string Environment(int device, const std::string& registers, int index) {
+  return "[chip.environment]\ndevice = " + std::to_string(device) + "\nindex = " + std::to_string(index) +
+         "\ndata = " + std::to_string(index + 1) + "\n[chip.environment.settings]\n" + registers;
+}
+
+// Two ports: the first holds what is written, the second always reads `second`.
+std::string Ports(unsigned port, int first, int second = 0) {
+  return "[[chip]]\nname = \"p" + Hex(port) + "\"\nkind = \"gpio-block\"\nbase = " + std::to_string(port) +
+         "\noutputs = 0\ninputs = " + std::to_string(second) + "\ninitial = [" + std::to_string(first) + "]\n";
+}
+
+// An index port and a data port that reads as the index: the base of every device is 0x6061.
+const std::string kEchoingPorts = "[[chip]]\nname = \"i\"\nkind = \"gpio-block\"\nbase = 0x2E\n";
+
+const std::string kWinDevices = Device(7, "30 = 1\nE5 = 0xB1\nED = 0x12\nF5 = 0x40\nE1 = 4\nE9 = 2\nE6 = 0x20") +
+                                Device(8, "30 = 1\nF1 = 0x80\nF3 = 1") +
+                                Device(9,
+                                       "30 = 7\nF3 = 0x21\nE4 = 0x22\nEA = 0x23\nE5 = 0x24\nF5 = 0x25\nEB = 0x2F\n"
+                                       "F4 = 0x2E\nE1 = 0x29\nFA = 0x2A\nF9 = 0x2B\nF0 = 0x2C\nF1 = 8\nE6 = 1") +
+                                Device(10, "E0 = 1\nE3 = 4\nE6 = 5\nE9 = 9") +
+                                Device(11, "30 = 1\n60 = 0x02\n61 = 0x90") + Device(13, "EC = 0x3C") +
+                                Environment(11,
+                                            "28 = 0x10\n29 = 0x05\n2A = 0xFF\n3F = 0x03\n47 = 0x90\n4B = 0x40\n"
+                                            "59 = 0x03\n5D = 0x20\n4C = 0x80\n04 = 0x7D\n12 = 0x7E\n62 = 0x43\n"
+                                            "01 = 0x44\n03 = 0x45\n11 = 0x46\n61 = 0x47\n50 = 0x1F\n51 = 0xC0\n"
+                                            "7D = 0x31\n7E = 0x40\n27 = 0x2A\n5E = 0x5E\n75 = 0x75\n02 = 0xF2\n"
+                                            "09 = 0x99\n56 = 0x04\n57 = 0xD2\n58 = 0xFF\n",
+                                            5);
+
+class ChipBench : public BoardBench {
+ public:
+  explicit ChipBench(const std::string& hardware, const std::string& keys = "") : BoardBench(hardware) {
+    SetFiles("[7D10]\n" + keys, "", "");
+    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+  }
+};
+
+std::unique_ptr<Chip> MakeChip(const std::string& name) {
+  for (const ChipRow& row : ChipRows()) {
+    if (row.name == name) {
+      return row.make();
+    }
+  }
+  return nullptr;
+}
+
+void Expect(const std::string& name, const std::string& hardware, const std::vector<ChipCase>& cases,
+            const std::string& keys = "") {
+  ChipBench bench(hardware, keys);
+  const std::unique_ptr<Chip> chip = MakeChip(name);
+  ASSERT_NE(chip, nullptr);
+  ExpectCases(bench, *chip, cases);
+}
+
+void ExpectWin(const std::string& name, const std::vector<ChipCase>& cases, unsigned port = 0x4E) {
+  Expect(name, SuperIo(port, "0x87, 0x87", kWinDevices), cases);
+}
+
+void ExpectConstruction(const std::string& name, const std::string& hardware, const std::string& requests) {
+  ChipBench bench(hardware);
+  const std::string traffic = bench.Traffic([&] { MakeChip(name); });
+  EXPECT_THAT(traffic, ::testing::HasSubstr(requests)) << name;
+  // Nothing else but the waits for the files.
+  EXPECT_EQ(std::count(traffic.begin(), traffic.end(), '-'), std::count(requests.begin(), requests.end(), '-'))
+      << name;
+}
+
+// ---- operations
+
+using Ask = std::function<int(Chip&)>;
+Ask Tach(int fan) {
+  return [=](Chip& c) { return static_cast<int>(c.ReadFanTach(fan, 0)); };
+}
+Ask Full(int fan) {
+  return [=](Chip& c) { return c.SetFanFullSpeed(fan); };
+}
+Ask Pwm(int fan) {
+  return [=](Chip& c) { return c.SetFanPwm(fan, 0x180); };
+}
+Ask Manual(bool on) {
+  return [=](Chip& c) { return c.SetManualFanMode(on); };
+}
+Ask Line(int line) {
+  return [=](Chip& c) { return c.ReadLine(line); };
+}
+Ask Hood(bool locks, int line, bool check) {
+  return [=](Chip& c) { return locks ? c.LockHood(line, check) : c.UnlockHood(line, check); };
+}
+Ask Zone(int zone) {
+  return [=](Chip& c) {
+    int value = 0;
+    return c.ReadTemperature(zone, value) ? c.MapTemperature(value) : -1000;
+  };
+}
+int Rpm(Chip& c) { return c.TachToRpm(1000, 3) + c.TachToRpm(0, 3); }
+int Red(Chip& c) {
+  bool supported = false;
+  return c.IsPowerLedRedSupported(supported) && supported;
+}
+int Pressed(Chip& c) {
+  bool pressed = false;
+  return c.IsPowerButtonPressed(pressed) && pressed;
+}
+
+// Save, save again, green, red, off, restore, restore again.
+std::vector<ChipCase> Led(const std::string& save, const std::string& green, int hasRed, const std::string& red,
+                          const std::string& off, const std::string& restore) {
+  return {{&Chip::RestorePowerLedState, 1, ""},      {&Chip::SavePowerLedState, 1, save},
+          {&Chip::SavePowerLedState, 1, ""},         {&Chip::AssertPowerLedGreen, 1, green},
+          {&Chip::AssertPowerLedRed, hasRed, red},   {&Chip::DeassertPowerLed, 1, off},
+          {&Chip::RestorePowerLedState, 1, restore}, {&Chip::RestorePowerLedState, 1, ""},
+          {&Chip::BlinkPowerLedGreen, 0, ""}};
+}
+
+// ---- the Winbond line
+
+TEST(WinChips, ThePowerLedIsConfigurationRegisters) {
+  ExpectWin("win", Led(Config("09", "F3->21"), Config("09", "F3<-80"), 0, "", Config("09", "F3<-00"),
+                       Config("09", "F3<-21")));
+  ExpectWin("nuv_w83667",
+            Led(Config("09", "30->07 E4->22 EA->23") + Config("0D", "EC->3C") + Config("09", "E5->24 F5->25"),
+                Config("09", "30<-0A E4<-7F EA<-80") + Config("0D", "EC<-A1"), 1,
+                Config("09", "E5<-00 F5<-01 EA<-80") + Config("0D", "EC<-A1"), "",
+                Config("09", "30<-07 E4<-22 EA<-23") + Config("0D", "EC<-3C") + Config("09", "E5<-24 F5<-25")));
+  ExpectWin("nuv_nct5571", Led(Config("09", "EB->2F F4->2E F5->25 E1->29") + Config("0D", "EC->3C 2D->00"),
+                               Config("0D", "EC<-11 2D->00 2D<-00"), 1,
+                               Config("09", "EB->2F EB<-27 F4->2E F4<-26 F5->25 F5<-2D E1->29 E1<-2B"),
+                               Config("09", "EB->27 EB<-27 F4->26 F4<-26 F5->2D F5<-2D E1->2B E1<-29") +
+                                   Config("0D", "EC<-31 2D->00 2D<-00"),
+                               Config("09", "EB<-2F F4<-2E F5<-25 E1<-29") + Config("0D", "EC<-3C 2D<-00")));
+  ExpectWin("nuv_nct5572",
+            Led(Config("07", "E5->B1 ED->12", 0x2E), Config("07", "E5->B1 E5<-B0 ED<-00", 0x2E), 1,
+                Config("07", "E5->B0 E5<-70 ED<-00", 0x2E), Config("07", "ED<-80 ED<-40", 0x2E),
+                Config("07", "E5<-B1 ED<-12", 0x2E)),
+            0x2E);
+  ExpectWin("win_w83202g", Led(Config("09", "F3->21 30->07 FA->2A F9->2B F0->2C"), Config("09", "F3<-29"), 1,
+                               Config("09", "30<-0B FA<-00 F9<-10 F0<-EF F3<-29"), Config("09", "F3<-09"),
+                               Config("09", "F3<-21 30<-07 FA<-2A F9<-2B F0<-2C")));
+}
+
+const std::string kSavedOfWin = "04->7D 04->7D 12->7E 62->43 01->44 03->45 11->46 61->47";
+const std::string kRestoredOfWin = "04<-7D 04<-7D 12<-7E 62<-43 01<-44 03<-45 11<-46 61<-47";
+
+TEST(WinChips, FansAreRegistersOfTheMonitorsBanks) {
+  ExpectWin("win", {{Tach(1), 0x10 << 5, Monitor("00", "28->10 47->90 5D->20")},
+                    {Tach(2), 5 << 2, Monitor("00", "29->05 47->90 5D->20")},
+                    {Tach(3), 0xFFFF, Monitor("00", "2A->FF")},
+                    {Tach(4), 3 << 7, Monitor("00", "3F->03 59->03 4C->80")},
+                    {Tach(5), 0xFFFF, ""},
+                    {Rpm, 1350, ""},
+                    {&Chip::RestoreFanState, 1, ""},
+                    {Full(1), 1, Monitor("00", kSavedOfWin + " 04<-40 12<-04 62<-40 01<-FF")},
+                    {Full(2), 1, Monitor("00", "03<-FF")},
+                    {Pwm(3), 1, Monitor("00", "11<-80")},
+                    {Pwm(4), 1, Monitor("00", "61<-80")},
+                    {Pwm(5), 0, ""},
+                    {Manual(false), 1, Monitor("00", kRestoredOfWin)},
+                    {Red, 0, ""}});
+  // The banks of this model are one: what stands at 0x50 is a temperature's degrees, too.
+  const auto fan3 = std::string("2A->FF");
+  ExpectWin("nuv_w83667", {{Manual(true), 1,
+                            Monitor("00", kSavedOfWin) + Monitor("09", "50->1F") + Monitor("0A", "50->1F") +
+                                Monitor("00", "04->7D 04<-4D 04->4D 04<-41") + Monitor("09", "50->1F 50<-1E") +
+                                Monitor("0A", "50->1E 50<-1E")},
+                           {&Chip::RestoreFanState, 1,
+                            Monitor("00", kRestoredOfWin) + Monitor("09", "50<-1F") + Monitor("0A", "50<-1F")},
+                           {Tach(4), 3 << 7, Monitor("00", "3F->03 59->03 4C->80")}});
+  ExpectWin("nuv_nct5571",
+            {{Manual(true), 1, Monitor("00", "04->7D 12->7E 01->44 03->45 11->46 04->7D 04<-41 12->7E 12<-78")},
+             {&Chip::RestoreFanState, 1, Monitor("00", "04<-7D 12<-7E 01<-44 03<-45 11<-46")},
+             {Tach(3), 0xFFFF, Monitor("00", fan3)},
+             {Tach(4), 0xFFFF, ""},
+             {Pwm(3), 1, Monitor("00", "11<-80")},
+             {Pwm(4), 0, ""}});
+  const auto speeds = [](const std::string& pair) {
+    return Monitor("05", "08<-80 06<-03 06<-30", 0x2E) + Monitor("06", pair, 0x2E);
+  };
+  ExpectWin("nuv_nct5572",
+            {{Tach(1), 0x4D2, speeds("56->04 57->D2")},
+             {Tach(2), 0xFFFF, speeds("58->FF 59->03")},
+             {Tach(3), 0xFFFF, ""},
+             {Rpm, 1000, ""},
+             {Full(2), 1,
+              Monitor("00", "04->7D 04->7D", 0x2E) + Monitor("02", "09->99", 0x2E) + Monitor("01", "09->99", 0x2E) +
+                  Monitor("02", "02->F2 02<-02", 0x2E) + Monitor("01", "02->02 02<-02", 0x2E) +
+                  Monitor("02", "09<-FF", 0x2E)},
+             {Pwm(1), 1, Monitor("01", "09<-80", 0x2E)},
+             {&Chip::RestoreFanState, 1,
+              Monitor("00", "04<-7D 04<-7D", 0x2E) + Monitor("02", "09<-99", 0x2E) + Monitor("01", "09<-99", 0x2E)}},
+            0x2E);
+  ExpectWin("win_w83202g", {{Tach(1), 3 << 7, Monitor("00", "3F->03 59->03 4C->80")},
+                            {Tach(2), 0xFFFF, ""},
+                            {Full(1), 1, Monitor("00", "5E->5E 75->75 5E<-00 75<-02 61<-FF")},
+                            {&Chip::RestoreFanState, 1, Monitor("00", "5E<-5E 75<-75")}});
+}
+
+TEST(WinChips, ZonesAreDegreesWithTheirFraction) {
+  const ChipCase zone2{Zone(2), 32, Monitor("01", "50->1F 51->C0")};
+  const ChipCase zone3{Zone(3), 32, Monitor("02", "50->1F 51->C0")};
+  const auto none = [](Chip& c) { return c.MapTemperature(0x80); };
+  ExpectWin("win", {{Zone(1), 0x2A, Monitor("00", "27->2A")}, zone2, zone3, {Zone(4), -1000, ""}, {none, 255, ""}});
+  ExpectWin("nuv_w83667", {{Zone(1), 0x31, Monitor("00", "7D->31 7E->40")}, zone2, zone3});
+  ExpectWin("nuv_nct5572", {{Zone(1), 0x2A, Monitor("00", "27->2A", 0x2E)}}, 0x2E);
+}
+
+TEST(WinChips, AGroupIsWokenAndMadeInputsBeforeItsLineIsRead) {
+  const auto group = [](const std::string& requests) { return Open(At(0x4E, requests)); };
+  ExpectWin("nuv_w83667",
+            {{Line(17), 3, group("07<-08 30<-02 F0<-FF F2<-00 F1->80")},
+             {[](Chip& c) { return c.ReadLineDirect(10); }, 3, group("07<-08 30<-02 F0<-FF F2<-00 F3->01")},
+             {Line(20), 3, group("07<-09 30<-01 E0<-FF E2<-00 E1->29")},
+             {Line(31), 4, group("07<-09 30<-02 E4<-FF E6<-00 E5->24")},
+             {Line(43), 3, group("07<-09 30<-04 F0<-FF F2<-00 F1->08")},
+             {[](Chip& c) { return c.ReadLineDirect(40); }, 4, group("07<-09 30<-04 F0<-FF F2<-00 E8->00")},
+             {Line(55), 3, group("07<-09 30<-08 F4<-FF F6<-00 F5->25")},
+             {Line(66), 3, group("07<-07 30<-02 F4<-FF F6<-00 F5->40")},
+             {Line(72), 3, group("07<-07 30<-04 E0<-FF E2<-00 E1->04")},
+             {Line(84), 3, group("07<-07 30<-08 E4<-FF E6<-00 E5->B1")},
+             {Line(91), 3, group("07<-07 30<-10 E8<-FF EA<-00 E9->02")},
+             {Line(5), -1, ""},
+             {Line(18), -1, ""},
+             {Line(100), -1, ""},
+             {Line(-11), -1, ""}});
+  ExpectWin("win", {{Line(17), -1, ""}});
+  const std::string keys =
+      "chip.win.gpiox.1.logical_device=9\nchip.win.gpiox.1.enable_bit=3\nchip.win.gpiox.1.io_reg=0xE0\n"
+      "chip.win.gpiox.1.data_reg=0xE4\nchip.win.gpiox.1.inversion_reg=0xE6\nchip.win.gpiox.1.status_reg=0xE5\n";
+  for (const char* name : {"win", "win_w83202g"}) {
+    Expect(name, SuperIo(0x4E, "0x87, 0x87", kWinDevices),
+           {{Line(11), 3, group("07<-09 30<-08 E0<-FF E6<-00 E4->22")},
+            {[](Chip& c) { return c.ReadLineDirect(12); }, 3, group("07<-09 30<-08 E0<-FF E6<-00 E5->24")},
+            {Line(21), -1, ""}},
+           keys);
+  }
+}
+
+TEST(WinChips, ThePowerButtonIsTakenAndGivenBack) {
+  ExpectWin("win", {{&Chip::RestorePowerButtonState, 1, ""},
+                    {&Chip::SavePowerButtonState, 1, Config("0A", "E0->01 E6->05")},
+                    {&Chip::ArmPowerButton, 1, Config("0A", "E0->01 E0<-81 E3->04")},
+                    {Pressed, 1, Config("0A", "E3->04")},
+                    {&Chip::RestorePowerButtonState, 1, Config("0A", "E0<-01 E6<-05")}});
+  ExpectWin("win_w83202g", {{&Chip::SavePowerButtonState, 1, Config("0A", "E0->01 E9->09")}});
+  Expect("nuv_nct5572", Ports(0x801, 0x01, 0x13) + Ports(0x803, 0x23, 0x31),
+         {{&Chip::SavePowerButtonState, 1, "0802->13 0803->23 0804->31 "},
+          {&Chip::ArmPowerButton, 1, "0802->13 0802<-12 0804->31 0804<-30 0803->23 0803<-22 "},
+          {Pressed, 1, "0801->01 "},
+          {&Chip::RestorePowerButtonState, 1, "0802<-13 0803<-23 0804<-31 "}});
+}
+
+// Every class has keys of its own, its base's count for nothing; without a part the monitor is where its key says.
+TEST(WinChips, KeysMoveThePorts) {
+  const std::pair<const char*, const char*> prefixes[] = {{"win", "chip.win."},
+                                                          {"nuv_w83667", "chip.nuv_w83667."},
+                                                          {"nuv_nct5571", "chip.nuvo5571."},
+                                                          {"nuv_nct5572", "chip.nuv_nct5572."},
+                                                          {"win_w83202g", "chip.win_w83202g."}};
+  for (const auto& [name, prefix] : prefixes) {
+    const std::string keys = std::string(prefix) + "cfgbar=0x164E\n" + prefix + "hwmbar=0x2A5\n";
+    Expect(name, "",
+           {{Zone(3), 256,
+             Each("50->FF 51->FF",
+                  [](const std::string& request) {
+                    return Open(At(0x164E, "07<-0B 30<-01 60->FF 61->FF") + At(0x2A5, "4E<-02 " + request), 0x164E);
+                  })}},
+           (std::string(name) == "win" ? "" : "chip.win.cfgbar=0x15\nchip.win.hwmbar=0x17\n") + keys);
+  }
+}
+
+TEST(WinChips, PagedMonitorsAndTheHoodLock) {
+  const auto reg = [](const std::string& request) { return At(0x2E, "07<-08") + "08FF<-00 " + request + " "; };
+  const std::string lookUntilTheEnd = [] {
+    std::string looks = At(0x2E, "17->FF 17<-FF 17->FF");
+    for (int look = 2; look <= 20; ++look) {
+      looks += "100ms " + At(0x2E, "17->FF");
+    }
+    return looks;
+  }();
+  Expect("win_wpcd376", kEchoingPorts + Ports(0x860, 0x34, 0x12) + Ports(0x86E, 0x35, 0x13) + Ports(0x842, 0xFF),
+         {{Tach(1), 0x1234, reg("0860->34") + reg("0861->12")},
+          {Tach(8), 0x1335, reg("086E->35") + reg("086F->13")},
+          {Pwm(3), 1, reg("0842->FF") + reg("0842<-9F") + reg("0882<-80") + "500ms "},
+          {Pwm(4), 0, ""},
+          {Full(1), 0, ""},
+          {Hood(true, 0, false), 1, At(0x2E, "17->17 17<-57 17->17")},
+          {Hood(false, 0, false), 1, At(0x2E, "17->17 17<-97 17->17")},
+          {Red, 1, ""},
+          {&Chip::SavePowerLedState, 1, At(0x2E, "25<-58 07<-07 F0<-04 F1<-03 F0<-06 F1<-03")},
+          {&Chip::AssertPowerLedGreen, 1, "0420<-40 "},
+          {&Chip::AssertPowerLedRed, 1, "0420<-10 "},
+          {&Chip::DeassertPowerLed, 1, "0420<-00 "},
+          {&Chip::RestorePowerLedState, 1, "0420<-40 " + At(0x2E, "25<-40")}});
+  Expect("win_wpcd376", "", {{Hood(true, 0, false), 0, lookUntilTheEnd}});
+  ChipBench bench("");
+  EXPECT_EQ(MakeChip("win_wpcd376")->ReadFanTach(9, 0), 0xFFFFU);
+  EXPECT_EQ(bench.machine.Output(), "\n INVALID FAN TACK INDEX NUMBER 9\n");
+}
+
+TEST(WinChips, APartThatIsToldOfWritesIsToldBeforeAndBehindEach) {
+  const std::string bases = At(0x2E, "07<-04 60->60 61->61") + At(0x2E, "07<-08 60->60 61->61");
+  const std::string hardware =
+      kEchoingPorts + Ports(0x6065, 0x81) + Ports(0x60C1, 0x34, 0x12) + Ports(0x60D2, 0xFF) + Ports(0x60F9, 0x77);
+  ExpectConstruction("nuv_npcd378h", hardware, bases);
+  const auto write = [](const std::string& request) {
+    return "6160<-00 6065->81 6065<-80 6160<-00 " + request + " 6160<-00 6065->80 6065<-81 ";
+  };
+  const auto control = [](void (Chip::*operation)(int), int fan) {
+    return [=](Chip& c) {
+      (c.*operation)(fan);
+      return 0;
+    };
+  };
+  const auto bit = [](int number) {
+    return [=](Chip& c) {
+      bool value = false;
+      return c.ReadConfigBit(4, 0x60, number, value) ? int{value} : -1;
+    };
+  };
+  const auto environment = [](std::uint16_t number) {
+    return [=](Chip& c) {
+      std::uint8_t value = 0;
+      return c.ReadEnvironmentRegister(number, value) ? int{value} : -1;
+    };
+  };
+  Expect("nuv_npcd378h", hardware,
+         {{Tach(1), 0x1234, "6160<-00 60C1->34 6160<-00 60C2->12 "},
+          {Tach(9), 0xFFFF, ""},
+          {Rpm, 1000, ""},
+          {Pwm(1), 1, write("60E1<-80")},
+          {control(&Chip::RestoreFanControl, 2), 0, ""},
+          {control(&Chip::SaveFanControl, 2), 0, "6160<-00 60D2->FF "},
+          {control(&Chip::TakeFanControl, 2), 0, "6160<-00 60D2->FF " + write("60D2<-9F")},
+          {control(&Chip::RestoreFanControl, 2), 0, write("60D2<-FF")},
+          {control(&Chip::TakeFanControl, INT_MAX), 0, ""},
+          {environment(0x398), 0x77, "6160<-03 60F9->77 "},
+          {environment(0x400), -1, ""},
+          {bit(5), 1, At(0x2E, "07<-04 60->60")},
+          {bit(4), 0, At(0x2E, "07<-04 60->60")},
+          {bit(8), -1, ""},
+          {Hood(true, 0, true), 1, At(0x2E, "23->23 23<-33 17->17 17<-57 17->17")},
+          {Hood(false, 0, true), 1, At(0x2E, "23->23 23<-33 17->17 17<-97 17->17")},
+          {Red, 0, ""}});
+  Expect("nuv_npcd378h", hardware, Led("6061->FF ", "6061<-1E ", 1, "6061<-1F ", "6061<-00 ", "6061<-FF "));
+  Expect("nuv_npcd378h", hardware, {{&Chip::AssertPowerLedGreen, 1, "0420<-1E "}},
+         "chip.nuv_npcd378h.gpiobar=0x420\n");
+}
+
+// ---- the SMSC line
+
+// A monitor at 0x480; no other part of the Super-I/O is used.
+std::string SmscMonitor(const char* base) {
+  return SuperIo(0x164E, "0x55",
+                 Device(4, std::string("30 = 1\n") + base) +
+                     Environment(4,
+                                 "28 = 0x34\n29 = 0x12\n3A = 0x35\n3B = 0x13\n40 = 0xFE\n5C = 0x01\n5D = 0x02\n"
+                                 "5E = 0x03\n62 = 0x77\n63 = 0x66\n25 = 0x2A\n26 = 0x80\n27 = 0xF6\n80 = 0x30\n"
+                                 "69 = 0x55\nA4 = 0x0F\nA0 = 0x31\nA5 = 0x0D\nA1 = 0x32\nA6 = 0x0C\nA2 = 0x33\n",
+                                 0));
+}
+
+TEST(SioChips, MonitorLinesHoodLockAndLed) {
+  const auto limit = [](int zone) {
+    return [=](Chip& c) {
+      int value = 0;
+      return c.ReadLowLimitTemperature(zone, value) ? value : -1000;
+    };
+  };
+  const auto intruder = [](int line) {
+    return [=](Chip& c) {
+      bool value = true;
+      return c.ReadIntrusionLatch(line, false, value) ? int{value} : -1;
+    };
+  };
+  const auto activity = [](Chip& c) {
+    int value = 7;
+    return c.ReadLineActivity(86, value) ? 100 : value;
+  };
+  const std::string moving = [] {
+    std::string looks = "045D->13 ";
+    for (int look = 2; look <= 40; ++look) {
+      looks += "75ms 045D->13 ";
+    }
+    return looks;
+  }();
+  const std::string hardware = SmscMonitor("60 = 0x04\n61 = 0x80") + Ports(0x433, 0xFF, 0x0F) + Ports(0x44B, 0x80) +
+                               Ports(0x44D, 0x3D) + Ports(0x451, 0x01, 0x20);
+  Expect("sio", hardware + Ports(0x45C, 0, 0x10),
+         {{Tach(1), 0x1234, At(0x480, "28->34 29->12")},
+          {Tach(8), 0x1335, At(0x480, "3A->35 3B->13")},
+          {Tach(9), 0xFFFF, ""},
+          {Pwm(2), 1, At(0x480, "31<-80")},
+          {Pwm(0), 0, ""},
+          {Full(1), 0, ""},
+          {Manual(true), 1,
+           At(0x480, "40->FE 5C->01 5D->02 5E->03 62->77 63->66 40<-FD 5C<-E1 5D<-E2 5E<-E3 62<-70 63<-00")},
+          {&Chip::RestoreFanState, 1, At(0x480, "40<-FE 5C<-01 5D<-02 5E<-03 62<-77 63<-66")},
+          {Manual(true), 1, At(0x480, "40<-FD 5C<-E1 5D<-E2 5E<-E3 62<-70 63<-00")},
+          {Zone(1), 0x2A, At(0x480, "25->2A")},
+          {Zone(2), 255, At(0x480, "26->80")},
+          {Zone(3), -10, At(0x480, "27->F6")},
+          {Zone(4), 0x30, At(0x480, "80->30")},
+          {Zone(5), -1000, ""},
+          {limit(3), 0x55, At(0x480, "69->55")},
+          {Line(17), 3, "044B->80 "},
+          {Line(36), 4, "044D->3D "},
+          {Line(70), 3, "0451->01 "},
+          {Line(85), 3, "0452->20 "},
+          {Line(86), -1, ""},
+          {Line(18), -1, ""},
+          {activity, -1, ""},
+          {intruder(238), 0, ""},
+          {intruder(17), 1, "044B->80 "},
+          {intruder(9), -1, ""},
+          {Hood(true, 17, false), 1, "045D->10 045D<-11 "},
+          {Hood(true, 17, true), 0, "045D->10 045D<-11 10ms 044B->80 "},
+          {Hood(false, 17, true), 1, "045D->10 045D<-12 10ms 044B->80 "},
+          {Red, 1, ""},
+          {&Chip::SavePowerLedState, 1, "0433->FF 0433<-FB 0434->0F 0434<-0B "},
+          {&Chip::AssertPowerLedGreen, 1, "044D->3D 044D<-3E "},
+          {&Chip::AssertPowerLedRed, 1, "044D->3E 044D<-3D "},
+          {&Chip::DeassertPowerLed, 1, "044D->3D 044D<-3C "},
+          {&Chip::RestorePowerLedState, 1, "0433->FB 0433<-FF 0434->0F 0434<-0F "}});
+  Expect("sio", Ports(0x45C, 0, 0x13), {{Hood(false, 17, false), 0, moving}});
+  Expect("sio", Ports(0x534, 0, 4), {{Hood(true, 17, false), 1, "0535->04 0535<-05 "}, {Line(17), 3, "054B->FF "}},
+         "chip.sio.pmbar=0x500\nchip.sio.hoodlockoffset=0x35\n");
+}
+
+TEST(SioChips, TheSch5327bKeepsItsLedInRuntimeRegisters) {
+  const std::string part =
+      SuperIo(0x2E, "0x55", Device(10, "60 = 0x06\n61 = 0x00")) + Ports(0x65B, 0x20) + Ports(0x677, 0x11);
+  const auto open = [](const std::string& requests) { return "002E<-55 " + requests + "002E<-AA "; };
+  ExpectConstruction("smsc_sch5327b", part, open(At(0x2E, "07<-0A 60->06 61->00")));
+  Expect("smsc_sch5327b", part,
+         Led(open("065B->20 0677->11 "), open("065B<-2E 0677<-00 "), 1, open("065B<-2F 0677<-00 "),
+             open("065B<-00 0677<-00 "), open("065B<-20 0677<-11 ")));
+  Expect("smsc_sch5327b", SmscMonitor("60 = 0x08\n61 = 0x80") + Ports(0xF84B, 0x80),
+         {{Full(1), 0, ""},
+          {Manual(true), 1,
+           At(0x880, "A4->0F A0->31 A5->0D A1->32 A6->0C A2->33 A4->0F A4<-07 A5->0D A5<-05 A6->0C A6<-04")},
+          {Pwm(3), 1, At(0x880, "A2<-80")},
+          {&Chip::RestoreFanState, 1, At(0x880, "A4<-0F A0<-31 A5<-0D A1<-32 A6<-0C A2<-33") + "2000ms "},
+          {Line(17), 3, "F84B->80 "},
+          {Red, 1, ""}});
+  Expect("smsc_sch5327b", part,
+         {{&Chip::SavePowerLedState, 1, open("065B->20 0677->11 ")},
+          {&Chip::AssertPowerLedGreen, 1, open("065B<-21 0677<-00 ")},
+          {&Chip::AssertPowerLedRed, 1, open("065B<-22 0677<-00 ")}},
+         "chip.smsc_sch5327b.multifunction_select2_register.green=1\n"
+         "chip.smsc_sch5327b.multifunction_select2_register.red=2\n");
+}
+
+TEST(SioChips, APartIsLookedForAtBothPlaces) {
+  const std::string runtime = Device(10, "30 = 1\n60 = 0x06\n61 = 0x00");
+  const std::string ports = Ports(0x647, 0x2B) + Ports(0x65D, 0x17);
+  const std::string monitor = Environment(10, "26 = 0x26\n25 = 0x25\n27 = 0x27\n", 0x70);
+  const auto base = [](unsigned port) {
+    return Hex(port) + "<-55 " + At(port, "07<-0A 60->06 61->00") + Hex(port) + "<-AA ";
+  };
+  ExpectConstruction("smsc5407", SuperIo(0x2E, "0x55", runtime) + ports, "002E<-55 002F->00 " + base(0x2E));
+  const std::string second = SuperIo(0x4E, "0x55", runtime + monitor) + ports;
+  ExpectConstruction("smsc5407", second, "002E<-55 002F->FF " + base(0x4E));
+  Expect("smsc5407", second,
+         {{Zone(1), 0x26, At(0x670, "26->26")},
+          {Zone(2), 0x25, At(0x670, "25->25")},
+          {Zone(3), 0x27, At(0x670, "27->27")},
+          {&Chip::DeassertPowerLed, 1, ""}});
+  Expect("smsc5407", second,
+         Led("0647->2B 065D->17 ", "0647<-27 065D<-14 ", 0, "", "065D<-17 0647<-2B ", "065D<-17 0647<-2B "));
+
+  const std::string via =
+      SuperIo(0x4E, "0x87, 0x87",
+              Device(8, "60 = 0x05") + Device(10, "60 = 0x06\n61 = 0x10") + Device(11, "60 = 0x0C")) +
+      Ports(0x62C, 0x15) + Ports(0xC1F, 0x31, 0x33) + Ports(0xC21, 0x32);
+  ExpectConstruction("vt1211", via,
+                     "002E<-87 002E<-87 002F->FF " + Open(At(0x4E, "07<-08 60->05 61->00")) +
+                         Open(At(0x4E, "07<-0A 60->06 61->10")) + Open(At(0x4E, "07<-0B 60->0C 61->00")));
+  Expect("vt1211", via, {{Zone(1), 0x31, "0C1F->31 "}, {Zone(2), 0x32, "0C21->32 "}, {Zone(3), 0x33, "0C20->33 "}});
+  Expect("vt1211", via,
+         Led(Open(At(0x4E, "07<-0A 30->00 30<-01") + "062C->15 062C<-12 "), "", 0, "", "",
+             Open("062C<-15 " + At(0x4E, "07<-0A 30<-00"))));
+}
+
+// ---- monitors behind an SMBus
+
+TEST(AdtChips, ARegisterIsATransaction) {
+  const auto bus = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "80"); };
+  Expect("adt", Ports(0xFC00, 0, 0x80) + Ports(0xFC04, 0x42),
+         {{Tach(1), 0x4242, bus("28->42 29->42")},
+          {Tach(4), 0x4242, bus("2E->42 2F->42")},
+          {Tach(5), 0xFFFF, ""},
+          {Zone(3), 0x42, bus("27->42")},
+          {Zone(4), -1000, ""},
+          {Pwm(0), 0, ""},
+          {Manual(true), 1,  // a written byte is the next one read: the host has but one data register
+           bus("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 40->42 40<-40 5C<-E0 5D<-E0 5E<-E0 "
+               "62->E0 62<-E7 63<-77")},
+          {Pwm(3), 1, bus("32<-80")},
+          {&Chip::RestoreFanState, 1, bus("40<-42 5C<-42 5D<-42 5E<-42 30<-42 31<-42 32<-42 62<-42 63<-42")}});
+  const auto reg = [](int number) { return [=](Chip& c) { return c.ReadRegister(number); }; };
+  const auto bus11 = [](const std::string& requests) { return Smbus("080", "5C", requests, "80"); };
+  Expect("adt_sio11", Ports(0x800, 0, 0x80) + Ports(0x804, 0x42),
+         {{reg(0x1A), 0x42, bus11("1A->42")},
+          {reg(256), 0, ""},
+          {&Chip::SaveFanState, 1,
+           bus11("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 64->42 65->42 66->42 38->42 39->42 "
+                 "3A->42")}});
+}
+
+TEST(AdtChips, WithoutAnAnswerNothingIsSavedOrTakenOver) {
+  const auto failed = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "00"); };
+  const std::string save = failed("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42");
+  Expect("adt", Ports(0xFC00, 0) + Ports(0xFC04, 0x42),
+         {{Zone(1), -1000, failed("25->42")},
+          {Manual(true), 0, save},
+          {&Chip::SaveFanState, 0, save},
+          {&Chip::RestoreFanState, 1, ""}});
+}
+
+// ---- all of them
+
+// On machines where nobody answers, where all ports read 0, and where a bus never gets ready.
+TEST(WinChips, AnyNumberIsAnsweredInBoundedTime) {
+  constexpr platform::sim::Microseconds kMostForAll_us = 60'000'000;
+  for (const std::string& hardware :
+       {std::string(), Ports(0xFC00, 0, 0x1A) + Ports(0x800, 0, 0x1A) + kEchoingPorts}) {
+    for (const char* name : {"win", "nuv_w83667", "nuv_nct5571", "nuv_nct5572", "win_w83202g", "win_wpcd376",
+                             "nuv_npcd378h", "sio", "smsc_sch5327b", "smsc5407", "vt1211", "adt", "adt_sio11"}) {
+      ChipBench bench(hardware);
+      const platform::sim::Microseconds start = bench.machine.Time().Now();
+      const std::unique_ptr<Chip> chip = MakeChip(name);
+      for (const int number : {INT_MIN, -1, 0, 1, 10, 99, INT_MAX}) {
+        int value = 0;
+        bool yes = false;
+        std::uint8_t byte = 0;
+        chip->ReadFanRpm(number, value, number);
+        chip->SetFanPwm(number, number);
+        chip->SaveFanControl(number);
+        chip->TakeFanControl(number);
+        chip->RestoreFanControl(number);
+        chip->ReadTemperature(number, value);
+        chip->ReadLowLimitTemperature(number, value);
+        chip->ReadLine(number);
+        chip->ReadLineDirect(number);
+        chip->ReadRegister(number);
+        chip->ReadIntrusionLatch(number, true, yes);
+        chip->ReadConfigBit(0xFF, 0xFF, number, yes);
+        chip->ReadEnvironmentRegister(0xFFFF, byte);
+      }
+      chip->LockHood(INT_MAX, true);
+      EXPECT_LT(bench.machine.Time().Now() - start, kMostForAll_us) << name;
+      EXPECT_EQ(chip->ReadFanTach(INT_MAX, 0) % 0xFFFF, 0U) << name;
+    }
+  }
+}
+
+}  // namespace
+}  // namespace panelglow
