@@ -153,6 +153,7 @@ TEST(EcChips, FansAndSensorsAreReadAndSetByTheClassesOwnAddresses) {
   EXPECT_EQ(kbc.TachToRpm(42, 1), 5851);
   EXPECT_TRUE(kbc.ReadFanRpmRaw(2, value, 1) && value == 5849);
   EXPECT_EQ(wpc.TachToRpm(42, 2), 16071);
+  EXPECT_EQ(wpc.TachToRpm(0, 2) + wpc.TachToRpm(42, 0), 0);
   EXPECT_EQ(ec.TachToRpm(0xFFFE, 1), 32);
   EXPECT_EQ(ec.TachToRpm(0xFFFF, 1), 0);
   // 0x2A: bits 1, 3 and 5 are set.

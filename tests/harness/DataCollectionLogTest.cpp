@@ -71,6 +71,8 @@ struct LogRun {
         machine.DiskFiles().Put("log.xml", before + std::string(isLong ? std::size_t{65} << 20U : 0, ' '));
       }
       SubtestDetails details;
+      details.retriesspecified = "7";
+      details.retriesattempted = "3";
       details.attempts = {{"0", "990100", "5", {{"a < b", "failed", "1", "2", "3", "4", "now"}}}};
       const bool corrupted = isXMLCorrupted(path);
       const std::uint32_t begin = platform::TheHost().clock.TickCount();
@@ -90,6 +92,7 @@ TEST(DataCollectionLog, ARunIsAddedWithItsTimesResultsAndParameters) {
   for (const char* part :
        {"<DiagnosticsData Version=\"4.0\">\n  <Older/>\n  <Diagnostic name=\"probe\">\n    <Subtest name=\"\"",
         " duration=\"61999\"", " starttime=\"03/01/2024 14:11:59\" endtime=\"03/01/2024 14:13:00\">",
+        "<Attempts retriesspecified=\"7\" retriesattempted=\"3\">",
         "errorcode=\"990100\">\n          <Results>\n            <Result description=\"a &lt; b\" status=\"failed\""
         " actualmin=\"1\" actualmax=\"2\" expectedmin=\"3\" expectedmax=\"4\" timestamp=\"now\"/>\n",
         "<Argument name=\"-empty\" value=\"\"/>\n        <Argument name=\"-note\" value=\"&lt;&quot;&amp;'&gt;\"/>\n",

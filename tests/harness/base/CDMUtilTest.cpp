@@ -134,7 +134,7 @@ TEST(CDMUtil, WidensAndNarrowsByteByByte) {
 TEST(CDMUtil, EscapesForXml) {
   EXPECT_EQ(CDMUtil::EscapeXml("<a b='`\"&amp;'>\x92\x93\x94\x01\xE9"),
             "&lt;a b=&apos;&apos;&quot;&amp;amp;&apos;&gt;&apos;&quot;&quot;\x01\xE9");
-  EXPECT_EQ(CDMUtil::EscapeXmlStrict(" \t<A&B>\x01\x7F\xE9\x92 c\n "), "&lt;A&amp;B&gt;.... c");
+  EXPECT_EQ(CDMUtil::EscapeXmlStrict(" \t<A&B>\x01\x80\x7F\xE9\x92 c\n "), "&lt;A&amp;B&gt;..... c");
 }
 
 TEST(CDMUtil, ReadsFilesToTheirFirstNul) {
