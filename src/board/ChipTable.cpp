@@ -31,10 +31,17 @@
 #include "board/chips/ite/IteChip.h"
 #include "board/chips/sensor/AdtChip.h"
 #include "board/chips/sensor/AdtSio11Chip.h"
+#include "board/chips/sensor/SmbusDeviceChip.h"
 #include "board/chips/sio/SioChip.h"
 #include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
 #include "board/chips/sio/Vt1211Chip.h"
+#include "board/chips/southbridge/HudsonChip.h"
+#include "board/chips/southbridge/IchChip.h"
+#include "board/chips/southbridge/IntelC200Chip.h"
+#include "board/chips/southbridge/McpChip.h"
+#include "board/chips/southbridge/Sb710Chip.h"
+#include "board/chips/southbridge/SbxChip.h"
 #include "board/chips/win/NuvNct5571Chip.h"
 #include "board/chips/win/NuvNct5572Chip.h"
 #include "board/chips/win/NuvNpcd378hChip.h"
@@ -71,21 +78,21 @@ constexpr ChipRow kRows[] = {
     {14, "fin_f71863", Make<FinF71863Chip>},
     {15, "fin_f71808a", Make<FinF71808aChip>},
     {16, "fin_f71808e", Make<FinF71808eChip>},
-    {17, "hudson", nullptr},
-    {19, "intelc200", nullptr},
-    {18, "ich", nullptr},
+    {17, "hudson", Make<HudsonChip>},
+    {19, "intelc200", Make<IntelC200Chip>},
+    {18, "ich", Make<IchChip>},
     {20, "ite", Make<IteChip>},
     {21, "ite_8758", Make<Ite8758Chip>},
     {22, "ite_8721", Make<Ite8721Chip>},
     {23, "ite_8772", Make<Ite8772Chip>},
-    {24, "mcp", nullptr},
+    {24, "mcp", Make<McpChip>},
     {25, "nuv_w83667", Make<NuvW83667Chip>},
     {26, "nuv_nct5571", Make<NuvNct5571Chip>},
     {27, "nuv_nct5572", Make<NuvNct5572Chip>},
-    {28, "sbx", nullptr},
-    {29, "sb710", nullptr},
+    {28, "sbx", Make<SbxChip>},
+    {29, "sb710", Make<Sb710Chip>},
     {30, "sio", Make<SioChip>},
-    {31, "smbus_device", nullptr},
+    {31, "smbus_device", Make<SmbusDeviceChip>},
     {32, "smsc5407", Make<Smsc5407Chip>},
     {33, "win", Make<WinChip>},
     {34, "win_w83202g", Make<WinW83202gChip>},
