@@ -21,13 +21,14 @@ constexpr std::uint8_t kForLed = 0x05;
 Lantern::Lantern(std::string boardClass, std::uint16_t boardId, std::uint16_t indexPort)
     : OldestBoard(std::move(boardClass), boardId,
                   {.fanDivisor = kFanDivisor, .indexPort = indexPort, .fanLatched = false}),
-      button(devio, ReadFlatWord("PowerIOBaseAddr"), PowerEventButton::Check::kNone) {}
+      powerBase(ReadFlatWord("PowerIOBaseAddr")),
+      button(devio, powerBase, PowerEventButton::Check::kNone) {}
 
 std::uint8_t Lantern::OpenAndKeep() {
   isOpen = true;
   superIo.Send(kEnterKeys);
   const std::uint8_t pins = superIo.Read(kPinRegister);
-  savedPins = pins;
+  savedPins = savedPins.value_or(pins);
   return pins;
 }
 
@@ -51,14 +52,17 @@ bool Lantern::RestorePowerLedState() {
 }
 
 bool Lantern::SavePowerButton() {
+  if (!HasButton()) {
+    return false;
+  }
   button.Save();
   return true;
 }
-bool Lantern::RestorePowerButton() { return button.Restore(); }
-bool Lantern::ArmPowerButton() { return button.Arm(); }
+bool Lantern::RestorePowerButton() { return HasButton() && button.Restore(); }
+bool Lantern::ArmPowerButton() { return HasButton() && button.Arm(); }
 bool Lantern::IsPowerButtonPressed(bool& pressed) {
-  pressed = button.IsPressed();
-  return true;
+  pressed = HasButton() && button.IsPressed();
+  return HasButton();
 }
 
 }  // namespace panelglow

@@ -157,6 +157,10 @@ std::unique_ptr<MotherBoard> MotherBoard::Instance(const std::string& detectIniP
     section.insert(0, "0");
     name = look();
   }
+  SelectedSystem selected = GetSelectedSystem();
+  selected.detectIniPath = detectIniPath;
+  selected.section = section;
+  SetSelectedSystem(selected);  // the flat keys stand where the class does
   if (name == "Lantern") {
     return id == kSaddleId ? std::unique_ptr<MotherBoard>(std::make_unique<Saddle>(id))
                            : std::make_unique<Lantern>(id);

@@ -50,9 +50,9 @@ bool Orchard::RestorePowerLedState() {
   if (!isSaved) {
     return false;
   }
-  isSaved = false;
   Light(kGreen);
   superIo.Write(kPinMultiplexer, kPinsAtStart);
+  isSaved = false;  // last: a restore that is interrupted is done again
   return true;
 }
 

@@ -288,15 +288,13 @@ TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
   BoardBench bench;
   for (const Case& c : {Case{"0A58", "A58", "Orchard", "Orchard", true, kOrchard},
                         Case{"A58", "0A58", "Lantern", "Lantern", false, kLantern},
-                        Case{"A58", "A58", "Lantern", "Lantern", false, kEventButton},
+                        Case{"A58", "0A58", "Lantern", "Lantern", false, kEventButton},
                         Case{"2A78", "2A78", "Lantern", "Saddle", false, kSaddle},
                         Case{"2A78", "2A78", "Lantern", "Saddle", false, kEventButton}}) {
     SCOPED_TRACE(c.name);
     SMBIOSDiscovery::Instance().productText = c.systemId;
-    const std::string base = "PowerIOBaseAddr=0x400\n";
-    bench.SetFiles("[" + std::string(c.section) + "]\nMotherboardClass=" + c.wanted + "\n" + base + "[" + c.systemId +
-                       "]\n" + base,
-                   "", "");
+    bench.SetFiles("[" + std::string(c.section) + "]\nMotherboardClass=" + c.wanted + "\nPowerIOBaseAddr=0x400\n", "",
+                   "");
     EXPECT_EQ(BoardBench::Board(c.systemId), nullptr);
     const std::unique_ptr<MotherBoard> board = MotherBoard::Instance(".\\mbdetect.ini");
     ASSERT_NE(board, nullptr);
@@ -308,6 +306,12 @@ TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
       EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(row.act(*board), row.answer) << row.traffic; }), row.traffic);
     }
   }
+  bench.SetFiles("[2A78]\nMotherboardClass=Lantern\n", "", "");
+  const std::unique_ptr<MotherBoard> unknown = MotherBoard::Instance(".\\mbdetect.ini");
+  EXPECT_EQ(bench.Traffic([&] {
+    EXPECT_FALSE(unknown->SavePowerButton() || unknown->ArmPowerButton() || unknown->RestorePowerButton());
+  }),
+            "");  // nobody knows where the button is
   bench.SetFiles("[2A78]\nMotherboardClass=lantern\n", "", "");
   EXPECT_EQ(MotherBoard::Instance(".\\mbdetect.ini"), nullptr);
   SMBIOSDiscovery::Instance().productText = "7D10";

@@ -45,7 +45,9 @@ bool Chip::ReadFanRpmRaw(int fan, int& rpm, int multiplier) {
 
 int Chip::TachToRpm(std::uint32_t raw, int multiplier) { return RpmOf(multiplier * kTachClock, raw); }
 
-bool Chip::SetFanPwmPercent(int fan, int percent) { return SetFanPwm(fan, percent * kFullDuty / 100); }
+bool Chip::SetFanPwmPercent(int fan, int percent) {
+  return SetFanPwm(fan, static_cast<int>(std::int64_t{percent} * kFullDuty / 100));
+}
 
 bool Chip::ReadConfigBit(std::uint8_t /*ldn*/, std::uint8_t /*reg*/, int /*bit*/, bool& /*value*/) {
   platform::TheHost().console.Write("BASIC\n");
