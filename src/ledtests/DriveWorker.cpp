@@ -2,8 +2,10 @@
 // busy and left alone in turn, by a thread that reads one block and writes back the very bytes it has read.
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string>
+#include <utility>
 
 #include "hw/SetupDI.h"
 #include "ledtests/BlinkWorkers.h"
@@ -79,8 +81,13 @@ bool BlinkActivity(FrontPanelTest& test, const LEDStruct& entry, const std::stri
   return true;
 }
 
-// Without a drive that is found, the one of the worker before is made busy.
-void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::string& found) {
+std::optional<std::string> KnownPath(std::string path) {
+  return path.empty() ? std::nullopt : std::optional(std::move(path));
+}
+
+// Without a drive, the one of the worker before is made busy. A drive whose path is not known is none of those that
+// are: its LED stays dark.
+void CustomBlinkHDLED(FrontPanelTest& test, LEDStruct& entry, const std::optional<std::string>& found) {
   const std::string drive = test.ChangeDriveHandle(found);
   entry.workerStarted = true;
   if (BlinkActivity(test, entry, drive)) {
@@ -103,15 +110,16 @@ void CustomLightUpFpHddLed(FrontPanelTest& test, const std::string& drive) {
 
 void CustomBlinkCtrlHDLED(FrontPanelTest& test, LEDStruct& entry) {
   const std::string disk = FindDiskOf(entry.controllerId);
-  CustomBlinkHDLED(test, entry, disk.empty() ? "" : MSUtils::GetDriveHandleStrUsingDevInstId(disk));
+  CustomBlinkHDLED(test, entry,
+                   disk.empty() ? std::nullopt : std::optional(MSUtils::GetDriveHandleStrUsingDevInstId(disk)));
 }
 
 void CustomBlinkIdeHDLED(FrontPanelTest& test, LEDStruct& entry) {
-  CustomBlinkHDLED(test, entry, FindDrivePath("ide"));
+  CustomBlinkHDLED(test, entry, KnownPath(FindDrivePath("ide")));
 }
 
 void CustomBlinkScsiHDLED(FrontPanelTest& test, LEDStruct& entry) {
-  CustomBlinkHDLED(test, entry, FindDrivePath("scsi"));
+  CustomBlinkHDLED(test, entry, KnownPath(FindDrivePath("scsi")));
 }
 
 }  // namespace panelglow

@@ -141,9 +141,9 @@ void FrontPanelTest::ResetAllParameters() {
   }
 }
 
-std::string FrontPanelTest::ChangeDriveHandle(const std::string& found) {
+std::string FrontPanelTest::ChangeDriveHandle(const std::optional<std::string>& found) {
   const std::lock_guard<std::mutex> lock(driveGuard);
-  driveHandle = found.empty() ? driveHandle : found;
+  driveHandle = found.value_or(driveHandle);
   return driveHandle;
 }
 

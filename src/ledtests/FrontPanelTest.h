@@ -9,6 +9,7 @@
 #include <initializer_list>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -58,8 +59,9 @@ class FrontPanelTest : public CDMDiag {
   /// of the dialog to end it.
   void WaitForThreadToFinish(std::int32_t deviceId);
 
-  /// Makes a drive the one that is made busy, unless `found` is empty; the path of that drive. Workers may overlap.
-  std::string ChangeDriveHandle(const std::string& found);
+  /// Makes a drive the one that is made busy, when there is one; the path of that drive. An empty path is a drive
+  /// that nobody knows: it does not open. Workers may overlap.
+  std::string ChangeDriveHandle(const std::optional<std::string>& found);
 
   void SetThreadState(std::uint32_t state) { threadState = state; }
   [[nodiscard]] std::uint32_t GetThreadState() const { return threadState; }

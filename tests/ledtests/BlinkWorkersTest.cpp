@@ -125,6 +125,24 @@ TEST(BlinkWorkers, OfTwoDrivesAtOnceKeepEachTheirOwnBusy) {
   EXPECT_EQ(bench.TimesLit("nvme-drive"), 0);
 }
 
+// The second controller's disk is one that the management service does not list: the first one's is left alone.
+TEST(BlinkWorkers, ADriveThatNobodyKnowsStaysDarkAndNoOtherIsMadeBusyForIt) {
+  const fs::path machine = Bench::FolderPath().string() + "-unlisted.toml";
+  std::ofstream(machine) << std::ifstream(fs::path(PANELGLOW_SOURCE_DIR) / "machines/drives-desktop.toml").rdbuf()
+                         << "\n[[management]]\nnamespace = 'ROOT\\CIMV2'\nclass = 'Win32_DiskDrive'\n";
+  Bench bench(machine.string());
+  fs::remove(machine);
+  bench.test.massStorageIniFile = ".\\msctrl.ini";
+  bench.Prepare({"hdgreen"});
+  bench.test.hdControllers = "all";
+  bench.test.PrepareDeviceArray();
+  ASSERT_GE(bench.test.hdCount, 1);
+  bench.test.ChangeDriveHandle("\\\\.\\PHYSICALDRIVE1");  // of the worker before
+  bench.After(2500, [&] { bench.Entry("hdgreen").running = false; });
+  bench.RunWorker("hdgreen");
+  EXPECT_EQ(bench.TimesLit("sata-drive") + bench.TimesLit("sas-drive"), 0);
+}
+
 // What a slow part still needs for its last step.
 constexpr sim::Microseconds kSilicon_us = 100'000;
 
