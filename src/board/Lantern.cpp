@@ -7,7 +7,6 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::uint32_t kFanDivisor = 1'500'000;
 constexpr std::array<std::uint8_t, 2> kEnterKeys{0x87, 0x87};
 constexpr std::array<std::uint8_t, 1> kExitKeys{0xAA};
 
@@ -19,8 +18,7 @@ constexpr std::uint8_t kForLed = 0x05;
 }  // namespace
 
 Lantern::Lantern(std::string boardClass, std::uint16_t boardId, std::uint16_t indexPort)
-    : OldestBoard(std::move(boardClass), boardId,
-                  {.fanDivisor = kFanDivisor, .indexPort = indexPort, .fanLatched = false}),
+    : OldestBoard(std::move(boardClass), boardId, {.indexPort = indexPort, .fanLatched = false}),
       powerBase(ReadFlatWord("PowerIOBaseAddr")),
       button(devio, powerBase, PowerEventButton::Check::kNone) {}
 

@@ -211,21 +211,22 @@ void MotherBoard::BuildListedChips() {
   const auto isListed = [this](std::string_view name) {
     return std::find(listed.begin(), listed.end(), name) != listed.end();
   };
-  for (const ChipRow& row : ChipRows()) {
-    const bool isGeneric = row.place == kGenericSuperIoPlace || row.place == kGenericEcPlace;
-    if (!isGeneric && row.place != kPlainChipPlace && isListed(row.name)) {
-      Place(row.name);
-    }
-  }
-  // The two generic families come last; of each the first that is listed.
-  for (const std::size_t place : {kGenericSuperIoPlace, kGenericEcPlace}) {
+  const auto build = [&](std::size_t place) {  // the first that is listed
     const std::span<const ChipRow> rows = ChipRows();
     const auto found = std::find_if(rows.begin(), rows.end(),
                                     [&](const ChipRow& row) { return row.place == place && isListed(row.name); });
     if (found != rows.end()) {
       Place(found->name);
     }
+  };
+  for (std::size_t place = kPlainChipPlace + 1; place <= kChipPlaces; ++place) {
+    if (place != kGenericSuperIoPlace && place != kGenericEcPlace) {
+      build(place);
+    }
   }
+  // The two generic families come last.
+  build(kGenericSuperIoPlace);
+  build(kGenericEcPlace);
   for (const std::size_t place : {kGenericSuperIoPlace, kGenericEcPlace}) {
     InitializeGeneric(place);
   }
@@ -261,7 +262,8 @@ void MotherBoard::BuildAllChips() {
 Chip& MotherBoard::ChipOf(ChipChoice& choice) {
   if (choice.chip == nullptr) {
     Setting name(choice.name);
-    if (choice.name.empty()) {
+    choice.isPreset = !choice.name.empty();
+    if (!choice.isPreset) {
       name = ReadName(choice.key, "");
     }
     const ChipRow* row = FindChipRow(name.text);
@@ -300,6 +302,9 @@ void MotherBoard::RequireDrivable(Led led) {
 
 std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
   IniReader& reader = IniReader::Instance();
+  if (choice.isPreset) {
+    return "the board class " + className + " gives it to the chip \"" + choice.name + "\", which has nothing for it";
+  }
   if (choice.name.empty()) {
     return std::string("the key \"") + choice.key + "\" names no chip for it; " + reader.DescribeSections();
   }
@@ -313,6 +318,9 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
   }
   if (!listed.empty() && std::find(listed.begin(), listed.end(), choice.name) == listed.end()) {
     return chip + " is not in the list of the key \"chips\"";
+  }
+  if (choice.chip != nullptr && choice.chip->GetName() == kNoChip) {
+    return "the board class " + className + " has no " + chip;
   }
   std::string missing;
   const std::string dataKey = "chip." + choice.name + ".data";

@@ -128,7 +128,8 @@ class MotherBoard {
     const char* settings;  // beginning of its keys in a chip's section
     std::string name = {};
     Chip* chip = nullptr;
-    bool wasLit = false;  // by this board
+    bool isPreset = false;  // the name is the board class's own
+    bool wasLit = false;    // by this board
   };
   Chip& ChipOf(ChipChoice& choice);
 
@@ -138,8 +139,6 @@ class MotherBoard {
   /// The chip's operation. People are told when the LED cannot be lit, or be darkened once it was lit.
   bool SwitchOn(ChipChoice& choice, bool (Chip::*operation)());
   bool SwitchOff(ChipChoice& choice, bool (Chip::*operation)());
-
-  std::string temperatureChipName;  // of the chip whose temperature is watched, where a class presets it
 
   ChipChoice powerLed{"test.powerled.chip", "power LED", "powerled."};
   ChipChoice chargeLed{"test.chargeled.chip", "charge LED", "chargeled."};

@@ -18,9 +18,8 @@ class OldestBoard : public MotherBoard {
  protected:
   /// What is fixed for a class. The data port stands behind the index port.
   struct Traits {
-    std::uint32_t fanDivisor;
     std::uint16_t indexPort;  // of the Super-I/O
-    bool fanLatched;          // also: the power LED has a red part
+    bool fanLatched;          // ... whose fans' counters are latched; also: the power LED has a red part
   };
 
   OldestBoard(std::string boardClass, std::uint16_t boardId, const Traits& fixed);

@@ -7,7 +7,6 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::uint32_t kFanDivisor = 5'400'000;
 constexpr std::uint16_t kIndexPort = 0x2E;
 constexpr PowerButtonPorts kPowerButton{.control = 0x458, .enable = 0xF802, .status = 0xF801};
 
@@ -26,8 +25,7 @@ constexpr std::array<std::pair<std::uint8_t, std::uint8_t>, 6> kGpioSetUp{
 }  // namespace
 
 Orchard::Orchard(std::uint16_t boardId)
-    : OldestBoard("Orchard", boardId, {.fanDivisor = kFanDivisor, .indexPort = kIndexPort, .fanLatched = true}),
-      button(devio, kPowerButton) {}
+    : OldestBoard("Orchard", boardId, {.indexPort = kIndexPort, .fanLatched = true}), button(devio, kPowerButton) {}
 
 bool Orchard::SavePowerLedState() {
   isSaved = true;

@@ -15,7 +15,6 @@ class Thicket : public MotherBoard {
     Place("ich");
     Place("ite");
     Place("acpi");
-    temperatureChipName = "ite";
     powerLed.name = "ite";
   }
 };

@@ -71,31 +71,34 @@ std::uint32_t ReadNumber(SetupDI& list, std::uint32_t property) {
          static_cast<std::uint32_t>(bytes[3]) << 24U;
 }
 
-// The three numbers of "PCI bus 0, device 31, function 2", whose words are of the system's language; otherwise the
-// driver is asked where the device is.
+// The last three numbers of "PCI bus 0, device 31, function 2", whose words are of the system's language and may hold
+// numbers themselves; otherwise the driver is asked where the device is.
 void ReadPlace(SetupDI& list, std::optional<CDevio>& driver, PciDevice& device) {
   const std::string text = ReadFirstText(list, platform::kLocationProperty);
-  std::array<std::uint8_t, 3> place{};
-  std::size_t count = 0;
+  std::vector<unsigned long> numbers;
   constexpr const char* kDigits = "0123456789";
-  for (std::size_t at = text.find_first_of(kDigits); at != std::string::npos && count < place.size();
+  for (std::size_t at = text.find_first_of(kDigits); at != std::string::npos;
        at = text.find_first_of(kDigits, std::min(text.find_first_not_of(kDigits, at), text.size()))) {
-    place[count++] = static_cast<std::uint8_t>(std::strtoul(text.c_str() + at, nullptr, 10));
+    numbers.push_back(std::strtoul(text.c_str() + at, nullptr, 10));
   }
-  std::uint16_t location = 0;
-  if (count < place.size() && !driver) {
+  if (numbers.size() >= 3) {
+    const unsigned long* const place = &numbers[numbers.size() - 3];
+    if (place[0] <= 255 && place[1] <= 31 && place[2] <= 7) {
+      device.bus = static_cast<std::uint8_t>(place[0]);
+      device.device = static_cast<std::uint8_t>(place[1]);
+      device.function = static_cast<std::uint8_t>(place[2]);
+      return;
+    }
+  }
+  if (!driver) {
     driver.emplace();
   }
-  if (count < place.size() && driver->FindPciDevice(device.vendorId, device.deviceId,
-                                                    static_cast<std::uint16_t>(device.earlierEqual), location) == 0) {
-    place = {static_cast<std::uint8_t>(location >> 8U), static_cast<std::uint8_t>(location >> 3U & 31U),
-             static_cast<std::uint8_t>(location & 7U)};
-    count = place.size();
-  }
-  if (count == place.size()) {
-    device.bus = place[0];
-    device.device = place[1];
-    device.function = place[2];
+  std::uint16_t location = 0;
+  if (driver->FindPciDevice(device.vendorId, device.deviceId, static_cast<std::uint16_t>(device.earlierEqual),
+                            location) == 0) {
+    device.bus = static_cast<std::uint8_t>(location >> 8U);
+    device.device = static_cast<std::uint8_t>(location >> 3U & 31U);
+    device.function = static_cast<std::uint8_t>(location & 7U);
   }
 }
 

@@ -75,6 +75,7 @@ bool SetupDI::OpenDeviceList(std::string_view enumerator, std::uint32_t flags, s
   nextDevice = 0;
   childCount = 0;
   nextInterface = 0;
+  currentInterface.reset();
   return true;
 }
 
@@ -85,27 +86,30 @@ bool SetupDI::NextDevice() {
   return found.has_value();
 }
 
-bool SetupDI::NextInterface() { return deviceInfoSet && deviceInfoSet->Interface(nextInterface++).has_value(); }
+bool SetupDI::NextInterface() {
+  const std::optional<platform::DeviceInterface> found =
+      deviceInfoSet ? deviceInfoSet->Interface(nextInterface++) : std::nullopt;
+  currentInterface = found ? found : currentInterface;
+  return found.has_value();
+}
 
 std::string SetupDI::GetInterfaceDevicePath(std::string_view instanceId, std::string_view interfaceClass) {
-  nextInterface = 1;
   deviceInfoSet = Tree().Open(instanceId, platform::kPresentDevices | platform::kDeviceInterfaces, interfaceClass);
+  nextInterface = 0;
+  currentInterface.reset();
+  NextInterface();
   return PathOfCurrentInterface();
 }
 
 std::string SetupDI::GetInterfaceDevicePath() { return PathOfCurrentInterface(); }
 
 std::string SetupDI::PathOfCurrentInterface() {
-  if (!deviceInfoSet || nextInterface == 0) {
+  if (!currentInterface) {
     return {};
   }
-  const std::optional<platform::DeviceInterface> found = deviceInfoSet->Interface(nextInterface - 1);
-  if (!found) {
-    return {};
-  }
-  devNode = found->device;
-  deviceInfoData = found->device;
-  return found->path;
+  devNode = currentInterface->device;
+  deviceInfoData = currentInterface->device;
+  return currentInterface->path;
 }
 
 // ---- properties
@@ -151,8 +155,8 @@ bool SetupDI::FindPciDevice(std::uint16_t vendorId, std::uint16_t deviceId, std:
   while (NextDevice()) {
     if (ReadDeviceProperty(platform::kHardwareIdProperty, buffer, size, type) &&
         TextIn(std::span(buffer).first(size)).find(wanted.data()) != std::string_view::npos) {
-      ReadDeviceProperty(platform::kDescriptionProperty, buffer, size, type);
-      deviceDescription = TextIn(buffer);
+      const bool isDescribed = ReadDeviceProperty(platform::kDescriptionProperty, buffer, size, type);
+      deviceDescription = TextIn(isDescribed ? std::span(buffer).first(size) : std::span(buffer));
       return true;
     }
   }

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -54,7 +55,7 @@ class SetupDI {
   /// Copies a property of the node; its length, or 0 when it has none or there is not the room.
   std::uint32_t ReadNodeProperty(std::uint32_t property, std::span<std::uint8_t> buffer, std::uint32_t& type) const;
 
-  /// Copies a property of the list's present device. `size`: its length. A `type` of 0 takes that of the property.
+  /// Copies a property of the list's present device. `size`: its length. `type`: that of the property.
   bool ReadDeviceProperty(std::uint32_t property, std::span<std::uint8_t> buffer, std::uint32_t& size,
                           std::uint32_t& type);
 
@@ -72,6 +73,7 @@ class SetupDI {
   int childCount = 0;
   platform::DeviceNode lastChild = 0;
   std::uint32_t nextInterface = 0;
+  std::optional<platform::DeviceInterface> currentInterface;  // found last
 };
 
 }  // namespace panelglow

@@ -53,10 +53,12 @@ std::vector<std::string> getCntrlListForHDD(const std::string& selection, const 
     named += (named.empty() ? "" : ", ") + (name.empty() ? "one without a name" : "\"" + name + "\"");
   }
   if (ids.empty()) {
-    Notices::Tell("No drive LED is tested: of the controllers that \"" + selection + "\" selects none has a disk. " +
-                  (named.empty() ? "No other has one either"
-                                 : "Those with a disk, by their names in " + massStorageIni + ": " + named) +
-                  ".");
+    Notices::Tell(named.empty() ? "No drive LED is tested: no storage controller has a disk."
+                                : "No drive LED is tested: \"" + selection +
+                                      "\" names no controller with a disk. Those with one, by their names in " +
+                                      massStorageIni + ": " + named +
+                                      "; a name counts as it is spelled there, and XML files can only name those "
+                                      "without capitals.");
   }
   return ids;
 }

@@ -229,7 +229,8 @@ void ControllerSection::TellWhatIsOdd(FileParser& parser, int entry, const std::
 }
 
 void ControllerSection::TellOfLine(int entry, const std::string& line, const std::string& what) const {
-  TellOfSection("its line " + CDMUtil::ToString(entry) + ", " + line.substr(0, kLongestQuotation) + ", " + what);
+  TellOfSection("its line " + CDMUtil::ToString(entry) + " (comments and blank lines not counted), " +
+                line.substr(0, kLongestQuotation) + ", " + what);
 }
 
 void ControllerSection::TellOfSection(const std::string& what) const {

@@ -6,6 +6,7 @@
 #include <limits>
 #include <map>
 #include <memory>
+#include <set>
 #include <string_view>
 #include <utility>
 
@@ -30,6 +31,7 @@ struct Knowledge {
   int nextControllerIndex = 0;
   MSUtils::UsedScsiPorts usedScsiPorts;
   bool firstLoad = true;
+  std::set<std::pair<std::string, std::string>> barren;  // files and sections that hold nothing of this machine
 
   HDD_CTRL_INFO* Add(CTRL_INFO record) {
     HDD_CTRL_INFO& added = controllers.emplace_back();
@@ -157,6 +159,22 @@ void Discover(const wstring& tableName, const wstring& className, const std::str
 
 }  // namespace
 
+// Fills what the process knows from the file, unless it has been found to hold nothing of this machine: then a
+// further row of the management service is not worth another reading.
+void MSUtils::LoadKnown(const std::string& iniPath, std::initializer_list<const char*> sections) {
+  if (!Known().controllers.empty() || Known().barren.count({iniPath, *sections.begin()}) != 0) {
+    return;
+  }
+  std::list<CTRL_INFO> loaded;
+  for (const char* section : sections) {
+    LoadInfoForControllersInSystem(loaded, iniPath, section, std::string_view(section) != kSasSection);
+  }
+  if (loaded.empty()) {
+    Known().barren.insert({iniPath, *sections.begin()});
+  }
+  CopyControllerListInfo(std::move(loaded));
+}
+
 void MSUtils::LoadInfoForControllersInSystem(std::list<CTRL_INFO>& out, const std::string& iniPath,
                                              const std::string& section, bool sataFlag,
                                              std::vector<std::string>* warnings) {
@@ -189,12 +207,7 @@ void MSUtils::DiscoverInfoListSCSIController(const std::string& iniPath, WMIDisc
 HDD_CTRL_INFO* MSUtils::LookupController(std::uint32_t vendorId, std::uint32_t deviceId, std::uint32_t subDeviceId,
                                          std::uint32_t subVendorId, const std::string& iniPath) {
   if (!iniPath.empty()) {
-    if (Known().controllers.empty()) {
-      std::list<CTRL_INFO> loaded;
-      LoadInfoForControllersInSystem(loaded, iniPath, kSataSection, true);
-      LoadInfoForControllersInSystem(loaded, iniPath, kSasSection, false);
-      CopyControllerListInfo(loaded);
-    }
+    LoadKnown(iniPath, {kSataSection, kSasSection});
     if (HDD_CTRL_INFO* known = Find(Known().byIds, ControllerIds{vendorId, deviceId, subVendorId, subDeviceId})) {
       return known;
     }
@@ -205,11 +218,7 @@ HDD_CTRL_INFO* MSUtils::LookupController(std::uint32_t vendorId, std::uint32_t d
 HDD_CTRL_INFO* MSUtils::LookupNvsController(std::uint32_t vendorId, std::uint32_t deviceId,
                                             const std::string& /*productText*/, const std::string& iniPath) {
   if (!iniPath.empty()) {
-    if (Known().controllers.empty()) {
-      std::list<CTRL_INFO> loaded;
-      LoadInfoForControllersInSystem(loaded, iniPath, kNvsSection, true);
-      CopyControllerListInfo(loaded);
-    }
+    LoadKnown(iniPath, {kNvsSection});
     if (HDD_CTRL_INFO* known = Find(Known().byVendorAndDevice, std::pair(vendorId, deviceId))) {
       return known;
     }

@@ -3,6 +3,7 @@
 // The lists behind it belong to the process and have no lock: one thread fills them, before any worker starts.
 #pragma once
 
+#include <initializer_list>
 #include <list>
 #include <string>
 #include <utility>
@@ -15,8 +16,6 @@ namespace panelglow {
 
 class MSUtils {
  public:
-  virtual ~MSUtils() = default;
-
   /// Appends the controllers of a section of the INI file that are in this machine, in file order. Throws a
   /// CDMException (990294) for a section that is missing, empty or holds the key "ENTRY0", and the integers and
   /// strings of the parsers and the management service. `warnings` takes the log lines that were written.
@@ -54,6 +53,9 @@ class MSUtils {
 
   /// Forgets what the process knows; for one that runs several machines, as tests do.
   static void Forget();
+
+ private:
+  static void LoadKnown(const std::string& iniPath, std::initializer_list<const char*> sections);
 };
 
 }  // namespace panelglow

@@ -8,6 +8,7 @@
 #include <string>
 
 #include "harness/base/CDMException.h"
+#include "storage/ControllerSection.h"
 #include "storage/MSUtils.h"
 #include "storage/StandIn.h"
 
@@ -185,9 +186,12 @@ TEST(ControllerSection, OfAFileThatCannotBeUsedIsRefusedByName) {
       {"[SATA CONTROLLERS]\n1,2,3,4,scsi,x\nentry0 = y\n", refused, "ENTRY0"},
       {"[SATA CONTROLLERS]\n" + std::string(1U << 20U, '\n') + "1,2,3,4,scsi,x\n", "", nullptr},
       {"[SATA CONTROLLERS]\n" + std::string(1U << 20U, 'x') + "\n", "thrown -1", "longer than can be read"},
-      {"[SATA CONTROLLERS]\n1,2,3,4,scsi,x\n1,\"2\n", "thrown -1", "line 2, 1,\"2, has a quotation mark"},
-      {"[SATA CONTROLLERS]\n1,2,3,4,scsi,x\n1,2,3\n", "", "line 2, 1,2,3, has 3 fields and needs 6"},
-      {"[SATA CONTROLLERS]\n1,0x2G,3,4,scsi,x\n", "", "line 1, 1,0x2G,3,4,scsi,x, has \"0x2G\" where a number"},
+      {"[SATA CONTROLLERS]\n1,2,3,4,scsi,x\n1,\"2\n", "thrown -1",
+       "line 2 (comments and blank lines not counted), 1,\"2, has a quotation mark"},
+      {"[SATA CONTROLLERS]\n1,2,3,4,scsi,x\n1,2,3\n", "",
+       "line 2 (comments and blank lines not counted), 1,2,3, has 3 fields and needs 6"},
+      {"[SATA CONTROLLERS]\n1,0x2G,3,4,scsi,x\n", "",
+       "line 1 (comments and blank lines not counted), 1,0x2G,3,4,scsi,x, has \"0x2G\" where a number"},
       {"[SATA CONTROLLERS]\n1,2,3,65536,scsi,x\n", "", "\"65536\" where a number of 16 bits"},
       {"[SATA CONTROLLERS]\n1,2,3,-4,scsi,x\n", "", "\"-4\" where a number of 16 bits"},
   };
@@ -256,6 +260,20 @@ TEST(ControllerSection, ReadsItsFileAFixedNumberOfTimes) {
     return profiles.calls;
   };
   EXPECT_EQ(calls(400), calls(3));
+
+  // Nor on how many controllers of the machine it does not know, where it knows none.
+  const auto callsOf = [](std::uint32_t unknown) {
+    Machine machine("", "[SATA CONTROLLERS]\n1,2,3,4,x,y\n[SAS CONTROLLERS]\n1,2,3,5,x,y\n[" +
+                            std::string(panelglow::kNvsSection) + "]\n1,2,z,x,y\n");
+    CountedProfiles profiles(machine.sim.TheMachine().profiles);
+    machine.Use({.profiles = &profiles});
+    for (std::uint32_t device = 0; device < unknown; ++device) {
+      EXPECT_EQ(MSUtils::LookupController(9, device, 9, 9, "msctrl.ini"), nullptr);
+      EXPECT_EQ(MSUtils::LookupNvsController(9, device, "z", "msctrl.ini"), nullptr);
+    }
+    return profiles.calls;
+  };
+  EXPECT_EQ(callsOf(20), callsOf(1));
 }
 
 TEST(ControllerSection, IsRefusedByItsWorkFileWhenNothingIsFoundThere) {

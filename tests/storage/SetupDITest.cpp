@@ -90,8 +90,8 @@ TEST_F(SetupDITest, WalksListsOfDevicesAndOfInterfaces) {
   EXPECT_TRUE(list.NextInterface());
   EXPECT_EQ(list.GetInterfaceDevicePath(), "second");
   EXPECT_FALSE(list.NextInterface());
-  EXPECT_EQ(list.GetInterfaceDevicePath(), "");
-  EXPECT_TRUE(list.OpenDeviceList("PCI", 6, ""));  // begins anew
+  EXPECT_EQ(list.GetInterfaceDevicePath(), "second");  // found last
+  EXPECT_TRUE(list.OpenDeviceList("PCI", 6, ""));      // begins anew
   EXPECT_TRUE(list.NextDevice());
   EXPECT_EQ(list.GetDevNode(), last - 1);
   EXPECT_THAT(tree_.calls, ElementsAre("open PCI 6 ", "open  18 {class}", "open PCI 6 "));

@@ -13,7 +13,10 @@ constexpr std::uint8_t kButtonIsLatched = 0x01;  // of the control byte
 void PowerButton::Save() { savedControl = devio->InportByte(ports.control); }
 
 void PowerButton::Arm() {
-  const auto control = static_cast<std::uint8_t>((savedControl & ~kButtonOverride) | kButtonIsLatched);
+  if (!savedControl) {
+    Save();
+  }
+  const auto control = static_cast<std::uint8_t>((*savedControl & ~kButtonOverride) | kButtonIsLatched);
   devio->OutportByte(ports.control, control);
   savedEnable = devio->InportWord(ports.enable);
   devio->OutportWord(ports.enable, 0);
@@ -23,9 +26,13 @@ void PowerButton::Arm() {
 bool PowerButton::IsPressed() const { return (devio->InportByte(ports.status) & kPressed) != 0; }
 
 void PowerButton::Restore() const {
-  devio->OutportByte(ports.status, kPressed);
-  devio->OutportWord(ports.enable, savedEnable);
-  devio->OutportByte(ports.control, savedControl);
+  if (savedEnable) {
+    devio->OutportByte(ports.status, kPressed);
+    devio->OutportWord(ports.enable, *savedEnable);
+  }
+  if (savedControl) {
+    devio->OutportByte(ports.control, *savedControl);
+  }
 }
 
 }  // namespace panelglow

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 
 #include "hw/CDevio.h"
 
@@ -22,13 +23,15 @@ class PowerButton {
   void Save();
   void Arm();
   [[nodiscard]] bool IsPressed() const;
+
+  /// Puts back what was kept; what was not is left alone.
   void Restore() const;
 
  private:
   CDevio* devio;
   PowerButtonPorts ports;
-  std::uint8_t savedControl = 0;  // as Save found it
-  std::uint16_t savedEnable = 0;  // as Arm found it
+  std::optional<std::uint8_t> savedControl;  // as Save found it
+  std::optional<std::uint16_t> savedEnable;  // as Arm found it
 };
 
 }  // namespace panelglow

@@ -20,19 +20,25 @@ bool PowerEventButton::Arm() {
     devio->OutportWord(EnablePort(), devio->InportWord(EnablePort()) & kNoEvents);
     return true;
   }
-  devio->OutportWord(EnablePort(), savedEnable & kNoEvents);
-  return devio->InportWord(EnablePort()) != savedEnable;
+  if (!savedEnable) {
+    Save();
+  }
+  devio->OutportWord(EnablePort(), *savedEnable & kNoEvents);
+  return devio->InportWord(EnablePort()) != *savedEnable;
 }
 
 bool PowerEventButton::IsPressed() const { return (devio->InportWord(base) & kPressed) != 0; }
 
 bool PowerEventButton::Restore() const {
+  if (!savedEnable) {
+    return false;
+  }
   devio->OutportWord(base, kPressed);
-  devio->OutportWord(EnablePort(), savedEnable);
+  devio->OutportWord(EnablePort(), *savedEnable);
   if (check == Check::kNone) {
     return true;
   }
-  for (int read = 1; devio->InportWord(EnablePort()) != savedEnable; ++read) {
+  for (int read = 1; devio->InportWord(EnablePort()) != *savedEnable; ++read) {
     if (read == kMostReads) {
       return false;
     }

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 
 #include "hw/CDevio.h"
 
@@ -22,7 +23,8 @@ class PowerEventButton {
   bool Arm();
   [[nodiscard]] bool IsPressed() const;
 
-  /// False when the enable word does not read as saved within three reads, 100 ms apart.
+  /// False, and nothing is done, without a save; false when the enable word does not read as saved within three
+  /// reads, 100 ms apart.
   bool Restore() const;
 
  private:
@@ -31,7 +33,7 @@ class PowerEventButton {
   CDevio* devio;
   std::uint16_t base;
   Check check;
-  std::uint16_t savedEnable = 0;
+  std::optional<std::uint16_t> savedEnable;
 };
 
 }  // namespace panelglow

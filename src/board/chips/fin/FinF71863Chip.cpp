@@ -28,6 +28,8 @@ std::optional<Steps> UnlessEmpty(const Steps& steps) { return steps.empty() ? st
 }  // namespace
 
 FinF71863Chip::FinF71863Chip() : FinChip("fin_f71863") {
+  ReadSelectKeys();
+  SetSelectLed();
   const Steps primary = ReadBlinkList("test.powerled.primary.data_blink", "0x2B:0x20,0x2A:0xC0");
   const Steps secondary = ReadBlinkList("test.powerled.secondary.data_blink", "0x2B:0x40,0x2A:0x30");
   led.saved.clear();
