@@ -6,6 +6,7 @@
 #include <stdexcept>
 #include <utility>
 
+#include "config/XmlCharacters.h"
 #include "harness/base/CDMUtil.h"
 
 namespace panelglow {
@@ -33,39 +34,6 @@ constexpr std::array<Entity, 8> kEntities{{{"&lt;", '<'},
                                            {"&#09;", '\t'},
                                            {"&#10;", '\n'},
                                            {"&#13;", '\r'}}};
-
-// Classes of the 256 byte values. Each of the last four is what a run of that kind cannot simply go over; NUL, which
-// stands behind the text, ends all of them.
-constexpr std::uint8_t kXmlCharacter = 1;  // 0x09, 0x0A, 0x0D, 0x20 to 0xFE
-constexpr std::uint8_t kNoNameStart = 2;   // a digit or a punctuation character
-constexpr std::uint8_t kStopsValue = 4;
-constexpr std::uint8_t kStopsText = 8;
-constexpr std::uint8_t kStopsTagName = 16;
-constexpr std::uint8_t kStopsAttributeName = 32;
-
-constexpr std::array<std::uint8_t, 256> MakeClasses() {
-  std::array<std::uint8_t, 256> classes{};
-  for (unsigned c = 0; c < 256; ++c) {
-    const auto isOneOf = [&](std::string_view set) {
-      return set.find(static_cast<char>(c)) != std::string_view::npos;
-    };
-    const bool letter = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z');
-    const bool xmlCharacter = isOneOf("\t\n\r") || (c >= 0x20 && c <= 0xFE);
-    const auto add = [&](std::uint8_t bit, bool wanted) {
-      classes[c] = static_cast<std::uint8_t>(classes[c] | (wanted ? bit : 0U));
-    };
-    add(kXmlCharacter, xmlCharacter);
-    add(kNoNameStart, c > 0x20 && c < 0x7F && !letter);
-    add(kStopsValue, isOneOf("<>-&\"'") || !xmlCharacter);
-    add(kStopsText, isOneOf("<>-") || c == 0);
-    add(kStopsTagName, isOneOf("<>-/ \t\n\r") || c == 0);
-    add(kStopsAttributeName, isOneOf("<>-= \t\n\r") || c == 0);
-  }
-  return classes;
-}
-constexpr std::array<std::uint8_t, 256> kClasses = MakeClasses();
-
-constexpr bool Is(char c, std::uint8_t wanted) { return (kClasses[static_cast<std::uint8_t>(c)] & wanted) != 0; }
 
 constexpr bool MayBeCommentMark(char c) { return c == '<' || c == '-'; }
 
@@ -103,11 +71,6 @@ std::string DecodeXmlEntities(std::string_view text) {
   }
   decoded += text.substr(at);
   return decoded;
-}
-
-std::string_view XmlCharactersOf(std::string_view text) {
-  const auto bad = std::find_if(text.begin(), text.end(), [](char c) { return !Is(c, kXmlCharacter); });
-  return text.substr(0, static_cast<std::size_t>(bad - text.begin()));
 }
 
 XmlParser::XmlParser(const std::string& text, bool lenient) : text_(text.c_str()), lenient_(lenient) {}
@@ -267,7 +230,7 @@ void XmlParser::ParseName() {
   if (AtEnd()) {
     Fail("Missing end tag: " + std::string(name));
   }
-  if (name.empty() || Is(name.front(), kNoNameStart)) {
+  if (name.empty() || HasXmlClass(name.front(), kNoNameStart)) {
     Fail(IsXmlSpace(Here()) ? "Invalid tag name: " + std::string(name) : "Invalid tag name");
   }
   Innermost().name = name;
@@ -286,7 +249,7 @@ void XmlParser::ParseAttribute() {
     return;
   }
   const std::string_view name = text_.substr(begin, position_ - begin);
-  if (!lenient_ && (name.empty() || Is(name.front(), kNoNameStart))) {
+  if (!lenient_ && (name.empty() || HasXmlClass(name.front(), kNoNameStart))) {
     Fail("Invalid attribute name: " + std::string(name));
   }
   SkipBlanks();
@@ -324,7 +287,7 @@ void XmlParser::ParseAttribute() {
       hasComments = true;
       continue;
     }
-    encoded = encoded || c == '&' || !Is(c, kXmlCharacter);
+    encoded = encoded || c == '&' || !HasXmlClass(c, kXmlCharacter);
     ++position_;
   }
   std::string_view value = text_.substr(valueBegin, position_ - valueBegin);

@@ -97,9 +97,6 @@ class XmlParser {
 /// Replaces the known entities by their characters, from left to right; any other "&" stays.
 std::string DecodeXmlEntities(std::string_view text);
 
-/// The part of `text` before its first byte that is no XML character.
-std::string_view XmlCharactersOf(std::string_view text);
-
 /// White space in the parser's sense.
 constexpr bool IsXmlSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; }
 

@@ -28,6 +28,10 @@ class SuperDialog {
   void CreateSuperDialog();
 
  private:
+  // Command ids of the dialog itself.
+  static constexpr std::uint32_t kLeaveCommand = 998;
+  static constexpr std::uint32_t kNextCommand = 1000;  // of the start button too
+
   std::intptr_t CustomLEDDlgProc(const platform::Message& message);
   void CustomTimerProc(platform::WindowHandle window);
   void BeginTest(platform::WindowHandle window);

@@ -62,6 +62,9 @@ class PromptWindow {
   int Run();
 
  private:
+  static constexpr std::uint32_t kTick_ms = 10;  // of the count-down, and of looking after the window
+  static constexpr int kImageFormHeight = 300;   // of one without an image, and the least; pixels
+
   struct Button {
     int result;
     platform::WindowHandle window;
