@@ -85,7 +85,7 @@ bool XmlParser::SkipElement() { return Parse(false); }
 
 inline void XmlParser::RunTo(std::uint8_t stops) {
   const char* here = text_.data() + position_;
-  while (!Is(*here, stops)) {
+  while (!HasXmlClass(*here, stops)) {
     ++here;
   }
   position_ = static_cast<std::size_t>(here - text_.data());
