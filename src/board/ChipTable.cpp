@@ -29,9 +29,11 @@
 #include "board/chips/ite/Ite8758Chip.h"
 #include "board/chips/ite/Ite8772Chip.h"
 #include "board/chips/ite/IteChip.h"
+#include "board/chips/sensor/AcpiChip.h"
 #include "board/chips/sensor/AdtChip.h"
 #include "board/chips/sensor/AdtSio11Chip.h"
 #include "board/chips/sensor/SmbusDeviceChip.h"
+#include "board/chips/sensor/VideoChip.h"
 #include "board/chips/sio/SioChip.h"
 #include "board/chips/sio/Smsc5407Chip.h"
 #include "board/chips/sio/SmscSch5327bChip.h"
@@ -65,7 +67,7 @@ constexpr ChipRow kRows[] = {
     {1, "chip", Make<Chip>},
     {2, "adt", Make<AdtChip>},
     {3, "adt_sio11", Make<AdtSio11Chip>},
-    {4, "acpi", nullptr},
+    {4, "acpi", Make<AcpiChip>},
     {5, "casl", Make<CaslChip>},
     {6, "ec", Make<EcChip>},
     {7, "ec_wpc8763", Make<EcWpc8763Chip>},
@@ -106,7 +108,7 @@ constexpr ChipRow kRows[] = {
     {39, "g_sio", Make<GSioChip>},
     {40, "g_ec_it8519", Make<GEcIt8519Chip>},
     {40, "g_ec", Make<GEcChip>},
-    {41, "videochip", nullptr},
+    {41, "videochip", Make<VideoChip>},
     {42, "smsc_mec1322", Make<SmscMec1322Chip>},
     {43, "smsc_kbc1126", Make<SmscKbc1126Chip>},
     {44, "g_iospace", Make<GIoSpaceChip>},

@@ -14,7 +14,7 @@ namespace panelglow {
 
 inline constexpr std::size_t kChipPlaces = 46;
 
-/// Builds one chip class; null for a class that this program does not have yet: its place holds the chip "none".
+/// Builds one chip class.
 using ChipFactory = std::unique_ptr<Chip> (*)();
 
 struct ChipRow {

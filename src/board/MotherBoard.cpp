@@ -15,8 +15,8 @@
 #include "board/Sb7Sch5.h"
 #include "board/Thicket.h"
 #include "board/base/IniReader.h"
-#include "board/base/NotBuiltException.h"
 #include "board/base/SelectedSystem.h"
+#include "board/base/mblib_exception.h"
 #include "board/chips/NoneChip.h"
 #include "board/parts/Bits.h"
 #include "harness/base/CDMException.h"
@@ -69,14 +69,6 @@ constexpr std::uint16_t kSaddleId = 0x2A78;  // of the "Lantern" boards the one 
 
 constexpr const char* kLegacyPorts =
     "a test that knows the ports of the oldest desktops uses them for power and drive";
-
-// `what` is named by `setting` and cannot be had.
-[[noreturn]] void RefuseNotBuilt(const std::string& what, const Setting& setting, const std::string& served) {
-  const std::string text = setting.place + ": " + what + " \"" + setting.text +
-                           "\" is not built into this version, which cannot drive " + served;
-  Notices::Tell(text + ".");
-  throw NotBuiltException(text);
-}
 
 // A name as it is compared, with its place.
 Setting ReadName(const std::string& key, const std::string& defaultValue) {
@@ -183,7 +175,7 @@ MotherBoard::MotherBoard(std::string boardClass, std::uint16_t boardId)
 }
 
 void MotherBoard::Place(std::string_view chipName) {
-  if (const ChipRow* row = FindChipRow(chipName); row != nullptr && row->make != nullptr) {
+  if (const ChipRow* row = FindChipRow(chipName); row != nullptr) {
     chips[row->place - 1] = row->make();
   }
 }
@@ -197,11 +189,8 @@ MotherBoard::MotherBoard(const std::string& systemIdText) : MotherBoard("generic
   }
   CDMUtil::Split(list.text, listed, ", ");
   for (const std::string& name : listed) {
-    const ChipRow* row = FindChipRow(name);
-    if (row == nullptr && name != kNoChip) {
+    if (FindChipRow(name) == nullptr && name != kNoChip) {
       TellOf(list, "there is no chip \"" + name + "\"");
-    } else if (row != nullptr && row->make == nullptr) {
-      TellOf(list, "the chip \"" + name + "\" is not built into this version; what it serves is not there");
     }
   }
   BuildListedChips();
@@ -261,43 +250,13 @@ void MotherBoard::BuildAllChips() {
 
 Chip& MotherBoard::ChipOf(ChipChoice& choice) {
   if (choice.chip == nullptr) {
-    Setting name(choice.name);
     choice.isPreset = !choice.name.empty();
     if (!choice.isPreset) {
-      name = ReadName(choice.key, "");
+      choice.name = ReadName(choice.key, "").text;
     }
-    const ChipRow* row = FindChipRow(name.text);
-    const bool isWanted = listed.empty() || std::find(listed.begin(), listed.end(), name.text) != listed.end();
-    if (row != nullptr && row->make == nullptr && isWanted) {
-      RefuseNotBuilt("the chip", name, std::string("the ") + choice.what);
-    }
-    choice.name = name.text;
     choice.chip = &GetChip(choice.name);
   }
   return *choice.chip;
-}
-
-void MotherBoard::RequireDrivable(Led led) {
-  switch (led) {
-    case Led::kPower:
-      ChipOf(powerLed);
-      break;
-    case Led::kCharge:
-      ChipOf(chargeLed);
-      break;
-    case Led::kHd:
-      ChipOf(hdLed);
-      break;
-    case Led::kWireless:
-      ChipOf(wirelessLed);
-      break;
-    case Led::kSpeaker:
-      ChipOf(speakerLed);
-      break;
-    case Led::kMicrophone:
-      ChipOf(microphoneLed);
-      break;
-  }
 }
 
 std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {

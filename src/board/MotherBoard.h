@@ -44,13 +44,6 @@ class MotherBoard {
   [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
   [[nodiscard]] const std::string& GetClassName() const { return className; }
 
-  /// The LEDs of the panel that are the board's.
-  enum class Led { kPower, kCharge, kHd, kWireless, kSpeaker, kMicrophone };
-
-  /// Throws NotBuiltException when the files give the LED to a chip that this version does not have: nobody can light
-  /// it, and its darkness is not the panel's fault. To be asked before the LED's test; the operations throw the same.
-  void RequireDrivable(Led led);
-
   // ---- LED operations. False: the board has no such LED; that an LED cannot be lit or darkened is told to people. A
   // blink that returns true has set the chip to blink the LED by itself; otherwise the caller toggles. Save and
   // restore must come on the same board.

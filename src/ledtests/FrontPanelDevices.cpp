@@ -21,34 +21,6 @@ bool IsSupported(MotherBoard* board, bool (MotherBoard::*question)(bool&)) {
   return board != nullptr && (board->*question)(supported) && supported;
 }
 
-struct BoardLed {
-  std::string_view function;
-  MotherBoard::Led led;
-};
-constexpr BoardLed kBoardLeds[] = {{"hdred", MotherBoard::Led::kHd},
-                                   {"powerred", MotherBoard::Led::kPower},
-                                   {"powergreen", MotherBoard::Led::kPower},
-                                   {"speakermute", MotherBoard::Led::kSpeaker},
-                                   {"microphone", MotherBoard::Led::kMicrophone},
-                                   {"microphone", MotherBoard::Led::kSpeaker},  // keeps its state
-                                   {"chargered", MotherBoard::Led::kCharge},
-                                   {"chargegreen", MotherBoard::Led::kCharge}};
-
-// Ends the run where the board's files give the LED to a chip that this version cannot drive: its darkness would be
-// blamed on the panel. A LED that the worker drives by other means needs no chip.
-void RequireDrivable(MotherBoard* board, std::string_view function) {
-  for (const BoardLed& row : kBoardLeds) {
-    const bool isByLegacyPorts = row.led == MotherBoard::Led::kPower && board != nullptr && board->IsPanelLedLegacy();
-    if (board != nullptr && row.function == function && !isByLegacyPorts) {
-      board->RequireDrivable(row.led);
-    }
-  }
-  bool isWireless = false;
-  if (function == "network" && board != nullptr && board->IsWirelessLedSupported(isWireless) && isWireless) {
-    board->RequireDrivable(MotherBoard::Led::kWireless);
-  }
-}
-
 }  // namespace
 
 void FrontPanelTest::BeginArray() {
@@ -81,7 +53,6 @@ void FrontPanelTest::AddDevice(std::int32_t deviceId, std::uint8_t address, cons
 void FrontPanelTest::AddDevice(const ArrayRow& row, MotherBoard* board) {
   const LedKind* const kind = FindLedKindByFunction(row.function);
   if (kind != nullptr && IsSupported(board, row.question)) {
-    RequireDrivable(board, row.function);
     const bool isDrive = kind->deviceId == kHdRed || kind->deviceId == kIdeDrive || kind->deviceId == kScsiDrive;
     AddDevice(kind->deviceId, isDrive ? std::uint8_t{0} : static_cast<std::uint8_t>(kind->deviceId), "");
   }

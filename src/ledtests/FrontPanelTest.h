@@ -158,8 +158,7 @@ class FrontPanelTest : public CDMDiag {
 
   void BeginArray();
   void AddDevice(std::int32_t deviceId, std::uint8_t address, const std::string& controllerId);
-  /// The entry of a row, when the board has such a LED. Throws NotBuiltException where its chip is not in this
-  /// version.
+  /// The entry of a row, when the board has such a LED.
   void AddDevice(const ArrayRow& row, MotherBoard* board);
   /// One entry for each controller.
   void AddDrives(const std::vector<std::string>& controllers);

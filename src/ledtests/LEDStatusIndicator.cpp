@@ -67,7 +67,6 @@ bool LEDStatusIndicator::Run() {
     throw failure.release();  // owned by whoever catches it
   }
   {
-    board->RequireDrivable(MotherBoard::Led::kPower);
     const PutBack restore([&] { board->RestorePowerLedState(); });
     board->SavePowerLedState();
     const std::time_t begin = clock.WallTime();

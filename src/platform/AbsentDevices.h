@@ -38,6 +38,9 @@ class AbsentDevices : public DeviceTree,
   std::unique_ptr<ConnectionList> Enumerate() override { return nullptr; }
   std::unique_ptr<RegistryKey> OpenMachineKey(std::string_view /*path*/) override { return nullptr; }
   bool CanLoad(std::string_view /*file*/) override { return false; }
+  std::unique_ptr<GraphicsLibrary> LoadGraphics(std::string_view /*file*/, GraphicsInterface /*interface*/) override {
+    return nullptr;
+  }
 };
 
 }  // namespace panelglow::platform

@@ -21,6 +21,13 @@ class Cpu {
 
   /// True on a 64-bit system: the driver then takes the wide memory requests and the 64-bit driver binary.
   virtual bool Is64BitSystem() = 0;
+
+  /// The logical processors that the calling thread may run on, a bit each; 0 when the system does not tell.
+  virtual std::uint64_t Affinity() = 0;
+
+  /// Lets the calling thread, or all of the process with it, run on these alone from now on. False when the system
+  /// refuses, as it does for a mask without a processor that there is.
+  virtual bool SetAffinity(std::uint64_t mask) = 0;
 };
 
 }  // namespace panelglow::platform

@@ -7,7 +7,6 @@
 #include <set>
 
 #include "board/BoardBench.h"
-#include "board/base/NotBuiltException.h"
 #include "board/base/SelectedSystem.h"
 #include "board/base/mblib_exception.h"
 #include "harness/base/CDMException.h"
@@ -27,12 +26,10 @@ TEST(ChipTable, EveryNameIsUniqueAndLeadsToItsOwnPlace) {
     EXPECT_TRUE(names.insert(row.name).second) << row.name;
     EXPECT_EQ(ChipPlaceOf(row.name), row.place) << row.name;
     places.insert(row.place);
-    if (row.make != nullptr) {
-      BoardBench bench;
-      bench.SetFiles("[Common]\nchip.codec.hdabar=0xFE5C0000\n", "", "");
-      IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
-      EXPECT_EQ(row.make()->GetName(), row.name);
-    }
+    BoardBench bench;
+    bench.SetFiles("[Common]\nchip.codec.hdabar=0xFE5C0000\n", "", "");
+    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+    EXPECT_EQ(row.make()->GetName(), row.name);
   }
   EXPECT_EQ(places.size(), kChipPlaces);
   EXPECT_EQ(*places.rbegin(), kChipPlaces);
@@ -208,18 +205,13 @@ TEST(MotherBoard, TheSmallClassesHaveTheirOwnChipsAndPowerLed) {
     ASSERT_NE(board, nullptr);
     EXPECT_EQ(board->GetClassName(), c.name);
     for (const ChipRow& row : ChipRows()) {
-      const bool wanted = std::count(c.chips.begin(), c.chips.end(), row.name) != 0 && row.name != "acpi";
+      const bool wanted = std::count(c.chips.begin(), c.chips.end(), row.name) != 0;
       EXPECT_EQ(board->GetChip(std::string(row.name)).GetName(), wanted ? row.name : "none") << row.name;
     }
     Notices::Forget();
     bench.machine.ClearOutput();
-    std::string asked;
-    try {
-      board->AssertPowerLedGreen();
-      asked = bench.machine.Errors();
-    } catch (const NotBuiltException& refused) {
-      asked = refused.what();
-    }
+    board->AssertPowerLedGreen();
+    const std::string asked = bench.machine.Errors();
     if (*c.ledChip == '\0') {
       EXPECT_THAT(asked, ::testing::HasSubstr("\"g_iospace\""));
     } else {
@@ -315,32 +307,6 @@ TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
   SMBIOSDiscovery::Instance().productText = "7D10";
 }
 
-// What the board's files name and this version does not have is nothing for other hardware's code.
-TEST(MotherBoard, AChipThatIsNotBuiltIsNamedAndNothingIsDoneInItsPlace) {
-  BoardBench bench;
-  Notices::Forget();
-  SMBIOSDiscovery::Instance().productText = "7D10";
-  const auto refusal = [](auto action) -> std::string {
-    try {
-      action();
-    } catch (const NotBuiltException& refused) {
-      return refused.what();
-    }
-    return "none";
-  };
-  const std::string end = "is not built into this version, which cannot drive ";
-  bench.SetFiles("[7D10]\nplatform=generic\nchips=videochip,g_iospace\n",
-                 "[Common]\ntest.powerled.chip=VideoChip\ntest.hdled.chip=g_iospace\ntest.chargeled.chip=ich\n", "");
-  const std::unique_ptr<MotherBoard> board = BoardBench::Board();
-  const std::string noChip = refusal([&] { board->RequireDrivable(MotherBoard::Led::kPower); });
-  EXPECT_EQ(noChip, ".\\mbtest.ini, section [Common], key \"test.powerled.chip\": the chip \"videochip\" " + end +
-                        "the power LED");
-  EXPECT_EQ(refusal([&] { board->AssertPowerLedGreen(); }), noChip);
-  board->RequireDrivable(MotherBoard::Led::kHd);
-  board->RequireDrivable(MotherBoard::Led::kCharge);  // which no list holds: that is another mistake
-  board->RequireDrivable(MotherBoard::Led::kWireless);
-}
-
 TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
   struct Case {
     const char* detect;
@@ -360,10 +326,10 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
        "",
        {"system id is \"7D10\", and section [7D10] is in .\\mbtest.ini, not in .\\mbdetect.ini; without"}},
       {"[7D10]\nplatform=genric\n", "", "", {"key \"platform\": there is no board class \"genric\""}},
-      {"[7D10]\nchips=g_iospace,g_iospce,videochip\n",
+      {"[7D10]\nchips=g_iospace,g_iospce\n",
        "[7D10]\ntest.powerled.chip=g_iospace\n",
        lamp,
-       {"key \"chips\": there is no chip \"g_iospce\"", "key \"chips\": the chip \"videochip\" is not built"}},
+       {"key \"chips\": there is no chip \"g_iospce\""}},
       {generic,
        "",
        "",

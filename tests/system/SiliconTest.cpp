@@ -110,27 +110,6 @@ TEST(SystemSilicon, AWrongWordInTheIniFilesShowsOnThePanelOrInWhatIsLeftBehind) 
   }
 }
 
-// A LED that is given to a chip which this version cannot drive: nobody is blamed for its darkness.
-TEST(SystemSilicon, AChipThatIsNotBuiltEndsTheRunOfALedThatHangsOnIt) {
-  const std::pair<const char*, std::vector<std::string>> kRuns[] = {
-      {"test.powerled.chip=videochip", {"-subtest=CustomLEDTest", "-SectionID=Desktop"}},
-      {"test.powerled.chip=videochip", {"-subtest=LEDStatusIndicator", "-BlinkTime=1"}},
-      {"test.wirelessled.chip=videochip\ntest.wirelessled.support=yes", {"-subtest=LEDTest", "-NetworkLED=true"}},
-  };
-  for (const auto& [setting, arguments] : kRuns) {
-    const Installation installation;
-    installation.Write("mbdetect.ini", "[7D10]\nplatform=generic\nchips=g_iospace,videochip\n");
-    installation.Write("mbtest.ini", std::string("[7D10]\n") + setting + "\n");
-    const SimulatedRun run{installation.Machine("desktop.toml"), "perfect", 1, {}, arguments};
-    const Outcome outcome = run.In(installation);
-    SCOPED_TRACE(setting + outcome.output);
-    EXPECT_TRUE(outcome.IsOrderly());
-    EXPECT_THAT(outcome.Tagged("TestFailed"), ::testing::ElementsAre(HasSubstr("videochip")));
-    EXPECT_THAT(outcome.Tagged("ReportFailure"), IsEmpty());
-    EXPECT_EQ(outcome.TimesLit("power-green"), 0U);
-  }
-}
-
 // Standard error is for what is odd: a machine with its sections is not, a board without them is.
 TEST(SystemSilicon, AGoodRunTellsPeopleNothing) {
   const std::pair<const char*, const char*> kMachines[] = {

@@ -63,6 +63,9 @@ void ReadDriver(Section& section, DriverDescription& driver) {
   driver.startError = section.Get("start_error", driver.startError);
   driver.version = section.Get("version", driver.version);
   driver.registers = section.Addressed<std::uint32_t, std::uint64_t>("msr");
+  section.Each("core", [&](Section& core) {
+    driver.cores.push_back(core.Addressed<std::uint32_t, std::uint64_t>("msr"));
+  });
   driver.refused = section.Numbers<std::uint32_t>("refused");
   section.Each("service", [&](Section& service) {
     driver.services.push_back(
@@ -87,6 +90,7 @@ void ReadPci(Section& section, MachineDescription& machine) {
       function.registers[offset] = *value;
     }
   });
+  function.temperatures = section.Numbers<int>("temperatures");
   machine.pci.push_back(function);
 }
 

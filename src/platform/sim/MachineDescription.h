@@ -49,16 +49,18 @@ struct ServiceDescription {
 };
 
 struct DriverDescription {
-  bool present = true;                                    // the driver's binary is installed
-  bool olderSet = false;                                  // ... under the older names instead
-  bool link = true;                                       // its device link opens once the service runs
-  std::uint32_t managerError = 0;                         // error of opening the service manager
-  std::uint32_t createError = 0;                          // error of creating a service
-  std::uint32_t startError = 0;                           // error of every start, 0: by what is installed
-  std::uint32_t version = 0x04010305;                     // answer to the version request
-  std::vector<ServiceDescription> services;               // registered before the run
-  std::map<std::uint32_t, std::uint64_t> registers = {};  // model-specific ones of the processor, by index
-  std::vector<std::uint32_t> refused = {};                // requests, by code, that it reports as failed
+  bool present = true;                       // the driver's binary is installed
+  bool olderSet = false;                     // ... under the older names instead
+  bool link = true;                          // its device link opens once the service runs
+  std::uint32_t managerError = 0;            // error of opening the service manager
+  std::uint32_t createError = 0;             // error of creating a service
+  std::uint32_t startError = 0;              // error of every start, 0: by what is installed
+  std::uint32_t version = 0x04010305;        // answer to the version request
+  std::vector<ServiceDescription> services;  // registered before the run
+  using Registers = std::map<std::uint32_t, std::uint64_t>;
+  Registers registers = {};                 // model-specific ones of every core, by index
+  std::vector<Registers> cores = {};        // those that each core has for itself; none: it has one core
+  std::vector<std::uint32_t> refused = {};  // requests, by code, that it reports as failed
 };
 
 struct ProcessorDescription {

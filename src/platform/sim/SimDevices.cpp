@@ -28,7 +28,7 @@ SimDevices::SimDevices(const MachineDescription& machine, const DoorContext& con
       tree(inventory_, context.scheduler),
       tables(machine, isThere_),
       registry(machine, context.scheduler),
-      modules(machine.libraries, context.scheduler),
+      modules(machine, context.scheduler),
       disks(diskParts_, context),
       cameras(Attach<CameraDevice>(machine.cameras, context), context),
       connections(Attach<AdapterDevice>(machine.adapters, context), context) {}

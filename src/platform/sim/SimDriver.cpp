@@ -86,9 +86,14 @@ class SimDriver::LinkedDevice : public DriverDevice {
   SimDriver& driver_;
 };
 
-SimDriver::SimDriver(const DriverDescription& description, Buses& buses, Scheduler& scheduler, DriverTrace& trace,
-                     std::function<void()> moved)
-    : description_(description), buses_(buses), scheduler_(scheduler), trace_(trace), moved_(std::move(moved)) {
+SimDriver::SimDriver(const DriverDescription& description, const SimCpu& cpu, Buses& buses, Scheduler& scheduler,
+                     DriverTrace& trace, std::function<void()> moved)
+    : description_(description),
+      cpu_(cpu),
+      buses_(buses),
+      scheduler_(scheduler),
+      trace_(trace),
+      moved_(std::move(moved)) {
   for (const ServiceDescription& service : description.services) {
     services_[service.name] = {service.running, service.startError};
   }
@@ -244,19 +249,31 @@ std::uint32_t SimDriver::AnswerInPlace(std::uint32_t code, std::span<const std::
     case driver::kMapPhysicalMemory:
       return copied({driver::kMapSize32, driver::kMapSize64}) ? MapMemory(out) : kErrorInvalidParameter;
     case driver::kReadMsr: {
-      const auto found =
+      const std::optional<std::uint64_t> value =
           in.size() == driver::kMsrSize
-              ? description_.registers.find(static_cast<std::uint32_t>(NumberAt(in, driver::kMsrIndex, 4)))
-              : description_.registers.end();
-      if (found == description_.registers.end() || !copied({driver::kMsrSize})) {
+              ? ModelRegister(static_cast<std::uint32_t>(NumberAt(in, driver::kMsrIndex, 4)))
+              : std::nullopt;
+      if (!value || !copied({driver::kMsrSize})) {
         return kErrorInvalidParameter;
       }
-      PutNumber(out, 0, driver::kMsrSize, found->second);
+      PutNumber(out, 0, driver::kMsrSize, *value);
       return 0;
     }
     default:
       return kErrorInvalidFunction;
   }
+}
+
+// Of the core that asks.
+std::optional<std::uint64_t> SimDriver::ModelRegister(std::uint32_t index) const {
+  if (cpu_.Core() < description_.cores.size()) {
+    const DriverDescription::Registers& own = description_.cores[cpu_.Core()];
+    if (const auto found = own.find(index); found != own.end()) {
+      return found->second;
+    }
+  }
+  const auto found = description_.registers.find(index);
+  return found == description_.registers.end() ? std::nullopt : std::optional(found->second);
 }
 
 std::uint32_t SimDriver::AnswerPort(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {

@@ -5,6 +5,7 @@
 #include <functional>
 #include <map>
 #include <memory>
+#include <optional>
 #include <set>
 #include <string>
 
@@ -12,6 +13,7 @@
 #include "platform/ServiceManager.h"
 #include "platform/sim/DriverTrace.h"
 #include "platform/sim/MachineDescription.h"
+#include "platform/sim/SimCpu.h"
 #include "platform/sim/base/Scheduler.h"
 #include "platform/sim/silicon/Buses.h"
 
@@ -20,8 +22,8 @@ namespace panelglow::platform::sim {
 class SimDriver : public DriverDevices, public ServiceManager {
  public:
   /// `moved` is called after every access that may have moved a pin.
-  SimDriver(const DriverDescription& description, Buses& buses, Scheduler& scheduler, DriverTrace& trace,
-            std::function<void()> moved);
+  SimDriver(const DriverDescription& description, const SimCpu& cpu, Buses& buses, Scheduler& scheduler,
+            DriverTrace& trace, std::function<void()> moved);
   ~SimDriver() override;
 
   // ---- DriverDevices
@@ -57,7 +59,10 @@ class SimDriver : public DriverDevices, public ServiceManager {
   std::uint32_t AnswerFirmware(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out);
   [[nodiscard]] std::uint64_t PhysicalAddress(std::uint64_t mapped) const;
 
+  [[nodiscard]] std::optional<std::uint64_t> ModelRegister(std::uint32_t index) const;
+
   DriverDescription description_;
+  const SimCpu& cpu_;
   Buses& buses_;
   Scheduler& scheduler_;
   DriverTrace& trace_;

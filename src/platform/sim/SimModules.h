@@ -1,30 +1,24 @@
-// The libraries that are installed on a simulated machine.
+// The libraries that are installed on a simulated machine, and what those of graphics makers say of its cards.
 #pragma once
 
-#include <algorithm>
-#include <string>
-#include <vector>
+#include <memory>
+#include <string_view>
 
 #include "platform/Modules.h"
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/sim/MachineDescription.h"
 #include "platform/sim/base/Scheduler.h"
 
 namespace panelglow::platform::sim {
 
 class SimModules : public Modules {
  public:
-  SimModules(const std::vector<std::string>& libraries, Scheduler& scheduler)
-      : libraries_(libraries), scheduler_(scheduler) {}
+  SimModules(const MachineDescription& machine, Scheduler& scheduler) : machine_(machine), scheduler_(scheduler) {}
 
-  bool CanLoad(std::string_view file) override {
-    constexpr Microseconds kLoadCost_us = 500;
-    scheduler_.Spend(kLoadCost_us);
-    return std::any_of(libraries_.begin(), libraries_.end(),
-                       [file](const std::string& library) { return EqualNames(library, file); });
-  }
+  bool CanLoad(std::string_view file) override;
+  std::unique_ptr<GraphicsLibrary> LoadGraphics(std::string_view file, GraphicsInterface interface) override;
 
  private:
-  const std::vector<std::string>& libraries_;
+  const MachineDescription& machine_;
   Scheduler& scheduler_;
 };
 

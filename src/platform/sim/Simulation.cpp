@@ -59,14 +59,14 @@ struct Simulation::Parts {
                 const Device* found = buses.Find(device);
                 return found == nullptr ? std::optional<bool>() : found->Signal(pin);
               }),
-        driver(description.driver, buses, scheduler, trace, [this] { LookAtPanel(); }),
+        cpu(description),
+        driver(description.driver, cpu, buses, scheduler, trace, [this] { LookAtPanel(); }),
         management(description, devices.tables, scheduler, firmwareCall, [this] { LookAtPanel(); }),
         mutexes(scheduler, description.peers, options.realFiles),
         clock(scheduler, description.startTime + static_cast<std::time_t>(simulationOptions.seed * 7919 % 86400)),
         threads(scheduler),
         console(scheduler, simulationOptions.captureOutput),
         environment(description.environment),
-        cpu(description),
         keyboard(scheduler, buses, keyboardDevice, [this] { LookAtPanel(); }),
         touchpad(description.touchpad, scheduler, buses, keyboardDevice, [this] { LookAtPanel(); }),
         files(simulationOptions.realFiles ? &posixFiles : nullptr, scheduler),
@@ -183,6 +183,7 @@ struct Simulation::Parts {
   std::optional<Microseconds> awaited;  // the chips' next event, when one is ahead
   DriverTrace trace;
   FrontPanel panel;
+  SimCpu cpu;
   SimDriver driver;
   SimManagement management;
   SimMutexes mutexes;
@@ -190,7 +191,6 @@ struct Simulation::Parts {
   SimThreads threads;
   SimConsole console;
   SimEnvironment environment;
-  SimCpu cpu;
   SimKeyboard keyboard;
   SimTouchpad touchpad;
   posix::PosixFiles posixFiles;
@@ -313,7 +313,7 @@ const std::string& Simulation::Errors() const { return parts_->console.Errors();
 void Simulation::ClearOutput() { parts_->console.Clear(); }
 void Simulation::RefuseThreads(unsigned count) { parts_->threads.RefuseNext(count); }
 void Simulation::RaiseConsole(std::uint32_t type) { parts_->console.Raise(type); }
-std::string Simulation::HardwareState() { return parts_->buses.State(); }
+std::string Simulation::HardwareState() { return parts_->buses.State() + parts_->cpu.State(); }
 std::string Simulation::SettledState() {
   parts_->Settle();
   return HardwareState();
