@@ -77,13 +77,11 @@ class Dialog {
       test_.buttons.push_back(button);
     }
     test_.InitializeButtonArray();
-    panelglow::g_pSuperPtrCustom = &test_;
     thread_ = std::thread([this] { panelglow::SuperDialog(test_).CreateSuperDialog(); });
   }
   ~Dialog() {
     TheHost().desktop.Post({Window(), message::kCommand, kCancel, 0});
     thread_.join();
-    panelglow::g_pSuperPtrCustom = nullptr;
   }
   Dialog(const Dialog&) = delete;
   Dialog& operator=(const Dialog&) = delete;
