@@ -6,6 +6,7 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <vector>
 
 #include "harness/base/CDMException.h"
 #include "storage/ControllerSection.h"
@@ -237,10 +238,13 @@ class CountedProfiles : public platform::ProfileFiles {
   bool SetValues(std::string_view section, std::span<const platform::ProfileEntry> entries,
                  std::string_view path) override {
     ++calls;
-    return losesWrites || own_.SetValues(section, entries, path);
+    const bool isSet = losesWrites || own_.SetValues(section, entries, path);
+    platform::TheHost().clock.Sleep(slowness_ms);
+    return isSet;
   }
 
   int calls = 0;
+  std::uint32_t slowness_ms = 0;  // of writing several values
   bool losesWrites = false;
 
  private:
@@ -282,6 +286,33 @@ TEST(ControllerSection, IsRefusedByItsWorkFileWhenNothingIsFoundThere) {
   profiles.losesWrites = true;
   machine.Use({.profiles = &profiles});
   EXPECT_EQ(Loaded(kSata), "990294 C:\\bench\\tmpmsctrl.ini SATA CONTROLLERS");
+}
+
+// The work file is one for all that run in a folder, whichever file they read: the second waits for the first.
+TEST(ControllerSection, TwoReadersInOneFolderTakeTurns) {
+  Machine machine(kTwoControllers);
+  CountedProfiles profiles(machine.sim.TheMachine().profiles);
+  profiles.slowness_ms = 100;
+  machine.Use({.profiles = &profiles});
+  platform::Threads& threads = platform::TheHost().threads;
+  const char* const kFiles[] = {".\\a.ini", ".\\b.ini"};
+  std::vector<std::string> names(2);
+  std::vector<platform::ThreadHandle> readers;
+  for (std::size_t i = 0; i < 2; ++i) {
+    machine.Put(kFiles[i], "[SATA CONTROLLERS]\n0x8086,0x2922,0x5678,0x1234,stor,name-" + std::to_string(i) + "\n");
+    readers.push_back(threads.Start("reader", [&, i] {
+      std::list<CTRL_INFO> records;
+      bool removesOld = i == 0;
+      ControllerSection(kFiles[i], kSata, true).Load(records, removesOld);
+      for (const CTRL_INFO& record : records) {
+        names[i] += record.name + ";";
+      }
+    }));
+  }
+  for (const platform::ThreadHandle reader : readers) {
+    threads.Wait(reader, platform::Threads::kNoLimit);
+  }
+  EXPECT_THAT(names, testing::ElementsAre("name-0;", "name-1;"));
 }
 
 }  // namespace
