@@ -7,6 +7,7 @@
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
+#include <exception>
 #include <fstream>
 #include <iostream>
 #include <sstream>
@@ -265,9 +266,7 @@ int Run(const Options& options) {
   return code;
 }
 
-}  // namespace
-
-int main(int argc, char** argv) {
+int RunCommandLine(int argc, char** argv) {
   Options options;
   CLI::App app{
       "Runs panelglow-diags on a simulated machine with a simulated operator, follows it as a controller does, and "
@@ -302,4 +301,15 @@ int main(int argc, char** argv) {
     options.person = "perfect";
   }
   return Run(options);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  try {
+    return RunCommandLine(argc, argv);
+  } catch (const std::exception& error) {
+    std::fprintf(stderr, "panelglow-sim: %s\n", error.what());
+    return kRunImpossible;
+  }
 }

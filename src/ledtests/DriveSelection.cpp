@@ -73,7 +73,7 @@ std::string FindDiskOf(const std::string& controllerId) {
   SetupDI child;
   std::set<platform::DeviceNode> seen;  // a tree that is changing, or broken, may lead in a circle
   while (controller.NextChild(child) && seen.insert(child.GetDevNode()).second) {
-    const std::string id = child.GetDeviceInstanceId();
+    std::string id = child.GetDeviceInstanceId();
     if (!id.empty() && !child.GetInterfaceDevicePath(id, platform::kDiskInterface).empty()) {
       return id;
     }
@@ -88,7 +88,7 @@ std::string FindDrivePath(std::string_view type) {
   }
   const std::string wanted = "\\" + std::string(type);
   while (disks.NextInterface()) {
-    const std::string path = disks.GetInterfaceDevicePath();
+    std::string path = disks.GetInterfaceDevicePath();
     if (path.find(wanted) != std::string::npos) {
       return path;
     }

@@ -258,7 +258,7 @@ int MSUtils::FindScsiPort(const std::string& driverName, UsedScsiPorts& usedScsi
       value.assign(size, '\0');
       key->Read("Driver", value, size);
     }
-    value = value.c_str();
+    value.resize(std::min(value.find('\0'), value.size()));  // the registry ends it with NUL
     if (!BeginsWith(value, driverName)) {
       continue;
     }

@@ -18,6 +18,7 @@ struct RegisterId {
 /// Registers of one place, for the rows of a table.
 inline std::vector<RegisterId> RegistersAt(std::uint8_t place, const std::vector<std::uint8_t>& regs) {
   std::vector<RegisterId> ids;
+  ids.reserve(regs.size());
   for (const std::uint8_t reg : regs) {
     ids.push_back({place, reg});
   }

@@ -99,7 +99,7 @@ platform::GraphicsLibrary* VideoChip::LibraryOf(const Card& card) {
 // subsystem, too.
 std::string VideoChip::FindEntry(const Card& card) {
   for (int n = 1;; ++n) {
-    const std::string prefix = "test.graphics." + CDMUtil::ToString(n) + ".";
+    std::string prefix = "test.graphics." + CDMUtil::ToString(n) + ".";
     const Setting ids = IniReader::Instance().ReadIniSetting(prefix + "PCI_IDS", "");
     if (ids.text.empty()) {
       return "";

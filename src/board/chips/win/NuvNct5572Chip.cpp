@@ -57,6 +57,7 @@ std::uint32_t NuvNct5572Chip::ReadFanTach(int fan, int arg) {
   if (RowOf(fans.tachs, fan) != nullptr) {
     Run(kMeasureSpeeds, Monitor());
   }
+  // The base corrects counts, and these are speeds. NOLINTNEXTLINE(bugprone-parent-virtual-call)
   return RegisterChip::ReadFanTach(fan, arg);
 }
 
