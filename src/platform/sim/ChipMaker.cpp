@@ -7,6 +7,7 @@
 #include "platform/sim/silicon/IteSuperIo.h"
 #include "platform/sim/silicon/LegacyPanelBlock.h"
 #include "platform/sim/silicon/MemoryRegisters.h"
+#include "platform/sim/silicon/TableSuperIo.h"
 
 namespace panelglow::platform::sim {
 
@@ -24,7 +25,7 @@ struct DeviceMaker {
       case SuperIoFamily::kFintek:
         return std::make_unique<FintekSuperIo>(setup, time);
       default:
-        return std::make_unique<SuperIo>(setup, time);
+        return std::make_unique<TableSuperIo>(setup, time);
     }
   }
   std::unique_ptr<Device> operator()(const EmbeddedControllerSetup& setup) const {
@@ -35,6 +36,9 @@ struct DeviceMaker {
   }
   std::unique_ptr<Device> operator()(const HdaCodecSetup& setup) const {
     return std::make_unique<HdaCodec>(setup, time);
+  }
+  std::unique_ptr<Device> operator()(const IndexedRegistersSetup& setup) const {
+    return std::make_unique<IndexedRegisters>(setup);
   }
   std::unique_ptr<Device> operator()(const FloppyControllerSetup& setup) const {
     return std::make_unique<FloppyController>(setup);
@@ -59,7 +63,7 @@ std::unique_ptr<Device> MakeChip(const ChipDescription& chip, const Scheduler& t
   }
   throw MachineError("chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
                      "\" (gpio-block, memory-registers, legacy-panel, super-io, embedded-controller, "
-                     "mailbox-controller, hda-codec, floppy-controller)");
+                     "mailbox-controller, hda-codec, floppy-controller, indexed-registers)");
 }
 
 }  // namespace panelglow::platform::sim

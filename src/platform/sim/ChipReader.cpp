@@ -4,6 +4,8 @@
 #include <array>
 #include <string_view>
 
+#include "platform/sim/SuperIoReader.h"
+
 namespace panelglow::platform::sim {
 
 namespace {
@@ -50,15 +52,19 @@ SuperIoSetup ReadSuperIo(Section& section) {
   const bool isIte = setup.family == SuperIoFamily::kIte;
   setup.indexPort = section.Get("base", setup.indexPort);
   setup.enterKeys = section.Bytes("enter");
+  const bool isAlwaysOpen = !isIte && section.Get("always_open", false);
   if (section.Has("enter") && setup.enterKeys.empty()) {
     section.Refuse("enter", "must name at least one key");
   }
-  if (!section.Has("enter")) {
+  if (isAlwaysOpen && section.Has("enter")) {
+    section.Refuse("enter", "is for a part that is not always open");
+  }
+  if (!section.Has("enter") && !isAlwaysOpen) {
     const std::uint8_t lastIteKey = setup.indexPort == 0x2E ? 0x55 : 0xAA;  // the key says which place is meant
     setup.enterKeys =
         isIte ? std::vector<std::uint8_t>{0x87, 0x01, 0x55, lastIteKey} : std::vector<std::uint8_t>{0x87, 0x87};
   }
-  if (!isIte) {
+  if (!isIte && !isAlwaysOpen) {
     setup.exitKey = section.Get<std::uint8_t>("exit", 0xAA);
   }
   const std::vector<std::uint8_t> chipId = section.Bytes("chip_id");
@@ -76,6 +82,9 @@ SuperIoSetup ReadSuperIo(Section& section) {
   });
   if (setup.gpio.size() > kMostSets) {
     section.Refuse("gpio", "must be at most five sets of lines");
+  }
+  if (setup.family == SuperIoFamily::kPlain) {
+    setup.tables = ReadSuperIoTables(section);
   }
   return setup;
 }
@@ -217,6 +226,8 @@ ChipDescription ReadChip(Section& section) {
     chip.setup = ReadMailbox(section);
   } else if (chip.kind == "floppy-controller") {
     chip.setup = ReadFloppyController(section);
+  } else if (chip.kind == "indexed-registers") {
+    chip.setup = ReadIndexedRegisters(section);
   } else if (chip.kind == "hda-codec") {
     chip.setup = ReadHdaCodec(section);
   } else {

@@ -21,6 +21,7 @@
 #include "platform/sim/silicon/FirmwareCall.h"
 #include "platform/sim/silicon/FloppyController.h"
 #include "platform/sim/silicon/HdaCodec.h"
+#include "platform/sim/silicon/IndexedRegisters.h"
 #include "platform/sim/silicon/MailboxController.h"
 #include "platform/sim/silicon/PciFunction.h"
 #include "platform/sim/silicon/SuperIo.h"
@@ -33,7 +34,7 @@ struct ChipDescription {
 
   // Of a kind that has a setup of its own; the others are told by the keys below.
   std::variant<std::monostate, SuperIoSetup, EmbeddedControllerSetup, MailboxControllerSetup, HdaCodecSetup,
-               FloppyControllerSetup>
+               FloppyControllerSetup, IndexedRegistersSetup>
       setup;
 
   std::uint64_t base = 0;

@@ -36,7 +36,8 @@ bool BlinkLevel(Microseconds now, Microseconds half_us) { return now / half_us %
 
 Microseconds NextBlinkEdge(Microseconds now, Microseconds half_us) { return (now / half_us + 1) * half_us; }
 
-SuperIo::SuperIo(const SuperIoSetup& setup, const Scheduler& time) : setup_(setup), time_(time) {
+SuperIo::SuperIo(const SuperIoSetup& setup, const Scheduler& time)
+    : setup_(setup), time_(time), configuration_(setup.enterKeys.empty()) {
   for (const auto& [address, value] : setup_.globals) {
     globals_[address] = value;
   }

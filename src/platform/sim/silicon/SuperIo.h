@@ -13,6 +13,7 @@
 #include "platform/sim/base/Scheduler.h"
 #include "platform/sim/silicon/Device.h"
 #include "platform/sim/silicon/EnvironmentController.h"
+#include "platform/sim/silicon/SuperIoTables.h"
 
 namespace panelglow::platform::sim {
 
@@ -28,7 +29,7 @@ struct GpioSet {
 struct SuperIoSetup {
   SuperIoFamily family = SuperIoFamily::kPlain;
   std::uint16_t indexPort = 0x2E;        // the data port is the next one; a strap on the board picks 0x2E or 0x4E
-  std::vector<std::uint8_t> enterKeys;   // written to the index port in a row
+  std::vector<std::uint8_t> enterKeys;   // written to the index port in a row; none: it is always open
   std::optional<std::uint8_t> exitKey;   // written to the index port; the ITE family leaves by a register instead
   std::array<std::uint8_t, 3> chipId{};  // registers 0x20 to 0x22
   std::map<std::uint8_t, std::uint8_t> globals;                          // global registers, 0x00 to 0x2F
@@ -36,6 +37,7 @@ struct SuperIoSetup {
   std::optional<EnvironmentSetup> environment;
   std::uint8_t gpioDevice = 7;
   std::vector<GpioSet> gpio;  // ITE and plain: lines 10 to 17, 20 to 27, ...; Fintek begins with lines 0 to 7
+  SuperIoTables tables;       // of the plain family
 };
 
 /// The plain family, and what all have in common. The part waits for its keys and then is in configuration mode until
@@ -75,6 +77,9 @@ class SuperIo : public Device {
   /// Whether the device answers at its base address.
   [[nodiscard]] virtual bool IsActive(std::uint8_t device) const;
 
+  /// The address in a register and the next one, the high byte first.
+  [[nodiscard]] std::uint16_t Base(std::uint8_t device, std::uint8_t highRegister) const;
+
   /// 0 for a device that the part does not have.
   [[nodiscard]] std::uint8_t DeviceRegister(std::uint8_t device, std::uint8_t address) const;
   [[nodiscard]] std::uint8_t Global(std::uint8_t address) const { return globals_[address]; }
@@ -88,7 +93,6 @@ class SuperIo : public Device {
   using Registers = std::array<std::uint8_t, 256>;
 
   void WriteIndex(std::uint8_t value);
-  [[nodiscard]] std::uint16_t Base(std::uint8_t device, std::uint8_t highRegister) const;
   [[nodiscard]] std::uint8_t Levels(std::size_t set) const;
   [[nodiscard]] std::optional<std::pair<std::size_t, unsigned>> Locate(std::string_view pin) const;  // set and bit
 

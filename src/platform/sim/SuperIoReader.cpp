@@ -1,0 +1,104 @@
+#include "platform/sim/SuperIoReader.h"
+
+namespace panelglow::platform::sim {
+
+namespace {
+
+std::set<std::uint8_t> ByteSet(Section& section, std::string_view key) {
+  const std::vector<std::uint8_t> bytes = section.Bytes(key);
+  return {bytes.begin(), bytes.end()};
+}
+
+std::optional<std::uint8_t> OptionalByte(Section& section, std::string_view key) {
+  return section.Has(key) ? std::optional(section.Number<std::uint8_t>(key)) : std::nullopt;
+}
+
+SuperIoField ReadField(Section& section) {
+  SuperIoField field;
+  if (const std::optional<std::uint8_t> runtime = OptionalByte(section, "runtime")) {
+    field.isRuntime = true;
+    field.address = *runtime;
+  } else {
+    field.device = OptionalByte(section, "device");
+    field.bank = OptionalByte(section, "bank");
+    field.address = section.Number<std::uint8_t>("register");
+  }
+  field.mask = section.Get("mask", field.mask);
+  return field;
+}
+
+SuperIoCondition ReadCondition(Section& section) {
+  const SuperIoField field = ReadField(section);
+  return {field, section.Get("value", field.mask)};
+}
+
+BankSetup ReadBanks(Section& section) {
+  BankSetup setup;
+  setup.select = section.Number<std::uint8_t>("select");
+  setup.mask = section.Get("mask", setup.mask);
+  section.Each("bank", [&](Section& bank) {
+    setup.banks[bank.Number<std::uint8_t>("number")] = bank.AddressedBytes<std::uint8_t>("registers");
+  });
+  return setup;
+}
+
+SuperIoLed ReadLed(Section& section) {
+  SuperIoLed led;
+  led.name = section.Required("name");
+  led.mode = ReadField(section);
+  led.high = ByteSet(section, "high");
+  for (const auto& [value, half_ms] : section.Addressed<std::uint8_t, std::uint16_t>("blinks")) {
+    if (half_ms == 0) {
+      section.Refuse("blinks", "holds halves of a period, at least 1 ms");
+    }
+    led.half_us[value] = Microseconds{half_ms} * 1000;
+  }
+  section.Each("needs", [&](Section& need) { led.needs.push_back(ReadCondition(need)); });
+  led.otherwise = section.Get("otherwise", false);
+  return led;
+}
+
+SuperIoLines ReadLines(Section& section) {
+  SuperIoLines lines;
+  lines.number = section.Number<std::uint8_t>("number");
+  lines.device = section.Number<std::uint8_t>("device");
+  lines.enableBit = OptionalByte(section, "enable_bit");
+  if (lines.enableBit.value_or(0) > 7) {
+    section.Refuse("enable_bit", "must be a bit of a byte, 0 to 7");
+  }
+  lines.direction = section.Number<std::uint8_t>("direction");
+  lines.outputIsSet = section.Get("output_is_set", lines.outputIsSet);
+  lines.data = section.Number<std::uint8_t>("data");
+  lines.inversion = OptionalByte(section, "inversion");
+  lines.status = OptionalByte(section, "status");
+  lines.function = OptionalByte(section, "function");
+  lines.inputs = section.Get("inputs", lines.inputs);
+  return lines;
+}
+
+}  // namespace
+
+SuperIoTables ReadSuperIoTables(Section& section) {
+  SuperIoTables tables;
+  section.Each("runtime", [&](Section& runtime) {
+    tables.runtimeDevice = runtime.Number<std::uint8_t>("device");
+    tables.runtime = runtime.AddressedBytes<std::uint8_t>("registers");
+  });
+  section.Each("led", [&](Section& led) { tables.leds.push_back(ReadLed(led)); });
+  section.Each("lines", [&](Section& lines) { tables.lines.push_back(ReadLines(lines)); });
+  section.Each("lock", [&](Section& lock) { tables.locks.push_back({ReadCondition(lock), ByteSet(lock, "stops")}); });
+  section.Each("banks",
+               [&](Section& banks) { tables.banks[banks.Number<std::uint8_t>("device")] = ReadBanks(banks); });
+  return tables;
+}
+
+IndexedRegistersSetup ReadIndexedRegisters(Section& section) {
+  IndexedRegistersSetup setup;
+  setup.indexPort = section.Number<std::uint16_t>("base");
+  setup.registers = section.AddressedBytes<std::uint8_t>("registers");
+  section.Each("banks", [&](Section& banks) { setup.banks = ReadBanks(banks); });
+  setup.readOnly = ByteSet(section, "read_only");
+  return setup;
+}
+
+}  // namespace panelglow::platform::sim

@@ -1,0 +1,13 @@
+// Reads the tables of a plain Super-I/O, and plain registers, from a machine's file.
+#pragma once
+
+#include "platform/sim/DescriptionSection.h"
+#include "platform/sim/MachineDescription.h"
+
+namespace panelglow::platform::sim {
+
+SuperIoTables ReadSuperIoTables(Section& section);
+
+IndexedRegistersSetup ReadIndexedRegisters(Section& section);
+
+}  // namespace panelglow::platform::sim
