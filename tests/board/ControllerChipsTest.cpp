@@ -158,7 +158,7 @@ TEST(EcChips, FansAndSensorsAreReadAndSetByTheClassesOwnAddresses) {
   EXPECT_EQ(ec.TachToRpm(0xFFFF, 1), 0);
   // 0x2A: bits 1, 3 and 5 are set.
   EXPECT_EQ(bench.Ec([&] { EXPECT_EQ(it8518.ReadLineByNames(0x21, "0x3", "2"), Chip::kAsserted); }),
-            "66<-21 62<-04 10ms 66<-21 62<-00 " + read("21"));
+            read("21") + "66<-21 62<-2E 10ms 66<-21 62<-2A " + read("21"));
   EXPECT_EQ(it8518.ReadLineByNames(0x21, "2", ""), Chip::kNotAsserted);
 }
 

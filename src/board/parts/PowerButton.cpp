@@ -10,22 +10,26 @@ constexpr std::uint8_t kButtonIsLatched = 0x01;  // of the control byte
 
 }  // namespace
 
-void PowerButton::Save() { savedControl = devio->InportByte(ports.control); }
+void PowerButton::Save() {
+  if (!savedControl) {
+    savedControl = devio->InportByte(ports.control);
+  }
+}
 
 void PowerButton::Arm() {
-  if (!savedControl) {
-    Save();
-  }
+  Save();
   const auto control = static_cast<std::uint8_t>((*savedControl & ~kButtonOverride) | kButtonIsLatched);
   devio->OutportByte(ports.control, control);
-  savedEnable = devio->InportWord(ports.enable);
+  if (!savedEnable) {
+    savedEnable = devio->InportWord(ports.enable);
+  }
   devio->OutportWord(ports.enable, 0);
   devio->OutportByte(ports.status, kPressed);
 }
 
 bool PowerButton::IsPressed() const { return (devio->InportByte(ports.status) & kPressed) != 0; }
 
-void PowerButton::Restore() const {
+void PowerButton::Restore() {
   if (savedEnable) {
     devio->OutportByte(ports.status, kPressed);
     devio->OutportWord(ports.enable, *savedEnable);
@@ -33,6 +37,8 @@ void PowerButton::Restore() const {
   if (savedControl) {
     devio->OutportByte(ports.control, *savedControl);
   }
+  savedEnable.reset();
+  savedControl.reset();
 }
 
 }  // namespace panelglow

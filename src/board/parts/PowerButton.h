@@ -20,12 +20,13 @@ class PowerButton {
  public:
   PowerButton(CDevio& client, PowerButtonPorts at) : devio(&client), ports(at) {}
 
+  // Nothing is kept twice before it was put back.
   void Save();
   void Arm();
   [[nodiscard]] bool IsPressed() const;
 
-  /// Puts back what was kept; what was not is left alone.
-  void Restore() const;
+  /// Puts back what was kept, and forgets it; what was not is left alone.
+  void Restore();
 
  private:
   CDevio* devio;

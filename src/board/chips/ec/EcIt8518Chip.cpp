@@ -2,8 +2,8 @@
 
 #include "board/parts/BitName.h"
 #include "board/parts/Lines.h"
+#include "board/parts/Pulse.h"
 #include "board/parts/RowOf.h"
-#include "platform/Host.h"
 
 namespace panelglow {
 
@@ -17,7 +17,6 @@ constexpr std::uint8_t kLedControlCommand = 0xEE;
 
 constexpr std::uint16_t kStatusPort = 0x66;
 constexpr std::uint16_t kDataPort = 0x62;
-constexpr std::uint32_t kPulse_ms = 10;
 
 constexpr std::uint32_t kNoTach = 0xFFFF;
 constexpr int kNoTemperature = 255;
@@ -51,12 +50,13 @@ bool EcIt8518Chip::SetPowerLed(std::uint8_t mode) {
 int EcIt8518Chip::ReadLineByNames(std::uint32_t offset, const std::string& bitName, const std::string& clearBitName) {
   const std::uint8_t reg = LowByte(offset);
   if (!clearBitName.empty()) {
-    const std::uint8_t clear = LowByte(MaskOfBitName(clearBitName, 8));
-    devio.OutportByte(kStatusPort, reg);
-    devio.OutportByte(kDataPort, clear);
-    platform::TheHost().clock.Sleep(kPulse_ms);
-    devio.OutportByte(kStatusPort, reg);
-    devio.OutportByte(kDataPort, 0);
+    const std::uint32_t clear = MaskOfBitName(clearBitName, 8);
+    const std::uint8_t value = ReadEc(reg);
+    const auto write = [&](std::uint8_t pulse) {
+      devio.OutportByte(kStatusPort, reg);
+      devio.OutportByte(kDataPort, pulse);
+    };
+    SendPulse(write, LowByte(value | clear), LowByte(value & ~clear));
   }
   return LineState((ReadEc(reg) & MaskOfBitName(bitName, 8)) != 0);
 }

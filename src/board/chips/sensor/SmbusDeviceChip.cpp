@@ -1,11 +1,20 @@
 #include "board/chips/sensor/SmbusDeviceChip.h"
 
-#include <utility>
+#include <algorithm>
+#include <optional>
+#include <string>
 
 #include "board/base/IniReader.h"
 #include "board/parts/Sequence.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
+
+namespace {
+
+constexpr const char* kBaseKey = "chip.smbus_device.smbus_bar";
+
+}  // namespace
 
 SmbusDeviceChip::Commands SmbusDeviceChip::ReadCommands(const char* key, const char* defaultText) {
   Commands commands;
@@ -18,45 +27,48 @@ SmbusDeviceChip::Commands SmbusDeviceChip::ReadCommands(const char* key, const c
 
 SmbusDeviceChip::SmbusDeviceChip()
     : Chip("smbus_device"),
-      host(devio, ReadIniWord("chip.smbus_device.smbus_bar", 0)),
+      hasBase(ReadIniWord(kBaseKey, 0) != 0),
+      host(devio, ReadIniWord(kBaseKey, 0)),
       address(ReadIniByte("chip.smbus_device.smbus_saddr", 0)),
       green(ReadCommands("test.powerled.green.data_blink", "03:0xC4")),
-      red(ReadCommands("test.powerled.red.data_blink", "03:0x40,04:0x05")) {}
-
-bool SmbusDeviceChip::Save(const Commands& commands, std::optional<Commands>& saved) const {
-  if (saved) {
-    return true;
+      red(ReadCommands("test.powerled.red.data_blink", "03:0x40,04:0x05")) {
+  if (!hasBase) {
+    Notices::Tell(std::string("The chip \"smbus_device\" has no SMBus host: give its first port with the key \"") +
+                  kBaseKey + "\".");
   }
-  Commands taken;
+}
+
+// What is held stays: a save is made once.
+bool SmbusDeviceChip::Save(const Commands& commands, Commands& saved) const {
   for (const auto& [command, unused] : commands) {
+    if (saved.count(command) != 0) {
+      continue;
+    }
     const std::optional<std::uint8_t> value = host.ReadByte(address, command);
     if (!value) {
       return false;
     }
-    taken[command] = *value;
+    saved[command] = *value;
   }
-  saved = std::move(taken);
   return true;
 }
 
 bool SmbusDeviceChip::Write(const Commands& commands) const {
-  for (const auto& [command, value] : commands) {
-    if (!host.WriteByte(address, command, value)) {
-      return false;
-    }
-  }
-  return true;
+  return hasBase && std::all_of(commands.begin(), commands.end(), [this](const auto& pair) {
+           return host.WriteByte(address, pair.first, pair.second);
+         });
 }
 
-bool SmbusDeviceChip::SavePowerLedState() { return Save(green, savedGreen) && Save(red, savedRed); }
+bool SmbusDeviceChip::SavePowerLedState() { return hasBase && Save(green, savedGreen) && Save(red, savedRed); }
 
 bool SmbusDeviceChip::RestorePowerLedState() {
-  if (!savedGreen || !savedRed || !Write(*savedGreen) || !Write(*savedRed)) {
+  const bool isWhole = savedGreen.size() == green.size() && savedRed.size() == red.size();
+  if (!Write(savedGreen) || !Write(savedRed)) {
     return false;
   }
-  savedGreen.reset();
-  savedRed.reset();
-  return true;
+  savedGreen.clear();
+  savedRed.clear();
+  return isWhole;
 }
 
 }  // namespace panelglow

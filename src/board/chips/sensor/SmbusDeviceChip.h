@@ -3,7 +3,6 @@
 
 #include <cstdint>
 #include <map>
-#include <optional>
 
 #include "board/chips/Chip.h"
 #include "board/parts/SmbusHost.h"
@@ -15,26 +14,28 @@ class SmbusDeviceChip : public Chip {
   SmbusDeviceChip();
 
   // ---- power LED. What cannot be read makes the save false, and the first write that fails ends its operation.
+  // Without a base in the files nothing is touched.
   bool SavePowerLedState() override;
   bool BlinkPowerLedGreen() override { return Write(green); }
   bool BlinkPowerLedRed() override { return Write(red); }
 
-  /// Needs a whole save, and is its end when all is written.
+  /// Writes what the save has read, and forgets it when all is written; true only for a whole save.
   bool RestorePowerLedState() override;
 
  private:
   using Commands = std::map<std::uint8_t, std::uint8_t>;  // command and its value
 
   static Commands ReadCommands(const char* key, const char* defaultText);
-  [[nodiscard]] bool Save(const Commands& commands, std::optional<Commands>& saved) const;
+  bool Save(const Commands& commands, Commands& saved) const;
   [[nodiscard]] bool Write(const Commands& commands) const;
 
+  bool hasBase;
   SmbusHost host;
   std::uint8_t address;
   Commands green;
   Commands red;
-  std::optional<Commands> savedGreen;
-  std::optional<Commands> savedRed;
+  Commands savedGreen;  // as far as they could be read
+  Commands savedRed;
 };
 
 }  // namespace panelglow

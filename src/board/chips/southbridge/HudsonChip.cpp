@@ -7,6 +7,7 @@
 #include "board/parts/Bits.h"
 #include "board/parts/ConfigMode.h"
 #include "board/parts/IndexedPorts.h"
+#include "board/parts/Pulse.h"
 #include "board/parts/RpmOf.h"
 #include "platform/Host.h"
 
@@ -39,7 +40,6 @@ constexpr int kLatchLine = 238;
 constexpr std::uint32_t kLatch = 0xFED8005A;  // physical address, whatever the GPIO base
 constexpr std::uint8_t kLatched = 0x04;
 constexpr std::uint8_t kClear = 0x02;
-constexpr std::uint32_t kPulse_ms = 10;
 
 // Makes a shared pin a line; for the life of a ConfigMode.
 class SharedPin {
@@ -76,12 +76,10 @@ class SharedPin {
 }  // namespace
 
 HudsonChip::HudsonChip()
-    : IchChip("hudson"),
+    : IchChip("hudson", ReadIniWordUnlessZero("chip.hudson.pmbar", 0x800)),
       gpiobar(ReadIniUnsignedUnlessZero("chip.hudson.gpiobar", 0xFED80100)),
       indirectioaddr(ReadIniWordUnlessZero("chip.hudson.indirectioaddr", 0xCD6)),
-      memory(devio) {
-  SetPmbar(ReadIniWordUnlessZero("chip.hudson.pmbar", 0x800));
-}
+      memory(devio) {}
 
 // ---- fans
 
@@ -109,9 +107,8 @@ int HudsonChip::ReadLatch() {
   if (!status || (*status & kLatched) == 0) {
     return kNotAsserted;
   }
-  memory.WriteByte(kLatch, *status & kClear);
-  platform::TheHost().clock.Sleep(kPulse_ms);
-  memory.WriteByte(kLatch, static_cast<std::uint8_t>(*status & ~kClear));
+  const auto write = [this](std::uint8_t value) { memory.WriteByte(kLatch, value); };
+  SendPulse(write, *status & kClear, LowByte(*status & ~std::uint32_t{kClear}));
   return kAsserted;
 }
 
@@ -120,11 +117,13 @@ int HudsonChip::ReadLevel(std::uint32_t line) const {
   return level ? LineState((*level & kLineIsHigh) != 0) : kNoSuchLine;
 }
 
+bool HudsonChip::HasLine(int line) const { return line >= 0 && line < kMostLines; }
+
 int HudsonChip::ReadLine(int line) {
   if (line == kLatchLine) {
     return ReadLatch();
   }
-  if (line < 0 || line >= kMostLines) {
+  if (!HasLine(line)) {
     return kNoSuchLine;
   }
   const auto number = static_cast<std::uint32_t>(line);
@@ -142,9 +141,8 @@ int HudsonChip::ReadLineByNames(std::uint32_t reg, const std::string& bitName, c
   if (!clearBitName.empty()) {
     const std::uint32_t clear = MaskOfBitName(clearBitName, 8);
     const std::uint8_t value = power.Read(index);
-    power.Write(index, LowByte(value | clear));
-    platform::TheHost().clock.Sleep(kPulse_ms);
-    power.Write(index, LowByte(value & ~clear));
+    const auto write = [&](std::uint8_t pulse) { power.Write(index, pulse); };
+    SendPulse(write, LowByte(value | clear), LowByte(value & ~clear));
   }
   return LineState((power.Read(index) & MaskOfBitName(bitName, 8)) != 0);
 }

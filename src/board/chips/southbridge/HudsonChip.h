@@ -25,6 +25,9 @@ class HudsonChip : public IchChip {
   /// by their number.
   int ReadLineByNames(std::uint32_t reg, const std::string& bitName, const std::string& clearBitName) override;
 
+ protected:
+  [[nodiscard]] bool HasLine(int line) const override;
+
  private:
   int ReadLatch();
   [[nodiscard]] int ReadLevel(std::uint32_t line) const;

@@ -1,9 +1,11 @@
 #include "board/chips/southbridge/IchChip.h"
 
+#include <algorithm>
 #include <array>
 
 #include "board/base/IniReader.h"
 #include "board/chips/southbridge/DashController.h"
+#include "board/parts/ConfigMode.h"
 #include "board/parts/LineActivity.h"
 #include "platform/Host.h"
 
@@ -31,25 +33,55 @@ constexpr std::uint32_t kIntruderSettle_ms = 75;
 
 constexpr std::uint32_t kPinSettle_ms = 10;  // of the network controller
 
+// The intruder input held down; for the life of a ConfigMode.
+class PulledInput {
+ public:
+  explicit PulledInput(CDevio& client) : devio(client) {}
+  void EnterConfigMode() { devio.OutportByte(kIntruderPort, kIntruderPulled); }
+  void ExitConfigMode() {
+    if (!staysPulled) {
+      devio.OutportByte(kIntruderPort, kIntruderFree);
+    }
+  }
+
+  /// A latch that does not see it is looked at with the input as it is: the next attempt pulls and frees it.
+  void LeavePulled() { staysPulled = true; }
+
+ private:
+  CDevio& devio;
+  bool staysPulled = false;
+};
+
+// The controller's pin driven low, and high behind it whatever was seen; for the life of a ConfigMode.
+class LowPin {
+ public:
+  explicit LowPin(const DashController& of) : controller(of) {}
+  void EnterConfigMode() { isDriven = controller.SetOutput(false); }
+  void ExitConfigMode() { isDriven = controller.SetOutput(true); }
+
+  /// Whether the last change reached the controller.
+  [[nodiscard]] bool IsDriven() const { return isDriven; }
+
+ private:
+  const DashController& controller;
+  bool isDriven = false;
+};
+
 }  // namespace
 
-IchChip::IchChip(std::string chipName)
+IchChip::IchChip() : IchChip("ich", ReadIniWordUnlessZero("chip.ich.pmbar", 0xF800)) {}
+
+IchChip::IchChip(std::string chipName, std::uint16_t base)
     : Chip(std::move(chipName)),
+      pmbar(base),
       gpiobar(ReadIniWordUnlessZero("chip.ich.gpiobar", 0xFA00)),
       enableOffset(ReadIniWord("chip.ich.pm.enable.offset", 2)),
       statusOffset(ReadIniWord("chip.ich.pm.status.offset", 1)),
       primary(ReadIniInt("test.powerled.gpio.primary", 12)),
       secondary(ReadIniInt("test.powerled.gpio.secondary", 24)),
-      button(devio, {}) {
-  SetPmbar(ReadIniWordUnlessZero("chip.ich.pmbar", 0xF800));
-}
-
-void IchChip::SetPmbar(std::uint16_t base) {
-  pmbar = base;
-  button = PowerButton(devio, {.control = static_cast<std::uint16_t>(pmbar + kButtonControl),
-                               .enable = static_cast<std::uint16_t>(pmbar + enableOffset),
-                               .status = static_cast<std::uint16_t>(pmbar + statusOffset)});
-}
+      button(devio, {.control = static_cast<std::uint16_t>(pmbar + kButtonControl),
+                     .enable = static_cast<std::uint16_t>(pmbar + enableOffset),
+                     .status = static_cast<std::uint16_t>(pmbar + statusOffset)}) {}
 
 // ---- lines
 
@@ -60,6 +92,8 @@ std::optional<LinePlace> IchChip::MapGpio(int line) const {
   }
   return found;
 }
+
+bool IchChip::HasLine(int line) const { return line == kLatchLine || MapGpio(line).has_value(); }
 
 void IchChip::ClearLatch() { devio.OutportWord(static_cast<std::uint16_t>(pmbar + kIntruderLatch), kLatched); }
 
@@ -79,19 +113,25 @@ int IchChip::ReadLine(int line) {
 
 bool IchChip::PullIntruderInput() {
   platform::Clock& clock = platform::TheHost().clock;
-  devio.OutportByte(kIntruderPort, kIntruderPulled);
-  clock.Sleep(kIntruderSettle_ms);
-  ClearLatch();
-  if (!IsLatched()) {
-    return false;
+  {
+    PulledInput input(devio);
+    const ConfigMode pulled(input);
+    clock.Sleep(kIntruderSettle_ms);
+    ClearLatch();
+    if (!IsLatched()) {
+      input.LeavePulled();
+      return false;
+    }
   }
-  devio.OutportByte(kIntruderPort, kIntruderFree);
   clock.Sleep(kIntruderSettle_ms);
   ClearLatch();
   return true;
 }
 
 bool IchChip::ReadIntrusionLatch(int line, bool clearFirst, bool& value) {
+  if (line != kLatchItself && !HasLine(line)) {
+    return false;
+  }
   if (line != kLatchLine && clearFirst && !PullIntruderInput()) {
     return false;
   }
@@ -99,11 +139,8 @@ bool IchChip::ReadIntrusionLatch(int line, bool clearFirst, bool& value) {
     value = IsLatched();
     return true;
   }
-  const int state = ReadLine(line);
-  if (state != kNoSuchLine) {
-    value = state == kAsserted;
-  }
-  return state != kNoSuchLine;
+  value = ReadLine(line) == kAsserted;
+  return true;
 }
 
 bool IchChip::ReadLineActivity(int line, int& value) {
@@ -148,17 +185,20 @@ bool IchChip::IsPowerLedRedSupported(bool& supported) {
 bool IchChip::SavePowerLedState() {
   const std::optional<LinePlace> green = MapGpio(primary);
   const std::optional<LinePlace> red = MapGpio(secondary);
-  if (!green || !red) {
-    return false;
-  }
-  if (savedLed.empty()) {
-    std::vector<std::pair<std::uint16_t, std::uint32_t>> taken{{green->place, devio.InportDword(green->place)}};
-    if (red->place != green->place) {
-      taken.emplace_back(red->place, devio.InportDword(red->place));
+  for (const std::optional<LinePlace>& line : {green, red}) {
+    if (line) {
+      KeepPort(line->place);
     }
-    savedLed = std::move(taken);
   }
-  return true;
+  return green && red;
+}
+
+void IchChip::KeepPort(std::uint16_t port) {
+  const bool isKept =
+      std::any_of(savedLed.begin(), savedLed.end(), [&](const auto& saved) { return saved.first == port; });
+  if (!isKept) {
+    savedLed.emplace_back(port, devio.InportDword(port));
+  }
 }
 
 bool IchChip::SetLine(int line) {
@@ -199,17 +239,20 @@ bool IchChip::RestorePowerLedState() {
 // ---- others
 
 bool IchChip::DetectDashCable(int line, const std::string& idList) {
-  if (line < 0) {
+  if (!HasLine(line)) {
     return false;
   }
   const std::optional<DashController> controller = DashController::Find(devio, idList);
   if (!controller || !controller->EnableOutput()) {
     return false;
   }
-  // Both levels are driven, so that the pin ends high whatever the line says.
-  const bool followsLow = controller->SetOutput(false) && ReadsAfterSettling(line, kNotAsserted);
-  const bool followsHigh = controller->SetOutput(true) && ReadsAfterSettling(line, kAsserted);
-  return followsLow && followsHigh;
+  LowPin pin(*controller);
+  bool followsLow = false;
+  {
+    const ConfigMode low(pin);
+    followsLow = pin.IsDriven() && ReadsAfterSettling(line, kNotAsserted);
+  }
+  return pin.IsDriven() && ReadsAfterSettling(line, kAsserted) && followsLow;
 }
 
 bool IchChip::ReadsAfterSettling(int line, int state) {

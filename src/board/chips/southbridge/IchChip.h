@@ -17,7 +17,7 @@ namespace panelglow {
 
 class IchChip : public Chip {
  public:
-  IchChip() : IchChip("ich") {}
+  IchChip();
 
   /// 238 is the hood switch as the chipset latches it: the latch is cleared and read again.
   int ReadLine(int line) override;
@@ -34,6 +34,7 @@ class IchChip : public Chip {
 
   // ---- power LED: two lines. False, and nothing touched, for a colour whose line the part does not have.
   bool IsPowerLedRedSupported(bool& supported) override;
+  /// Keeps what can be lit, also where it is false because one of the lines is missing.
   bool SavePowerLedState() override;
   bool AssertPowerLedGreen() override { return SetLine(primary); }
   bool AssertPowerLedRed() override { return SetLine(secondary); }
@@ -41,19 +42,21 @@ class IchChip : public Chip {
   bool RestorePowerLedState() override;
 
   /// Drives an output pin of a network controller low and high, and looks whether the line follows. `idList`: its
-  /// vendor, device, subsystem vendor and subsystem device as numbers, separated by blanks.
+  /// vendor, device, subsystem vendor and subsystem device as numbers, separated by blanks. The pin ends high.
   bool DetectDashCable(int line, const std::string& idList) override;
 
  protected:
-  explicit IchChip(std::string chipName);
+  /// `base`: first port of the power management block.
+  IchChip(std::string chipName, std::uint16_t base);
 
-  /// Moves the power management block.
-  void SetPmbar(std::uint16_t base);
+  /// Whether ReadLine knows the line.
+  [[nodiscard]] virtual bool HasLine(int line) const;
 
  private:
   /// The port and the bit of a line.
   [[nodiscard]] std::optional<LinePlace> MapGpio(int line) const;
   bool SetLine(int line);
+  void KeepPort(std::uint16_t port);
   void ClearBits(std::uint16_t port, std::uint32_t mask);
   void ClearLatch();
 
@@ -62,7 +65,7 @@ class IchChip : public Chip {
   bool ReadsAfterSettling(int line, int state);
   bool IsLatched();
 
-  std::uint16_t pmbar = 0;
+  std::uint16_t pmbar;
   std::uint16_t gpiobar;
   std::uint16_t enableOffset;  // in the power management block
   std::uint16_t statusOffset;

@@ -13,8 +13,8 @@ namespace {
 constexpr unsigned kButtonStatus = 1;  // cleared by writing its bit
 constexpr std::uint8_t kPressed = 0x01;
 constexpr unsigned kButtonEnable = 2;  // word
-constexpr unsigned kInputs = 0x400;
-constexpr unsigned kLines = 0x4C0;  // a byte for each line
+constexpr unsigned kInputs = 0x400;    // how inputs are latched
+constexpr unsigned kLines = 0x4C0;     // a byte for each line
 
 // Of a line's byte.
 constexpr std::uint8_t kOtherFunction = 0x0C;
@@ -69,11 +69,14 @@ int McpChip::ReadLine(int line) {
 // ---- power button
 
 bool McpChip::SavePowerButtonState() {
-  savedEnable = devio.InportWord(PortOf(kButtonEnable));
+  if (!savedEnable) {
+    savedEnable = devio.InportWord(PortOf(kButtonEnable));
+  }
   return true;
 }
 
 bool McpChip::ArmPowerButton() {
+  SavePowerButtonState();
   devio.OutportWord(PortOf(kButtonEnable), 0);
   return true;
 }
@@ -84,8 +87,11 @@ bool McpChip::IsPowerButtonPressed(bool& pressed) {
 }
 
 bool McpChip::RestorePowerButtonState() {
-  devio.OutportByte(PortOf(kButtonStatus), kPressed);
-  devio.OutportWord(PortOf(kButtonEnable), savedEnable);
+  if (savedEnable) {
+    devio.OutportByte(PortOf(kButtonStatus), kPressed);
+    devio.OutportWord(PortOf(kButtonEnable), *savedEnable);
+    savedEnable.reset();
+  }
   return true;
 }
 

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 
 #include "board/chips/Chip.h"
 #include "board/parts/PortRegisters.h"
@@ -27,7 +28,7 @@ class McpChip : public Chip {
 
   std::uint16_t pmbar;  // base port of the power management block
   PortRegisters inputs;
-  std::uint16_t savedEnable = 0;
+  std::optional<std::uint16_t> savedEnable;
 };
 
 }  // namespace panelglow

@@ -21,7 +21,8 @@ constexpr Microseconds kBlindPause = 3000 * kMillisecond;  // between presses of
 // by itself until then, changes up to four times more. The slowest blink has phases of 1.5 s.
 constexpr std::size_t kEdgesOfABlink = 5;
 constexpr Microseconds kLongestPhase = 1600 * kMillisecond;
-constexpr Microseconds kDarkness = 6000 * kMillisecond;  // nothing has changed for so long: no LED blinks
+constexpr Microseconds kShortestFlash = 1 * kMillisecond;  // a shorter change and its reverse go unseen
+constexpr Microseconds kDarkness = 6000 * kMillisecond;    // nothing has changed for so long: no LED blinks
 
 constexpr int kOkButton = 1005;
 constexpr int kCancelTest = 999;
@@ -221,18 +222,25 @@ void Operator::LookAtTest(const std::vector<Button>& buttons) {
 std::optional<int> Operator::JudgePanel(const std::vector<Button>& buttons) const {
   const FrontPanel& panel = seat_.panel;
   const Microseconds now = seat_.time.Now();
-  std::vector<std::size_t> edges(panel.Leds().size());
-  std::vector<Microseconds> latest(panel.Leds().size());
+  const std::vector<LedChange>& timeLine = panel.TimeLine();
+  const auto turn = std::find_if(timeLine.rbegin(), timeLine.rend(),
+                                 [this](const LedChange& change) { return change.time < turnBegan_; });
+  std::vector<std::vector<Microseconds>> edges(panel.Leds().size());
+  for (auto change = turn.base(); change != timeLine.end(); ++change) {
+    std::vector<Microseconds>& seen = edges[change->led];
+    if (!seen.empty() && change->time - seen.back() < kShortestFlash) {
+      seen.pop_back();  // neither this change nor the one that it takes back was seen
+    } else {
+      seen.push_back(change->time);
+    }
+  }
   Microseconds lastChange = turnBegan_;
-  for (auto change = panel.TimeLine().rbegin(); change != panel.TimeLine().rend() && change->time >= turnBegan_;
-       ++change) {
-    ++edges[change->led];
-    latest[change->led] = std::max(latest[change->led], change->time);
-    lastChange = std::max(lastChange, change->time);
+  for (const std::vector<Microseconds>& seen : edges) {
+    lastChange = seen.empty() ? lastChange : std::max(lastChange, seen.back());
   }
   std::vector<std::size_t> blinking;
   for (std::size_t led = 0; led < edges.size(); ++led) {
-    if (edges[led] >= kEdgesOfABlink && latest[led] + kLongestPhase >= now) {
+    if (edges[led].size() >= kEdgesOfABlink && edges[led].back() + kLongestPhase >= now) {
       blinking.push_back(led);
     }
   }
