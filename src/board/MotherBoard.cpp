@@ -268,7 +268,8 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
     return std::string("the key \"") + choice.key + "\" names no chip for it; " + reader.DescribeSections();
   }
   const std::string place = reader.ReadIniSetting(choice.key, "").place;
-  const std::string chip = "the chip \"" + choice.name + "\" (" + (place.empty() ? choice.key : place) + ")";
+  const std::string name = "chip \"" + choice.name + "\" (" + (place.empty() ? choice.key : place) + ")";
+  const std::string chip = "the " + name;
   if (choice.name == kNoChip) {
     return chip + " stands for no chip at all";
   }
@@ -279,7 +280,7 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
     return chip + " is not in the list of the key \"chips\"";
   }
   if (choice.chip != nullptr && choice.chip->GetName() == kNoChip) {
-    return "the board class " + className + " has no " + chip;
+    return "the board class " + className + " has no " + name;
   }
   std::string missing;
   const std::string dataKey = "chip." + choice.name + ".data";

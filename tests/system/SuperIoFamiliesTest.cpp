@@ -2,41 +2,12 @@
 // is put back, however the run ends, and a wrong word or another strap leaves it dark.
 #include <gmock/gmock.h>
 
-#include "system/SystemRun.h"
+#include "system/LampRuns.h"
 
 namespace panelglow::systemtest {
 namespace {
 
 using ::testing::IsEmpty;
-
-// Every occurrence of a text in a file of the installation, or in the machine's.
-struct Edit {
-  const char* file;
-  const char* right;
-  const char* wrong;
-};
-
-struct Board {
-  const char* machine;
-  const char* section = "TwoColorPower";
-  std::vector<Edit> edits = {};
-  unsigned furtherSeed = 2;
-};
-
-// Writes the board's files with `events` behind the machine's; the path of the latter.
-std::string Prepare(const Installation& installation, const Board& board, const std::string& events = {}) {
-  installation.Write("machine.toml", installation.Read(installation.Machine(board.machine)) + events);
-  for (const Edit& edit : board.edits) {
-    std::string text = installation.Read(edit.file);
-    std::size_t at = text.find(edit.right);
-    EXPECT_NE(at, std::string::npos) << edit.right;
-    for (; at != std::string::npos; at = text.find(edit.right, at + std::string(edit.wrong).size())) {
-      text.replace(at, std::string(edit.right).size(), edit.wrong);
-    }
-    installation.Write(edit.file, text);
-  }
-  return installation.Path("machine.toml").string();
-}
 
 const std::vector<Board>& Boards() {
   static const std::vector<Board> kBoards = {
@@ -68,69 +39,21 @@ const std::vector<Board>& Boards() {
   return kBoards;
 }
 
-std::vector<std::string> LampsOf(const Board& board) {
-  const bool hasRed = std::string(board.section) == "TwoColorPower";
-  return hasRed ? std::vector<std::string>{"power-green", "power-red"} : std::vector<std::string>{"power-green"};
-}
-
-void ExpectNothingLeft(const Outcome& outcome) {
-  EXPECT_TRUE(outcome.IsOrderly());
-  EXPECT_EQ(outcome.errors, "");
-  EXPECT_THAT(outcome.leftBehind, IsEmpty());
-  EXPECT_THAT(outcome.LeftChanged(), IsEmpty());
-}
-
 TEST(SystemSuperIoFamilies, EveryLampBlinksAtItsTurnAndIsPutBack) {
   for (const Board& board : Boards()) {
-    std::vector<unsigned> seeds = Seeds(1);
-    seeds.push_back(board.furtherSeed);
-    for (const unsigned seed : seeds) {
-      const Installation installation;
-      const SimulatedRun run = LedRun(Prepare(installation, board), board.section, {"-Retries=0"}, "slow:5", seed);
-      SCOPED_TRACE(board.machine + (": " + run.Describe()));
-      const Outcome outcome = run.In(installation);
-      EXPECT_EQ(outcome.exitCode, 0) << outcome.output;
-      ExpectNothingLeft(outcome);
-      for (const std::string& lamp : LampsOf(board)) {
-        EXPECT_GE(outcome.TimesLit(lamp), 3U) << lamp;  // one of them when it is put back
-      }
-    }
+    ExpectLampsBlink(board);
   }
 }
 
-// From outside, at moments that fall into lit and dark phases, and by the operator.
 TEST(SystemSuperIoFamilies, ARunThatIsStoppedWhileALampBlinksPutsItBack) {
   for (const Board& board : Boards()) {
-    for (const std::string& lamp : LampsOf(board)) {
-      for (const unsigned seed : Seeds(3)) {
-        const Installation installation;
-        const std::string button = lamp == "power-red" ? "PowerRed" : "PowerGreen";
-        installation.Write("ui.xml", "<UI><Section ID=\"Lamp\"><Button ID=\"" + button + "\"/></Section></UI>");
-        const std::string moment = std::to_string(3500 + 370 * seed);
-        const bool byOperator = seed % 3 == 0;
-        const SimulatedRun run =
-            LedRun(Prepare(installation, board,
-                           byOperator ? "" : "\n[[event]]\nat_ms = " + moment + "\nwrite_file = '\\kill.ctl'\n"),
-                   "Lamp", {"-Retries=0"}, byOperator ? "cancel" : "silent", seed);
-        SCOPED_TRACE(board.machine + (": " + moment + " ms: " + run.Describe()));
-        const Outcome outcome = run.In(installation);
-        EXPECT_EQ(outcome.exitCode, 1);
-        EXPECT_GE(outcome.TimesLit(lamp), 1U);
-        ExpectNothingLeft(outcome);
-      }
-    }
+    ExpectStoppedRunsPutBack(board);
   }
 }
 
 TEST(SystemSuperIoFamilies, TheStatusIndicatorBlinksTheGreenLamp) {
   for (const Board& board : Boards()) {
-    const Installation installation;
-    const SimulatedRun run{Prepare(installation, board), "", 1, {}, {"-subtest=LEDStatusIndicator", "-BlinkTime=1"}};
-    SCOPED_TRACE(board.machine);
-    const Outcome outcome = run.In(installation);
-    EXPECT_EQ(outcome.exitCode, 0);
-    ExpectNothingLeft(outcome);
-    EXPECT_GE(outcome.TimesLit("power-green"), 20U);
+    ExpectSignal(board);
   }
 }
 
@@ -168,7 +91,7 @@ TEST(SystemSuperIoFamilies, AWrongWordOrAnotherStrapKeepsALampFromBlinking) {
   for (const Case& c : kCases) {
     const Installation installation;
     const SimulatedRun run = LedRun(Prepare(installation, c.board), c.board.section, {"-Retries=0"}, "perfect", 2);
-    SCOPED_TRACE(std::string(c.board.edits.front().wrong) + ": " + run.Describe());
+    SCOPED_TRACE(c.board.edits.front().wrong + ": " + run.Describe());
     const Outcome outcome = run.In(installation);
     EXPECT_TRUE(outcome.IsOrderly());
     EXPECT_EQ(outcome.exitCode, 1);

@@ -87,6 +87,18 @@ void Installation::Write(const std::string& name, const std::string& content) co
   std::ofstream(folder_ / name, std::ios::binary) << content;
 }
 
+void Installation::Replace(const std::string& name, const std::string& right, const std::string& wrong) const {
+  std::string text = Read(name);
+  std::size_t at = text.find(right);
+  if (at == std::string::npos) {
+    throw std::runtime_error(name + " has no \"" + right + "\"");
+  }
+  for (; at != std::string::npos; at = text.find(right, at + wrong.size())) {
+    text.replace(at, right.size(), wrong);
+  }
+  Write(name, text);
+}
+
 std::string Installation::Read(const std::string& name) const { return TextOf(folder_ / name); }
 
 std::string Installation::Machine(const std::string& base, const std::string& more) const {

@@ -19,6 +19,8 @@ class Installation {
 
   [[nodiscard]] std::filesystem::path Path(const std::string& name) const { return folder_ / name; }
   void Write(const std::string& name, const std::string& content) const;
+  /// Every occurrence of a text in a file; throws when there is none.
+  void Replace(const std::string& name, const std::string& right, const std::string& wrong) const;
   [[nodiscard]] std::string Read(const std::string& name) const;  // empty when there is no such file
 
   /// A machine's file: machines/<base> with more text behind it. Returns its path.

@@ -40,6 +40,12 @@ struct DeviceMaker {
   std::unique_ptr<Device> operator()(const IndexedRegistersSetup& setup) const {
     return std::make_unique<IndexedRegisters>(setup);
   }
+  std::unique_ptr<Device> operator()(const PortRegistersSetup& setup) const {
+    return std::make_unique<PortRegisters>(setup);
+  }
+  std::unique_ptr<Device> operator()(const SmbusHostSetup& setup) const {
+    return std::make_unique<SmbusHost>(setup, time);
+  }
   std::unique_ptr<Device> operator()(const FloppyControllerSetup& setup) const {
     return std::make_unique<FloppyController>(setup);
   }
@@ -61,9 +67,10 @@ std::unique_ptr<Device> MakeChip(const ChipDescription& chip, const Scheduler& t
   if (chip.kind == "legacy-panel") {
     return std::make_unique<LegacyPanelBlock>(static_cast<std::uint16_t>(chip.base));
   }
-  throw MachineError("chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
-                     "\" (gpio-block, memory-registers, legacy-panel, super-io, embedded-controller, "
-                     "mailbox-controller, hda-codec, floppy-controller, indexed-registers)");
+  throw MachineError(
+      "chip \"" + chip.name + "\": there is no kind \"" + chip.kind +
+      "\" (gpio-block, memory-registers, legacy-panel, super-io, embedded-controller, "
+      "mailbox-controller, hda-codec, floppy-controller, indexed-registers, port-registers, smbus-host)");
 }
 
 }  // namespace panelglow::platform::sim

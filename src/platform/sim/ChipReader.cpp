@@ -4,6 +4,7 @@
 #include <array>
 #include <string_view>
 
+#include "platform/sim/SouthbridgeReader.h"
 #include "platform/sim/SuperIoReader.h"
 
 namespace panelglow::platform::sim {
@@ -228,6 +229,10 @@ ChipDescription ReadChip(Section& section) {
     chip.setup = ReadFloppyController(section);
   } else if (chip.kind == "indexed-registers") {
     chip.setup = ReadIndexedRegisters(section);
+  } else if (chip.kind == "port-registers") {
+    chip.setup = ReadPortRegisters(section);
+  } else if (chip.kind == "smbus-host") {
+    chip.setup = ReadSmbusHost(section);
   } else if (chip.kind == "hda-codec") {
     chip.setup = ReadHdaCodec(section);
   } else {

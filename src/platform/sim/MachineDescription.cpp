@@ -63,9 +63,8 @@ void ReadDriver(Section& section, DriverDescription& driver) {
   driver.startError = section.Get("start_error", driver.startError);
   driver.version = section.Get("version", driver.version);
   driver.registers = section.Addressed<std::uint32_t, std::uint64_t>("msr");
-  section.Each("core", [&](Section& core) {
-    driver.cores.push_back(core.Addressed<std::uint32_t, std::uint64_t>("msr"));
-  });
+  section.Each("core",
+               [&](Section& core) { driver.cores.push_back(core.Addressed<std::uint32_t, std::uint64_t>("msr")); });
   driver.refused = section.Numbers<std::uint32_t>("refused");
   section.Each("service", [&](Section& service) {
     driver.services.push_back(

@@ -24,6 +24,8 @@
 #include "platform/sim/silicon/IndexedRegisters.h"
 #include "platform/sim/silicon/MailboxController.h"
 #include "platform/sim/silicon/PciFunction.h"
+#include "platform/sim/silicon/PortRegisters.h"
+#include "platform/sim/silicon/SmbusHost.h"
 #include "platform/sim/silicon/SuperIo.h"
 
 namespace panelglow::platform::sim {
@@ -34,7 +36,7 @@ struct ChipDescription {
 
   // Of a kind that has a setup of its own; the others are told by the keys below.
   std::variant<std::monostate, SuperIoSetup, EmbeddedControllerSetup, MailboxControllerSetup, HdaCodecSetup,
-               FloppyControllerSetup, IndexedRegistersSetup>
+               FloppyControllerSetup, IndexedRegistersSetup, PortRegistersSetup, SmbusHostSetup>
       setup;
 
   std::uint64_t base = 0;

@@ -29,12 +29,14 @@
 #include "platform/sim/person/Operator.h"
 #include "platform/sim/person/SimScreen.h"
 #include "platform/sim/silicon/KeyboardDevice.h"
+#include "platform/sim/silicon/PciDoorway.h"
 
 namespace panelglow::platform::sim {
 
 namespace {
 
 constexpr const char* kFirmware = "firmware";
+constexpr const char* kPci = "pci";
 
 Simulation* g_current = nullptr;
 
@@ -116,6 +118,7 @@ struct Simulation::Parts {
   }
 
   void AttachChips() {
+    buses.Attach(kPci, std::make_unique<PciDoorway>(buses));
     for (const ChipDescription& chip : description.chips) {
       std::unique_ptr<Device> device = MakeChip(chip, scheduler);
       chips.push_back(device.get());

@@ -42,22 +42,6 @@ BankSetup ReadBanks(Section& section) {
   return setup;
 }
 
-SuperIoLed ReadLed(Section& section) {
-  SuperIoLed led;
-  led.name = section.Required("name");
-  led.mode = ReadField(section);
-  led.high = ByteSet(section, "high");
-  for (const auto& [value, half_ms] : section.Addressed<std::uint8_t, std::uint16_t>("blinks")) {
-    if (half_ms == 0) {
-      section.Refuse("blinks", "holds halves of a period, at least 1 ms");
-    }
-    led.half_us[value] = Microseconds{half_ms} * 1000;
-  }
-  section.Each("needs", [&](Section& need) { led.needs.push_back(ReadCondition(need)); });
-  led.otherwise = section.Get("otherwise", false);
-  return led;
-}
-
 SuperIoLines ReadLines(Section& section) {
   SuperIoLines lines;
   lines.number = section.Number<std::uint8_t>("number");
@@ -78,13 +62,29 @@ SuperIoLines ReadLines(Section& section) {
 
 }  // namespace
 
+SuperIoLed ReadLedPin(Section& section) {
+  SuperIoLed led;
+  led.name = section.Required("name");
+  led.mode = ReadField(section);
+  led.high = ByteSet(section, "high");
+  for (const auto& [value, half_ms] : section.Addressed<std::uint8_t, std::uint16_t>("blinks")) {
+    if (half_ms == 0) {
+      section.Refuse("blinks", "holds halves of a period, at least 1 ms");
+    }
+    led.half_us[value] = Microseconds{half_ms} * 1000;
+  }
+  section.Each("needs", [&](Section& need) { led.needs.push_back(ReadCondition(need)); });
+  led.otherwise = section.Get("otherwise", false);
+  return led;
+}
+
 SuperIoTables ReadSuperIoTables(Section& section) {
   SuperIoTables tables;
   section.Each("runtime", [&](Section& runtime) {
     tables.runtimeDevice = runtime.Number<std::uint8_t>("device");
     tables.runtime = runtime.AddressedBytes<std::uint8_t>("registers");
   });
-  section.Each("led", [&](Section& led) { tables.leds.push_back(ReadLed(led)); });
+  section.Each("led", [&](Section& led) { tables.leds.push_back(ReadLedPin(led)); });
   section.Each("lines", [&](Section& lines) { tables.lines.push_back(ReadLines(lines)); });
   section.Each("lock", [&](Section& lock) { tables.locks.push_back({ReadCondition(lock), ByteSet(lock, "stops")}); });
   section.Each("banks",

@@ -6,6 +6,9 @@
 
 namespace panelglow::platform::sim {
 
+/// An LED pin with a mode.
+SuperIoLed ReadLedPin(Section& section);
+
 SuperIoTables ReadSuperIoTables(Section& section);
 
 IndexedRegistersSetup ReadIndexedRegisters(Section& section);

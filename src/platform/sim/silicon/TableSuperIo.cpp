@@ -72,15 +72,11 @@ std::uint8_t TableSuperIo::Value(const SuperIoField& field) const {
   return static_cast<std::uint8_t>(value & field.mask);
 }
 
-bool TableSuperIo::Holds(const SuperIoCondition& condition) const {
-  return Value(condition.field) == condition.value;
-}
-
 bool TableSuperIo::IsLocked(bool isRuntime, std::optional<std::uint8_t> device, std::uint8_t address) const {
   return std::any_of(Tables().locks.begin(), Tables().locks.end(), [&](const SuperIoLock& lock) {
     const SuperIoField& field = lock.condition.field;
     return field.isRuntime == isRuntime && field.device == device && lock.stops.count(address) != 0 &&
-           Holds(lock.condition);
+           Holds(lock.condition, Reader());
   });
 }
 
@@ -128,23 +124,6 @@ void TableSuperIo::WriteRegister(std::uint8_t address, std::uint8_t value) {
 
 // ---- pins
 
-bool TableSuperIo::HasPin(const SuperIoLed& led) const {
-  return std::all_of(led.needs.begin(), led.needs.end(), [this](const auto& need) { return Holds(need); });
-}
-
-std::optional<Microseconds> TableSuperIo::HalfPeriod(const SuperIoLed& led) const {
-  const auto found = led.half_us.find(Value(led.mode));
-  return HasPin(led) && found != led.half_us.end() ? std::optional(found->second) : std::nullopt;
-}
-
-bool TableSuperIo::LedLevel(const SuperIoLed& led) const {
-  if (!HasPin(led)) {
-    return led.otherwise;
-  }
-  const std::optional<Microseconds> half = HalfPeriod(led);
-  return half ? BlinkLevel(Time().Now(), *half) : led.high.count(Value(led.mode)) != 0;
-}
-
 bool TableSuperIo::BitOf(const SuperIoLines& lines, std::uint8_t address, unsigned bit) const {
   return Bit(DeviceRegister(lines.device, address), bit);
 }
@@ -173,7 +152,7 @@ std::optional<bool> TableSuperIo::Signal(std::string_view pin) const {
     return one && others ? std::optional(*one && *others) : std::nullopt;
   }
   if (const SuperIoLed* led = FindLed(pin)) {
-    return LedLevel(*led);
+    return LedLevel(*led, Reader(), Time().Now());
   }
   if (pin.size() == 4 && pin.substr(0, 2) == "GP" && pin[3] >= '0' && pin[3] <= '7') {
     for (const SuperIoLines& lines : Tables().lines) {
@@ -195,14 +174,7 @@ std::optional<std::uint64_t> TableSuperIo::RegisterOf(std::string_view pin) cons
 }
 
 std::optional<Microseconds> TableSuperIo::NextEvent() const {
-  std::optional<Microseconds> next;
-  for (const SuperIoLed& led : Tables().leds) {
-    if (const std::optional<Microseconds> half = HalfPeriod(led)) {
-      const Microseconds edge = NextBlinkEdge(Time().Now(), *half);
-      next = std::min(next.value_or(edge), edge);
-    }
-  }
-  return next;
+  return NextLedEdge(Tables().leds, Reader(), Time().Now());
 }
 
 std::string TableSuperIo::State() const {

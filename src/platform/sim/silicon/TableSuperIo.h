@@ -7,6 +7,7 @@
 #include <string>
 #include <string_view>
 
+#include "platform/sim/silicon/LedPins.h"
 #include "platform/sim/silicon/SuperIo.h"
 
 namespace panelglow::platform::sim {
@@ -34,11 +35,10 @@ class TableSuperIo : public SuperIo {
  private:
   [[nodiscard]] const SuperIoTables& Tables() const { return Setup().tables; }
   [[nodiscard]] std::uint8_t Value(const SuperIoField& field) const;
-  [[nodiscard]] bool Holds(const SuperIoCondition& condition) const;
   [[nodiscard]] bool IsLocked(bool isRuntime, std::optional<std::uint8_t> device, std::uint8_t address) const;
-  [[nodiscard]] bool HasPin(const SuperIoLed& led) const;
-  [[nodiscard]] std::optional<Microseconds> HalfPeriod(const SuperIoLed& led) const;  // of one that blinks now
-  [[nodiscard]] bool LedLevel(const SuperIoLed& led) const;
+  [[nodiscard]] LedFieldReader Reader() const {
+    return [this](const SuperIoField& field) { return Value(field); };
+  }
   [[nodiscard]] bool BitOf(const SuperIoLines& lines, std::uint8_t address, unsigned bit) const;
   [[nodiscard]] bool Drives(const SuperIoLines& lines, unsigned bit) const;
   [[nodiscard]] bool PinLevel(const SuperIoLines& lines, unsigned bit) const;

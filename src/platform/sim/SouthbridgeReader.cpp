@@ -1,0 +1,56 @@
+#include "platform/sim/SouthbridgeReader.h"
+
+#include <array>
+#include <string_view>
+
+#include "platform/sim/SuperIoReader.h"
+
+namespace panelglow::platform::sim {
+
+PortRegistersSetup ReadPortRegisters(Section& section) {
+  constexpr std::uint16_t kLineBytes = 4;
+  PortRegistersSetup setup;
+  setup.base = section.Number<std::uint16_t>("base");
+  setup.registers = section.AddressedBytes<std::uint16_t>("registers");
+  setup.clearByOne = section.AddressedBytes<std::uint16_t>("clear_by_one");
+  setup.readOnly = section.AddressedBytes<std::uint16_t>("read_only");
+  section.Each("lines", [&](Section& entry) {
+    const auto offset = [&](std::string_view key) {
+      const auto first = entry.Number<std::uint16_t>(key);
+      for (std::uint16_t byte = 0; byte < kLineBytes; ++byte) {
+        if (setup.registers.count(static_cast<std::uint16_t>(first + byte)) == 0) {
+          entry.Refuse(key, "is the first of four registers, which must all be told");
+        }
+      }
+      return first;
+    };
+    PortLines& lines = setup.lines.emplace_back();
+    lines.level = offset("level");
+    if (entry.Has("select")) {
+      lines.select = offset("select");
+    }
+    if (entry.Has("direction")) {
+      lines.direction = offset("direction");
+    }
+    lines.outside = entry.Get("outside", lines.outside);
+  });
+  return setup;
+}
+
+SmbusHostSetup ReadSmbusHost(Section& section) {
+  constexpr std::array<std::string_view, 2> kFaults{"", "stuck-busy"};
+  SmbusHostSetup setup;
+  setup.base = section.Number<std::uint16_t>("base");
+  setup.transfer_us = section.Get<std::uint32_t>("transfer_us", static_cast<std::uint32_t>(setup.transfer_us));
+  section.Each("device", [&](Section& entry) {
+    SmbusDevice& device = setup.devices[entry.Number<std::uint8_t>("address")];
+    device.registers = entry.AddressedBytes<std::uint8_t>("registers");
+    const std::vector<std::uint8_t> readOnly = entry.Bytes("read_only");
+    device.readOnly = {readOnly.begin(), readOnly.end()};
+    entry.Each("lamp", [&](Section& lamp) { device.lamps.push_back(ReadLedPin(lamp)); });
+  });
+  setup.fault = static_cast<SmbusHostSetup::Fault>(section.OneOf("fault", kFaults));
+  return setup;
+}
+
+}  // namespace panelglow::platform::sim
