@@ -68,12 +68,6 @@ class BridgeBench : public BoardBench {
 constexpr int kLargest = std::numeric_limits<int>::max();
 constexpr int kSmallest = std::numeric_limits<int>::min();
 
-std::function<int(Chip&)> Line(int number) {
-  return [number](Chip& chip) { return chip.ReadLine(number); };
-}
-std::function<int(Chip&)> Tach(int fan) {
-  return [fan](Chip& chip) { return static_cast<int>(chip.ReadFanTach(fan, 0)); };
-}
 std::function<int(Chip&)> Named(std::uint32_t offset, const char* bit, const char* clear = "") {
   return [=](Chip& chip) { return chip.ReadLineByNames(offset, bit, clear); };
 }

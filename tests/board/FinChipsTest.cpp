@@ -1,7 +1,7 @@
 // What the Fintek classes with registers in code do on the ports, request by request.
 #include <gmock/gmock.h>
 
-#include <limits>
+#include <climits>
 #include <map>
 
 #include "board/ChipCases.h"
@@ -32,14 +32,11 @@ std::string Hardware(const std::string& settings, const std::string& caseStatus)
          "[[chip]]\nname = \"e\"\nkind = \"gpio-block\"\nbase = 0x802\ninitial = [0xFF]\n";
 }
 
-class FinBench : public BoardBench {
+class FinBench : public KeyBench {
  public:
   explicit FinBench(const std::string& keys = "", const std::string& settings = "96 = 0x05\n",
                     const std::string& caseStatus = "3")
-      : BoardBench(Hardware(settings, caseStatus)) {
-    SetFiles("[7D10]\n" + keys, "", "");
-    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
-  }
+      : KeyBench(Hardware(settings, caseStatus), keys) {}
 };
 
 const std::string kOpen = "004E<-87 004E<-87 ";
@@ -49,22 +46,6 @@ std::string Config(const std::string& requests) { return kOpen + requests + kClo
 
 std::string ConfigOf(const std::string& accesses) { return Config(Accesses("004E", "004F", accesses)); }
 std::string Monitor(const std::string& accesses) { return Accesses("0A05", "0A06", accesses); }
-
-constexpr int kLargest = std::numeric_limits<int>::max();
-constexpr int kSmallest = std::numeric_limits<int>::min();
-
-std::function<int(Chip&)> Full(int fan) {
-  return [fan](Chip& chip) { return chip.SetFanFullSpeed(fan); };
-}
-std::function<int(Chip&)> Duty(int fan, int value) {
-  return [fan, value](Chip& chip) { return chip.SetFanPwm(fan, value); };
-}
-std::function<int(Chip&)> Zone(int number) {
-  return [number](Chip& chip) {
-    int value = 0;
-    return chip.ReadTemperature(number, value) ? value : -1;
-  };
-}
 
 TEST(FinChip, ThePowerLedIsMultiFunctionSelectByMultiFunctionSelect) {
   FinBench bench;
@@ -88,33 +69,26 @@ TEST(FinChip, ThePowerLedIsMultiFunctionSelectByMultiFunctionSelect) {
 TEST(FinChip, FansAndZonesAreRegistersOfTheMonitor) {
   FinBench bench;
   FinChip chip;
-  int value = 0;
-  const auto tach = [](int fan) { return [fan](Chip& c) { return static_cast<int>(c.ReadFanTach(fan, 0)); }; };
-  const auto full = [](int fan) { return [fan](Chip& c) { return c.SetFanFullSpeed(fan); }; };
-  const auto pwm = [](int fan) { return [fan](Chip& c) { return c.SetFanPwm(fan, 0x180); }; };
-  const auto zone = [&](int number) {
-    return [&value, number](Chip& c) { return c.ReadTemperature(number, value) ? c.MapTemperature(value) : -1; };
-  };
   ExpectCases(bench, chip,
-              {{tach(1), 4094, "0A05<-A0 0A06->0F 0A05<-A1 0A06->FE "},
-               {tach(2), 0xFFFF, "0A05<-B0 0A06->0F 0A05<-B1 0A06->FF "},
-               {tach(3), 0x135, "0A05<-C0 0A06->01 0A05<-C1 0A06->35 "},
-               {tach(0), 0xFFFF, ""},
-               {tach(4), 0xFFFF, ""},
+              {{Tach(1), 4094, "0A05<-A0 0A06->0F 0A05<-A1 0A06->FE "},
+               {Tach(2), 0xFFFF, "0A05<-B0 0A06->0F 0A05<-B1 0A06->FF "},
+               {Tach(3), 0x135, "0A05<-C0 0A06->01 0A05<-C1 0A06->35 "},
+               {Tach(0), 0xFFFF, ""},
+               {Tach(4), 0xFFFF, ""},
                {&Chip::RestoreFanState, 1, ""},
-               {pwm(1), 1, "0A05<-A3 0A06<-80 "},
-               {pwm(4), 0, ""},
-               {full(2), 1, "0A05<-96 0A06->05 0A05<-96 0A06<-FF 0A05<-B3 0A06<-FF "},
-               {full(3), 1, "0A05<-C3 0A06<-FF "},
-               {full(0), 0, ""},
-               {[](Chip& c) { return c.SetManualFanMode(false); }, 1, "0A05<-96 0A06<-05 "},
-               {[](Chip& c) { return c.SetManualFanMode(true); }, 1, "0A05<-96 0A06<-FF "},
+               {Duty(1, 0x180), 1, "0A05<-A3 0A06<-80 "},
+               {Duty(4, 0x180), 0, ""},
+               {Full(2), 1, "0A05<-96 0A06->05 0A05<-96 0A06<-FF 0A05<-B3 0A06<-FF "},
+               {Full(3), 1, "0A05<-C3 0A06<-FF "},
+               {Full(0), 0, ""},
+               {Manual(false), 1, "0A05<-96 0A06<-05 "},
+               {Manual(true), 1, "0A05<-96 0A06<-FF "},
                {&Chip::SaveFanState, 1, ""},
                {&Chip::RestoreFanState, 1, "0A05<-96 0A06<-05 "},
-               {zone(1), 0x2A, "0A05<-72 0A06->2A "},
-               {zone(2), 0, "0A05<-74 0A06->00 "},
-               {zone(3), 255, "0A05<-76 0A06->80 "},
-               {zone(4), -1, ""}});
+               {Zone(1), 0x2A, "0A05<-72 0A06->2A "},
+               {Zone(2), 0, "0A05<-74 0A06->00 "},
+               {Zone(3), 255, "0A05<-76 0A06->80 "},
+               {Zone(4), -1000, ""}});
   EXPECT_EQ(chip.TachToRpm(1000, 7), 1500);
   EXPECT_EQ(chip.TachToRpm(0, 7) + chip.TachToRpm(0xFFFF, 7), 0);
 }
@@ -122,50 +96,43 @@ TEST(FinChip, FansAndZonesAreRegistersOfTheMonitor) {
 TEST(FinChip, LinesAreLevelsOrLatches) {
   FinBench bench;
   FinChip chip;
-  const auto line = [](int number) { return [number](Chip& c) { return c.ReadLine(number); }; };
   const auto levels = [](const char* reg, const char* value) {
     return Config(std::string("004E<-07 004F<-06 004E<-") + reg + " 004F->" + value + " ");
   };
   bool latched = false;
   ExpectCases(bench, chip,
-              {{line(237), 4, "0A05<-03 0A06->01 0A05<-03 0A06<-01 10ms 0A05<-03 0A06->00 "},
-               {line(237), 4, "0A05<-03 0A06->00 10ms 0A05<-03 0A06->00 "},
-               {line(238), 3, "4449->FF 4449<-FD 100ms 4444->FF "},
-               {line(3), 3, levels("F2", "08")},
-               {line(0), 4, levels("F2", "08")},
-               {line(17), 3, levels("E2", "80")},
-               {line(20), 4, levels("D2", "00")},
-               {line(33), 4, levels("C2", "00")},
-               {line(45), 3, levels("B2", "20")},
-               {line(4), -1, ""},
-               {line(18), -1, ""},
-               {line(46), -1, ""},
-               {line(-1), -1, ""},
-               {line(kSmallest), -1, ""},
-               {line(kLargest), -1, ""},
+              {{Line(237), 4, "0A05<-03 0A06->01 0A05<-03 0A06<-01 10ms 0A05<-03 0A06->00 "},
+               {Line(237), 4, "0A05<-03 0A06->00 10ms 0A05<-03 0A06->00 "},
+               {Line(238), 3, "4449->FF 4449<-FD 100ms 4444->FF "},
+               {Line(3), 3, levels("F2", "08")},
+               {Line(0), 4, levels("F2", "08")},
+               {Line(17), 3, levels("E2", "80")},
+               {Line(20), 4, levels("D2", "00")},
+               {Line(33), 4, levels("C2", "00")},
+               {Line(45), 3, levels("B2", "20")},
+               {Line(4), -1, ""},
+               {Line(18), -1, ""},
+               {Line(46), -1, ""},
+               {Line(INT_MIN), -1, ""},
                {[&](Chip& c) { return c.ReadIntrusionLatch(2, true, latched) && latched; }, 1, "0802->FFFF "},
-               {[&](Chip& c) { return c.ReadIntrusionLatch(kLargest, true, latched); }, 1, "07FF->FFFF "}});
+               {[&](Chip& c) { return c.ReadIntrusionLatch(INT_MAX, true, latched); }, 1, "07FF->FFFF "}});
 }
 
 TEST(FinChip, ThePowerButtonIsAnEventThatCanBeTakenAway) {
-  FinBench bench;
-  FinChip chip;
-  bool pressed = false;
-  ExpectCases(bench, chip,
-              {{&Chip::SavePowerButtonState, 1, "0802->FFFF "},
-               {&Chip::ArmPowerButton, 1, "0802<-FEFE 0802->FEFE "},
-               {[&](Chip& c) { return c.IsPowerButtonPressed(pressed) && pressed; }, 1, "0800->FFFF "},
-               {&Chip::RestorePowerButtonState, 1, "0800<-0100 0802<-FFFF 0802->FFFF "}});
-}
-
-TEST(FinChip, WithoutAPowerManagementBlockNoEventCanBeTakenAway) {
-  FinBench bench("chip.fin.pmbar=0x900\n");
-  FinChip chip;
-  ExpectCases(bench, chip,
-              {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
-               {&Chip::SavePowerButtonState, 1, "0902->FFFF "},
-               {&Chip::ArmPowerButton, 0, "0902<-FEFE 0902->FFFF "},
-               {&Chip::RestorePowerButtonState, 1, "0900<-0100 0902<-FFFF 0902->FFFF "}});
+  const auto expect = [](const std::string& keys, bool isTaken, const std::string& status, const std::string& enable,
+                         const std::string& armed) {
+    FinBench bench(keys);
+    FinChip chip;
+    bool pressed = false;
+    ExpectCases(bench, chip,
+                {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
+                 {&Chip::SavePowerButtonState, 1, enable + "->FFFF "},
+                 {&Chip::ArmPowerButton, isTaken, enable + "<-FEFE " + enable + "->" + armed + " "},
+                 {[&](Chip& c) { return c.IsPowerButtonPressed(pressed) && pressed; }, 1, status + "->FFFF "},
+                 {&Chip::RestorePowerButtonState, 1, status + "<-0100 " + enable + "<-FFFF " + enable + "->FFFF "}});
+  };
+  expect("", true, "0800", "0802", "FEFE");
+  expect("chip.fin.pmbar=0x900\n", false, "0900", "0902", "FFFF");  // nobody there
 }
 
 TEST(FinChip, EveryKeyReplacesItsValue) {
@@ -204,8 +171,7 @@ TEST(FinF71808aChip, HasALedDeviceAndFanRegistersOfItsOwn) {
        {&Chip::AssertPowerLedRed, 1, led("F9 004F<-04") + led("F8 004F<-02")},
        {&Chip::DeassertPowerLed, 1, led("F8 004F<-00") + led("F9 004F<-00")},
        {&Chip::RestorePowerLedState, 1, led("F9 004F<-21") + led("F8 004F<-20")},
-       {[](Chip& c) { return c.SetFanFullSpeed(1); }, 1,
-        fans + "0A05<-9F 0A06<-00 0A05<-96 0A06<-03 0A05<-A3 0A06<-FF "},
+       {Full(1), 1, fans + "0A05<-9F 0A06<-00 0A05<-96 0A06<-03 0A05<-A3 0A06<-FF "},
        {&Chip::RestoreFanState, 1, "0A05<-96 0A06<-05 0A05<-9F 0A06<-09 0A05<-A3 0A06<-31 0A05<-B3 0A06<-32 "}});
 }
 
@@ -246,7 +212,7 @@ std::string AllFlat(const std::string& duty) { return Flat('C', duty) + Flat('B'
 
 // The registers of the zones from 1 on, and no zone behind them.
 void ExpectZones(BoardBench& bench, Chip& chip, const std::vector<std::string>& registers) {
-  std::vector<ChipCase> cases = {{Zone(0), -1, ""}, {Zone(static_cast<int>(registers.size()) + 1), -1, ""}};
+  std::vector<ChipCase> cases = {{Zone(0), -1000, ""}, {Zone(static_cast<int>(registers.size()) + 1), -1000, ""}};
   for (std::size_t i = 0; i < registers.size(); ++i) {
     cases.push_back({Zone(static_cast<int>(i) + 1), registers[i] == "72" ? 0x2A : 0, Held(registers[i], {"->"})});
   }
@@ -268,10 +234,8 @@ TEST(FinF8000Chip, KeepsWhatThePartMakesOfItsFansRegisters) {
                {Full(1), 1, with(Held(registers, {"->"}), "AF->00", "AF->01") + Monitor("96<-85") + Flat('A', "FF")},
                {&Chip::RestoreFanState, 1, with(restored, "AF<-00 AF->00", "AF<-01 AF->00")},
                {&Chip::RestoreFanState, 1, restored},
-               {Full(kLargest), 0, Monitor("96<-85")},
-               {Duty(2, 0x40), 1, Flat('B', "40")},
-               {Duty(0, 0x40), 0, ""},
-               {Duty(4, 0x40), 0, ""}});
+               {Full(INT_MAX), 0, Monitor("96<-85")},
+               {Duty(2, 0x40), 1, Flat('B', "40")}});
   ExpectLed(bench, chip, ConfigOf, {"2A->11", "2A<-55", "2A<-46", "", "-", "-", "2A<-11"});
   ExpectZones(bench, chip, {"70", "72", "74"});
 }
@@ -281,10 +245,9 @@ TEST(FinF71858Chip, TakesAllFansTheLastOneFirst) {
   FinF71858Chip chip;
   ExpectCases(bench, chip,
               {{Duty(3, 0x180), 1, Flat('C', "80")},
-               {Duty(4, 1), 0, ""},
                {Full(0), 1, Held(kElevenOfTwo, {"->"}) + Monitor("96<-15") + AllFlat("FF")},
                {Full(2), 1, Flat('B', "FF")},
-               {Duty(kSmallest, 0x33), 1, AllFlat("33")},
+               {Duty(INT_MIN, 0x33), 1, AllFlat("33")},
                {&Chip::RestoreFanState, 1, Held(kElevenOfTwo, {"<-"})}});
   ExpectLed(bench, chip, [](const std::string& led) { return ConfigOf("07<-01 " + led); },
             {"F9->1F", "F9<-C0", "F9<-03", "F9<-00", "-", "-", "F9<-1F"});
@@ -369,14 +332,12 @@ TEST(FinFamily, EveryClassHasItsOwnDefaults) {
           key + key + Accesses(config, data(config), accesses) + config + "<-AA "},
          {[&](Chip& c) { return c.IsPowerLedRedSupported(red) && c.IsPowerButtonPressed(red); }, 1, "0800->FFFF "}});
   };
-  BoardBench bench;
-  const std::string keys = "[7D10]\nchip.fin.hwmbar=0x111\nchip.fin.cfgbar=0x111\nchip.fin.pmbar=0x111\n";
-  bench.SetFiles(keys, "", "");
-  IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+  const std::string keys = "chip.fin.hwmbar=0x111\nchip.fin.cfgbar=0x111\nchip.fin.pmbar=0x111\n";
+  KeyBench bench("", keys);
   FinF8000Chip f8000;
   FinF71858Chip f71858;
   FinF71855Chip f71855;
-  bench.SetFiles(keys + "chip.fin_f71858.cfgbar=0x111\nchip.fin_f71858.hwmbar=0x111\n", "", "");
+  bench.SetFiles("[7D10]\n" + keys + "chip.fin_f71858.cfgbar=0x111\nchip.fin_f71858.hwmbar=0x111\n", "", "");
   FinF71808eChip f71808e;
   expect(f8000, bench, "0A05", "004E", "2A<-45");
   expect(f71858, bench, "0A05", "004E", "07<-01 F9<-02");
