@@ -69,6 +69,16 @@ inline Ask Limit(int zone) {
   };
 }
 
+/// -1 where the class does not say.
+inline int Pressed(Chip& chip) {
+  bool pressed = false;
+  return chip.IsPowerButtonPressed(pressed) ? int{pressed} : -1;
+}
+inline int Red(Chip& chip) {
+  bool supported = false;
+  return chip.IsPowerLedRedSupported(supported) ? int{supported} : -1;
+}
+
 // ---- rows
 
 struct ChipCase {
@@ -77,15 +87,22 @@ struct ChipCase {
   std::string traffic;  // in order, as BoardBench::Traffic has it
 };
 
-/// Registers behind two ports, as "0A05" and "0A06": "96->05 A6<-00" is a read and a write.
-inline std::string Accesses(const std::string& index, const std::string& data, const std::string& accesses) {
-  std::istringstream words(accesses);
+/// What each single word becomes, put together.
+template <class Around>
+std::string Each(const std::string& text, Around around) {
+  std::istringstream words(text);
   std::string traffic;
-  for (std::string access; words >> access;) {
-    traffic.append(index).append("<-").append(access, 0, 2).append(" ");
-    traffic.append(data).append(access, 2).append(" ");
+  for (std::string word; words >> word;) {
+    traffic += around(word);
   }
   return traffic;
+}
+
+/// Registers behind two ports, as "0A05" and "0A06": "96->05 A6<-00" is a read and a write.
+inline std::string Accesses(const std::string& index, const std::string& data, const std::string& accesses) {
+  return Each(accesses, [&](const std::string& access) {
+    return index + "<-" + access.substr(0, 2) + " " + data + access.substr(2) + " ";
+  });
 }
 
 /// The rows in their order, on one chip.
@@ -113,6 +130,26 @@ inline void ExpectLed(BoardBench& bench, Chip& chip, const std::function<std::st
     }
   }
   ExpectCases(bench, chip, cases);
+}
+
+/// Wherever a worker is ended, what it has changed of the fans and the power LED by then can be put back.
+inline void ExpectInterruptedCanBePutBack(const std::string& name, const std::string& hardware) {
+  bool isDone = false;
+  for (platform::sim::Microseconds step = 0; !isDone; step += 2) {
+    KeyBench bench(hardware);
+    const std::unique_ptr<Chip> chip = MakeChip(name);
+    const std::string before = bench.machine.HardwareState();
+    bench.EndAfter(step, [&] {
+      chip->SetManualFanMode(true);
+      chip->SavePowerLedState();
+      chip->AssertPowerLedRed();
+      chip->AssertPowerLedGreen();
+      isDone = true;
+    });
+    chip->SetManualFanMode(false);
+    chip->RestorePowerLedState();
+    EXPECT_EQ(bench.machine.HardwareState(), before) << name << " " << step;
+  }
 }
 
 }  // namespace panelglow

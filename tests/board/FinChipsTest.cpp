@@ -11,7 +11,6 @@
 #include "board/chips/fin/FinF71855Chip.h"
 #include "board/chips/fin/FinF71863Chip.h"
 #include "board/chips/fin/FinF8000Chip.h"
-#include "platform/Host.h"
 
 namespace panelglow {
 namespace {
@@ -45,25 +44,15 @@ const std::string kClose = "004E<-AA ";
 std::string Config(const std::string& requests) { return kOpen + requests + kClose; }
 
 std::string ConfigOf(const std::string& accesses) { return Config(Accesses("004E", "004F", accesses)); }
+std::string EachConfig(const std::string& accesses) { return Each(accesses, ConfigOf); }
 std::string Monitor(const std::string& accesses) { return Accesses("0A05", "0A06", accesses); }
 
 TEST(FinChip, ThePowerLedIsMultiFunctionSelectByMultiFunctionSelect) {
   FinBench bench;
   FinChip chip;
-  bool supported = false;
-  ExpectCases(bench, chip,
-              {{&Chip::RestorePowerLedState, 1, ""},
-               {[&](Chip& c) { return c.IsPowerLedRedSupported(supported) && supported; }, 1, ""},
-               {&Chip::SavePowerLedState, 1,
-                Config("004E<-2B 004F->22 ") + Config("004E<-2B 004F<-60 ") + Config("004E<-2A 004F->11 ")},
-               {&Chip::SavePowerLedState, 1, ""},
-               {&Chip::AssertPowerLedGreen, 1, Config("004E<-2A 004F<-C0 ")},
-               {&Chip::AssertPowerLedRed, 1, Config("004E<-2A 004F<-30 ")},
-               {&Chip::DeassertPowerLed, 1, Config("004E<-2A 004F<-00 ")},
-               {&Chip::BlinkPowerLedGreen, 0, ""},
-               {&Chip::BlinkPowerLedRed, 0, ""},
-               {&Chip::RestorePowerLedState, 1, Config("004E<-2A 004F<-11 ") + Config("004E<-2B 004F<-22 ")},
-               {&Chip::RestorePowerLedState, 1, ""}});
+  ExpectLed(bench, chip, EachConfig,
+            {"2B->22 2B<-60 2A->11", "2A<-C0", "2A<-30", "2A<-00", "-", "-", "2A<-11 2B<-22"});
+  ExpectCases(bench, chip, {{Red, 1, ""}});
 }
 
 TEST(FinChip, FansAndZonesAreRegistersOfTheMonitor) {
@@ -123,12 +112,11 @@ TEST(FinChip, ThePowerButtonIsAnEventThatCanBeTakenAway) {
                          const std::string& armed) {
     FinBench bench(keys);
     FinChip chip;
-    bool pressed = false;
     ExpectCases(bench, chip,
                 {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
                  {&Chip::SavePowerButtonState, 1, enable + "->FFFF "},
                  {&Chip::ArmPowerButton, isTaken, enable + "<-FEFE " + enable + "->" + armed + " "},
-                 {[&](Chip& c) { return c.IsPowerButtonPressed(pressed) && pressed; }, 1, status + "->FFFF "},
+                 {Pressed, 1, status + "->FFFF "},
                  {&Chip::RestorePowerButtonState, 1, status + "<-0100 " + enable + "<-FFFF " + enable + "->FFFF "}});
   };
   expect("", true, "0800", "0802", "FEFE");
@@ -162,17 +150,14 @@ TEST(FinF71808aChip, HasALedDeviceAndFanRegistersOfItsOwn) {
   FinBench bench("chip.fin_f71808a.cfgbar=0x4E\nchip.fin_f71808a.multifunction_select2_register.green=0xC1\n",
                  "96 = 0x01\n9F = 0x09\nA3 = 0x31\nB3 = 0x32\n");
   FinF71808aChip chip;
-  const auto led = [](const std::string& request) { return Config("004E<-07 004F<-0A 004E<-" + request + " "); };
-  const std::string fans = "0A05<-9F 0A06->09 0A05<-A3 0A06->31 0A05<-B3 0A06->32 ";
-  ExpectCases(
-      bench, chip,
-      {{&Chip::SavePowerLedState, 1, led("F9 004F->21") + led("F8 004F->20")},
-       {&Chip::AssertPowerLedGreen, 1, led("F9 004F<-C1")},
-       {&Chip::AssertPowerLedRed, 1, led("F9 004F<-04") + led("F8 004F<-02")},
-       {&Chip::DeassertPowerLed, 1, led("F8 004F<-00") + led("F9 004F<-00")},
-       {&Chip::RestorePowerLedState, 1, led("F9 004F<-21") + led("F8 004F<-20")},
-       {Full(1), 1, fans + "0A05<-9F 0A06<-00 0A05<-96 0A06<-03 0A05<-A3 0A06<-FF "},
-       {&Chip::RestoreFanState, 1, "0A05<-96 0A06<-05 0A05<-9F 0A06<-09 0A05<-A3 0A06<-31 0A05<-B3 0A06<-32 "}});
+  ExpectLed(bench, chip,
+            [](const std::string& accesses) {
+              return Each(accesses, [](const std::string& access) { return ConfigOf("07<-0A " + access); });
+            },
+            {"F9->21 F8->20", "F9<-C1", "F9<-04 F8<-02", "F8<-00 F9<-00", "-", "-", "F9<-21 F8<-20"});
+  ExpectCases(bench, chip,
+              {{Full(1), 1, Monitor("9F->09 A3->31 B3->32 9F<-00 96<-03 A3<-FF")},
+               {&Chip::RestoreFanState, 1, Monitor("96<-05 9F<-09 A3<-31 B3<-32")}});
 }
 
 // ---- fans that follow a curve: four bounds of its sections, then five duties
@@ -189,15 +174,14 @@ const std::string kElevenOfTwo = "96 " + kTenA + "B0 " + kTenB + "C0 ";
 
 // Each of the registers with what it holds, in each of the directions.
 std::string Held(const std::string& registers, const std::vector<std::string>& directions) {
-  std::istringstream words(registers);
-  std::string accesses;
-  for (std::string reg; words >> reg;) {
+  return Monitor(Each(registers, [&](const std::string& reg) {
     const auto value = kHeld.find(reg);
+    std::string accesses;
     for (const std::string& direction : directions) {
       accesses.append(reg).append(direction).append(value == kHeld.end() ? "00" : value->second).append(" ");
     }
-  }
-  return Monitor(accesses);
+    return accesses;
+  }));
 }
 
 std::string Flat(char curve, const std::string& duty) {
@@ -292,15 +276,6 @@ TEST(FinF71855Chip, BlinksItsLedAndKeepsItsFansModes) {
 
 // ---- an LED by lists of the files
 
-std::string EachConfig(const std::string& accesses) {
-  std::istringstream words(accesses);
-  std::string traffic;
-  for (std::string access; words >> access;) {
-    traffic += ConfigOf(access);
-  }
-  return traffic;
-}
-
 TEST(FinF71863Chip, BlinksByListsAndChangesNoRegisterThatItDoesNotSave) {
   {
     FinBench bench;
@@ -345,28 +320,10 @@ TEST(FinFamily, EveryClassHasItsOwnDefaults) {
   expect(f71808e, bench, "0A05", "002E", "07<-0A F8<-00 F9<-01");
 }
 
-// A worker that overruns is ended at whatever request it stands; what it has changed by then can be put back.
-template <class Class>
-void ExpectInterruptedSavesCanBePutBack() {
-  constexpr platform::sim::Microseconds kMostSteps_us = 40;  // a save is fifteen requests of 2 us at most
-  for (platform::sim::Microseconds step = 0; step < kMostSteps_us; ++step) {
-    FinBench bench;
-    Class chip;
-    const std::string before = bench.machine.HardwareState();
-    const platform::ThreadHandle worker = platform::TheHost().threads.Start("worker", [&] {
-      chip.SavePowerLedState();
-      chip.AssertPowerLedGreen();
-    });
-    bench.machine.Time().SleepFor(step);
-    platform::TheHost().threads.Terminate(worker);
-    chip.RestorePowerLedState();
-    EXPECT_EQ(bench.machine.HardwareState(), before) << step;
+TEST(FinFamily, ATakeoverThatIsInterruptedCanBePutBack) {
+  for (const char* name : {"fin", "fin_f71858"}) {
+    ExpectInterruptedCanBePutBack(name, Hardware("96 = 0x05\n", "3"));
   }
-}
-
-TEST(FinFamily, ASaveThatIsInterruptedCanBePutBack) {
-  ExpectInterruptedSavesCanBePutBack<FinChip>();
-  ExpectInterruptedSavesCanBePutBack<FinF71858Chip>();
 }
 
 }  // namespace

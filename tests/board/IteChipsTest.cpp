@@ -181,12 +181,7 @@ TEST(Ite8772Chip, DrivesItsSecondAndThirdFan) {
 
 // Each class is at its own port, also where the keys of its bases name others; another port has another last key.
 TEST(IteFamily, EveryClassHasKeysOfItsOwn) {
-  const std::pair<std::string, std::function<std::unique_ptr<Chip>()>> kClasses[] = {
-      {"ite_8758", [] { return std::make_unique<Ite8758Chip>(); }},
-      {"ite_8721", [] { return std::make_unique<Ite8721Chip>(); }},
-      {"ite_8772", [] { return std::make_unique<Ite8772Chip>(); }}};
-  for (const auto& [name, make] : kClasses) {
-    SCOPED_TRACE(name);
+  for (const std::string name : {"ite_8758", "ite_8721", "ite_8772"}) {
     const std::string bases = name == "ite_8758" ? "" : "chip.ite_8758.cfgbar=0x111\nchip.ite_8758.hwmbar=0x111\n";
     const std::string own = "chip." + name + ".";
     IteBench bench({.keys = "chip.ite.hwmbar=0x111\nchip.ite.powerled.color.primary.gpio=30\n" + bases + own +
@@ -199,13 +194,12 @@ TEST(IteFamily, EveryClassHasKeysOfItsOwn) {
     };
     std::unique_ptr<Chip> chip;
     EXPECT_THAT(
-        bench.Traffic([&, &build = make] { chip = build(); }),
+        bench.Traffic([&] { chip = MakeChip(name); }),
         testing::MatchesRegex("([0-9]+ms )?" + config("20->87 21->20 22->02")));  // after the time of the keys
     ExpectCases(bench, *chip,
                 {{&Chip::AssertPowerLedGreen, 1, config("07<-07 F8<-18 F9<-02")},
                  {Duty(3, 1), 1, Monitor("73<-01")},
-                 {[](Chip& c) { return c.ReadLine(10); }, name == "ite_8721" ? 3 : -1,
-                  name == "ite_8721" ? "0B00->FF " : ""}});
+                 {Line(10), name == "ite_8721" ? 3 : -1, name == "ite_8721" ? "0B00->FF " : ""}});
   }
 }
 
