@@ -1,6 +1,7 @@
 // A simulated machine with its INI files, for what one process can do again and again.
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -9,6 +10,7 @@
 #include "board/base/BoardDevio.h"
 #include "board/base/IniReader.h"
 #include "harness/base/CDMUtil.h"
+#include "platform/Host.h"
 #include "platform/sim/Simulation.h"
 
 namespace panelglow {
@@ -57,6 +59,17 @@ class BoardBench {
     }
     wait(machine.Time().Now());
     return text;
+  }
+
+  /// A worker that overruns: ended at the request at which it stands after this time. A request takes 2 us.
+  void EndAfter(platform::sim::Microseconds time, const std::function<void()>& work) {
+    constexpr platform::sim::Microseconds kSetOff_us = 1000;  // both begin together, not the worker ahead
+    const platform::ThreadHandle worker = platform::TheHost().threads.Start("worker", [&] {
+      machine.Time().SleepFor(kSetOff_us);
+      work();
+    });
+    machine.Time().SleepFor(kSetOff_us + time);
+    platform::TheHost().threads.Terminate(worker);
   }
 
   platform::sim::Simulation machine;

@@ -52,28 +52,20 @@ class AnsweringPorts : public platform::sim::Device {
   Answers answers;
 };
 
-class BridgeBench : public BoardBench {
+class BridgeBench : public KeyBench {
  public:
   explicit BridgeBench(const Answers& answers = {}, const std::string& keys = "", bool isKept = true,
                        const std::string& hardware = "")
-      : BoardBench(hardware) {
+      : KeyBench(hardware, keys) {
     auto ports = std::make_unique<AnsweringPorts>(answers);
     ports->isKept = isKept;
     machine.Hardware().Attach("ports", std::move(ports));
-    SetFiles("[7D10]\n" + keys, "", "");
-    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
   }
 };
 
 constexpr int kLargest = std::numeric_limits<int>::max();
 constexpr int kSmallest = std::numeric_limits<int>::min();
 
-std::function<int(Chip&)> Line(int number) {
-  return [number](Chip& chip) { return chip.ReadLine(number); };
-}
-std::function<int(Chip&)> Tach(int fan) {
-  return [fan](Chip& chip) { return static_cast<int>(chip.ReadFanTach(fan, 0)); };
-}
 std::function<int(Chip&)> Named(std::uint32_t offset, const char* bit, const char* clear = "") {
   return [=](Chip& chip) { return chip.ReadLineByNames(offset, bit, clear); };
 }
@@ -83,14 +75,6 @@ std::function<int(Chip&)> Latch(int line, bool clearFirst) {
     bool value = false;
     return chip.ReadIntrusionLatch(line, clearFirst, value) ? int{value} : -1;
   };
-}
-int Pressed(Chip& chip) {
-  bool pressed = false;
-  return chip.IsPowerButtonPressed(pressed) ? int{pressed} : -1;
-}
-int Red(Chip& chip) {
-  bool supported = false;
-  return chip.IsPowerLedRedSupported(supported) ? int{supported} : -1;
 }
 
 // ---- "ich"

@@ -1,7 +1,7 @@
 // What the Fintek classes with registers in code do on the ports, request by request.
 #include <gmock/gmock.h>
 
-#include <limits>
+#include <climits>
 #include <map>
 
 #include "board/ChipCases.h"
@@ -11,7 +11,6 @@
 #include "board/chips/fin/FinF71855Chip.h"
 #include "board/chips/fin/FinF71863Chip.h"
 #include "board/chips/fin/FinF8000Chip.h"
-#include "platform/Host.h"
 
 namespace panelglow {
 namespace {
@@ -32,14 +31,11 @@ std::string Hardware(const std::string& settings, const std::string& caseStatus)
          "[[chip]]\nname = \"e\"\nkind = \"gpio-block\"\nbase = 0x802\ninitial = [0xFF]\n";
 }
 
-class FinBench : public BoardBench {
+class FinBench : public KeyBench {
  public:
   explicit FinBench(const std::string& keys = "", const std::string& settings = "96 = 0x05\n",
                     const std::string& caseStatus = "3")
-      : BoardBench(Hardware(settings, caseStatus)) {
-    SetFiles("[7D10]\n" + keys, "", "");
-    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
-  }
+      : KeyBench(Hardware(settings, caseStatus), keys) {}
 };
 
 const std::string kOpen = "004E<-87 004E<-87 ";
@@ -48,73 +44,40 @@ const std::string kClose = "004E<-AA ";
 std::string Config(const std::string& requests) { return kOpen + requests + kClose; }
 
 std::string ConfigOf(const std::string& accesses) { return Config(Accesses("004E", "004F", accesses)); }
+std::string EachConfig(const std::string& accesses) { return Each(accesses, ConfigOf); }
 std::string Monitor(const std::string& accesses) { return Accesses("0A05", "0A06", accesses); }
-
-constexpr int kLargest = std::numeric_limits<int>::max();
-constexpr int kSmallest = std::numeric_limits<int>::min();
-
-std::function<int(Chip&)> Full(int fan) {
-  return [fan](Chip& chip) { return chip.SetFanFullSpeed(fan); };
-}
-std::function<int(Chip&)> Duty(int fan, int value) {
-  return [fan, value](Chip& chip) { return chip.SetFanPwm(fan, value); };
-}
-std::function<int(Chip&)> Zone(int number) {
-  return [number](Chip& chip) {
-    int value = 0;
-    return chip.ReadTemperature(number, value) ? value : -1;
-  };
-}
 
 TEST(FinChip, ThePowerLedIsMultiFunctionSelectByMultiFunctionSelect) {
   FinBench bench;
   FinChip chip;
-  bool supported = false;
-  ExpectCases(bench, chip,
-              {{&Chip::RestorePowerLedState, 1, ""},
-               {[&](Chip& c) { return c.IsPowerLedRedSupported(supported) && supported; }, 1, ""},
-               {&Chip::SavePowerLedState, 1,
-                Config("004E<-2B 004F->22 ") + Config("004E<-2B 004F<-60 ") + Config("004E<-2A 004F->11 ")},
-               {&Chip::SavePowerLedState, 1, ""},
-               {&Chip::AssertPowerLedGreen, 1, Config("004E<-2A 004F<-C0 ")},
-               {&Chip::AssertPowerLedRed, 1, Config("004E<-2A 004F<-30 ")},
-               {&Chip::DeassertPowerLed, 1, Config("004E<-2A 004F<-00 ")},
-               {&Chip::BlinkPowerLedGreen, 0, ""},
-               {&Chip::BlinkPowerLedRed, 0, ""},
-               {&Chip::RestorePowerLedState, 1, Config("004E<-2A 004F<-11 ") + Config("004E<-2B 004F<-22 ")},
-               {&Chip::RestorePowerLedState, 1, ""}});
+  ExpectLed(bench, chip, EachConfig,
+            {"2B->22 2B<-60 2A->11", "2A<-C0", "2A<-30", "2A<-00", "-", "-", "2A<-11 2B<-22"});
+  ExpectCases(bench, chip, {{Red, 1, ""}});
 }
 
 TEST(FinChip, FansAndZonesAreRegistersOfTheMonitor) {
   FinBench bench;
   FinChip chip;
-  int value = 0;
-  const auto tach = [](int fan) { return [fan](Chip& c) { return static_cast<int>(c.ReadFanTach(fan, 0)); }; };
-  const auto full = [](int fan) { return [fan](Chip& c) { return c.SetFanFullSpeed(fan); }; };
-  const auto pwm = [](int fan) { return [fan](Chip& c) { return c.SetFanPwm(fan, 0x180); }; };
-  const auto zone = [&](int number) {
-    return [&value, number](Chip& c) { return c.ReadTemperature(number, value) ? c.MapTemperature(value) : -1; };
-  };
   ExpectCases(bench, chip,
-              {{tach(1), 4094, "0A05<-A0 0A06->0F 0A05<-A1 0A06->FE "},
-               {tach(2), 0xFFFF, "0A05<-B0 0A06->0F 0A05<-B1 0A06->FF "},
-               {tach(3), 0x135, "0A05<-C0 0A06->01 0A05<-C1 0A06->35 "},
-               {tach(0), 0xFFFF, ""},
-               {tach(4), 0xFFFF, ""},
+              {{Tach(1), 4094, "0A05<-A0 0A06->0F 0A05<-A1 0A06->FE "},
+               {Tach(2), 0xFFFF, "0A05<-B0 0A06->0F 0A05<-B1 0A06->FF "},
+               {Tach(3), 0x135, "0A05<-C0 0A06->01 0A05<-C1 0A06->35 "},
+               {Tach(0), 0xFFFF, ""},
+               {Tach(4), 0xFFFF, ""},
                {&Chip::RestoreFanState, 1, ""},
-               {pwm(1), 1, "0A05<-A3 0A06<-80 "},
-               {pwm(4), 0, ""},
-               {full(2), 1, "0A05<-96 0A06->05 0A05<-96 0A06<-FF 0A05<-B3 0A06<-FF "},
-               {full(3), 1, "0A05<-C3 0A06<-FF "},
-               {full(0), 0, ""},
-               {[](Chip& c) { return c.SetManualFanMode(false); }, 1, "0A05<-96 0A06<-05 "},
-               {[](Chip& c) { return c.SetManualFanMode(true); }, 1, "0A05<-96 0A06<-FF "},
+               {Duty(1, 0x180), 1, "0A05<-A3 0A06<-80 "},
+               {Duty(4, 0x180), 0, ""},
+               {Full(2), 1, "0A05<-96 0A06->05 0A05<-96 0A06<-FF 0A05<-B3 0A06<-FF "},
+               {Full(3), 1, "0A05<-C3 0A06<-FF "},
+               {Full(0), 0, ""},
+               {Manual(false), 1, "0A05<-96 0A06<-05 "},
+               {Manual(true), 1, "0A05<-96 0A06<-FF "},
                {&Chip::SaveFanState, 1, ""},
                {&Chip::RestoreFanState, 1, "0A05<-96 0A06<-05 "},
-               {zone(1), 0x2A, "0A05<-72 0A06->2A "},
-               {zone(2), 0, "0A05<-74 0A06->00 "},
-               {zone(3), 255, "0A05<-76 0A06->80 "},
-               {zone(4), -1, ""}});
+               {Zone(1), 0x2A, "0A05<-72 0A06->2A "},
+               {Zone(2), 0, "0A05<-74 0A06->00 "},
+               {Zone(3), 255, "0A05<-76 0A06->80 "},
+               {Zone(4), -1000, ""}});
   EXPECT_EQ(chip.TachToRpm(1000, 7), 1500);
   EXPECT_EQ(chip.TachToRpm(0, 7) + chip.TachToRpm(0xFFFF, 7), 0);
 }
@@ -122,50 +85,42 @@ TEST(FinChip, FansAndZonesAreRegistersOfTheMonitor) {
 TEST(FinChip, LinesAreLevelsOrLatches) {
   FinBench bench;
   FinChip chip;
-  const auto line = [](int number) { return [number](Chip& c) { return c.ReadLine(number); }; };
   const auto levels = [](const char* reg, const char* value) {
     return Config(std::string("004E<-07 004F<-06 004E<-") + reg + " 004F->" + value + " ");
   };
   bool latched = false;
   ExpectCases(bench, chip,
-              {{line(237), 4, "0A05<-03 0A06->01 0A05<-03 0A06<-01 10ms 0A05<-03 0A06->00 "},
-               {line(237), 4, "0A05<-03 0A06->00 10ms 0A05<-03 0A06->00 "},
-               {line(238), 3, "4449->FF 4449<-FD 100ms 4444->FF "},
-               {line(3), 3, levels("F2", "08")},
-               {line(0), 4, levels("F2", "08")},
-               {line(17), 3, levels("E2", "80")},
-               {line(20), 4, levels("D2", "00")},
-               {line(33), 4, levels("C2", "00")},
-               {line(45), 3, levels("B2", "20")},
-               {line(4), -1, ""},
-               {line(18), -1, ""},
-               {line(46), -1, ""},
-               {line(-1), -1, ""},
-               {line(kSmallest), -1, ""},
-               {line(kLargest), -1, ""},
+              {{Line(237), 4, "0A05<-03 0A06->01 0A05<-03 0A06<-01 10ms 0A05<-03 0A06->00 "},
+               {Line(237), 4, "0A05<-03 0A06->00 10ms 0A05<-03 0A06->00 "},
+               {Line(238), 3, "4449->FF 4449<-FD 100ms 4444->FF "},
+               {Line(3), 3, levels("F2", "08")},
+               {Line(0), 4, levels("F2", "08")},
+               {Line(17), 3, levels("E2", "80")},
+               {Line(20), 4, levels("D2", "00")},
+               {Line(33), 4, levels("C2", "00")},
+               {Line(45), 3, levels("B2", "20")},
+               {Line(4), -1, ""},
+               {Line(18), -1, ""},
+               {Line(46), -1, ""},
+               {Line(INT_MIN), -1, ""},
                {[&](Chip& c) { return c.ReadIntrusionLatch(2, true, latched) && latched; }, 1, "0802->FFFF "},
-               {[&](Chip& c) { return c.ReadIntrusionLatch(kLargest, true, latched); }, 1, "07FF->FFFF "}});
+               {[&](Chip& c) { return c.ReadIntrusionLatch(INT_MAX, true, latched); }, 1, "07FF->FFFF "}});
 }
 
 TEST(FinChip, ThePowerButtonIsAnEventThatCanBeTakenAway) {
-  FinBench bench;
-  FinChip chip;
-  bool pressed = false;
-  ExpectCases(bench, chip,
-              {{&Chip::SavePowerButtonState, 1, "0802->FFFF "},
-               {&Chip::ArmPowerButton, 1, "0802<-FEFE 0802->FEFE "},
-               {[&](Chip& c) { return c.IsPowerButtonPressed(pressed) && pressed; }, 1, "0800->FFFF "},
-               {&Chip::RestorePowerButtonState, 1, "0800<-0100 0802<-FFFF 0802->FFFF "}});
-}
-
-TEST(FinChip, WithoutAPowerManagementBlockNoEventCanBeTakenAway) {
-  FinBench bench("chip.fin.pmbar=0x900\n");
-  FinChip chip;
-  ExpectCases(bench, chip,
-              {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
-               {&Chip::SavePowerButtonState, 1, "0902->FFFF "},
-               {&Chip::ArmPowerButton, 0, "0902<-FEFE 0902->FFFF "},
-               {&Chip::RestorePowerButtonState, 1, "0900<-0100 0902<-FFFF 0902->FFFF "}});
+  const auto expect = [](const std::string& keys, bool isTaken, const std::string& status, const std::string& enable,
+                         const std::string& armed) {
+    FinBench bench(keys);
+    FinChip chip;
+    ExpectCases(bench, chip,
+                {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
+                 {&Chip::SavePowerButtonState, 1, enable + "->FFFF "},
+                 {&Chip::ArmPowerButton, isTaken, enable + "<-FEFE " + enable + "->" + armed + " "},
+                 {Pressed, 1, status + "->FFFF "},
+                 {&Chip::RestorePowerButtonState, 1, status + "<-0100 " + enable + "<-FFFF " + enable + "->FFFF "}});
+  };
+  expect("", true, "0800", "0802", "FEFE");
+  expect("chip.fin.pmbar=0x900\n", false, "0900", "0902", "FFFF");  // nobody there
 }
 
 TEST(FinChip, EveryKeyReplacesItsValue) {
@@ -195,18 +150,14 @@ TEST(FinF71808aChip, HasALedDeviceAndFanRegistersOfItsOwn) {
   FinBench bench("chip.fin_f71808a.cfgbar=0x4E\nchip.fin_f71808a.multifunction_select2_register.green=0xC1\n",
                  "96 = 0x01\n9F = 0x09\nA3 = 0x31\nB3 = 0x32\n");
   FinF71808aChip chip;
-  const auto led = [](const std::string& request) { return Config("004E<-07 004F<-0A 004E<-" + request + " "); };
-  const std::string fans = "0A05<-9F 0A06->09 0A05<-A3 0A06->31 0A05<-B3 0A06->32 ";
-  ExpectCases(
-      bench, chip,
-      {{&Chip::SavePowerLedState, 1, led("F9 004F->21") + led("F8 004F->20")},
-       {&Chip::AssertPowerLedGreen, 1, led("F9 004F<-C1")},
-       {&Chip::AssertPowerLedRed, 1, led("F9 004F<-04") + led("F8 004F<-02")},
-       {&Chip::DeassertPowerLed, 1, led("F8 004F<-00") + led("F9 004F<-00")},
-       {&Chip::RestorePowerLedState, 1, led("F9 004F<-21") + led("F8 004F<-20")},
-       {[](Chip& c) { return c.SetFanFullSpeed(1); }, 1,
-        fans + "0A05<-9F 0A06<-00 0A05<-96 0A06<-03 0A05<-A3 0A06<-FF "},
-       {&Chip::RestoreFanState, 1, "0A05<-96 0A06<-05 0A05<-9F 0A06<-09 0A05<-A3 0A06<-31 0A05<-B3 0A06<-32 "}});
+  ExpectLed(bench, chip,
+            [](const std::string& accesses) {
+              return Each(accesses, [](const std::string& access) { return ConfigOf("07<-0A " + access); });
+            },
+            {"F9->21 F8->20", "F9<-C1", "F9<-04 F8<-02", "F8<-00 F9<-00", "-", "-", "F9<-21 F8<-20"});
+  ExpectCases(bench, chip,
+              {{Full(1), 1, Monitor("9F->09 A3->31 B3->32 9F<-00 96<-03 A3<-FF")},
+               {&Chip::RestoreFanState, 1, Monitor("96<-05 9F<-09 A3<-31 B3<-32")}});
 }
 
 // ---- fans that follow a curve: four bounds of its sections, then five duties
@@ -223,15 +174,14 @@ const std::string kElevenOfTwo = "96 " + kTenA + "B0 " + kTenB + "C0 ";
 
 // Each of the registers with what it holds, in each of the directions.
 std::string Held(const std::string& registers, const std::vector<std::string>& directions) {
-  std::istringstream words(registers);
-  std::string accesses;
-  for (std::string reg; words >> reg;) {
+  return Monitor(Each(registers, [&](const std::string& reg) {
     const auto value = kHeld.find(reg);
+    std::string accesses;
     for (const std::string& direction : directions) {
       accesses.append(reg).append(direction).append(value == kHeld.end() ? "00" : value->second).append(" ");
     }
-  }
-  return Monitor(accesses);
+    return accesses;
+  }));
 }
 
 std::string Flat(char curve, const std::string& duty) {
@@ -246,7 +196,7 @@ std::string AllFlat(const std::string& duty) { return Flat('C', duty) + Flat('B'
 
 // The registers of the zones from 1 on, and no zone behind them.
 void ExpectZones(BoardBench& bench, Chip& chip, const std::vector<std::string>& registers) {
-  std::vector<ChipCase> cases = {{Zone(0), -1, ""}, {Zone(static_cast<int>(registers.size()) + 1), -1, ""}};
+  std::vector<ChipCase> cases = {{Zone(0), -1000, ""}, {Zone(static_cast<int>(registers.size()) + 1), -1000, ""}};
   for (std::size_t i = 0; i < registers.size(); ++i) {
     cases.push_back({Zone(static_cast<int>(i) + 1), registers[i] == "72" ? 0x2A : 0, Held(registers[i], {"->"})});
   }
@@ -268,10 +218,8 @@ TEST(FinF8000Chip, KeepsWhatThePartMakesOfItsFansRegisters) {
                {Full(1), 1, with(Held(registers, {"->"}), "AF->00", "AF->01") + Monitor("96<-85") + Flat('A', "FF")},
                {&Chip::RestoreFanState, 1, with(restored, "AF<-00 AF->00", "AF<-01 AF->00")},
                {&Chip::RestoreFanState, 1, restored},
-               {Full(kLargest), 0, Monitor("96<-85")},
-               {Duty(2, 0x40), 1, Flat('B', "40")},
-               {Duty(0, 0x40), 0, ""},
-               {Duty(4, 0x40), 0, ""}});
+               {Full(INT_MAX), 0, Monitor("96<-85")},
+               {Duty(2, 0x40), 1, Flat('B', "40")}});
   ExpectLed(bench, chip, ConfigOf, {"2A->11", "2A<-55", "2A<-46", "", "-", "-", "2A<-11"});
   ExpectZones(bench, chip, {"70", "72", "74"});
 }
@@ -281,10 +229,9 @@ TEST(FinF71858Chip, TakesAllFansTheLastOneFirst) {
   FinF71858Chip chip;
   ExpectCases(bench, chip,
               {{Duty(3, 0x180), 1, Flat('C', "80")},
-               {Duty(4, 1), 0, ""},
                {Full(0), 1, Held(kElevenOfTwo, {"->"}) + Monitor("96<-15") + AllFlat("FF")},
                {Full(2), 1, Flat('B', "FF")},
-               {Duty(kSmallest, 0x33), 1, AllFlat("33")},
+               {Duty(INT_MIN, 0x33), 1, AllFlat("33")},
                {&Chip::RestoreFanState, 1, Held(kElevenOfTwo, {"<-"})}});
   ExpectLed(bench, chip, [](const std::string& led) { return ConfigOf("07<-01 " + led); },
             {"F9->1F", "F9<-C0", "F9<-03", "F9<-00", "-", "-", "F9<-1F"});
@@ -329,15 +276,6 @@ TEST(FinF71855Chip, BlinksItsLedAndKeepsItsFansModes) {
 
 // ---- an LED by lists of the files
 
-std::string EachConfig(const std::string& accesses) {
-  std::istringstream words(accesses);
-  std::string traffic;
-  for (std::string access; words >> access;) {
-    traffic += ConfigOf(access);
-  }
-  return traffic;
-}
-
 TEST(FinF71863Chip, BlinksByListsAndChangesNoRegisterThatItDoesNotSave) {
   {
     FinBench bench;
@@ -369,14 +307,12 @@ TEST(FinFamily, EveryClassHasItsOwnDefaults) {
           key + key + Accesses(config, data(config), accesses) + config + "<-AA "},
          {[&](Chip& c) { return c.IsPowerLedRedSupported(red) && c.IsPowerButtonPressed(red); }, 1, "0800->FFFF "}});
   };
-  BoardBench bench;
-  const std::string keys = "[7D10]\nchip.fin.hwmbar=0x111\nchip.fin.cfgbar=0x111\nchip.fin.pmbar=0x111\n";
-  bench.SetFiles(keys, "", "");
-  IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+  const std::string keys = "chip.fin.hwmbar=0x111\nchip.fin.cfgbar=0x111\nchip.fin.pmbar=0x111\n";
+  KeyBench bench("", keys);
   FinF8000Chip f8000;
   FinF71858Chip f71858;
   FinF71855Chip f71855;
-  bench.SetFiles(keys + "chip.fin_f71858.cfgbar=0x111\nchip.fin_f71858.hwmbar=0x111\n", "", "");
+  bench.SetFiles("[7D10]\n" + keys + "chip.fin_f71858.cfgbar=0x111\nchip.fin_f71858.hwmbar=0x111\n", "", "");
   FinF71808eChip f71808e;
   expect(f8000, bench, "0A05", "004E", "2A<-45");
   expect(f71858, bench, "0A05", "004E", "07<-01 F9<-02");
@@ -384,28 +320,10 @@ TEST(FinFamily, EveryClassHasItsOwnDefaults) {
   expect(f71808e, bench, "0A05", "002E", "07<-0A F8<-00 F9<-01");
 }
 
-// A worker that overruns is ended at whatever request it stands; what it has changed by then can be put back.
-template <class Class>
-void ExpectInterruptedSavesCanBePutBack() {
-  constexpr platform::sim::Microseconds kMostSteps_us = 40;  // a save is fifteen requests of 2 us at most
-  for (platform::sim::Microseconds step = 0; step < kMostSteps_us; ++step) {
-    FinBench bench;
-    Class chip;
-    const std::string before = bench.machine.HardwareState();
-    const platform::ThreadHandle worker = platform::TheHost().threads.Start("worker", [&] {
-      chip.SavePowerLedState();
-      chip.AssertPowerLedGreen();
-    });
-    bench.machine.Time().SleepFor(step);
-    platform::TheHost().threads.Terminate(worker);
-    chip.RestorePowerLedState();
-    EXPECT_EQ(bench.machine.HardwareState(), before) << step;
+TEST(FinFamily, ATakeoverThatIsInterruptedCanBePutBack) {
+  for (const char* name : {"fin", "fin_f71858"}) {
+    ExpectInterruptedCanBePutBack(name, Hardware("96 = 0x05\n", "3"));
   }
-}
-
-TEST(FinFamily, ASaveThatIsInterruptedCanBePutBack) {
-  ExpectInterruptedSavesCanBePutBack<FinChip>();
-  ExpectInterruptedSavesCanBePutBack<FinF71858Chip>();
 }
 
 }  // namespace

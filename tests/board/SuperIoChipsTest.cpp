@@ -118,20 +118,17 @@ TEST(SuperIoChips, ARegisterIsTwoRequests) {
   EXPECT_EQ(bench.Traffic([&] { chip->ExitConfigMode(); }), "002E<-02 002F->FF 002F<-FF ");  // other bits stay
 }
 
-// A worker that overruns is ended at whatever request it stands.
 TEST(SuperIoChips, AThreadThatIsEndedAnywhereLeavesConfigurationMode) {
   constexpr platform::sim::Microseconds kMostSteps_us = 40;  // a save is thirteen requests of 2 us
   for (platform::sim::Microseconds step = 0; step < kMostSteps_us; ++step) {
     SuperIoBench bench("ite");
     const auto chip = bench.Make<GIteChip>(kLed);
     bool wentOn = false;
-    const platform::ThreadHandle worker = platform::TheHost().threads.Start("worker", [&] {
+    bench.EndAfter(step, [&] {
       chip->SavePowerLedState();
       platform::TheHost().clock.Sleep(1);
       wentOn = true;
     });
-    bench.machine.Time().SleepFor(step);
-    platform::TheHost().threads.Terminate(worker);
     EXPECT_FALSE(wentOn) << step;
     EXPECT_THAT(bench.machine.HardwareState(), ::testing::HasSubstr("configuration mode = closed")) << step;
   }

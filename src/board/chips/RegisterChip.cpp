@@ -65,12 +65,12 @@ bool RegisterChip::SetManualFanMode(bool on) {
   }
   if (on && !manualFanMode) {
     SaveFanState();
+    manualFanMode = true;  // first: steps that are interrupted are put back, too
     const ConfigMode mode(Monitor());
     Run(fans.manual, Monitor(), savedFans);
   } else if (!on && manualFanMode) {
     RestoreFanState();
   }
-  manualFanMode = on;
   return true;
 }
 

@@ -53,7 +53,7 @@ constexpr int kLongestWait_ms = 10'000;
 
 SmscMec1322Chip::SmscMec1322Chip() : EcChip("smsc_mec1322") {
   static_assert(kListKeys.size() == kListCount);
-  devio.OutportByte(ProbeConfigPort(devio, std::array{kEnterKey}), kEnterKey);
+  devio.OutportByte(ProbeConfigPort(devio, {kEnterKey}, {}), kEnterKey);
   const std::string section = ReadIniValue("chip.smsc_mec1322.data", name);
   for (std::size_t i = 0; i < kListKeys.size(); ++i) {
     lists[i] = ParsePairs<std::uint16_t>(ReadChipSetting(section, kListKeys[i], ""));

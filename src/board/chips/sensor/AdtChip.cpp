@@ -4,6 +4,7 @@
 
 #include "board/base/IniReader.h"
 #include "board/parts/RowOf.h"
+#include "board/parts/RpmOf.h"
 #include "harness/base/CDMout.h"
 
 namespace panelglow {
@@ -50,10 +51,17 @@ std::uint8_t AdtChip::ReadMonitor(std::uint8_t reg) {
 }
 
 void AdtChip::WriteMonitor(std::uint8_t reg, std::uint8_t value) {
-  hasFailed = !host.WriteByte(address, reg, value) || hasFailed;
+  // What is written behind a failure may be made of a byte that was not read.
+  hasFailed = hasFailed || !host.WriteByte(address, reg, value);
 }
 
 // ---- fans
+
+std::uint32_t AdtChip::ReadFanTach(int fan, int arg) {
+  hasFailed = false;
+  const std::uint32_t raw = RegisterChip::ReadFanTach(fan, arg);
+  return hasFailed ? kTachStopped : raw;
+}
 
 bool AdtChip::SaveFanState() {
   if (savedFans.Holds()) {
@@ -67,13 +75,33 @@ bool AdtChip::SaveFanState() {
   return !hasFailed;
 }
 
-bool AdtChip::SetManualFanMode(bool on) { return (!on || SaveFanState()) && RegisterChip::SetManualFanMode(on); }
+bool AdtChip::RestoreFanState() {
+  hasFailed = false;
+  const bool wasManual = manualFanMode;
+  RegisterChip::RestoreFanState();
+  manualFanMode = wasManual && hasFailed;  // to be put back again
+  return !hasFailed;
+}
+
+bool AdtChip::SetManualFanMode(bool on) {
+  if (on && !SaveFanState()) {
+    return false;
+  }
+  hasFailed = false;
+  RegisterChip::SetManualFanMode(on);
+  if (on && hasFailed) {
+    RestoreFanState();
+    return false;
+  }
+  return !hasFailed;
+}
 
 bool AdtChip::SetFanPwm(int fan, int value) {
   if (RowOf(fans.duties, fan) == nullptr) {
     CDMout::LogMessage(LogOptions::Debug, kFreeText, "Invalid PWM index specified");
   }
-  return RegisterChip::SetFanPwm(fan, value);
+  hasFailed = false;
+  return RegisterChip::SetFanPwm(fan, value) && !hasFailed;
 }
 
 // ---- temperatures

@@ -14,8 +14,11 @@ class AdtChip : public RegisterChip {
  public:
   AdtChip();
 
-  // False where the device does not answer: nothing is then saved, and no fan is taken over.
+  // False, and a count of 0xFFFF, where the device does not answer. Nothing is then saved, what was taken over is put
+  // back, and the first write that fails is the last of its operation. A restore that fails can be done again.
+  std::uint32_t ReadFanTach(int fan, int arg) override;
   bool SaveFanState() override;
+  bool RestoreFanState() override;
   bool SetManualFanMode(bool on) override;
   bool ReadTemperature(int zone, int& value) override;
 

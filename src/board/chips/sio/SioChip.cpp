@@ -69,7 +69,7 @@ SioChip::SioChip(std::string chipName)
                     {{0, 0x36}, {0, 0x37}},
                     {{0, 0x38}, {0, 0x39}},
                     {{0, 0x3A}, {0, 0x3B}}},
-          .duties = RegisterRun(0, 0x30, 3),
+          .duties = RegisterRun(0, 0x30, 3),  // fans 4 to 8 are watched only
           .saved = {kStart, kFan1Mode, kFan2Mode, kFan3Mode, kRamp1, kRamp2},
           .manual = {FromSaved(kStart, 0xFD, 0x01), FromSaved(kFan1Mode, 0xFF, kManual),
                      FromSaved(kFan2Mode, 0xFF, kManual), FromSaved(kFan3Mode, 0xFF, kManual),
@@ -160,12 +160,16 @@ bool SioChip::UnlockHood(int line, bool check) { return MoveHood(kUnlock, line, 
 // ---- power LED
 
 bool SioChip::SavePowerLedState() {
+  isSaved = true;
   Run(std::array{ClearBits(kLedLine1, kOtherFunction), ClearBits(kLedLine2, kOtherFunction)}, runtime);
   return true;
 }
 
 bool SioChip::RestorePowerLedState() {
-  Run(std::array{SetBits(kLedLine1, kOtherFunction), SetBits(kLedLine2, kOtherFunction)}, runtime);
+  if (isSaved) {
+    Run(std::array{SetBits(kLedLine1, kOtherFunction), SetBits(kLedLine2, kOtherFunction)}, runtime);
+    isSaved = false;  // last: a restore that is interrupted is done again
+  }
   return true;
 }
 

@@ -31,7 +31,9 @@ class SioChip : public RegisterChip {
   int ReadLine(int line) override;
   bool ReadLineActivity(int line, int& value) override;
 
-  /// Takes the LED's two lines from their other function, and gives them back to it.
+  /// Takes the LED's two lines from their other function, and gives them back to it; without a save nothing is given
+  /// back. The colour register is not kept: with its lines given back the part drives the LED, and the colour counts
+  /// for nothing.
   bool SavePowerLedState() override;
   bool RestorePowerLedState() override;
 
@@ -49,6 +51,7 @@ class SioChip : public RegisterChip {
   bool ReadZone(const std::vector<RegisterId>& registers, int zone, int& value);
   bool MoveHood(std::uint8_t command, int line, bool check, int wanted);
 
+  bool isSaved = false;     // the LED's lines are taken
   std::uint16_t pmbar = 0;  // base of the runtime registers
   std::uint16_t hoodLockOffset = 0;
   IndexedRegisters monitor;

@@ -1,7 +1,5 @@
 #include "board/chips/sio/Smsc5407Chip.h"
 
-#include <array>
-
 #include "board/base/BoardDevio.h"
 #include "board/parts/ProbeConfigPort.h"
 #include "board/parts/ReadBase.h"
@@ -10,7 +8,7 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::array<std::uint8_t, 1> kEnterKeys{0x55};
+constexpr std::uint8_t kEnterKey = 0x55;
 constexpr std::uint8_t kExitKey = 0xAA;
 constexpr std::uint8_t kRuntimeDevice = 10;
 
@@ -20,7 +18,8 @@ constexpr RegisterId kLedLine{0, 0x47};
 constexpr RegisterId kLed{0, 0x5D};
 
 std::uint16_t AskForBase(CDevio& devio) {
-  ConfigRegisters config(IndexedPorts(devio, ProbeConfigPort(devio, kEnterKeys)), {kEnterKeys[0]}, {kExitKey});
+  const std::uint16_t port = ProbeConfigPort(devio, {kEnterKey}, {kExitKey});
+  ConfigRegisters config(IndexedPorts(devio, port), {kEnterKey}, {kExitKey});
   return ReadBase(config, kRuntimeDevice);
 }
 
@@ -32,6 +31,9 @@ Smsc5407Chip::Smsc5407Chip(std::uint16_t base)
     : RegisterChip("smsc5407"),
       runtime(devio, base),
       monitor(IndexedPorts(devio, static_cast<std::uint16_t>(base + kMonitorIndex))) {
+  if (!IsBase(base)) {
+    return;
+  }
   zones = {.zones = RegistersAt(0, {0x26, 0x25, 0x27})};
   led = {.saved = {kLedLine, kLed},
          .restored = {kLed, kLedLine},
@@ -40,7 +42,7 @@ Smsc5407Chip::Smsc5407Chip(std::uint16_t base)
 
 bool Smsc5407Chip::DeassertPowerLed() {
   savedLed.Restore(runtime, led.restored);
-  return true;
+  return !led.saved.empty();
 }
 
 }  // namespace panelglow

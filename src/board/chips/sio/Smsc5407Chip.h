@@ -11,7 +11,8 @@ namespace panelglow {
 
 class Smsc5407Chip : public RegisterChip {
  public:
-  /// Looks where the part answers, and asks it for the base of its runtime registers.
+  /// Looks where the part answers, and asks it for the base of its runtime registers; without one it has neither
+  /// temperatures nor an LED.
   Smsc5407Chip();
 
   /// Puts the saved values back and keeps them; does nothing without a save.

@@ -32,7 +32,8 @@ constexpr std::uint32_t kFansSettle_ms = 2000;
 SmscSch5327bChip::SmscSch5327bChip()
     : SioChip("smsc_sch5327b"),
       config(IndexedPorts(devio, ReadIniWord(std::string(kPrefix) + "cfgbar", 0x2E)), {kEnterKey}, {kExitKey}),
-      ledRegisters(devio, ReadBase(config, kRuntimeDevice), config) {
+      ledRegisters(devio, 0, config) {
+  const std::uint16_t runtimeBase = ReadBase(config, kRuntimeDevice);
   ReadKeys(kPrefix, 0xF800, 0x880);
   const std::string select2 = std::string(kPrefix) + "multifunction_select2_register.";
   const std::uint8_t green = ReadIniByte(select2 + "green", 0x0E);
@@ -42,6 +43,11 @@ SmscSch5327bChip::SmscSch5327bChip()
   fans.manual = {ClearBits(kFan1Mode, kAutomatic), ClearBits(kFan2Mode, kAutomatic),
                  ClearBits(kFan3Mode, kAutomatic)};
   fans.restoreWait_ms = kFansSettle_ms;
+  led = {.isRedSupported = true};
+  if (!IsBase(runtimeBase)) {
+    return;
+  }
+  ledRegisters = LedFile(devio, runtimeBase, config);
   led = {.saved = {kLed, kLedBlink},
          .green = Steps{FromSaved(kLed, 0xFF, green), Put(kLedBlink, 0)},
          .red = Steps{FromSaved(kLed, 0xFF, red), Put(kLedBlink, 0)},

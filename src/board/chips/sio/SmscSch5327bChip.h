@@ -11,7 +11,7 @@ namespace panelglow {
 
 class SmscSch5327bChip : public SioChip {
  public:
-  /// Asks the part for the base of its runtime registers.
+  /// Asks the part for the base of its runtime registers; without one it has no LED.
   SmscSch5327bChip();
 
   // By the table: the base's LED is in other registers. NOLINTBEGIN(bugprone-parent-virtual-call)

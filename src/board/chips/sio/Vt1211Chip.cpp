@@ -1,7 +1,5 @@
 #include "board/chips/sio/Vt1211Chip.h"
 
-#include <array>
-
 #include "board/parts/ProbeConfigPort.h"
 #include "board/parts/ReadBase.h"
 
@@ -9,7 +7,7 @@ namespace panelglow {
 
 namespace {
 
-constexpr std::array<std::uint8_t, 2> kEnterKeys{0x87, 0x87};
+constexpr std::uint8_t kEnterKey = 0x87;  // twice
 constexpr std::uint8_t kExitKey = 0xAA;
 
 // Logical devices with a base.
@@ -25,16 +23,23 @@ constexpr std::uint8_t kLedControl = 0x1C;  // from the base of the power manage
 
 Vt1211Chip::Vt1211Chip()
     : RegisterChip("vt1211"),
-      ledRegisters(ConfigRegisters(IndexedPorts(devio, ProbeConfigPort(devio, kEnterKeys)),
-                                   {kEnterKeys[0], kEnterKeys[1]}, {kExitKey})),
+      ledRegisters(ConfigRegisters(IndexedPorts(devio, ProbeConfigPort(devio, {kEnterKey, kEnterKey}, {kExitKey})),
+                                   {kEnterKey, kEnterKey}, {kExitKey})),
       power(devio, 0),
       monitor(devio, 0) {
   // The GPIO lines have a base, too, which is asked for although nothing here reads them.
   ReadBase(ledRegisters, kGpioDevice);
-  power = PortRegisters(devio, ReadBase(ledRegisters, kPowerDevice));
-  monitor = PortRegisters(devio, ReadBase(ledRegisters, kMonitorDevice));
+  const std::uint16_t powerBase = ReadBase(ledRegisters, kPowerDevice);
+  const std::uint16_t monitorBase = ReadBase(ledRegisters, kMonitorDevice);
+  if (IsBase(monitorBase)) {
+    monitor = PortRegisters(devio, monitorBase);
+    zones = {.zones = RegistersAt(0, {0x1F, 0x21, 0x20})};
+  }
+  if (!IsBase(powerBase)) {
+    return;
+  }
+  power = PortRegisters(devio, powerBase);
   ledRegisters.ports = &power;
-  zones = {.zones = RegistersAt(0, {0x1F, 0x21, 0x20})};
   // The ports are there while their device is active: the first to be changed is the last to be put back.
   constexpr RegisterId kLed{LedFile::kPorts, kLedControl};
   led = {.saved = {kPowerActivate, kLed},

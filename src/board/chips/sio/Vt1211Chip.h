@@ -12,7 +12,7 @@ namespace panelglow {
 
 class Vt1211Chip : public RegisterChip {
  public:
-  /// Looks where the part answers, and asks it for its bases.
+  /// Looks where the part answers, and asks it for its bases. Without them it has no temperatures or no LED.
   Vt1211Chip();
 
  protected:

@@ -25,6 +25,7 @@ constexpr RegisterId kFan3Mode{0, 0x12};
 
 NuvNct5571Chip::NuvNct5571Chip() : NuvW83667Chip("nuv_nct5571") {
   ReadKeys({"chip.nuvo5571.", 0x4000, 0xA10, 0x4E});
+  // The GPIO groups stay the base's: the part has them in the same registers, as the LED's below show.
   counters.resize(3);
   fans.duties = RegistersAt(0, {0x01, 0x03, 0x11});
   fans.saved = RegistersAt(0, {0x04, 0x12, 0x01, 0x03, 0x11});

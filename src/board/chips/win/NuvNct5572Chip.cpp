@@ -71,6 +71,7 @@ bool NuvNct5572Chip::SavePowerButtonState() {
 }
 
 bool NuvNct5572Chip::ArmPowerButton() {
+  SavePowerButtonState();
   Run(kDisarm, buttonPorts);
   return true;
 }

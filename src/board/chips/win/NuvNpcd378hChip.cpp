@@ -8,6 +8,7 @@
 #include "board/parts/ConfigMode.h"
 #include "board/parts/ReadBase.h"
 #include "board/parts/RowOf.h"
+#include "board/parts/RpmOf.h"
 
 namespace panelglow {
 
@@ -32,27 +33,40 @@ constexpr std::uint8_t kDuty = 0x80;
 constexpr std::uint8_t kManual = 0x9F;  // bits of the control that stay when it is taken
 constexpr unsigned kPages = 4;
 
-// Nothing for a fan that the part does not have.
-std::vector<RegisterId> ControlOf(int fan) {
-  const std::vector<RegisterId> controls = RegisterRun(0, kControl, kFans);
-  const RegisterId* control = RowOf(controls, fan);
-  return control == nullptr ? std::vector<RegisterId>{} : std::vector<RegisterId>{*control};
-}
-
 }  // namespace
 
 NuvNpcd378hChip::NuvNpcd378hChip()
     : RegisterChip("nuv_npcd378h"),
       config(IndexedPorts(devio, ReadIniWord("chip.nuv_npcd378h.cfgbar", 0x2E)), {}, {}),
-      monitor(devio, ReadBase(config, kMonitorDevice), PagedPorts::WriteLock::kHost),
-      gpio(devio, ReadIniWordUnlessZero("chip.nuv_npcd378h.gpiobar", ReadBase(config, kGpioDevice))) {
-  fans = {.tachs = RegisterPairs(0, kSpeed, kFans), .duties = RegisterRun(0, kDuty, kFans)};
-  led = {.saved = {kLed}, .green = Steps{Put(kLed, 0x1E)}, .red = Steps{Put(kLed, 0x1F)}, .off = Steps{Put(kLed, 0)}};
+      monitor(devio, 0, PagedPorts::WriteLock::kHost),
+      gpio(devio, 0) {
+  const std::uint16_t monitorBase = ReadBase(config, kMonitorDevice);
+  const std::uint16_t gpioBase = ReadIniWordUnlessZero("chip.nuv_npcd378h.gpiobar", ReadBase(config, kGpioDevice));
+  hasMonitor = IsBase(monitorBase);
+  if (hasMonitor) {
+    monitor = PagedPorts(devio, monitorBase, PagedPorts::WriteLock::kHost);
+    fans = {.tachs = RegisterPairs(0, kSpeed, kFans), .duties = RegisterRun(0, kDuty, kFans)};
+    controls = RegisterRun(0, kControl, kFans);
+  }
+  if (IsBase(gpioBase)) {
+    gpio = PortRegisters(devio, gpioBase);
+    led = {
+        .saved = {kLed}, .green = Steps{Put(kLed, 0x1E)}, .red = Steps{Put(kLed, 0x1F)}, .off = Steps{Put(kLed, 0)}};
+  }
 }
 
 // ---- fans
 
+std::uint32_t NuvNpcd378hChip::ReadFanTach(int fan, int arg) {
+  return hasMonitor ? RegisterChip::ReadFanTach(fan, arg) : kTachStopped;
+}
+
 int NuvNpcd378hChip::TachToRpm(std::uint32_t raw, int /*multiplier*/) { return static_cast<int>(raw); }
+
+std::vector<RegisterId> NuvNpcd378hChip::ControlOf(int fan) const {
+  const RegisterId* control = RowOf(controls, fan);
+  return control == nullptr ? std::vector<RegisterId>{} : std::vector<RegisterId>{*control};
+}
 
 void NuvNpcd378hChip::SaveFanControl(int fan) {
   for (const RegisterId control : ControlOf(fan)) {
@@ -71,7 +85,7 @@ void NuvNpcd378hChip::RestoreFanControl(int fan) { savedControls.Restore(monitor
 // ---- registers that files name
 
 bool NuvNpcd378hChip::ReadEnvironmentRegister(std::uint16_t reg, std::uint8_t& value) {
-  if (HighByte(reg) >= kPages) {
+  if (!hasMonitor || HighByte(reg) >= kPages) {
     return false;
   }
   value = monitor.Read({HighByte(reg), LowByte(reg)});

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <vector>
 
 #include "board/chips/RegisterChip.h"
 #include "board/chips/win/PagedPorts.h"
@@ -13,8 +14,11 @@ namespace panelglow {
 
 class NuvNpcd378hChip : public RegisterChip {
  public:
-  /// Asks the part for its bases.
+  /// Asks the part for its bases. Without one, what stands there answers as a fan or a lamp that the part does not
+  /// have.
   NuvNpcd378hChip();
+
+  std::uint32_t ReadFanTach(int fan, int arg) override;
 
   /// The part gives revolutions per minute.
   int TachToRpm(std::uint32_t raw, int multiplier) override;
@@ -24,7 +28,7 @@ class NuvNpcd378hChip : public RegisterChip {
   void TakeFanControl(int fan) override;
   void RestoreFanControl(int fan) override;
 
-  /// False beyond the part's four pages.
+  /// False beyond the part's four pages, and without a monitor.
   bool ReadEnvironmentRegister(std::uint16_t reg, std::uint8_t& value) override;
 
   /// False for a bit that a register does not have.
@@ -38,11 +42,15 @@ class NuvNpcd378hChip : public RegisterChip {
   RegisterFile& LedRegisters() override { return gpio; }
 
  private:
+  /// Nothing for a fan that the part does not have.
+  [[nodiscard]] std::vector<RegisterId> ControlOf(int fan) const;
   bool MoveHood(bool locks);
 
   ConfigRegisters config;
   PagedPorts monitor;
+  bool hasMonitor = false;  // the monitor has a base
   PortRegisters gpio;
+  std::vector<RegisterId> controls;
   SavedRegisters savedControls;
 };
 

@@ -25,7 +25,9 @@ NuvW83667Chip::NuvW83667Chip() : NuvW83667Chip("nuv_w83667") {}
 
 NuvW83667Chip::NuvW83667Chip(std::string chipName) : WinChip(std::move(chipName)) {
   ReadKeys({"chip.nuv_w83667.", 0x2000, 0x295, 0x4E});
-  // Group 1 has device 8, groups 2 to 5 device 9, the others device 7.
+  // Group 1 has device 8, groups 2 to 5 device 9, the others device 7. A line of groups 2 to 5 that is read leaves
+  // the activation register of device 9 with that group's bit alone; it is one of the LED's, too, and what the LED
+  // saved puts it back.
   ReadGroups({{{8, 1, 0xF0, 0xF1, 0xF2, 0xF3},
                {9, 0, 0xE0, 0xE1, 0xE2, 0xE3},
                {9, 1, 0xE4, 0xE5, 0xE6, 0xE7},

@@ -112,11 +112,12 @@ int WinChip::ReadGroup(int line, std::uint8_t GpioGroup::*reg) {
     return kNoSuchLine;
   }
   const GpioGroup& group = groups[static_cast<std::size_t>(line / 10 - 1)];
-  if (group.device == 0 || group.io == 0 || group.inversion == 0 || group.*reg == 0) {
-    return kNoSuchLine;  // nobody has described it
+  const std::uint8_t enable = LowByte(MaskOfBit(group.enableBit, 8));
+  if (group.device == 0 || enable == 0 || group.io == 0 || group.inversion == 0 || group.*reg == 0) {
+    return kNoSuchLine;  // nobody has described it, or not as the part can have it
   }
   const ConfigMode mode(registers);
-  registers.Write({group.device, kActivate}, LowByte(MaskOfBit(group.enableBit, 8)));
+  registers.Write({group.device, kActivate}, enable);
   registers.Write({group.device, group.io}, 0xFF);
   registers.Write({group.device, group.inversion}, 0);
   return LineState((registers.Read({group.device, group.*reg}) & MaskOfBit(bit, 8)) != 0);
@@ -130,6 +131,7 @@ bool WinChip::SavePowerButtonState() {
 }
 
 bool WinChip::ArmPowerButton() {
+  SavePowerButtonState();
   Run(std::array{SetBits(kPanelSwitch, kSwitchBlocked)}, config);
   config.Read(kWakeStatus);  // an older press does not count
   return true;

@@ -2,6 +2,7 @@
 
 #include "board/parts/Bits.h"
 #include "board/parts/ConfigMode.h"
+#include "board/parts/ReadBase.h"
 
 namespace panelglow {
 
@@ -17,18 +18,13 @@ constexpr RegisterId kBaseLow{kMonitorDevice, 0x61};
 constexpr std::uint16_t kIndexOffset = 5;  // from the base
 constexpr std::uint8_t kBankSelect = 0x4E;
 
-// What the base reads as where there is none: not set, or nobody answers.
-constexpr std::uint16_t kUnset = 0;
-constexpr std::uint16_t kNobody = 0xFFFF;
-
 }  // namespace
 
 IndexedPorts WinMonitor::SelectBank(std::uint8_t bank) {
   config.Write(kActivate, 1);
   const std::uint8_t high = config.Read(kBaseHigh);
   const std::uint16_t base = WordOf(high, config.Read(kBaseLow));
-  const bool hasBase = base != kUnset && base != kNobody;
-  const IndexedPorts ports(*devio, hasBase ? static_cast<std::uint16_t>(base + kIndexOffset) : fallback);
+  const IndexedPorts ports(*devio, IsBase(base) ? static_cast<std::uint16_t>(base + kIndexOffset) : fallback);
   ports.Write(kBankSelect, bank);
   return ports;
 }

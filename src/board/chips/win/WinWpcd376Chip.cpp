@@ -87,14 +87,18 @@ bool WinWpcd376Chip::UnlockHood(int /*line*/, bool /*check*/) { return MoveHoodL
 // ---- power LED
 
 bool WinWpcd376Chip::SavePowerLedState() {
+  isSaved = true;
   const ConfigMode mode(config);
   Run(kTakePins, config);
   return true;
 }
 
 bool WinWpcd376Chip::RestorePowerLedState() {
-  gpio.Write(kLed, kGreen);
-  config.Write(kPinSelect, kPinsOfFirmware);
+  if (isSaved) {
+    gpio.Write(kLed, kGreen);
+    config.Write(kPinSelect, kPinsOfFirmware);
+    isSaved = false;  // last: a restore that is interrupted is done again
+  }
   return true;
 }
 

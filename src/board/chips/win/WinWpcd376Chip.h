@@ -20,6 +20,7 @@ class WinWpcd376Chip : public RegisterChip {
   bool UnlockHood(int line, bool check) override;
 
   /// Gives the LED its pins. What they were before is not kept: a restore leaves the LED green, as firmware does.
+  /// Without a save it does nothing.
   bool SavePowerLedState() override;
   bool RestorePowerLedState() override;
 
@@ -34,6 +35,7 @@ class WinWpcd376Chip : public RegisterChip {
   std::uint8_t ReadMonitor(std::uint8_t reg);
   void WriteMonitor(std::uint8_t reg, std::uint8_t value);
 
+  bool isSaved = false;  // the LED's pins are taken
   ConfigRegisters config;
   PortRegisters gpio;
   PagedPorts pages;
