@@ -59,6 +59,7 @@ class BridgeBench : public KeyBench {
       : KeyBench(hardware, keys) {
     auto ports = std::make_unique<AnsweringPorts>(answers);
     ports->isKept = isKept;
+    machine.Hardware().Remove("pci");  // whose ports have answers here
     machine.Hardware().Attach("ports", std::move(ports));
   }
 };
