@@ -504,10 +504,6 @@ TEST(SioChips, APartThatIsLookedForIsClosedAgain) {
       isDone = true;
     });
     EXPECT_THAT(bench.machine.HardwareState(), ::testing::HasSubstr("configuration mode = closed")) << step;
-    fprintf(stderr, "step %d done %d %s %s\n", int(step), isDone, "",
-            bench.machine.HardwareState().substr(85, 40).c_str());
-    for (auto& r : bench.machine.Trace().Requests())
-      fprintf(stderr, "  %s\n", Describe(r).c_str());
   }
 }
 
