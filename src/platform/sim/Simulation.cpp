@@ -118,7 +118,9 @@ struct Simulation::Parts {
   }
 
   void AttachChips() {
-    buses.Attach(kPci, std::make_unique<PciDoorway>(buses));
+    if (!buses.PciFunctions().empty()) {
+      buses.Attach(kPci, std::make_unique<PciDoorway>(buses));
+    }
     for (const ChipDescription& chip : description.chips) {
       std::unique_ptr<Device> device = MakeChip(chip, scheduler);
       chips.push_back(device.get());

@@ -1,4 +1,4 @@
-// The doorway from I/O ports to PCI configuration space, which every machine has.
+// The doorway from I/O ports to PCI configuration space, on every machine that has a function there.
 #pragma once
 
 #include <cstdint>
