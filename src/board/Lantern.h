@@ -1,5 +1,6 @@
 // The board class "Lantern": the power LED hangs on a multi-function pin of the Super-I/O, and is lit by the chip
-// that the files name.
+// that the files name. The class places no chip itself, so that on its own it tells people that the LED cannot be
+// lit.
 #pragma once
 
 #include <cstdint>
