@@ -497,7 +497,7 @@ TEST(SioChips, APartIsLookedForAtBothPlaces) {
 // Also a part that opens and reads as nobody, and one whose reader is told to end.
 TEST(SioChips, APartThatIsLookedForIsClosedAgain) {
   bool isDone = false;
-  for (platform::sim::Microseconds step = 0; !isDone; step += 1) {
+  for (platform::sim::Microseconds step = 0; !isDone; step += 2) {
     KeyBench bench(SuperIo(0x2E, "0x55", "[chip.registers]\n00 = 0xFF\n"));
     bench.EndAfter(step, [&] {
       MakeChip("smsc5407");

@@ -19,10 +19,8 @@ inline std::uint16_t ProbeConfigPort(CDevio& devio, const std::vector<std::uint8
   constexpr std::uint16_t kSecond = 0x4E;
   constexpr std::uint8_t kNobody = 0xFF;
   ConfigRegisters first(IndexedPorts(devio, kFirst), enterKeys, exitKeys);
-  first.EnterConfigMode();
-  const auto r = devio.InportByte(kFirst + 1) == kNobody ? kSecond : kFirst;
-  first.ExitConfigMode();
-  return r;
+  const ConfigMode mode(first);
+  return devio.InportByte(kFirst + 1) == kNobody ? kSecond : kFirst;
 }
 
 }  // namespace panelglow
