@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <optional>
 #include <span>
 #include <string>
@@ -18,6 +19,21 @@ template <class Char>
 std::optional<std::basic_string_view<Char>> FindValue(std::basic_string_view<Char> text,
                                                       std::basic_string_view<Char> section,
                                                       std::basic_string_view<Char> key);
+
+/// A section's header, or a line of a section that is neither blank nor a comment, as the look-ups see it.
+struct OutlineLine {
+  std::size_t number = 1;  // of the line in the text
+  std::size_t column = 1;  // of its first character that is no blank
+  bool isHeader = false;
+  bool isEntry = false;         // it has a "="
+  std::string_view name;        // of the section, or of the key; all of a line that is no entry
+  std::string_view value;       // with its quotes
+  std::size_t valueColumn = 1;  // where it begins, or would
+  std::string_view line;        // whole, without its line end
+};
+
+/// Gives the headers and lines of a text in order, those before the first header, too.
+void VisitLines(std::string_view text, const std::function<void(const OutlineLine&)>& visit);
 
 /// The names of all sections, each ended by NUL. A repeated name stands as often as the file has it.
 template <class Char>

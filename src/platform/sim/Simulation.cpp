@@ -7,6 +7,7 @@
 #include <ctime>
 #include <map>
 
+#include "platform/HostInPlace.h"
 #include "platform/desktop/Scene.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
@@ -384,6 +385,9 @@ Simulation& CurrentSimulation() {
 namespace panelglow::platform {
 
 // Weak, so that a program may link a host of its own: a test that stands in for a service of the machine.
-[[gnu::weak]] Host& TheHost() { return sim::CurrentSimulation().TheMachine(); }
+[[gnu::weak]] Host& TheHost() {
+  Host* const other = HostInPlace::Current();
+  return other == nullptr ? sim::CurrentSimulation().TheMachine() : *other;
+}
 
 }  // namespace panelglow::platform
