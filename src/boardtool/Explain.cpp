@@ -1,6 +1,7 @@
 #include "boardtool/Explain.h"
 
 #include <algorithm>
+#include <map>
 #include <nlohmann/json.hpp>
 
 #include "platform/Host.h"
@@ -23,29 +24,93 @@ std::string BitsOf(const PlannedAccess& planned) {
   const std::uint64_t all = planned.access.width >= 8 ? ~std::uint64_t{0}
                                                       : (std::uint64_t{1} << (8 * planned.access.width)) - 1;
   const std::uint64_t cleared = all & ~planned.kept & ~planned.set;
-  std::string text = planned.set == 0 && cleared == 0 ? "as read" : "as read";
+  std::string text = "as read";
   text += planned.set == 0 ? "" : ", bits " + Hex(planned.set, digits) + " set";
   text += cleared == 0 ? "" : ", bits " + Hex(cleared, digits) + " cleared";
   return text;
 }
 
-std::string TextOf(const PlannedAccess& planned) {
-  std::string text = Describe(planned.access);
-  if (const std::string bits = BitsOf(planned); !bits.empty()) {
-    text = PlaceOf(planned.access) + " <- " + bits;
+std::string ValueOf(const PlannedAccess& planned) {
+  const std::string bits = BitsOf(planned);
+  if (!bits.empty()) {
+    return " <- " + bits;
   }
-  if (const std::string reg = RegisterOf(planned.access); !reg.empty()) {
-    text += "  (" + reg + ")";
-  }
-  return text;
+  return IsRead(planned.access.kind)
+             ? " is read"
+             : " <- " + Hex(planned.access.value, static_cast<int>(std::max(1U, planned.access.width) * 2));
 }
 
-std::string SourceOf(const PlannedAccess& planned, const Files& files) {
+std::string TextOf(const PlannedAccess& planned) {
+  const HardwareAccess& access = planned.access;
+  const std::string text = IsRead(access.kind) || IsWrite(access.kind) ? PlaceOf(access) + ValueOf(planned)
+                                                                       : Describe(access);
+  const std::string reg = RegisterOf(access);
+  return text + (reg.empty() ? "" : "  (" + reg + ")");
+}
+
+// A line for people: one request, or an index port's write with the access to the register behind it.
+struct ShownLine {
   std::string text;
-  for (const IniEntry* const entry : planned.from) {
-    text += (text.empty() ? "" : ", ") + PlaceOf(files, *entry) + " " + entry->key;
+  std::vector<const IniEntry*> from;
+  unsigned times = 1;
+};
+
+bool SelectsNext(const PlannedAccess& access, const PlannedAccess& next) {
+  return access.access.kind == HardwareAccess::Kind::kPortWrite && next.access.reg >= 0 &&
+         access.access.address == static_cast<std::uint64_t>(next.access.indexPort) &&
+         access.access.value == static_cast<std::uint64_t>(next.access.reg);
+}
+
+std::vector<ShownLine> Shown(const std::vector<PlannedAccess>& accesses) {
+  std::vector<ShownLine> lines;
+  for (std::size_t i = 0; i < accesses.size(); ++i) {
+    ShownLine line{TextOf(accesses[i]), accesses[i].from};
+    if (i + 1 < accesses.size() && SelectsNext(accesses[i], accesses[i + 1])) {
+      const PlannedAccess& access = accesses[++i];
+      line = {RegisterOf(access.access) + " behind port " + Hex(static_cast<unsigned>(access.access.indexPort), 4) +
+                  ValueOf(access),
+              access.from};
+    }
+    if (!lines.empty() && lines.back().text == line.text && lines.back().from == line.from) {
+      ++lines.back().times;
+    } else {
+      lines.push_back(std::move(line));
+    }
   }
-  return text;
+  return lines;
+}
+
+// How many requests hang on each entry.
+using Weights = std::map<const IniEntry*, std::size_t>;
+
+Weights WeightsOf(const BoardPlan& plan) {
+  Weights weights;
+  const auto count = [&](const std::vector<PlannedAccess>& accesses) {
+    for (const PlannedAccess& access : accesses) {
+      for (const IniEntry* const entry : access.from) {
+        ++weights[entry];
+      }
+    }
+  };
+  count(plan.setUp);
+  for (const LedPlan& led : plan.leds) {
+    for (const PlannedStep& step : led.steps) {
+      count(step.accesses);
+    }
+  }
+  return weights;
+}
+
+// The entry that says most about a request is the one on which the fewest hang.
+std::string SourceOf(std::vector<const IniEntry*> from, const Files& files, const Weights& weights) {
+  constexpr std::size_t kMostShown = 2;
+  std::stable_sort(from.begin(), from.end(),
+                   [&](const IniEntry* a, const IniEntry* b) { return weights.at(a) < weights.at(b); });
+  std::string text;
+  for (std::size_t i = 0; i < from.size() && i < kMostShown; ++i) {
+    text += (i == 0 ? "" : ", ") + PlaceOf(files, *from[i]) + " " + from[i]->key;
+  }
+  return text + (from.size() > kMostShown ? ", ..." : "");
 }
 
 std::string Line(const std::string& head, const std::string& text, const std::string& source) {
@@ -57,22 +122,17 @@ std::string Line(const std::string& head, const std::string& text, const std::st
   return line + "\n";
 }
 
-std::string StepText(const PlannedStep& step, const Files& files) {
+std::string StepText(const PlannedStep& step, const Files& files, const Weights& weights) {
   std::string head = "  " + step.name;
   head.resize(12, ' ');
   if (step.accesses.empty()) {
     return head + (step.answer ? "nothing to do" : "no such thing on this board") + "\n";
   }
   std::string text;
-  for (auto access = step.accesses.begin(); access != step.accesses.end();) {
-    const auto next = std::find_if(access, step.accesses.end(), [&](const PlannedAccess& other) {
-      return TextOf(other) != TextOf(*access) || other.from != access->from;
-    });
-    const auto count = next - access;
+  for (const ShownLine& line : Shown(step.accesses)) {
     text += Line(text.empty() ? head : std::string(head.size(), ' '),
-                 TextOf(*access) + (count > 1 ? "  (" + std::to_string(count) + " times)" : ""),
-                 SourceOf(*access, files));
-    access = next;
+                 line.text + (line.times > 1 ? "  (" + std::to_string(line.times) + " times)" : ""),
+                 SourceOf(line.from, files, weights));
   }
   return text + (step.answer ? "" : std::string(head.size(), ' ') + "the board answers: not done\n");
 }
@@ -102,7 +162,7 @@ std::string ByteName(const ImaginedHardware::Cell& cell) {
   return PlaceOf(access);
 }
 
-std::string LedText(const BoardPlan& plan, const LedPlan& led, const Files& files) {
+std::string LedText(const BoardPlan& plan, const LedPlan& led, const Files& files, const Weights& weights) {
   std::string text = "\n" + std::string(led.led->id) + ": " + std::string(led.led->title) + "\n";
   const std::string decided = Decided(plan, files, std::string(led.led->chipKey));
   text += Line("  chip      ", decided.empty() ? "no key \"" + std::string(led.led->chipKey) + "\" chooses one" : "",
@@ -111,7 +171,7 @@ std::string LedText(const BoardPlan& plan, const LedPlan& led, const Files& file
     text += "  ends with  " + led.failure + "\n";
   }
   for (const PlannedStep& step : led.steps) {
-    text += StepText(step, files);
+    text += StepText(step, files, weights);
   }
   if (led.blinksByItself) {
     text += "  The chip blinks it by itself; \"on\" and \"off\" are for the signal lamp.\n";
@@ -170,6 +230,7 @@ Json JsonOf(const std::vector<PlannedAccess>& accesses, const Files& files) {
 }  // namespace
 
 std::string ExplainText(const BoardPlan& plan, const Files& files, bool allLeds) {
+  const Weights weights = WeightsOf(plan);
   std::string text = "board " + plan.systemId + ": ";
   if (!plan.failure.empty()) {
     text += "cannot be built: " + plan.failure + "\n";
@@ -188,7 +249,7 @@ std::string ExplainText(const BoardPlan& plan, const Files& files, bool allLeds)
     const std::string list = Decided(plan, files, "chips");
     text += "chips: " + (chips.empty() ? "none" : chips) + (list.empty() ? "" : "  (" + list + ")") + "\n";
     if (!plan.setUp.empty()) {
-      text += StepText({"building", true, plan.setUp}, files);
+      text += StepText({"building", true, plan.setUp}, files, weights);
     }
   }
   std::string without;
@@ -199,7 +260,7 @@ std::string ExplainText(const BoardPlan& plan, const Files& files, bool allLeds)
     if (isBare && allLeds) {
       without += (without.empty() ? "" : ", ") + std::string(led.led->id);
     } else {
-      text += LedText(plan, led, files);
+      text += LedText(plan, led, files, weights);
     }
   }
   text += without.empty() ? "" : "\nThis board lights none of: " + without + "\n";

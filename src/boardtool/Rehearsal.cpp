@@ -146,7 +146,9 @@ class Stage {
   std::vector<ImaginedHardware::Cell> LeftChanged(std::uint8_t background) {
     std::vector<ImaginedHardware::Cell> changed;
     for (const auto& [cell, value] : host_.Hardware().Written()) {
-      if (value != background) {
+      // A plain port's last byte says nothing of what stands behind it.
+      const bool isRegister = cell.indexPort >= 0 || cell.space != HardwareAccess::Kind::kPortWrite;
+      if (isRegister && value != background) {
         changed.push_back(cell);
       }
     }
