@@ -1,6 +1,6 @@
-// The board library's face: one object stands for the system board, and the tests ask it for LEDs without knowing
-// what is behind them. This is also the class "generic": the INI files name the chips to build, and the chips do the
-// work.
+// The board library's face: one object stands for the system board, and the tests ask it for LEDs, fans, temperatures
+// and detected devices without knowing what is behind them. This is also the class "generic": the INI files name the
+// chips to build, and the chips do the work.
 //
 // A board holds the machine-wide mutex of the board library for all of its life, so boards are one at a time across
 // all threads and processes of the suite (one thread may nest them): building one blocks while another is alive.
@@ -15,12 +15,23 @@
 
 #include "board/ChipTable.h"
 #include "board/chips/Chip.h"
+#include "board/sets/DeviceDetection.h"
+#include "board/sets/FanSet.h"
+#include "board/sets/HoodLock.h"
+#include "board/sets/HoodSwitch.h"
+#include "board/sets/LegacySettings.h"
+#include "board/sets/TestButtons.h"
+#include "board/sets/ZoneSet.h"
 #include "platform/NamedMutexes.h"
 
 namespace panelglow {
 
+class XmlObject;
+
 class MotherBoard {
  public:
+  using DEVICE_INFO = panelglow::DEVICE_INFO;
+
   /// A board by the INI data of this system (or of `systemIdOverride`); null when the data selects no class of this
   /// path, which is no error. `classKey` names the key that holds the class, as "platform". Throws CDMException
   /// 990431 when the chip file is missing, and mblib_exception for chip data that cannot be used.
@@ -43,6 +54,76 @@ class MotherBoard {
 
   [[nodiscard]] std::uint16_t GetSystemId() const { return systemId; }
   [[nodiscard]] const std::string& GetClassName() const { return className; }
+
+  // ---- devices that the files name, each class looked for by its own operation (see DeviceDetection)
+  virtual bool DetectJumpers();
+  virtual bool DetectFrontPanel();
+  virtual bool DetectSecurityDevices();
+  virtual bool DetectPowerSupply();
+  virtual bool DetectHeatsink();
+  virtual bool DetectDashCable();
+  virtual bool DetectRiser();
+  virtual bool DetectCables();
+  virtual bool DetectPoweredDevices();
+  virtual bool DetectInternalSpeaker();
+  virtual bool DetectTouchScreen();
+
+  /// The operation of a kind, for callers that go through all of them.
+  bool Detect(DeviceKind kind);
+
+  /// What was found; empty before the kind's operation. TitleOf(kind) is what people call it.
+  [[nodiscard]] const std::vector<DEVICE_INFO>& GetDevices(DeviceKind kind) const { return devices.List(kind); }
+
+  // ---- fans (see FanSet). They are loaded first; a fan is named by its number in the keys.
+  virtual bool LoadFanGroups();
+  virtual bool LoadFans();
+  virtual void TakeFanControl();
+  virtual void ReleaseFanControl();
+  virtual bool SetActiveReadingSet(std::uint32_t index);
+  virtual void SetFanTests(bool full, bool pwm, bool nominal);
+  virtual bool SetManualFanMode(bool on);
+  virtual bool SaveFanStates();
+  virtual bool RestoreFanStates();
+  virtual bool ReadAllFans();
+
+  /// The oldest boards' own way to a fan; false elsewhere.
+  virtual bool ReadFan(int index, int& rpm);
+  virtual bool ReadOneFan(int index);
+  virtual bool SetAllFansFull();
+  virtual bool SetAllFansPwm();
+  virtual bool SetFanPwm(int index);
+  virtual void WaitForFans();
+
+  /// `group`: which fans were tested, for the reader.
+  virtual void WriteFanLog(const LineSink& write, const std::string& group);
+  virtual void WriteFanResults(XmlObject& parent);
+
+  /// Looks which fans are plugged in; the answer is each fan's detectionStatus.
+  virtual bool DetectFans();
+  [[nodiscard]] const std::vector<FanGroup>& GetFanGroups() const { return fans.Groups(); }
+
+  // ---- temperature zones (see ZoneSet). They are loaded first; a zone is named by its number from 1. The getters
+  // are true when zones were loaded, also when there are none.
+  virtual bool GetZones(std::vector<TempZone>& list);
+  virtual bool LoadZones();
+  virtual bool LoadZoneGroups();
+  virtual bool GetZoneCount(int& count);
+  virtual bool GetProbeRate(int& seconds);
+  virtual bool SetProbeRate(int seconds);
+  virtual bool GetConsecutiveHigh(int& count);
+  virtual bool GetConsecutiveLow(int& count);
+  virtual bool GetRetriesOnInvalid(int& count);
+  virtual bool IsZoneSkipped(int zone);
+  virtual bool SetZoneSkipped(int zone, bool skip);
+  virtual bool CheckZone(int zone, ZoneCheck& check);
+  virtual bool GetZoneName(int zone, std::string& zoneName);
+  virtual void WriteZoneLog(const LineSink& write);
+  virtual void WriteZoneResults(XmlObject& parent);
+  virtual int ReadProchot(int zone);
+  virtual int GetZoneHigh(int zone);
+  virtual int GetZoneLow(int zone);
+  virtual int ReadZone(int zone);
+  [[nodiscard]] const std::vector<ZoneGroup>& GetZoneGroups() const { return zones.Groups(); }
 
   // ---- LED operations. False: the board has no such LED; that an LED cannot be lit or darkened is told to people. A
   // blink that returns true has set the chip to blink the LED by itself; otherwise the caller toggles. Save and
@@ -99,6 +180,54 @@ class MotherBoard {
   virtual bool ArmPowerButton();
   virtual bool IsPowerButtonPressed(bool& pressed);
 
+  // ---- hood and buttons (see HoodSwitch, HoodLock, TestButtons); each is loaded first
+  virtual bool LoadHoodSwitch();
+  virtual bool ReadHoodSwitch(bool& value);
+  virtual bool ReadHoodLatch(bool clearFirst, bool& value);
+  virtual bool LoadHoodLock();
+  virtual bool ReadHoodLock(bool& present);
+  virtual int LockHood();
+  virtual int UnlockHood();
+  virtual bool LoadButtons();
+  virtual bool SelectButton(const std::string& buttonName);
+  virtual bool GetButtonState(const std::string& buttonName, bool& pressed);
+  virtual bool ReadButtonDirect(bool& value);
+  virtual bool ReadButton(bool& pressed);
+  virtual bool ReadButtonLatch(bool& value);
+  [[nodiscard]] const std::vector<TestButton>& GetButtons() const { return buttons.List(); }
+
+  // ---- what only the oldest boards have; false, and nothing is touched, on all others
+
+  /// Reads the flat keys of the detection file, and with them the fans and zones.
+  virtual bool LoadLegacySettings();
+
+  /// Whether the machine has a device of the flat keys. False, and `present` stays, when its key has no line or the
+  /// line cannot be read.
+  virtual bool DetectLegacyDevice(LegacyDevice device, bool& present);
+
+  /// Whether a fan turns.
+  virtual bool DetectLegacyFan(int index, bool& present);
+  virtual bool SaveLegacyFanState();
+  virtual bool RestoreLegacyFanState();
+
+  // ---- records of fans; false, and nothing is written, for a number without a fan
+  virtual bool GetFanCount(int& count);
+  virtual bool GetFans(std::vector<Fan>& list);
+  virtual bool GetFanName(int index, std::string& fanName);
+  virtual bool GetFanFullLimits(int index, FanLimits& limits);
+
+  /// The oldest boards' own way to full speed, and below to a fan's duty; false elsewhere.
+  virtual bool SetLegacyFanFull(int index);
+  virtual bool GetFanNominalLimits(int index, FanLimits& limits);
+  virtual bool GetFanPwmLimits(int index, FanLimits& limits);
+  virtual bool GetFanPwmDuty(int index, int& percent);
+  virtual bool SetLegacyFanPwm(int index);
+  virtual bool GetFanReading(int index, FanReading column, int& rpm);
+  virtual bool GetFanRecord(int index, Fan& record);
+
+  /// As WriteFanLog, with other words in the heading and the full-speed verdict.
+  virtual void WriteFanLogEx(const LineSink& write, const std::string& group);
+
   // ---- latched status bits, by number, of the chip in the first place
   virtual bool ReadLatchedBit(std::uint16_t port, int bit);
   virtual bool ClearLatchedBit(std::uint16_t port, int bit);
@@ -109,6 +238,9 @@ class MotherBoard {
 
   /// Builds the class of a name of the chip table in its place; a class that this version does not have stays "none".
   void Place(std::string_view chipName);
+
+  /// The chip that serves a fan, zone or device; GetChip, unless a board class has one of its own.
+  virtual Chip& ChipFor(const std::string& chipName) { return GetChip(chipName); }
 
   /// `place` counts from 1.
   [[nodiscard]] Chip& ChipAt(std::size_t place) { return *chips[place - 1]; }
@@ -141,7 +273,14 @@ class MotherBoard {
   ChipChoice microphoneLed{"test.microphoneled.chip", "microphone LED", "codecgpio."};
   ChipChoice powerButton{"test.powerbutton.chip", "power button", ""};
 
+  FanSet fans{Finder()};
+  ZoneSet zones{Finder()};
+  DeviceDetection devices{Finder()};
+
  private:
+  ChipFinder Finder() {
+    return [this](const std::string& chipName) -> Chip& { return ChipFor(chipName); };
+  }
   void BuildListedChips();
   void BuildAllChips();
   void InitializeGeneric(std::size_t place);
@@ -152,6 +291,9 @@ class MotherBoard {
   std::vector<std::string> listed;                       // the value of "chips", in names; none: every class
   std::uint16_t systemId;
   std::string className;
+  HoodSwitch hoodSwitch{Finder()};
+  HoodLock hoodLock{Finder()};
+  TestButtons buttons{Finder()};
 };
 
 }  // namespace panelglow

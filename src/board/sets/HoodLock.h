@@ -1,0 +1,31 @@
+// The lock that keeps the machine's hood shut.
+#pragma once
+
+#include <string>
+#include <utility>
+
+#include "board/sets/ChipFinder.h"
+
+namespace panelglow {
+
+class HoodLock {
+ public:
+  /// Of Lock and Unlock: the files do not name both lines.
+  static constexpr int kNoLines = -256;
+
+  explicit HoodLock(ChipFinder finder) : chipOf(std::move(finder)) {}
+
+  bool Load();
+
+  /// Whether the machine has the lock, which Lock and Unlock rely on. False, and `present` stays, when no line tells.
+  bool Read(bool& present);
+
+  /// 1 when the lock moved, 0 when it did not or was not found by Read, kNoLines.
+  int Lock();
+  int Unlock();
+
+ private:
+  ChipFinder chipOf;
+};
+
+}  // namespace panelglow

@@ -1,0 +1,76 @@
+// The temperature zones of a board: which there are, how they are read, and whether they are too hot or too cold.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "board/sets/ChipFinder.h"
+#include "board/sets/TempZone.h"
+
+namespace panelglow {
+
+class XmlObject;
+
+/// How a test of temperatures goes; the test itself keeps to it.
+struct ProbeSettings {
+  int rate_s = 10;           // between two readings of a zone
+  int consecutiveHigh = 1;   // checks in a row that make a zone too hot
+  int consecutiveLow = 1;    // ... or too cold
+  int retriesOnInvalid = 1;  // readings that may be none
+};
+
+/// Zones are named by their number, from 1 in the order of the list; a number without a zone is false, or a reading
+/// or limit that is none, and touches nothing.
+class ZoneSet {
+ public:
+  explicit ZoneSet(ChipFinder finder) : chipOf(std::move(finder)) {}
+
+  /// Reads zones and probe settings from the files, in place of those before. Throws what the chips throw of whose
+  /// thresholds limits are made.
+  bool Load();
+
+  /// Puts zones there that come from elsewhere.
+  void Take(std::vector<TempZone> list, const ProbeSettings& settings);
+
+  /// Reads the groups; the zones are loaded first. Throws mblib_exception for one that is empty or names a zone that
+  /// there is not.
+  bool LoadGroups();
+
+  [[nodiscard]] const std::vector<TempZone>& List() const { return zones; }
+  [[nodiscard]] const std::vector<ZoneGroup>& Groups() const { return groups; }
+  [[nodiscard]] int Count() const { return static_cast<int>(zones.size()); }
+
+  /// Null for a number without a zone. Good until the next load.
+  [[nodiscard]] const TempZone* Find(int zone) const;
+
+  [[nodiscard]] const ProbeSettings& Probe() const { return probe; }
+  void SetProbeRate(int seconds) { probe.rate_s = seconds; }
+
+  [[nodiscard]] bool IsSkipped(int zone) const;
+  bool SetSkipped(int zone, bool skip);
+
+  /// A reading in degrees; kFirstInvalidReading and above is none.
+  int Read(int zone);
+
+  /// Reads the zone and judges it; true when at least one limit applied.
+  bool Check(int zone, ZoneCheck& check);
+
+  /// Whether the processor has throttled itself: 1 at the low threshold, 3 at the high one, else 0.
+  int ReadProchot(int zone);
+
+  // The limits of a zone; kNoLimit when it has none.
+  int GetHigh(int zone);
+  int GetLow(int zone) const;
+
+ private:
+  [[nodiscard]] TempZone* At(int zone);
+
+  ChipFinder chipOf;
+  std::vector<TempZone> zones;
+  std::vector<ZoneGroup> groups;
+  ProbeSettings probe;
+};
+
+}  // namespace panelglow
