@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <map>
+#include <optional>
 
 #include "board/ChipTable.h"
 #include "boardtool/KnownKeys.h"
@@ -15,7 +16,8 @@ namespace {
 using Files = std::vector<IniOutline>;
 
 const IniOutline* FileOf(const Files& files, const std::string& path) {
-  const auto found = std::find_if(files.begin(), files.end(), [&](const IniOutline& file) { return file.path == path; });
+  const auto found =
+      std::find_if(files.begin(), files.end(), [&](const IniOutline& file) { return file.path == path; });
   return found == files.end() ? nullptr : &*found;
 }
 
@@ -74,6 +76,7 @@ class BoardCheck {
     const std::vector<std::string> machines = MachinesOf(files_, names_);
     RehearsalWish wish;
     wish.withSources = false;
+    wish.everything = true;
     for (std::size_t i = 0; i < machines.size() && i < kMostMachines; ++i) {
       const BoardPlan plan = Rehearse(files_, names_, machines[i], machine_, wish);
       CheckPlan(plan);
@@ -186,7 +189,8 @@ class BoardCheck {
       Add("on-without-off", file, entry, title + " can be lit and not darkened: the chip has no keys for it");
     }
     if (const PlannedStep* const save = led.Find("save");
-        !led.leftChanged.empty() && led.blinksByItself && save != nullptr && save->answer) {
+        !led.leftChanged.empty() && led.blinksByItself && save != nullptr && save->answer &&
+        ChipOf(plan, *led.led).starts_with("g_")) {  // whose save list stands in a file
       std::string registers;
       for (const ImaginedHardware::Cell& cell : led.leftChanged) {
         registers += (registers.empty() ? "" : ", ") + Hex(cell.address);
@@ -206,8 +210,8 @@ class BoardCheck {
       }
       if (!led.blinksByItself && waits > kLongest_ms) {
         Add("blink-rate", file, entry,
-            title + ": switching it \"" + name + "\" takes " + std::to_string(waits) + " ms, which no eye takes for " +
-                "blinking");
+            title + ": switching it \"" + name + "\" takes " + std::to_string(waits) +
+                " ms, which no eye takes for " + "blinking");
       }
     }
   }
@@ -245,15 +249,29 @@ class BoardCheck {
     std::map<std::pair<HardwareAccess::Kind, std::uint64_t>, std::uint64_t> bits;
     const PlannedStep* const on = led.Find("on");
     for (const PlannedAccess& access : on == nullptr ? std::vector<PlannedAccess>{} : on->accesses) {
-      if (IsWrite(access.access.kind) && access.kept != 0 && access.set != 0) {
+      if (IsWrite(access.access.kind) && access.access.reg < 0 && access.kept != 0 && access.set != 0) {
         bits[{access.access.kind, access.access.address}] |= access.set;
       }
     }
     return bits;
   }
 
+  std::string ChipOf(const BoardPlan& plan, const BoardLed& led) const {
+    const auto [file, entry] = Deciding(plan.systemId, std::string(led.chipKey));
+    return entry == nullptr ? std::string() : LoweredName(CDMUtil::Trim(entry->value));
+  }
+
+  // The classes whose masks stand in the files; others share bits by what they are.
+  bool HasMasksOfFiles(const BoardPlan& plan, const BoardLed& led) const {
+    const std::string chip = ChipOf(plan, led);
+    return chip == "g_iospace" || chip == "g_memoryspace";
+  }
+
   void CheckSameBits(const BoardPlan& plan) {
     for (auto first = plan.leds.begin(); first != plan.leds.end(); ++first) {
+      if (!HasMasksOfFiles(plan, *first->led)) {
+        continue;
+      }
       const auto bits = BitsOf(*first);
       for (auto second = first + 1; second != plan.leds.end(); ++second) {
         for (const auto& [place, set] : BitsOf(*second)) {
@@ -319,6 +337,9 @@ class BoardCheck {
     return names;
   }
 
+  // Gathered for the first key that the machines of the files did not look up.
+  const KnownKeys& Known() { return known_ ? *known_ : known_.emplace(names_, machine_); }
+
   // Keys that nothing reads.
   void CheckKeys() {
     std::set<std::string> readKeys;      // in a chip file, whatever the section
@@ -342,7 +363,7 @@ class BoardCheck {
                        : lookUps_.contains({file.path, section, key})) {
           continue;
         }
-        if (KnownKeys::Instance(machine_).IsKnown(key, isChipFile)) {
+        if (Known().IsKnown(key, isChipFile)) {
           if (isChipFile && readSections.contains(section)) {
             continue;  // of another class that may use this section
           }
@@ -358,8 +379,7 @@ class BoardCheck {
           continue;
         }
         findings_.Add("unknown-key", file.path, entry.line, entry.column,
-                      WithNearest("nothing reads a key \"" + entry.key + "\"", key,
-                                  KnownKeys::Instance(machine_).All(isChipFile)));
+                      WithNearest("nothing reads a key \"" + entry.key + "\"", key, Known().All(isChipFile)));
       }
     }
   }
@@ -369,6 +389,7 @@ class BoardCheck {
   platform::Host& machine_;
   Findings& findings_;
   std::set<LookUp> lookUps_;
+  std::optional<KnownKeys> known_;
   BoardKnowledge knowledge_;
 };
 

@@ -21,8 +21,8 @@ std::string BitsOf(const PlannedAccess& planned) {
     return {};
   }
   const int digits = static_cast<int>(std::max(1U, planned.access.width) * 2);
-  const std::uint64_t all = planned.access.width >= 8 ? ~std::uint64_t{0}
-                                                      : (std::uint64_t{1} << (8 * planned.access.width)) - 1;
+  const std::uint64_t all =
+      planned.access.width >= 8 ? ~std::uint64_t{0} : (std::uint64_t{1} << (8 * planned.access.width)) - 1;
   const std::uint64_t cleared = all & ~planned.kept & ~planned.set;
   std::string text = "as read";
   text += planned.set == 0 ? "" : ", bits " + Hex(planned.set, digits) + " set";
@@ -42,8 +42,8 @@ std::string ValueOf(const PlannedAccess& planned) {
 
 std::string TextOf(const PlannedAccess& planned) {
   const HardwareAccess& access = planned.access;
-  const std::string text = IsRead(access.kind) || IsWrite(access.kind) ? PlaceOf(access) + ValueOf(planned)
-                                                                       : Describe(access);
+  const std::string text =
+      IsRead(access.kind) || IsWrite(access.kind) ? PlaceOf(access) + ValueOf(planned) : Describe(access);
   const std::string reg = RegisterOf(access);
   return text + (reg.empty() ? "" : "  (" + reg + ")");
 }
@@ -265,9 +265,10 @@ std::string ExplainText(const BoardPlan& plan, const Files& files, bool allLeds)
   }
   text += without.empty() ? "" : "\nThis board lights none of: " + without + "\n";
   for (const std::string& notice : plan.notices) {
-    text += "\nnote: " + notice;
+    // That no key names a chip is said above.
+    text += notice.find("names no chip for it") == std::string::npos ? "\nnote: " + notice + "\n" : std::string();
   }
-  return text + (plan.notices.empty() ? "" : "\n");
+  return text;
 }
 
 std::string ExplainJson(const BoardPlan& plan, const Files& files) {

@@ -15,12 +15,14 @@ using Json = nlohmann::ordered_json;
 // By name.
 constexpr std::array kRules{
     Rule{"base-cycle", Severity::kError, "A chain of base sections comes back to a section that it has been in."},
-    Rule{"bit-out-of-range", Severity::kError, "A number does not fit into the register, port or mask that it is for."},
+    Rule{"bit-out-of-range", Severity::kError,
+         "A number does not fit into the register, port or mask that it is for."},
     Rule{"blink-rate", Severity::kWarning, "An LED blinks faster or slower than an eye takes for blinking."},
     Rule{"board-fails", Severity::kError, "The files name a board that cannot be built."},
     Rule{"byte-order-mark", Severity::kError, "A mark in front of the first line hides what stands in it."},
     Rule{"caption-missing", Severity::kWarning, "A button's caption has no text in a language."},
     Rule{"comment-in-value", Severity::kWarning, "A comment behind a value leaves its blank in the value."},
+    Rule{"controller-line", Severity::kError, "A line of the storage controllers is not what it should be."},
     Rule{"duplicate-button", Severity::kWarning, "A button, or its definition, stands twice."},
     Rule{"duplicate-key", Severity::kWarning, "A key stands twice in a section; the first counts."},
     Rule{"duplicate-section", Severity::kWarning, "A section stands twice; the first counts."},
@@ -29,6 +31,7 @@ constexpr std::array kRules{
     Rule{"icon-missing", Severity::kWarning, "A button's icon is missing or is no picture."},
     Rule{"led-not-lit", Severity::kError, "No board of the files lights a LED that a test asks for."},
     Rule{"malformed-sequence", Severity::kError, "An entry of a sequence is no command with its data."},
+    Rule{"message-format", Severity::kError, "A text has a place for something that the program does not give."},
     Rule{"no-file-text", Severity::kError, "A file holds bytes that are no text."},
     Rule{"not-a-number", Severity::kError, "A number is none and counts as 0."},
     Rule{"not-saved", Severity::kWarning, "A blink changes a register that is not put back."},
@@ -58,8 +61,7 @@ constexpr const char* kVersion = "2.1.0";
 std::span<const Rule> Rules() { return kRules; }
 
 const Rule& RuleOf(std::string_view name) {
-  const auto found =
-      std::find_if(kRules.begin(), kRules.end(), [&](const Rule& rule) { return rule.name == name; });
+  const auto found = std::find_if(kRules.begin(), kRules.end(), [&](const Rule& rule) { return rule.name == name; });
   if (found == kRules.end()) {
     throw std::out_of_range("there is no rule " + std::string(name));
   }

@@ -35,9 +35,9 @@ std::string PlaceOf(const HardwareAccess& access) {
     case Kind::kPciWrite: {
       const std::uint64_t location = access.address >> 16U;
       std::array<char, 64> text{};
-      std::snprintf(text.data(), text.size(), "PCI %02X:%02X.%u register 0x%02X", static_cast<unsigned>(location >> 8U),
-                    static_cast<unsigned>(location >> 3U & 0x1FU), static_cast<unsigned>(location & 7U),
-                    static_cast<unsigned>(access.address & 0xFFFFU));
+      std::snprintf(text.data(), text.size(), "PCI %02X:%02X.%u register 0x%02X",
+                    static_cast<unsigned>(location >> 8U), static_cast<unsigned>(location >> 3U & 0x1FU),
+                    static_cast<unsigned>(location & 7U), static_cast<unsigned>(access.address & 0xFFFFU));
       return text.data() + WidthOf(access);
     }
     case Kind::kMsrRead:

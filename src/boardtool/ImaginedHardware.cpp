@@ -132,11 +132,11 @@ std::map<ImaginedHardware::Cell, std::uint8_t> ImaginedHardware::Written() const
   std::map<Cell, std::uint8_t> written;
   for (const auto& [cell, value] : cells_) {
     const bool steers = cell.indexPort >= 0 && (cell.address == kSelectDevice || cell.address == kGlobalControl);
-    const bool isIndex = cell.indexPort < 0 && cell.space == Kind::kPortWrite &&
-                         std::any_of(cells_.begin(), cells_.end(), [&, port = cell.address](const auto& other) {
-                           return other.first.indexPort >= 0 &&
-                                  static_cast<std::uint64_t>(other.first.indexPort) == port;
-                         });
+    const bool isIndex =
+        cell.indexPort < 0 && cell.space == Kind::kPortWrite &&
+        std::any_of(cells_.begin(), cells_.end(), [&, port = cell.address](const auto& other) {
+          return other.first.indexPort >= 0 && static_cast<std::uint64_t>(other.first.indexPort) == port;
+        });
     if (!steers && !isIndex) {
       written.emplace(cell, value);
     }
@@ -201,8 +201,8 @@ void ImaginedHardware::Pci(std::uint32_t width, bool isWrite, std::span<std::byt
   HardwareAccess access;
   access.kind = isWrite ? Kind::kPciWrite : Kind::kPciRead;
   access.width = width;
-  access.address = driver::NumberAt(record, driver::kPciLocation, 2) << 16U |
-                   driver::NumberAt(record, driver::kPciRegister, 2);
+  access.address =
+      driver::NumberAt(record, driver::kPciLocation, 2) << 16U | driver::NumberAt(record, driver::kPciRegister, 2);
   const Cell cell{Kind::kPciWrite, -1, -1, access.address};
   if (isWrite) {
     access.value = driver::NumberAt(record, driver::kPciValue, width);

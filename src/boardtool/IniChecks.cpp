@@ -14,7 +14,8 @@ constexpr std::string_view kBigEndianMark = "\xFE\xFF";
 constexpr std::size_t kLongestValue = 254;
 
 std::size_t LineAt(const std::string& bytes, std::size_t at) {
-  return 1 + static_cast<std::size_t>(std::count(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(at), '\n'));
+  return 1 +
+         static_cast<std::size_t>(std::count(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(at), '\n'));
 }
 
 }  // namespace
@@ -77,9 +78,8 @@ void CheckIniText(const IniOutline& file, bool keepsComments, Findings& findings
       continue;
     }
     // Within one section only: what stands in a repeated one is told with its header.
-    const auto [first, isNew] =
-        keys.try_emplace({std::to_string(section) + " " + LoweredName(entry.section), LoweredName(entry.key)},
-                         entry.line);
+    const auto [first, isNew] = keys.try_emplace(
+        {std::to_string(section) + " " + LoweredName(entry.section), LoweredName(entry.key)}, entry.line);
     if (!isNew) {
       findings.Add("duplicate-key", file.path, entry.line, entry.column,
                    "key \"" + entry.key + "\" stands in line " + std::to_string(first->second) +

@@ -18,15 +18,15 @@ std::string Narrowed(const std::string& bytes) {
   }
   wstring wide;
   for (std::size_t i = kWideMark.size(); i + 1 < bytes.size(); i += 2) {
-    wide.push_back(static_cast<char16_t>(static_cast<unsigned char>(bytes[i]) |
-                                         static_cast<unsigned char>(bytes[i + 1]) << 8U));
+    wide.push_back(
+        static_cast<char16_t>(static_cast<unsigned char>(bytes[i]) | static_cast<unsigned char>(bytes[i + 1]) << 8U));
   }
   return platform::CodePageFromWide(wide);
 }
 
 std::string Unquoted(std::string_view value) {
-  const bool isQuoted = value.size() >= 2 && value.front() == value.back() &&
-                        (value.front() == '"' || value.front() == '\'');
+  const bool isQuoted =
+      value.size() >= 2 && value.front() == value.back() && (value.front() == '"' || value.front() == '\'');
   return std::string(isQuoted ? value.substr(1, value.size() - 2) : value);
 }
 
@@ -73,8 +73,8 @@ IniOutline::IniOutline(std::string filePath, std::string fileBytes)
       isFirstOfName = firstSection_.try_emplace(LoweredName(section), sections.size()).second;
       sections.push_back({section, line.number, line.column});
     } else if (line.isEntry) {
-      IniEntry entry{section,     std::string(line.name), Unquoted(line.value), line.number,
-                     line.column, line.valueColumn,       false};
+      IniEntry entry{
+          section, std::string(line.name), Unquoted(line.value), line.number, line.column, line.valueColumn, false};
       entry.isFirst = isFirstOfName && !sections.empty() &&
                       first_.try_emplace({LoweredName(section), LoweredName(entry.key)}, entries.size()).second;
       entries.push_back(std::move(entry));
@@ -93,8 +93,8 @@ bool IniOutline::HasSection(std::string_view section) const { return firstSectio
 
 bool IniOutline::IsSilenced(std::size_t line, std::string_view rule) const {
   const std::string_view own = LineOf(bytes, line);
-  if (const std::size_t comment = own.find(';'); comment != std::string_view::npos &&
-                                                 Silences(own.substr(comment), rule)) {
+  if (const std::size_t comment = own.find(';');
+      comment != std::string_view::npos && Silences(own.substr(comment), rule)) {
     return true;
   }
   if (line < 2) {

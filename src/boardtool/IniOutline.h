@@ -1,5 +1,5 @@
-// An INI file as the look-ups see it, with the line and column of everything in it, so that whatever is said of a value
-// can say where it stands.
+// An INI file as the look-ups see it, with the line and column of everything in it, so that whatever is said of a
+// value can say where it stands.
 #pragma once
 
 #include <cstddef>

@@ -8,6 +8,7 @@
 #include "board/MotherBoard.h"
 #include "board/base/BoardDevio.h"
 #include "board/base/mblib_exception.h"
+#include "boardtool/Everything.h"
 #include "boardtool/RehearsalHost.h"
 #include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
@@ -96,7 +97,8 @@ class Stage {
       }
       Do(run, *board, "restore", led->restore);
       run.leftChanged = LeftChanged(background);
-      if (blinks) {  // the signal lamp still asks for them
+      if (blinks) {  // the signal lamp still asks for them, and nothing is wrong when there is no such thing
+        const RehearsalHost::Hush hush(host_);
         board.reset();
         Run ignored;
         board = Build(ignored, background);
@@ -107,6 +109,13 @@ class Stage {
       }
     });
     return run;
+  }
+
+  void AskEverything() {
+    Run ignored;
+    if (const std::unique_ptr<MotherBoard> board = Build(ignored, kZeros)) {
+      boardtool::AskEverything(*board);
+    }
   }
 
  private:
@@ -147,7 +156,9 @@ class Stage {
     std::vector<ImaginedHardware::Cell> changed;
     for (const auto& [cell, value] : host_.Hardware().Written()) {
       // A plain port's last byte says nothing of what stands behind it.
-      const bool isRegister = cell.indexPort >= 0 || cell.space != HardwareAccess::Kind::kPortWrite;
+      constexpr int kLastConfigPort = 0x3FF;
+      const bool isRegister = cell.space != HardwareAccess::Kind::kPortWrite ||
+                              (cell.indexPort >= 0 && cell.indexPort <= kLastConfigPort);
       if (isRegister && value != background) {
         changed.push_back(cell);
       }
@@ -206,9 +217,9 @@ void Mark(std::vector<PlannedAccess>& planned, const Accesses& other, const IniE
   const auto isSame = [&](std::size_t mine, std::size_t theirs) {
     const HardwareAccess& a = planned[mine].access;
     const HardwareAccess& b = other[theirs];
-    return IsRead(a.kind) ? a.kind == b.kind && a.address == b.address && a.reg == b.reg &&
-                                a.logicalDevice == b.logicalDevice
-                          : a == b;
+    return IsRead(a.kind)
+               ? a.kind == b.kind && a.address == b.address && a.reg == b.reg && a.logicalDevice == b.logicalDevice
+               : a == b;
   };
   if (planned.size() == other.size()) {
     for (std::size_t i = 0; i < planned.size(); ++i) {
@@ -239,8 +250,8 @@ LedPlan PlanOf(const BoardLed& led, const Run& zeros, const Run& ones) {
   for (std::size_t i = 0; i < zeros.steps.size(); ++i) {
     const Run::Step& step = zeros.steps[i];
     const bool isComparable = i < ones.steps.size() && ones.steps[i].name == step.name;
-    plan.steps.push_back({step.name, step.answer,
-                          Planned(step.accesses, isComparable ? ones.steps[i].accesses : step.accesses)});
+    plan.steps.push_back(
+        {step.name, step.answer, Planned(step.accesses, isComparable ? ones.steps[i].accesses : step.accesses)});
     plan.blinksByItself = plan.blinksByItself || (step.name == "blink" && step.answer);
   }
   std::set_intersection(zeros.leftChanged.begin(), zeros.leftChanged.end(), ones.leftChanged.begin(),
@@ -272,13 +283,24 @@ BoardPlan Rehearse(std::span<const IniOutline> files, const BoardFiles& names, c
   plan.failure = empty.failure;
   plan.chips = empty.chips;
   plan.setUp = Planned(empty.setUp, empty.setUp);
+  std::vector<std::uint8_t> backgrounds;  // of the LEDs' plans
   if (!empty.className.empty()) {
     for (const BoardLed& led : BoardLeds()) {
       if (wish.led == nullptr || wish.led == &led) {
         const Run zeros = stage.Play(&led, kZeros);
-        plan.leds.push_back(PlanOf(led, zeros, stage.Play(&led, kOnes)));
+        const Run ones = stage.Play(&led, kOnes);
+        plan.leds.push_back(PlanOf(led, zeros, ones));
+        backgrounds.push_back(kZeros);
+        // A part that reports success by a set bit works on the one hardware only.
+        if (LedPlan other = PlanOf(led, ones, zeros); !plan.leds.back().IsLit() && other.IsLit()) {
+          plan.leds.back() = std::move(other);
+          backgrounds.back() = kOnes;
+        }
       }
     }
+  }
+  if (wish.everything && !empty.className.empty()) {
+    stage.AskEverything();
   }
   plan.lookUps = profiles.LookUps();
   plan.found = profiles.Found();
@@ -289,10 +311,10 @@ BoardPlan Rehearse(std::span<const IniOutline> files, const BoardFiles& names, c
       continue;
     }
     profiles.Replace(entry, turned);
-    bool isFirst = true;
-    for (LedPlan& led : plan.leds) {
-      const Run other = stage.Play(led.led, kZeros);
-      if (std::exchange(isFirst, false)) {
+    for (std::size_t at = 0; at < plan.leds.size(); ++at) {
+      LedPlan& led = plan.leds[at];
+      const Run other = stage.Play(led.led, backgrounds[at]);
+      if (at == 0 && backgrounds[at] == kZeros) {
         Mark(plan.setUp, other.setUp, entry);
       }
       for (std::size_t i = 0; i < led.steps.size() && i < other.steps.size(); ++i) {

@@ -59,19 +59,20 @@ struct BoardPlan {
   std::vector<std::string> chips;
   std::vector<PlannedAccess> setUp;  // what building it does
   std::vector<LedPlan> leds;
-  std::vector<std::string> notices;      // what people are told, a sentence each
-  std::set<LookUp> lookUps;              // all that were made
-  std::set<const IniEntry*> found;       // what they found
+  std::vector<std::string> notices;  // what people are told, a sentence each
+  std::set<LookUp> lookUps;          // all that were made
+  std::set<const IniEntry*> found;   // what they found
 };
 
 /// How much of a rehearsal is wanted.
 struct RehearsalWish {
   const BoardLed* led = nullptr;  // only this one; null: all
+  bool everything = false;        // all that a board can do, so that every key of its is looked up
   bool withSources = true;        // where each request comes from, which takes a run for each entry that was read
 };
 
-/// Runs the library for a board of these files. `files` holds what can be read, by the paths of `names`; `machine` lends
-/// the services that are not called. One rehearsal at a time: the library's objects are the process's.
+/// Runs the library for a board of these files. `files` holds what can be read, by the paths of `names`; `machine`
+/// lends the services that are not called. One rehearsal at a time: the library's objects are the process's.
 BoardPlan Rehearse(std::span<const IniOutline> files, const BoardFiles& names, const std::string& systemId,
                    platform::Host& machine, const RehearsalWish& wish = {});
 

@@ -36,10 +36,11 @@ class RehearsalClock : public platform::Clock {
 class RehearsalConsole : public platform::Console {
  public:
   void Write(std::string_view /*bytes*/) override {}  // the protocol's lines mean nothing here
-  void WriteError(std::string_view bytes) override { told += bytes; }
+  void WriteError(std::string_view bytes) override { told += isHushed ? std::string_view() : bytes; }
   void SetControlHandler(std::function<bool(std::uint32_t type)> /*handler*/) override {}
 
   std::string told;
+  bool isHushed = false;
 };
 
 class RehearsalFiles : public platform::Files {
@@ -201,6 +202,9 @@ ImaginedHardware& RehearsalHost::Hardware() { return *parts_->hardware; }
 
 // The driver's device that the board library holds stays open: the hardware behind it changes.
 void RehearsalHost::NewHardware(std::uint8_t background) { *parts_->hardware = ImaginedHardware(background); }
+
+RehearsalHost::Hush::Hush(RehearsalHost& host) : host_(host) { host_.parts_->console.isHushed = true; }
+RehearsalHost::Hush::~Hush() { host_.parts_->console.isHushed = false; }
 
 std::vector<std::string> RehearsalHost::TakeNotices() {
   std::vector<std::string> notices;

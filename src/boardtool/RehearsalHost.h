@@ -1,5 +1,5 @@
-// The machine of a rehearsal: imagined hardware, files in memory, a clock that nobody waits for, and nothing else that
-// could be changed. What the board library tells people is kept.
+// The machine of a rehearsal: imagined hardware, files in memory, a clock that nobody waits for, and nothing else
+// that could be changed. What the board library tells people is kept.
 #pragma once
 
 #include <memory>
@@ -30,6 +30,18 @@ class RehearsalHost {
 
   /// What was told to people since the last call, a sentence each, without the program's name in front.
   [[nodiscard]] std::vector<std::string> TakeNotices();
+
+  /// While it exists, nothing that is told is kept.
+  class Hush {
+   public:
+    explicit Hush(RehearsalHost& host);
+    ~Hush();
+    Hush(const Hush&) = delete;
+    Hush& operator=(const Hush&) = delete;
+
+   private:
+    RehearsalHost& host_;
+  };
 
  private:
   struct Parts;

@@ -1,10 +1,11 @@
-// The integrator's program: says what the board library makes of an installation's files and of a machine, and helps to
-// bring up a board that nothing knows yet.
+// The integrator's program: says what the board library makes of an installation's files and of a machine, and helps
+// to bring up a board that nothing knows yet.
 #include <CLI/CLI.hpp>
 #include <cstdio>
 #include <exception>
 #include <string>
 
+#include "boardtool/Check.h"
 #include "boardtool/Explain.h"
 #include "platform/Host.h"
 
@@ -35,6 +36,13 @@ int main(int argc, char** argv) {
   explainVerb->add_option("--folder", explain.folder, "Folder of the installation (default: the current one)");
   explainVerb->add_flag("--json", explain.json, "For programs");
   explainVerb->callback([&] { code = Explain(explain); });
+  CheckOptions check;
+  CLI::App* const checkVerb = app.add_subcommand("check", "What is wrong with an installation's files");
+  checkVerb->add_option("files", check.files, "Only these files of an installation (default: all of the folder)");
+  checkVerb->add_option("--folder", check.folder, "Folder of the installation (default: the current one)");
+  checkVerb->add_option("--format", check.format, "text, json or sarif")
+      ->check(CLI::IsMember({"text", "json", "sarif"}));
+  checkVerb->callback([&] { code = Check(check); });
   try {
     app.parse(argc, argv);
     return code;
