@@ -1,7 +1,11 @@
 // One thing that the board library does to the hardware, as people and programs are told of it.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <map>
+#include <optional>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -42,6 +46,22 @@ struct HardwareAccess {
   return kind == HardwareAccess::Kind::kPortWrite || kind == HardwareAccess::Kind::kMemoryWrite ||
          kind == HardwareAccess::Kind::kPciWrite;
 }
+
+/// The access that a driver's record asks for; nothing for a record that is none, as that of a mapping. The value is
+/// that of a write, or of a read that was answered (`out`).
+std::optional<HardwareAccess> DecodeRequest(std::uint32_t code, std::span<const std::byte> in,
+                                            std::span<const std::byte> out);
+
+/// Knows which port was written as an index, and which logical device was selected behind it.
+class IndexTracker {
+ public:
+  /// Says of an access to a data port which register it goes to, and learns from it.
+  void Follow(HardwareAccess& access);
+
+ private:
+  std::map<std::uint16_t, std::uint8_t> index_;          // last byte written to a port
+  std::map<std::uint16_t, std::uint8_t> logicalDevice_;  // by index port
+};
 
 /// At least `digits` hexadecimal digits behind "0x".
 std::string Hex(std::uint64_t value, int digits = 2);

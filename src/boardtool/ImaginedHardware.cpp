@@ -37,6 +37,17 @@ constexpr std::uint64_t kBridgeRegisters = 0x40;
 constexpr std::uint16_t kOnlyFunction = 0x00F8;  // bus 0, device 0x1F, function 0
 constexpr std::uint8_t kDeviceNotFound = 0x86;
 
+// Where an access begins, whether it reads or writes.
+ImaginedHardware::Cell CellOf(const HardwareAccess& access) {
+  const bool isMemory = access.kind == Kind::kMemoryRead || access.kind == Kind::kMemoryWrite;
+  const bool isPci = access.kind == Kind::kPciRead || access.kind == Kind::kPciWrite;
+  return {isMemory ? Kind::kMemoryWrite
+          : isPci  ? Kind::kPciWrite
+                   : Kind::kPortWrite,
+          access.indexPort, access.logicalDevice,
+          access.reg < 0 ? access.address : static_cast<std::uint64_t>(access.reg)};
+}
+
 }  // namespace
 
 void ImaginedHardware::AddWait(std::uint32_t milliseconds) {
@@ -75,18 +86,6 @@ void ImaginedHardware::AddFirmwareCall(const platform::ManagementCall& call) {
 }
 
 // ---- bytes
-
-// A port behind one that was written is the data port of that index.
-ImaginedHardware::Cell ImaginedHardware::PortCell(std::uint16_t port) const {
-  const auto index = port == 0 ? index_.end() : index_.find(static_cast<std::uint16_t>(port - 1));
-  if (index == index_.end()) {
-    return {Kind::kPortWrite, -1, -1, port};
-  }
-  const auto device = logicalDevice_.find(index->first);
-  const bool isGlobal = index->second < kActivate;
-  return {Kind::kPortWrite, index->first, device == logicalDevice_.end() || isGlobal ? -1 : device->second,
-          index->second};
-}
 
 std::optional<std::uint8_t> ImaginedHardware::MadeUp(const Cell& cell) const {
   if (cell.space == Kind::kPciWrite) {
@@ -144,11 +143,11 @@ std::map<ImaginedHardware::Cell, std::uint8_t> ImaginedHardware::Written() const
   return written;
 }
 
-std::uint32_t ImaginedHardware::Read(HardwareAccess access, Cell first) {
-  repeats_ = lastRead_ == first ? repeats_ + 1 : 0;
-  lastRead_ = first;
+std::uint32_t ImaginedHardware::Read(HardwareAccess access) {
+  Cell cell = CellOf(access);
+  repeats_ = lastRead_ == cell ? repeats_ + 1 : 0;
+  lastRead_ = cell;
   std::uint32_t value = 0;
-  Cell cell = first;
   for (unsigned i = 0; i < access.width; ++i, ++cell.address) {
     value |= std::uint32_t{ReadByte(cell)} << (8 * i);
   }
@@ -160,9 +159,9 @@ std::uint32_t ImaginedHardware::Read(HardwareAccess access, Cell first) {
   return value;
 }
 
-void ImaginedHardware::Write(HardwareAccess access, Cell first) {
+void ImaginedHardware::Write(HardwareAccess access) {
   lastRead_.reset();
-  Cell cell = first;
+  Cell cell = CellOf(access);
   for (unsigned i = 0; i < access.width; ++i, ++cell.address) {
     cells_[cell] = static_cast<std::uint8_t>(access.value >> (8 * i));
   }
@@ -171,70 +170,32 @@ void ImaginedHardware::Write(HardwareAccess access, Cell first) {
 
 // ---- requests
 
-void ImaginedHardware::Port(std::uint32_t width, bool isWrite, std::span<const std::byte> in,
-                            std::span<std::byte> out) {
-  const auto port = static_cast<std::uint16_t>(driver::NumberAt(in, driver::kPortNumber, 4));
-  const Cell cell = PortCell(port);
-  HardwareAccess access;
-  access.kind = isWrite ? Kind::kPortWrite : Kind::kPortRead;
-  access.width = width;
-  access.address = port;
-  access.indexPort = cell.indexPort;
-  access.logicalDevice = cell.logicalDevice;
-  access.reg = cell.indexPort < 0 ? -1 : static_cast<int>(cell.address);
-  if (!isWrite) {
-    driver::PutNumber(out, 0, 4, Read(std::move(access), cell));
-    return;
-  }
-  access.value = driver::NumberAt(in, driver::kPortValue, 4) & (width >= 4 ? 0xFFFFFFFFU : (1U << (8 * width)) - 1);
-  const auto byte = static_cast<std::uint8_t>(access.value);
-  if (width == 1 && cell.indexPort >= 0 && cell.address == kSelectDevice) {
-    logicalDevice_[static_cast<std::uint16_t>(cell.indexPort)] = byte;
-  }
-  if (width == 1 && cell.indexPort < 0) {
-    index_[port] = byte;
-  }
-  Write(std::move(access), cell);
-}
-
-void ImaginedHardware::Pci(std::uint32_t width, bool isWrite, std::span<std::byte> record) {
-  HardwareAccess access;
-  access.kind = isWrite ? Kind::kPciWrite : Kind::kPciRead;
-  access.width = width;
-  access.address =
-      driver::NumberAt(record, driver::kPciLocation, 2) << 16U | driver::NumberAt(record, driver::kPciRegister, 2);
-  const Cell cell{Kind::kPciWrite, -1, -1, access.address};
-  if (isWrite) {
-    access.value = driver::NumberAt(record, driver::kPciValue, width);
-    Write(std::move(access), cell);
-  } else {
-    driver::PutNumber(record, driver::kPciValue, 4, Read(std::move(access), cell));
-  }
-  driver::PutNumber(record, driver::kPciStatus, 1, 0);
-}
-
 std::uint32_t ImaginedHardware::Control(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
+  if (std::optional<HardwareAccess> access = DecodeRequest(code, in, {})) {
+    tracker_.Follow(*access);
+    switch (access->kind) {
+      case Kind::kPortWrite:
+        Write(std::move(*access));
+        break;
+      case Kind::kPciWrite:
+        Write(std::move(*access));
+        driver::PutNumber(out, driver::kPciStatus, 1, 0);
+        break;
+      case Kind::kPciRead:
+        driver::PutNumber(out, driver::kPciValue, 4, Read(std::move(*access)));
+        driver::PutNumber(out, driver::kPciStatus, 1, 0);
+        break;
+      case Kind::kMsrRead:
+        accesses_.push_back(std::move(*access));
+        std::fill(out.begin(), out.end(), static_cast<std::byte>(background_));
+        break;
+      default:
+        driver::PutNumber(out, 0, 4, Read(std::move(*access)));
+        break;
+    }
+    return 0;
+  }
   switch (code) {
-    case driver::kInportByte:
-    case driver::kInportWord:
-    case driver::kInportDword:
-      Port(code == driver::kInportByte ? 1 : code == driver::kInportWord ? 2 : 4, false, in, out);
-      return 0;
-    case driver::kOutportByte:
-    case driver::kOutportWord:
-    case driver::kOutportDword:
-      Port(code == driver::kOutportByte ? 1 : code == driver::kOutportWord ? 2 : 4, true, in, out);
-      return 0;
-    case driver::kReadPciConfigByte:
-    case driver::kReadPciConfigWord:
-    case driver::kReadPciConfigDword:
-      Pci(code == driver::kReadPciConfigByte ? 1 : code == driver::kReadPciConfigWord ? 2 : 4, false, out);
-      return 0;
-    case driver::kWritePciConfigByte:
-    case driver::kWritePciConfigWord:
-    case driver::kWritePciConfigDword:
-      Pci(code == driver::kWritePciConfigByte ? 1 : code == driver::kWritePciConfigWord ? 2 : 4, true, out);
-      return 0;
     case driver::kFindPciDevice:
     case driver::kFindPciClass: {  // the one function there is
       const bool isFound = driver::NumberAt(in, driver::kSearchIndex, 2) == 0;
@@ -251,14 +212,6 @@ std::uint32_t ImaginedHardware::Control(std::uint32_t code, std::span<const std:
     case driver::kUnmapPhysicalMemory:
     case driver::kGetVersion:
       return 0;
-    case driver::kReadMsr: {
-      HardwareAccess access;
-      access.kind = Kind::kMsrRead;
-      access.address = driver::NumberAt(in, driver::kMsrIndex, 4);
-      accesses_.push_back(access);
-      std::fill(out.begin(), out.end(), static_cast<std::byte>(background_));
-      return 0;
-    }
     default:
       std::fill(out.begin(), out.end(), std::byte{0});
       return 0;
@@ -270,8 +223,7 @@ std::uint32_t ImaginedHardware::ReadMapped(std::uint64_t mapped, std::size_t wid
   access.kind = Kind::kMemoryRead;
   access.width = static_cast<unsigned>(width);
   access.address = mapped & (kMapped - 1);
-  const Cell cell{Kind::kMemoryWrite, -1, -1, access.address};
-  return Read(std::move(access), cell);
+  return Read(std::move(access));
 }
 
 void ImaginedHardware::WriteMapped(std::uint64_t mapped, std::size_t width, std::uint32_t value) {
@@ -280,8 +232,7 @@ void ImaginedHardware::WriteMapped(std::uint64_t mapped, std::size_t width, std:
   access.width = static_cast<unsigned>(width);
   access.address = mapped & (kMapped - 1);
   access.value = width >= 4 ? value : value & 0xFFU;
-  const Cell cell{Kind::kMemoryWrite, -1, -1, access.address};
-  Write(std::move(access), cell);
+  Write(std::move(access));
 }
 
 // ---- the driver's device

@@ -54,18 +54,14 @@ class ImaginedHardware {
  private:
   std::uint8_t ReadByte(const Cell& cell);
   [[nodiscard]] std::optional<std::uint8_t> MadeUp(const Cell& cell) const;
-  [[nodiscard]] Cell PortCell(std::uint16_t port) const;
-  std::uint32_t Read(HardwareAccess access, Cell first);
-  void Write(HardwareAccess access, Cell first);
-  void Port(std::uint32_t width, bool isWrite, std::span<const std::byte> in, std::span<std::byte> out);
-  void Pci(std::uint32_t width, bool isWrite, std::span<std::byte> record);
+  std::uint32_t Read(HardwareAccess access);
+  void Write(HardwareAccess access);
 
   std::uint8_t background_;
   std::vector<HardwareAccess> accesses_;
   std::map<Cell, std::uint8_t> cells_;
-  std::map<std::uint16_t, std::uint8_t> index_;          // last byte written to a port
-  std::map<std::uint16_t, std::uint8_t> logicalDevice_;  // selected behind an index port
-  std::optional<Cell> lastRead_;                         // and nothing was written since
+  IndexTracker tracker_;
+  std::optional<Cell> lastRead_;  // and nothing was written since
   unsigned repeats_ = 0;
 };
 

@@ -1,19 +1,16 @@
 #include "boardtool/Rehearsal.h"
 
 #include <algorithm>
-#include <functional>
 #include <utility>
 
-#include "board/ChipTable.h"
 #include "board/MotherBoard.h"
 #include "board/base/BoardDevio.h"
-#include "board/base/mblib_exception.h"
+#include "boardtool/AssumedIdentity.h"
+#include "boardtool/BoardOnMachine.h"
 #include "boardtool/Everything.h"
 #include "boardtool/RehearsalHost.h"
-#include "harness/base/CDMException.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/Notices.h"
-#include "hw/SMBIOSDiscovery.h"
 #include "platform/HostInPlace.h"
 
 namespace panelglow::boardtool {
@@ -22,39 +19,6 @@ namespace {
 
 constexpr std::uint8_t kZeros = 0x00;
 constexpr std::uint8_t kOnes = 0xFF;
-
-// The firmware's name of the machine, as long as a rehearsal lasts.
-class AssumedIdentity {
- public:
-  explicit AssumedIdentity(const std::string& systemId)
-      : firmware_(SMBIOSDiscovery::Instance()),
-        productText_(std::exchange(firmware_.productText, systemId)),
-        processors_(std::exchange(firmware_.processors, {})) {}
-  ~AssumedIdentity() {
-    firmware_.productText = std::move(productText_);
-    firmware_.processors = std::move(processors_);
-  }
-  AssumedIdentity(const AssumedIdentity&) = delete;
-  AssumedIdentity& operator=(const AssumedIdentity&) = delete;
-
- private:
-  SMBIOSDiscovery& firmware_;
-  std::string productText_;
-  std::vector<ProcessorInfo> processors_;
-};
-
-std::string FailureOf(const std::function<void()>& work) {
-  try {
-    work();
-  } catch (const std::exception& failure) {
-    return failure.what();
-  } catch (const CDMException& failure) {
-    return "failure " + std::to_string(failure.code);
-  } catch (const std::string& failure) {
-    return failure;
-  }
-  return {};
-}
 
 struct Run {
   struct Step {
@@ -131,11 +95,7 @@ class Stage {
     run.setUp = host_.Hardware().TakeAccesses();
     if (board != nullptr) {
       run.className = board->GetClassName();
-      for (const ChipRow& row : ChipRows()) {
-        if (row.place != kPlainChipPlace && board->GetChip(std::string(row.name)).GetName() == row.name) {
-          run.chips.emplace_back(row.name);
-        }
-      }
+      run.chips = ChipsOf(*board);
     }
     return board;
   }

@@ -3,6 +3,8 @@
 #include <array>
 #include <utility>
 
+#include "boardtool/AlwaysRunningServices.h"
+
 namespace panelglow::boardtool {
 
 namespace {
@@ -84,29 +86,6 @@ class RehearsalMutexes : public platform::NamedMutexes {
   bool Release(platform::MutexHandle /*mutex*/) override { return true; }
 };
 
-/// The driver's service runs.
-class RehearsalServices : public platform::ServiceManager {
- public:
-  platform::ServiceHandle OpenManager(std::uint32_t, std::uint32_t& error) override { return Opened(error); }
-  platform::ServiceHandle OpenService(platform::ServiceHandle, std::string_view, std::uint32_t,
-                                      std::uint32_t& error) override {
-    return Opened(error);
-  }
-  platform::ServiceHandle CreateService(platform::ServiceHandle, const platform::ServiceDefinition&,
-                                        std::uint32_t& error) override {
-    return Opened(error);
-  }
-  std::uint32_t Start(platform::ServiceHandle) override { return 0; }
-  std::uint32_t Delete(platform::ServiceHandle) override { return 0; }
-  void Close(platform::ServiceHandle) override {}
-
- private:
-  static platform::ServiceHandle Opened(std::uint32_t& error) {
-    error = 0;
-    return 1;
-  }
-};
-
 /// A firmware that takes every call and answers zeros.
 class RehearsalFirmware : public platform::Management {
  public:
@@ -185,7 +164,7 @@ struct RehearsalHost::Parts {
   RehearsalFiles files{profiles};
   RehearsalCpu cpu;
   RehearsalMutexes mutexes;
-  RehearsalServices services;
+  AlwaysRunningServices services;
   RehearsalFirmware firmware{hardware};
   ImaginedDrivers drivers{hardware};
   platform::AbsentDevices absent;

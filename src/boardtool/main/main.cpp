@@ -3,11 +3,18 @@
 #include <CLI/CLI.hpp>
 #include <cstdio>
 #include <exception>
+#include <functional>
+#include <memory>
 #include <string>
 
+#include "boardtool/AssumedIdentity.h"
+#include "boardtool/Blink.h"
+#include "boardtool/BoardOnMachine.h"
 #include "boardtool/Check.h"
 #include "boardtool/Explain.h"
-#include "platform/Host.h"
+#include "boardtool/Machine.h"
+#include "boardtool/Trace.h"
+#include "platform/HostInPlace.h"
 
 namespace {
 
@@ -22,39 +29,129 @@ int Complain(int code, const std::string& problem) {
   return code;
 }
 
+// What stands between the verb and the machine.
+struct Between {
+  MachineOptions machine;
+  std::string traceFile;
+  std::string replayFile;
+};
+
+void AddFolder(CLI::App& verb, std::string& folder) {
+  verb.add_option("--folder", folder, "Folder of the installation (default: the current one)");
+}
+
+// Runs a verb on the machine, on a recorded one, or on one that is being recorded.
+int OnMachine(const Between& between, const std::function<int()>& verb) {
+  UseMachine(between.machine);
+  platform::Host& machine = platform::TheHost();
+  if (!between.replayFile.empty()) {
+    TracePlayer player(between.replayFile, machine, IsSimulated());
+    const platform::HostInPlace inPlace(player.TheHost());
+    const AssumedIdentity identity(player.SystemId());
+    const int code = verb();
+    player.Check();
+    if (player.Left() > 0) {
+      throw CannotRun(between.replayFile + ": the trace goes on where the program ended, with " +
+                      std::to_string(player.Left()) + " more requests");
+    }
+    return code;
+  }
+  if (!between.traceFile.empty()) {
+    TraceRecorder recorder(between.traceFile, machine, IsSimulated(), MachineId());
+    const platform::HostInPlace inPlace(recorder.TheHost());
+    const int code = verb();
+    recorder.Close();
+    return code;
+  }
+  return verb();
+}
+
+class Program {
+ public:
+  Program() {
+    app_.require_subcommand(1, 2);
+    app_.fallthrough();
+    app_.add_option("--trace", between_.traceFile, "Record every request to the driver in this file");
+    if (IsSimulated()) {
+      app_.add_option("--machine", between_.machine.file, "File of the simulated machine");
+      app_.add_flag("--real-time", between_.machine.realTime, "Let time pass as on a real machine");
+    }
+    AddExplain();
+    AddCheck();
+    AddBlink();
+    AddReplay();
+  }
+
+  int Run(int argc, char** argv) {
+    app_.parse(argc, argv);
+    return OnMachine(between_, run_);
+  }
+
+  int Exit(const CLI::Error& error) const { return app_.exit(error); }
+
+ private:
+  void AddExplain() {
+    CLI::App& verb = *app_.add_subcommand(
+        "explain", "The requests to the hardware by which a board's LEDs are lit; needs no hardware");
+    verb.add_option("led", explain_.led, "One LED: " + BoardLedNames() + " (default: all)");
+    verb.add_option("--board", explain_.systemId, "System id, as 7D10")->required();
+    AddFolder(verb, explain_.folder);
+    verb.add_flag("--json", explain_.json, "For programs");
+    verb.callback([this] { run_ = [this] { return Explain(explain_); }; });
+  }
+
+  void AddCheck() {
+    CLI::App& verb = *app_.add_subcommand("check", "What is wrong with an installation's files; needs no hardware");
+    verb.add_option("files", check_.files, "Only these files of an installation (default: all of the folder)");
+    AddFolder(verb, check_.folder);
+    verb.add_option("--format", check_.format, "text, json or sarif")
+        ->check(CLI::IsMember({"text", "json", "sarif"}));
+    verb.callback([this] { run_ = [this] { return Check(check_); }; });
+  }
+
+  void AddBlink() {
+    CLI::App& verb = *app_.add_subcommand("blink", "Blinks one LED of this machine until a key is pressed");
+    verb.add_option("led", blink_.led, "One of " + BoardLedNames())->required();
+    verb.add_option("--seconds", blink_.seconds, "Blink so long, and look for no key")->check(CLI::Range(1, 86400));
+    AddFolder(verb, blink_.folder);
+    verb.callback([this] {
+      run_ = [this] {
+        const StopRequest stop;
+        return Blink(blink_, PersonAtTerminal());
+      };
+    });
+  }
+
+  void AddReplay() {
+    CLI::App& verb = *app_.add_subcommand("replay", "Runs another verb on a recorded trace in place of the machine");
+    verb.add_option("file", between_.replayFile, "The trace")->required();
+    verb.require_subcommand(0, 1);
+    verb.footer("The verb with its options stands behind the file: replay trace.txt blink power-green --seconds 5");
+  }
+
+  CLI::App app_{"What the board library makes of an installation's files and of a machine.", "panelglow-board"};
+  Between between_;
+  ExplainOptions explain_;
+  CheckOptions check_;
+  BlinkOptions blink_;
+  std::function<int()> run_;
+};
+
 }  // namespace
 
 int main(int argc, char** argv) {
-  CLI::App app{"What the board library makes of an installation's files and of a machine.", "panelglow-board"};
-  app.require_subcommand(1);
-  int code = 0;
-  ExplainOptions explain;
-  CLI::App* const explainVerb =
-      app.add_subcommand("explain", "The requests to the hardware by which a board's LEDs are lit, without hardware");
-  explainVerb->add_option("led", explain.led, "One LED: " + BoardLedNames() + " (default: all)");
-  explainVerb->add_option("--board", explain.systemId, "System id, as 7D10")->required();
-  explainVerb->add_option("--folder", explain.folder, "Folder of the installation (default: the current one)");
-  explainVerb->add_flag("--json", explain.json, "For programs");
-  explainVerb->callback([&] { code = Explain(explain); });
-  CheckOptions check;
-  CLI::App* const checkVerb = app.add_subcommand("check", "What is wrong with an installation's files");
-  checkVerb->add_option("files", check.files, "Only these files of an installation (default: all of the folder)");
-  checkVerb->add_option("--folder", check.folder, "Folder of the installation (default: the current one)");
-  checkVerb->add_option("--format", check.format, "text, json or sarif")
-      ->check(CLI::IsMember({"text", "json", "sarif"}));
-  checkVerb->callback([&] { code = Check(check); });
+  Program program;
   try {
-    app.parse(argc, argv);
-    return code;
+    return program.Run(argc, argv);
   } catch (const CLI::CallForHelp& call) {
-    return app.exit(call);
+    return program.Exit(call);
+  } catch (const CLI::CallForAllHelp& call) {
+    return program.Exit(call);
   } catch (const CLI::ParseError& wrong) {
-    app.exit(wrong);
+    program.Exit(wrong);
     return kWrongCall;
   } catch (const WrongCall& wrong) {
     return Complain(kWrongCall, wrong.what());
-  } catch (const CannotRun& problem) {
-    return Complain(kCouldNotRun, problem.what());
   } catch (const std::exception& problem) {
     return Complain(kCouldNotRun, problem.what());
   }
