@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "boardtool/AlwaysRunningServices.h"
+#include "boardtool/MemoryFiles.h"
 
 namespace panelglow::boardtool {
 
@@ -43,30 +44,6 @@ class RehearsalConsole : public platform::Console {
 
   std::string told;
   bool isHushed = false;
-};
-
-class RehearsalFiles : public platform::Files {
- public:
-  explicit RehearsalFiles(const RecordedProfiles& profiles) : profiles_(profiles) {}
-
-  bool CanRead(std::string_view path) override { return profiles_.File(path) != nullptr; }
-  std::optional<std::string> Read(std::string_view path) override {
-    const IniOutline* const file = profiles_.File(path);
-    return file == nullptr ? std::nullopt : std::optional(file->bytes);
-  }
-  std::optional<std::string> ReadLocked(std::string_view path) override { return Read(path); }
-  bool Write(std::string_view, std::string_view) override { return false; }
-  bool WriteLocked(std::string_view, std::string_view) override { return false; }
-  bool Remove(std::string_view) override { return false; }
-  std::string FullPath(std::string_view path) override { return std::string(path); }
-  std::string CurrentDirectory() override { return {}; }
-  std::string FileName(std::string_view path) override {
-    return std::string(path.substr(path.find_last_of("/\\") + 1));
-  }
-  std::string ExecutablePath() override { return {}; }
-
- private:
-  const RecordedProfiles& profiles_;
 };
 
 /// A processor without anything to tell, in a system of 64 bits.
@@ -161,7 +138,7 @@ struct RehearsalHost::Parts {
   RecordedProfiles profiles;
   RehearsalClock clock{hardware};
   RehearsalConsole console;
-  RehearsalFiles files{profiles};
+  MemoryFiles files{profiles};
   RehearsalCpu cpu;
   RehearsalMutexes mutexes;
   AlwaysRunningServices services;

@@ -13,7 +13,10 @@
 #include "boardtool/Check.h"
 #include "boardtool/Explain.h"
 #include "boardtool/Machine.h"
+#include "boardtool/ReadVerbs.h"
+#include "boardtool/Report.h"
 #include "boardtool/Trace.h"
+#include "boardtool/Try.h"
 #include "platform/HostInPlace.h"
 
 namespace {
@@ -78,7 +81,10 @@ class Program {
     }
     AddExplain();
     AddCheck();
+    AddReport();
+    AddReadings();
     AddBlink();
+    AddTry();
     AddReplay();
   }
 
@@ -122,6 +128,53 @@ class Program {
     });
   }
 
+  void AddReport() {
+    CLI::App& verb = *app_.add_subcommand("report", "All that can be told of this machine and its board");
+    AddFolder(verb, report_.folder);
+    verb.add_flag("--json", report_.json, "For programs");
+    verb.callback([this] { run_ = [this] { return Report(report_); }; });
+  }
+
+  void AddReadings() {
+    const auto add = [this](const char* name, const char* what, bool hasLog,
+                            int (*read)(const ReadOptions&, const Person&)) {
+      CLI::App& verb = *app_.add_subcommand(name, what);
+      AddFolder(verb, read_.folder);
+      verb.add_flag("--json", read_.json, "For programs");
+      verb.add_flag("--watch", read_.watch, "Again and again until a key is pressed");
+      verb.add_option("--rounds", read_.rounds, "So many readings while watching")->check(CLI::Range(1, 1000000));
+      if (hasLog) {
+        verb.add_option("--log", read_.logFile, "Write the test's log there, and its XML results beside it");
+      }
+      verb.callback([this, read] {
+        run_ = [this, read] {
+          const StopRequest stop;
+          return read(read_, PersonAtTerminal());
+        };
+      });
+    };
+    add("fans", "The fans of this machine, with limits and states", true, Fans);
+    add("zones", "The temperature zones of this machine, with limits and states", true, Zones);
+    add("detect", "The devices that lines of this machine tell of: jumpers, cables, hood, buttons", false, Detect);
+  }
+
+  void AddTry() {
+    CLI::App& verb =
+        *app_.add_subcommand("try", "Finds the lamps of a board that nothing knows: one bit or line after the other");
+    verb.add_option("--chip", try_.chip, "g_iospace, g_memoryspace, g_ite or g_it8702")->required();
+    verb.add_option("--at", try_.at, "Port or address of the register, as 0xA20");
+    CLI::Option* const bits = verb.add_option("--bits", try_.range, "Bits of the register (default: 0-7)");
+    verb.add_option("--lines", try_.range, "Lines of the chip, as 20-27")->excludes(bits);
+    verb.add_option("--board", try_.systemId, "System id for the sections (default: the machine's)");
+    AddFolder(verb, try_.folder);
+    verb.callback([this] {
+      run_ = [this] {
+        const StopRequest stop;
+        return Try(try_, PersonAtTerminal());
+      };
+    });
+  }
+
   void AddReplay() {
     CLI::App& verb = *app_.add_subcommand("replay", "Runs another verb on a recorded trace in place of the machine");
     verb.add_option("file", between_.replayFile, "The trace")->required();
@@ -134,6 +187,9 @@ class Program {
   ExplainOptions explain_;
   CheckOptions check_;
   BlinkOptions blink_;
+  ReportOptions report_;
+  ReadOptions read_;
+  TryOptions try_;
   std::function<int()> run_;
 };
 
