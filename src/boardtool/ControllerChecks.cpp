@@ -88,6 +88,9 @@ void CheckControllers(const IniOutline& file, Findings& findings) {
     }
     return FormOf(section);
   };
+  if (file.sections.empty()) {
+    findings.Add("unknown-section", file.path, 1, 1, "the file has no section of controllers");
+  }
   for (const IniSection& one : file.sections) {
     if (FormOf(one.name) == nullptr) {
       findings.Add("unknown-section", file.path, one.line, one.column,

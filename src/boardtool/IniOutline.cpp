@@ -65,17 +65,21 @@ std::string LoweredName(std::string_view name) {
 IniOutline::IniOutline(std::string filePath, std::string fileBytes)
     : path(std::move(filePath)), bytes(std::move(fileBytes)) {
   std::string section;
-  bool isFirstOfName = true;  // the section of the line
+  std::vector<std::size_t>* ofSection = nullptr;  // entries of the line's section; null where it does not count
   const std::string text = Narrowed(bytes);
   platform::profile::VisitLines(text, [&](const platform::profile::OutlineLine& line) {
     if (line.isHeader) {
       section = std::string(line.name);
-      isFirstOfName = firstSection_.try_emplace(LoweredName(section), sections.size()).second;
+      const auto [first, isFirstOfName] = firstSection_.try_emplace(LoweredName(section));
+      ofSection = isFirstOfName ? &first->second : nullptr;
       sections.push_back({section, line.number, line.column});
     } else if (line.isEntry) {
       IniEntry entry{
           section, std::string(line.name), Unquoted(line.value), line.number, line.column, line.valueColumn, false};
-      entry.isFirst = isFirstOfName && !sections.empty() &&
+      if (ofSection != nullptr) {
+        ofSection->push_back(entries.size());
+      }
+      entry.isFirst = ofSection != nullptr &&
                       first_.try_emplace({LoweredName(section), LoweredName(entry.key)}, entries.size()).second;
       entries.push_back(std::move(entry));
     } else {
@@ -90,6 +94,16 @@ const IniEntry* IniOutline::Find(std::string_view section, std::string_view key)
 }
 
 bool IniOutline::HasSection(std::string_view section) const { return firstSection_.contains(LoweredName(section)); }
+
+std::string IniOutline::LinesOf(std::string_view section) const {
+  std::string lines;
+  if (const auto found = firstSection_.find(LoweredName(section)); found != firstSection_.end()) {
+    for (const std::size_t at : found->second) {
+      lines += entries[at].key + "=" + entries[at].value + '\0';
+    }
+  }
+  return lines;
+}
 
 bool IniOutline::IsSilenced(std::size_t line, std::string_view rule) const {
   const std::string_view own = LineOf(bytes, line);

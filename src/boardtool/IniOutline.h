@@ -42,6 +42,8 @@ class IniOutline {
   /// The entry that a look-up finds; null when there is none. Names without regard to ASCII case.
   [[nodiscard]] const IniEntry* Find(std::string_view section, std::string_view key) const;
   [[nodiscard]] bool HasSection(std::string_view section) const;
+  /// The lines of the section that look-ups find, each ended by NUL, as the look-ups list them.
+  [[nodiscard]] std::string LinesOf(std::string_view section) const;
 
   /// Whether the comment behind ";" in `line`, or in the comment line above it, silences a rule: "check: off RULE".
   [[nodiscard]] bool IsSilenced(std::size_t line, std::string_view rule) const;
@@ -54,7 +56,7 @@ class IniOutline {
 
  private:
   std::map<std::pair<std::string, std::string>, std::size_t> first_;  // lowered section and key, index of the entry
-  std::map<std::string, std::size_t> firstSection_;                   // lowered name, index
+  std::map<std::string, std::vector<std::size_t>> firstSection_;      // lowered name, indices of its entries
 };
 
 /// With ASCII letters lowered, as names are compared.

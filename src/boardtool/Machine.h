@@ -19,6 +19,9 @@ bool IsSimulated();
 /// To be called before the machine is used. Throws WrongCall for options that this executable has no use for.
 void UseMachine(const MachineOptions& options);
 
+/// What a person would see of a simulated machine's panel at this moment, as "power-green lit"; empty on a real one.
+std::string PanelNow();
+
 /// A person at a terminal.
 struct Person {
   bool isThere = false;                                // standard input is a terminal

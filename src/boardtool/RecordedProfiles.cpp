@@ -56,18 +56,8 @@ std::size_t RecordedProfiles::GetValue(std::optional<std::u16string_view> /*sect
 }
 
 std::size_t RecordedProfiles::GetSection(std::string_view section, std::span<char> buffer, std::string_view path) {
-  std::string lines;
-  if (const IniOutline* const file = File(path); file != nullptr && file->HasSection(section)) {
-    const std::string wanted = LoweredName(section);
-    for (const IniEntry& entry : file->entries) {
-      if (LoweredName(entry.section) == wanted) {
-        lines += entry.key + "=" + entry.value + '\0';
-      }
-    }
-    if (lines.empty()) {
-      lines = std::string("\0", 1);
-    }
-  }
+  const IniOutline* const file = File(path);
+  const std::string lines = file == nullptr ? std::string() : file->LinesOf(section);
   return CopyList<char>(lines, buffer);
 }
 

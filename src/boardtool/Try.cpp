@@ -283,6 +283,9 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
     throw CannotRun(
         "the chip does not blink: its section needs powerled.green.blink.sequence with primary_led in it");
   }
+  if (const std::string panel = PanelNow(); !panel.empty()) {
+    Say(panel + "; ");
+  }
   for (;;) {
     Say("which lamp moved? ");
     const std::optional<std::string> answer = person.answer();

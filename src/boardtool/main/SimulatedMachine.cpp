@@ -8,6 +8,15 @@ namespace panelglow::boardtool {
 
 bool IsSimulated() { return true; }
 
+std::string PanelNow() {
+  const platform::sim::FrontPanel& panel = platform::sim::CurrentSimulation().Panel();
+  std::string lit;
+  for (std::size_t i = 0; i < panel.Leds().size(); ++i) {
+    lit += panel.IsLit(i) ? (lit.empty() ? "" : ", ") + panel.Leds()[i].name : "";
+  }
+  return "the panel shows " + (lit.empty() ? "nothing" : lit) + " lit";
+}
+
 void UseMachine(const MachineOptions& options) {
   namespace sim = platform::sim;
   if (!options.file.empty()) {

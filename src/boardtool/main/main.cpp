@@ -51,7 +51,13 @@ int OnMachine(const Between& between, const std::function<int()>& verb) {
     TracePlayer player(between.replayFile, machine, IsSimulated());
     const platform::HostInPlace inPlace(player.TheHost());
     const AssumedIdentity identity(player.SystemId());
-    const int code = verb();
+    int code = 0;
+    try {
+      code = verb();
+    } catch (const CannotRun&) {
+      player.Check();  // where they part is what matters
+      throw;
+    }
     player.Check();
     if (player.Left() > 0) {
       throw CannotRun(between.replayFile + ": the trace goes on where the program ended, with " +

@@ -1,0 +1,211 @@
+// The integrator's program as a person at a bench uses it.
+#include <gmock/gmock.h>
+
+#include <filesystem>
+#include <fstream>
+
+#include "system/SystemRun.h"
+
+namespace panelglow::systemtest {
+namespace {
+
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+using ::testing::StartsWith;
+
+constexpr const char* kReal = "panelglow-board";
+constexpr const char* kSimulated = "panelglow-board-sim";
+
+Outcome Ask(const Installation& installation, const char* program, const std::vector<std::string>& arguments,
+            const std::map<std::string, std::string>& environment = {}) {
+  return RunProgram(program, arguments, installation.Path(""), environment);
+}
+
+// With what a person types.
+Outcome Type(const Installation& installation, const std::string& typed, const std::string& call,
+             const std::map<std::string, std::string>& environment = {}) {
+  installation.Write("typed", typed);
+  installation.Write("call.sh", "exec " PANELGLOW_BINARY_DIR "/" + call + " < typed\n");
+  return RunProgram("/bin/sh", {"call.sh"}, installation.Path(""), environment);
+}
+
+TEST(SystemBoardTool, HelpsAnybodyAndTellsWrongCallsFromWhatCannotBe) {
+  const Installation installation;
+  for (const char* const verb : {"explain", "check", "report", "fans", "zones", "detect", "blink", "try", "replay"}) {
+    const Outcome help = Ask(installation, kReal, {verb, "--help"});
+    EXPECT_EQ(help.exitCode, 0) << verb;
+    EXPECT_THAT(help.output, HasSubstr("--help")) << verb;
+  }
+  struct Call {
+    std::vector<std::string> arguments;
+    int exitCode;
+    const char* says;
+  };
+  for (const Call& call :
+       {Call{{}, 2, "subcommand"}, Call{{"explian"}, 2, ""}, Call{{"explain"}, 2, "--board"},
+        Call{{"explain", "--board", "7D10", "lamp"}, 2, "there is no LED \"lamp\": name one of power-"},
+        Call{{"explain", "--board", "7D10", "--folder", "none"}, 3, "can be read: start in the folder"},
+        Call{{"explain", "--board", "0000"}, 1, ""}, Call{{"check", "--format", "xml"}, 2, ""},
+        Call{{"blink", "power-green"}, 2, "give --seconds"},
+        Call{{"blink", "power-green", "--seconds", "1"}, 3, "no driver on this machine"},
+        Call{{"fans"}, 3, "no driver on this machine"}, Call{{"try", "--chip", "fin"}, 2, "the walk knows g_iospace"},
+        Call{{"try", "--chip", "g_iospace", "--at", "A20"}, 2, "name the register with --at"},
+        Call{{"report"}, 1, ""}, Call{{"replay", "ui.xml", "fans"}, 3, "is no trace of panelglow-board"}}) {
+    const Outcome outcome = Ask(installation, kReal, call.arguments);
+    EXPECT_EQ(outcome.exitCode, call.exitCode) << ::testing::PrintToString(call.arguments) << outcome.errors;
+    EXPECT_THAT(outcome.errors, HasSubstr(call.says));
+  }
+  EXPECT_THAT(Ask(installation, kReal, {"report"}).output, HasSubstr("This report is incomplete:\n"));
+}
+
+TEST(SystemBoardTool, CheckSpeaksToProgramsAndStandsWhatIsHostile) {
+  const Installation installation;
+  EXPECT_EQ(Ask(installation, kReal, {"check"}).exitCode, 0);
+  installation.Replace("mbtest.ini", "test.hdled.chip", "test.hdld.chip");
+  const std::string line =
+      "mbtest.ini:22:1: warning: nothing reads a key \"test.hdld.chip\"; is \"test.hdled.chip\" meant?";
+  EXPECT_THAT(Ask(installation, kReal, {"check"}).output, StartsWith(line + " [unknown-key]\n"));
+  EXPECT_THAT(Ask(installation, kReal, {"check", "--format", "json"}).output,
+              AllOf(StartsWith("["), HasSubstr("\"line\": 22"), HasSubstr("\"rule\": \"unknown-key\"")));
+  EXPECT_THAT(Ask(installation, kReal, {"check", "--format", "sarif"}).output,
+              AllOf(HasSubstr("\"version\": \"2.1.0\""), HasSubstr("\"startLine\": 22")));
+
+  std::string deep = "<UI>";
+  for (int i = 0; i < 100000; ++i) {
+    deep += "<a>";
+  }
+  std::string wide;
+  for (int i = 0; i < 100000; ++i) {
+    wide += "[" + std::to_string(i) + "]\nplatform=generic\nchips=g_iospace\n";
+  }
+  std::string bytes;
+  for (int i = 0; i < 100000; ++i) {
+    bytes += static_cast<char>(1 + i * 37 % 255);
+  }
+  const std::pair<const char*, std::string> hostile[] = {{"ui.xml", deep},
+                                                         {"mbdetect.ini", wide},
+                                                         {"chip.ini", bytes},
+                                                         {"buttondefinition.xml", bytes},
+                                                         {"msctrl.ini", bytes},
+                                                         {"chip.ini", std::string(std::size_t{100} << 20U, '[')},
+                                                         {"chip.ini", "[a]\nbase=b\n[b]\nbase=a\n"}};
+  for (const auto& [name, text] : hostile) {
+    const Installation broken;
+    broken.Write(name, text);
+    const Outcome outcome = Ask(broken, kReal, {"check"});
+    EXPECT_EQ(outcome.exitCode, 1) << name;
+    EXPECT_THAT(outcome.output, HasSubstr(name));
+  }
+}
+
+// From an empty section to a test that is passed: what the walk prints is all that the files need.
+TEST(SystemBoardTool, TheWalkFindsTheLampsOfABoardThatNothingKnows) {
+  const Installation installation;
+  const std::string machine = installation.Machine("desktop.toml");
+  for (const char* const file : {"mbdetect.ini", "mbtest.ini"}) {
+    installation.Replace(file, "[7D10]", "[gone]");
+  }
+  EXPECT_EQ(Ask(installation, kSimulated, {"--machine", machine, "blink", "power-green", "--seconds", "1"}).exitCode,
+            3);
+  const Outcome walk = Type(installation, "power-green\nlamp\npower-red\n\n\n\n\n\n\n",
+                            "panelglow-board-sim --machine " + machine + " try --chip g_iospace --at 0xA20",
+                            {{"PANELGLOW_SIM_REPORT", installation.Path("report").string()}});
+  ASSERT_EQ(walk.exitCode, 0) << walk.errors;
+  EXPECT_THAT(walk.errors, HasSubstr("bit 1 of port 0x0A20: the panel shows power-red lit; which lamp moved?"));
+  EXPECT_THAT(walk.errors, HasSubstr("\"lamp\" is no answer"));
+  EXPECT_THAT(installation.Read("report"), Not(HasSubstr("\nafter ")));
+  const std::size_t test = walk.output.find("; mbtest.ini\n");
+  ASSERT_NE(test, std::string::npos);
+  installation.Write("mbdetect.ini", installation.Read("mbdetect.ini") + walk.output.substr(0, test));
+  installation.Write("mbtest.ini", installation.Read("mbtest.ini") + walk.output.substr(test));
+  installation.Replace("mbdetect.ini", "[gone]", "[7D99]");
+  installation.Replace("mbtest.ini", "[gone]", "[7D99]");
+  EXPECT_EQ(Ask(installation, kReal, {"check"}).output, "");
+  const Outcome run = LedRun(machine, "TwoColorPower").In(installation);
+  EXPECT_EQ(run.exitCode, 0) << run.output;
+  EXPECT_GE(run.TimesLit("power-green"), 2U);
+  EXPECT_GE(run.TimesLit("power-red"), 2U);
+}
+
+TEST(SystemBoardTool, TheWalkFindsLinesAndEndsWhenToldTo) {
+  const Installation installation;
+  const std::string machine = installation.Machine("sio-ite.toml");
+  const Outcome walk = Type(installation, "\n\npower-green\n",
+                            "panelglow-board-sim --machine " + machine + " try --chip g_ite --lines 20-27",
+                            {{"PANELGLOW_SIM_REPORT", installation.Path("report").string()}});
+  EXPECT_EQ(walk.exitCode, 0) << walk.errors;
+  EXPECT_THAT(walk.output, HasSubstr("chips=g_ite\nchip.g_ite.powerled.color.primary.gpio=22\n"));
+  EXPECT_THAT(installation.Read("report"), Not(HasSubstr("\nafter ")));
+  EXPECT_EQ(Type(installation, "q\n", "panelglow-board-sim --machine " + machine + " try --chip g_ite --lines 20-27")
+                .exitCode,
+            1);
+}
+
+// Whatever ends the blinking, the machine is as it was.
+TEST(SystemBoardTool, BlinkPutsBackHoweverItEnds) {
+  const Installation installation;
+  const std::map<std::string, std::string> report{{"PANELGLOW_SIM_REPORT", installation.Path("report").string()}};
+  for (const char* const name : {"sio-fintek", "sio-ite", "ec-notebook", "notebook"}) {
+    const std::string machine = installation.Machine(std::string(name) + ".toml");
+    const Outcome blink =
+        Ask(installation, kSimulated, {"--machine", machine, "blink", "power-green", "--seconds", "3"}, report);
+    EXPECT_EQ(blink.exitCode, 0) << name << blink.errors;
+    EXPECT_THAT(blink.errors, HasSubstr("(simulated); it writes "));
+    EXPECT_THAT(installation.Read("report"), Not(HasSubstr("\nafter "))) << name;
+    EXPECT_THAT(installation.Read("report"), HasSubstr("\nedge ")) << name;
+  }
+  const std::string machine = installation.Machine("sio-fintek.toml");
+  installation.Write("call.sh", PANELGLOW_BINARY_DIR "/panelglow-board-sim --real-time --machine " + machine +
+                                    " blink power-red --seconds 60 &\nsleep 1.5\nkill -$1 $!\nwait $!\n");
+  for (const char* const signal : {"INT", "TERM", "HUP"}) {
+    const Outcome ended = RunProgram("/bin/sh", {"call.sh", signal}, installation.Path(""), report);
+    EXPECT_EQ(ended.exitCode, 0) << signal << ended.errors;
+    EXPECT_THAT(installation.Read("report"), HasSubstr("\nend ")) << signal;
+    EXPECT_THAT(installation.Read("report"), Not(HasSubstr("\nafter "))) << signal;
+  }
+}
+
+TEST(SystemBoardTool, ATraceAnswersInPlaceOfTheMachine) {
+  const Installation installation;
+  const std::string machine = installation.Machine("desktop.toml");
+  const std::vector<std::string> verb{"blink", "power-red", "--seconds", "2"};
+  const auto with = [&](std::vector<std::string> first) {
+    first.insert(first.end(), verb.begin(), verb.end());
+    return first;
+  };
+  const Outcome recorded = Ask(installation, kSimulated, with({"--machine", machine, "--trace", "trace"}));
+  EXPECT_EQ(recorded.exitCode, 0) << recorded.errors;
+  const std::string trace = installation.Read("trace");
+  EXPECT_THAT(trace, StartsWith("panelglow-board trace 1\nmachine simulated\nboard 7D10\n"));
+  const Outcome played = Ask(installation, kSimulated, with({"replay", "trace"}));
+  EXPECT_EQ(played.exitCode, 0) << played.errors;
+  EXPECT_EQ(played.errors, recorded.errors);
+  EXPECT_THAT(Ask(installation, kReal, with({"replay", "trace"})).errors,
+              HasSubstr("recorded on a simulated machine"));
+
+  struct Damage {
+    const char* from;
+    const char* to;
+    const char* says;
+  };
+  for (const Damage& damage :
+       {Damage{"control 220010 200a", "control 220010 210a", "damaged:6: the trace has"},
+        Damage{"board 7D10\n", "board 7D10\nopen x 0\n", "damaged:4: the trace has \"open x 0\""},
+        Damage{" 0 00 ;", " 0 zz ;", "a number is missing or damaged"}, Damage{" 0 00 ;", " 0 0000 ;", "an answer of 1 bytes"},
+        Damage{"sleep 32", "sleep 33", "where the program asks \"sleep 32\""}}) {
+    std::string damaged = trace;
+    damaged.replace(damaged.find(damage.from), std::string(damage.from).size(), damage.to);
+    installation.Write("damaged", damaged);
+    const Outcome outcome = Ask(installation, kSimulated, with({"replay", "damaged"}));
+    EXPECT_EQ(outcome.exitCode, 3) << damage.to;
+    EXPECT_THAT(outcome.errors, HasSubstr(damage.says));
+  }
+  installation.Write("damaged", trace + "tick 1\n");
+  EXPECT_THAT(Ask(installation, kSimulated, with({"replay", "damaged"})).errors, HasSubstr("with 1 more requests"));
+  EXPECT_EQ(Ask(installation, kSimulated, with({"--machine", machine, "--trace", "none/trace"})).exitCode, 3);
+}
+
+}  // namespace
+}  // namespace panelglow::systemtest
