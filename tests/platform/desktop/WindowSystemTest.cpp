@@ -234,6 +234,22 @@ TEST_F(DialogTest, TheFocusedButtonHasTheHeavyFrameAndTheDefaultOneWhenNoneIs) {
   EXPECT_THAT(heavy(), ElementsAre(12));
 }
 
+// Each row's number of lines, and characters of the longest.
+TEST_F(DialogTest, ATextHasAPlausibleSizeWithoutTheDrawingModule) {
+  desktop_.SetDrawing([] { return nullptr; });
+  const Font font{18, 600};
+  const std::tuple<std::u16string, int, int, int> kCases[] = {{u"", 100, 1, 0},
+                                                              {u"59", 10'000, 1, 2},
+                                                              {u"59", 0, 2, 1},
+                                                              {u"one\nthree\n", 32'767, 3, 5},
+                                                              {u"1234567890", 36, 3, 4}};
+  for (const auto& [text, width, lines, longest] : kCases) {
+    const Rectangle size = desktop_.MeasureText(text, width, font);
+    EXPECT_EQ(size.Height(), lines * font.height) << width;
+    EXPECT_EQ(size.Width(), longest * font.height / 2) << width;
+  }
+}
+
 TEST_F(DialogTest, EnterWithoutAFocusedButtonPressesTheDefaultOne) {
   Pump(1);
   desktop_.EnableWindow(buttons_[0], false);  // the focused one: no focus is left
