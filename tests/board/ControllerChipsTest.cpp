@@ -429,10 +429,10 @@ TEST(GCodecChip, WithoutADriverALampTakesItsTimeAndDoesNothing) {
 }
 
 TEST(GCodecChip, ALampIsThreeVerbsWithTheSavedPinsAndItsOwn) {
-  // Registers that never change: always idle, always with the answer 0xABCD0004.
+  // Registers that never change: always idle, always with the answer 0xABCD0085.
   ChipBench bench(
       "chip = [{name = \"hda\", kind = \"memory-registers\", base = 0xFE0F0000,"
-      " initial = [0, 0, 0, 0, 0x04, 0x00, 0xCD, 0xAB, 2, 0]}]\n",
+      " initial = [0, 0, 0, 0, 0x85, 0x00, 0xCD, 0xAB, 2, 0]}]\n",
       "chip.codec.hdabar=0xFE0F0000\nchip.g_codec.codec.icw.reg=0\nchip.g_codec.codec.irr.reg=4\n"
       "chip.g_codec.codec.ics.reg=8\n",
       kVerbs);
@@ -449,19 +449,19 @@ TEST(GCodecChip, ALampIsThreeVerbsWithTheSavedPinsAndItsOwn) {
     }
     return text;
   };
-  std::string blink = "0C161700 10ms 0C171700 10ms ";
+  std::string blink = "8D161700 10ms 8D171700 10ms ";
   for (int round = 0; round < 51; ++round) {
-    blink += round % 2 == 0 ? "04151700 10ms 500ms " : "0C151700 10ms 500ms ";
+    blink += round % 2 == 0 ? "85151700 10ms 500ms " : "8D151700 10ms 500ms ";
   }
   EXPECT_EQ(verbs(&Chip::RestoreSpeakerLedState), "");  // nothing is saved yet
   const std::pair<Operation, std::string> kOperations[] = {
       {&Chip::SaveSpeakerLedState, "00161F00 10ms 00171F00 10ms 00151F00 10ms "},
-      {&Chip::AssertSpeakerLed, "05161700 10ms 05171700 10ms 04151700 10ms 10ms "},
-      {&Chip::DeassertSpeakerLed, "05161700 10ms 05171700 10ms 05151700 10ms 10ms "},
-      {&Chip::AssertMicrophoneLed, "0C161700 10ms 0C171700 10ms 04151700 10ms 10ms "},
-      {&Chip::DeassertMicrophoneLed, "0C161700 10ms 0C171700 10ms 0C151700 10ms 10ms "},
+      {&Chip::AssertSpeakerLed, "85161700 10ms 85171700 10ms 84151700 10ms 10ms "},
+      {&Chip::DeassertSpeakerLed, "85161700 10ms 85171700 10ms 85151700 10ms 10ms "},
+      {&Chip::AssertMicrophoneLed, "8D161700 10ms 8D171700 10ms 85151700 10ms 10ms "},
+      {&Chip::DeassertMicrophoneLed, "8D161700 10ms 8D171700 10ms 8D151700 10ms 10ms "},
       {&Chip::BlinkMicrophoneLed, blink},
-      {&Chip::RestoreSpeakerLedState, "0416EFAB 10ms 0417EFAB 10ms 0415EFAB 10ms "},
+      {&Chip::RestoreSpeakerLedState, "8516EFAB 10ms 8517EFAB 10ms 8515EFAB 10ms "},
   };
   for (const auto& [operation, traffic] : kOperations) {
     EXPECT_EQ(verbs(operation), traffic);
@@ -486,12 +486,15 @@ TEST(GCodecChip, AListWithoutExactlyThreeVerbsServesNoLamp) {
 
 TEST(GCodecChip, ItsControllerIsFoundByPlaceOrByTheFilesBase) {
   const auto base = [](const std::string& settings) {
-    ChipBench bench("pci = [{device = 0x1B, function = 2, registers = {\"10\" = 0xF7F10004, \"14\" = 0}}]\n",
-                    settings, "");
+    ChipBench bench(
+        "pci = [{device = 0x1B, function = 2, registers = {\"10\" = 0xF7F10004, \"14\" = 0}},"
+        " {bus = 5, device = 0x1B, function = 2, registers = {\"14\" = 0xE7F10004, \"18\" = 0}}]\n",
+        settings, "");
     GCodecChip chip;
     return bench.Traffic([&] { chip.SendVerb(1); }).substr(0, 8);
   };
   EXPECT_EQ(base("chip.codec.pciloc=0x001B0210\nchip.codec.hdabar=0xFE0F0000\n"), "F7F10060");
+  EXPECT_EQ(base("chip.codec.pciloc=0x051B0214\n"), "E7F10060");
   EXPECT_EQ(base("chip.codec.pciloc=0x001B0110\nchip.codec.hdabar=0xF0000000\n"), "F0000060");  // nothing there
   for (const char* settings : {"", "chip.codec.hdabar=15\n", "chip.codec.pciloc=0x001B0110\n"}) {
     EXPECT_THAT([&] { base(settings); },
@@ -542,7 +545,7 @@ TEST(CaslChip, FansAndTemperaturesAreItemsOfCountedRecords) {
   EXPECT_FALSE(chip.ReadFanRpm(1, value, 100) || chip.ReadFanRpm(2, value, 100) || value != 7);
   EXPECT_TRUE(chip.ReadFanRpm(0, value, 100) && value == 2400);
   EXPECT_TRUE(chip.ReadVirtualTemperature(1, false, value) && value == 38);
-  EXPECT_FALSE(chip.ReadVirtualTemperature(3, false, value));
+  EXPECT_FALSE(chip.ReadVirtualTemperature(3, false, value) || chip.ReadVirtualTemperature(-1, false, value));
   const std::pair<std::function<bool()>, const char*> kDuties[] = {
       {[&] { return chip.SetFanPwm(1, 300); }, "fan 0 duty = 60\nfan 1 duty = FE\n"},
       {[&] { return chip.SetFanPwm(0, -3); }, "fan 0 duty = 01\nfan 1 duty = FE\n"},
@@ -552,6 +555,13 @@ TEST(CaslChip, FansAndTemperaturesAreItemsOfCountedRecords) {
     EXPECT_TRUE(set());
     EXPECT_THAT(bench.machine.HardwareState(), HasSubstr(duties));
   }
+}
+
+TEST(CaslChip, WhatAnEarlierRecordLeftBehindTheLastFanIsNoFan) {
+  ChipBench bench(std::string(kFirmware) + "fault = \"stale-record\"\n");
+  int value = 0;
+  EXPECT_TRUE(CaslChip().ReadFanRpm(0, value, 100));
+  EXPECT_FALSE(CaslChip().ReadFanRpm(2, value, 100) || CaslChip().ReadFanRpm(-1, value, 100));
 }
 
 TEST(CaslChip, AFailingCallSaysAtWhichStep) {

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <functional>
 
 #include "board/BoardBench.h"
@@ -88,11 +89,11 @@ TEST(IniReader, NumbersAreDecimalOrPrefixedAndEveryReadIsRecorded) {
 TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
   BoardBench bench;
   bench.SetFiles(
-      "[7D10]\na=OxF9\nb=0xFFFFFFFF\nc=-1\nchip.g_ec.d=F8h\ngood=0x20\nempty=undef\n"
+      "[7D10]\na=OxF9\nb=0xFFFFFFFF\nc=-1\nchip.g_ec.d=F8h\ngood=0x20\nempty=undef\nl=-2\n"
       "test.panelglow.waittime=-1\n",
       "",
-      "[g_ec]\ne=0x1F9\nf=255\ng=-128\nh=0x10000\ni=0xFFFF\nj=0xF9 x\n"
-      "list=B40:1.300,0x10:undef\n[parts]\nbase=g_ce\n");
+      "[g_ec]\ne=0x1F9\nf=255\ng=-128\nh=0x10000\ni=0xFFFF\nj=0xF9 x\nk=-2147483649\nm=-0x3\n"
+      "list=B40:1.300,0x10:-1,-0x10:undef\n[parts]\nbase=g_ce\n");
   IniReader& reader = IniReader::Instance("7D10", kFiles[0], kFiles[1], kFiles[2]);
   const std::string detect = ".\\mbdetect.ini, section [7D10], key ";
   const std::string chip = ".\\chip.ini, section [g_ec], key ";
@@ -111,7 +112,19 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
       {[&] { EXPECT_EQ(ReadChipByte("g_ec", "d", 1), 0); }, detect + "\"chip.g_ec.d\": \"F8h\"" + none},
       {[&] { EXPECT_EQ(ReadChipByte("g_ec", "e", 1), 0xF9); },
        chip + "\"e\": \"0x1F9\" does not fit into 8 bits and counts as 0xF9"},
-      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "f", 1) + ReadChipByte("g_ec", "g", 1), 255 + 128); }, ""},
+      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "f", 1), 255); }, ""},
+      // A sign is for an int alone.
+      {[&] { EXPECT_EQ(ReadChipInt("g_ec", "g", 1), -128); }, ""},
+      {[&] { EXPECT_EQ(reader.ReadChipInt("g_ec", "k", status, 1), INT_MIN); },
+       chip + "\"k\": \"-2147483649\" does not fit into 31 bits and counts as 0x80000000"},
+      {[&] { EXPECT_EQ(ReadChipByte("g_ec", "g", 1), 128); },
+       chip + "\"g\": \"-128\" does not fit into 8 bits and counts as 0x80"},
+      {[&] { EXPECT_EQ(ReadIniWord("c", 1), 0xFFFF); },
+       detect + "\"c\": \"-1\" does not fit into 16 bits and counts as 0xFFFF"},
+      {[&] { EXPECT_EQ(reader.ReadIniUnsigned("l", status, 1), 0xFFFFFFFE); },
+       detect + "\"l\": \"-2\" does not fit into 32 bits and counts as 0xFFFFFFFE"},
+      {[&] { EXPECT_EQ(ReadChipDword("g_ec", "m", 1), 0xFFFFFFFD); },
+       chip + "\"m\": \"-0x3\" does not fit into 32 bits and counts as 0xFFFFFFFD"},
       {[&] { EXPECT_EQ(ReadChipWord("g_ec", "h", 1), 0); },
        chip + "\"h\": \"0x10000\" does not fit into 16 bits and counts as 0x0"},
       {[&] { EXPECT_EQ(ReadChipWord("g_ec", "i", 1), 0xFFFF); }, ""},
@@ -119,7 +132,9 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
       {[&] { ParseByteList("x"); }, ""},  // of no file
       {[&] { ParseSequence(ReadChipSetting("g_ec", "list", ""), sequence, 16); },
        chip + "\"list\": \"B40\"" + none + ".\npanelglow-diags: " + chip +
-           "\"list\": \"300\" does not fit into 8 bits and counts as 0x2C"},
+           "\"list\": \"300\" does not fit into 8 bits and counts as 0x2C.\npanelglow-diags: " + chip +
+           "\"list\": \"-1\" does not fit into 8 bits and counts as 0xFF.\npanelglow-diags: " + chip +
+           "\"list\": \"-0x10\" does not fit into 16 bits and counts as 0xFFF0"},
       {[&] { EXPECT_THROW(ParsePairs<std::uint8_t>(ReadChipSetting("g_ec", "i", "")), mblib_exception); },
        chip + "\"i\": malformed sequence entry: '0xFFFF'. should be: 'cmd:data[.data]*,...'"},
       {[] { const SmscMec1322Chip part; },

@@ -325,6 +325,7 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
        "[7D10]\na=b\n",
        "",
        {"system id is \"7D10\", and section [7D10] is in .\\mbtest.ini, not in .\\mbdetect.ini; without"}},
+      {"[7D11]\nplatform=generic\n", "", "", {"section [7D10] is not in .\\mbdetect.ini and .\\mbtest.ini; without"}},
       {"[7D10]\nplatform=genric\n", "", "", {"key \"platform\": there is no board class \"genric\""}},
       {"[7D10]\nchips=g_iospace,g_iospce\n",
        "[7D10]\ntest.powerled.chip=g_iospace\n",
@@ -335,6 +336,7 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
        "",
        {"The power LED cannot be lit: the key \"test.powerled.chip\" names no chip for it; section [7D10] is in "
         ".\\mbdetect.ini, not in .\\mbtest.ini"}},
+      {generic, "[7D10]\na=b\n", "", {"section [7D10] is in .\\mbdetect.ini and .\\mbtest.ini."}},
       {generic,
        "[7D10]\ntest.powerled.chip=g_iospce\n",
        "",

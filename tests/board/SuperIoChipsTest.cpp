@@ -221,6 +221,8 @@ TEST(SuperIoChips, FansAndLinesAreTheirRegistersInOrder) {
   Expect<GSioChip>(
       SuperIoBench("plain", kEnvironment), kFans,
       {{rpm, 2 * 1350000 / (0x135 * 2), kTach},
+       {[](Chip& chip) { return chip.TachToRpm(0xFFFE, 2) * 100 + chip.TachToRpm(0xFFFF, 2); }, 2000, ""},
+       {[](Chip& chip) { return chip.TachToRpm(0, 2) + chip.TachToRpm(0x10000, 2); }, 0, ""},
        {full, 1, kSaved + "0A15<-63 0A16<-7F "},
        {[](Chip& chip) { return chip.SetFanPwm(1, 300) && chip.SetFanPwm(1, -1) && chip.SetFanPwmPercent(1, 50); }, 1,
         "0A15<-63 0A16<-7F 0A15<-63 0A16<-00 0A15<-63 0A16<-3F "},

@@ -533,27 +533,27 @@ TEST(SioChips, WhereThereIsNoBaseNothingIsTouched) {
 TEST(AdtChips, ARegisterIsATransaction) {
   const auto bus = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "80"); };
   const std::string printed = Expect(
-      "adt", Ports(0xFC00, 0, 0x80) + Ports(0xFC04, 0x42),
-      {{Tach(1), 0x4242, bus("28->42 29->42")},
-       {Tach(4), 0x4242, bus("2E->42 2F->42")},
+      "adt", Ports(0xFC00, 0, 0x80) + Ports(0xFC04, 0x43),
+      {{Tach(1), 0x4343, bus("28->43 29->43")},
+       {Tach(4), 0x4343, bus("2E->43 2F->43")},
        {Tach(5), 0xFFFF, ""},
-       {Zone(3), 0x42, bus("27->42")},
+       {Zone(3), 0x43, bus("27->43")},
        {Zone(4), -1000, ""},
        {Duty(0, 0x180), 0, ""},
        {Manual(true), 1,  // a written byte is the next one read: the host has but one data register
-        bus("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 40->42 40<-40 5C<-E0 5D<-E0 5E<-E0 "
+        bus("40->43 5C->43 5D->43 5E->43 30->43 31->43 32->43 62->43 63->43 40->43 40<-40 5C<-E0 5D<-E0 5E<-E0 "
             "62->E0 62<-E7 63<-77")},
        {Duty(3, 0x180), 1, bus("32<-80")},
-       {&Chip::RestoreFanState, 1, bus("40<-42 5C<-42 5D<-42 5E<-42 30<-42 31<-42 32<-42 62<-42 63<-42")}});
+       {&Chip::RestoreFanState, 1, bus("40<-43 5C<-43 5D<-43 5E<-43 30<-43 31<-43 32<-43 62<-43 63<-43")}});
   EXPECT_EQ(printed, "LogMessage 14 20000 \"Invalid PWM index specified\" \"\"\n");
   const auto reg = [](int number) { return [=](Chip& c) { return c.ReadRegister(number); }; };
   const auto bus11 = [](const std::string& requests) { return Smbus("080", "5C", requests, "80"); };
-  Expect("adt_sio11", Ports(0x800, 0, 0x80) + Ports(0x804, 0x42),
-         {{reg(0x1A), 0x42, bus11("1A->42")},
+  Expect("adt_sio11", Ports(0x800, 0, 0x80) + Ports(0x804, 0x43),
+         {{reg(0x1A), 0x43, bus11("1A->43")},
           {reg(256), 0, ""},
           {&Chip::SaveFanState, 1,
-           bus11("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 64->42 65->42 66->42 38->42 39->42 "
-                 "3A->42")}});
+           bus11("40->43 5C->43 5D->43 5E->43 30->43 31->43 32->43 62->43 63->43 64->43 65->43 66->43 38->43 39->43 "
+                 "3A->43")}});
 }
 
 TEST(AdtChips, WithoutAnAnswerNothingIsSavedOrTakenOver) {

@@ -462,14 +462,18 @@ TEST_F(XmlFiles, LeavesTheObjectAloneWhenThereIsNothingToLoad) {
 }
 
 TEST_F(XmlFiles, CountsThePlaceOfAnErrorFromItsOwnTopLevelElement) {
-  machine_.DiskFiles().Put("m.xml", "<a>\n\n</a><b>\n<1/></b>");
-  XmlObject object;
-  try {
-    static_cast<void>(object.LoadFromFile("m.xml", false, false, 1));
-    FAIL() << "no error";
-  } catch (const std::runtime_error& error) {
-    EXPECT_THAT(error.what(), HasSubstr("(line 2, position 3) Invalid tag name"));
-  }
+  const auto error = [&](const char* text, int index) {
+    machine_.DiskFiles().Put("m.xml", text);
+    try {
+      static_cast<void>(XmlObject().LoadFromFile("m.xml", false, false, index));
+    } catch (const std::runtime_error& thrown) {
+      return std::string(thrown.what());
+    }
+    return std::string();
+  };
+  EXPECT_THAT(error("<a>\n\n</a><b>\n<1/></b>", 1), HasSubstr("(line 2, position 3) Invalid tag name"));
+  // Of an element that is passed over nothing is kept but its name.
+  EXPECT_THAT(error("<a/><b>\n<c/>text", 2), HasSubstr("(line 2, position 8) Missing end tag: b<b/>\n"));
 }
 
 TEST_F(XmlFiles, ReadsBackThePlainAndTheScrambledForm) {

@@ -42,7 +42,7 @@ class ScreenTest : public ::testing::Test {
   [[nodiscard]] bool AwaitPrompt() const { return display_.AwaitPixel(kInsideX, kInsideY, kPromptGray, kLimit); }
 
   // A window of another program, above all others and with the keyboard.
-  [[nodiscard]] ::Window ShowOther(int width, int height) const {
+  [[nodiscard]] ::Window ShowOther(int width, int height, const char* title = "") const {
     ::Display* display = display_.Connection();
     XSetWindowAttributes attributes{};
     attributes.override_redirect = True;
@@ -50,6 +50,7 @@ class ScreenTest : public ::testing::Test {
     const ::Window window = XCreateWindow(display, DefaultRootWindow(display), 0, 0, static_cast<unsigned>(width),
                                           static_cast<unsigned>(height), 0, CopyFromParent, InputOutput,
                                           CopyFromParent, CWOverrideRedirect | CWBackPixel, &attributes);
+    XStoreName(display, window, title);
     XMapRaised(display, window);
     XSetInputFocus(display, window, RevertToParent, CurrentTime);
     XSync(display, False);
@@ -106,8 +107,8 @@ TEST_F(ScreenTest, AHeldSpaceAnswersOnePrompt) {
 TEST_F(ScreenTest, ATopmostPromptGetsPlaceAndKeyboardBack) {
   ChildProcess child([](int) { return TextPrompt(u"text", u"title", kPromptTopmost | 1, nullptr, 0); });
   ASSERT_TRUE(AwaitPrompt());
-  for (int times = 0; times < 3; ++times) {
-    const ::Window other = ShowOther(1280, 1024);
+  for (const char* title : {"", "another", "a third"}) {
+    const ::Window other = ShowOther(1280, 1024, title);
     ASSERT_TRUE(AwaitPrompt());
     EXPECT_EQ(display_.PixelAt(10, 10), kRed);
     ASSERT_TRUE(AwaitLossOfKeyboard(other));  // or nobody ends the child

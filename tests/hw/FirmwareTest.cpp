@@ -109,6 +109,7 @@ TEST_F(Firmware, ReadsTheOtherStructures) {
   EXPECT_EQ(info.maximumSpeed, 3600);
   EXPECT_EQ(info.coreCount, 4);
   EXPECT_EQ(info.model, 10U * 3 + 10);  // of the processor that runs this: extended model 3, model 10
+  EXPECT_EQ(info.longMode, "yes");
   EXPECT_EQ(found.populatedSockets, 1U);
   EXPECT_FALSE(found.isAmd);
   EXPECT_EQ(found.caches.at(0).level + found.caches.at(0).size + found.caches.at(0).socket, "L24096L2-Cache");
@@ -172,11 +173,14 @@ TEST_F(Firmware, LeavesRecordsPastItsLimitsUnstored) {
   EXPECT_EQ(found.GetProcessor(10).manufacturer, "");
 }
 
-TEST(FirmwareOfAnotherMaker, IsNoticed) {
+TEST(FirmwareOfAnotherProcessor, IsNoticed) {
   MachineDescription description;
   description.firmware.processors = {{"AMD", 0x6B}};
+  description.is64Bit = false;
   Simulation machine(description, {});
-  EXPECT_TRUE(SMBIOSDiscovery(Structure(4, Bytes(32, 0), {})).isAmd);
+  const SMBIOSDiscovery found(Structure(4, Bytes(32, 0), {}));
+  EXPECT_TRUE(found.isAmd);
+  EXPECT_EQ(found.GetProcessor(0).longMode, "no");
 }
 
 // ---- SmbiosScanner

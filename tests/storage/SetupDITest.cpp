@@ -175,6 +175,8 @@ TEST_F(SetupDITest, TheInventoryReadsTheNumbersOfHardwareIds) {
   }
 }
 
+int PlaceOf(const PciDevice& device) { return device.bus * 10000 + device.device * 100 + device.function; }
+
 TEST_F(SetupDITest, TheInventoryCountsEqualFunctionsAndReadsTheRest) {
   auto first = Function("PCI\\VEN_0001&DEV_0002&SUBSYS_00040003&REV_00");
   first.properties = {{1, first.properties[1]},
@@ -187,7 +189,7 @@ TEST_F(SetupDITest, TheInventoryCountsEqualFunctionsAndReadsTheRest) {
   tree_.Add(0, Function("PCI\\VEN_0001&DEV_0002&SUBSYS_00040003&REV_00"));
   const PciDeviceList list;
   const PciDevice& device = list.Devices()[0];
-  EXPECT_EQ(device.bus * 10000 + device.device * 100 + device.function, 33107);
+  EXPECT_EQ(PlaceOf(device), 33107);
   EXPECT_EQ(device.slot, 0x80000001U);
   EXPECT_EQ(device.driverKey + "|" + device.description + "|" + device.instanceId, "{class}\\0001|Card|PCI\\0");
   EXPECT_EQ(list.Devices()[1].earlierEqual + 10 * list.Devices()[2].earlierEqual, 21U);
@@ -205,8 +207,21 @@ TEST_F(SetupDITest, TheInventoryAsksTheDriverForAPlaceThatTheSystemDoesNotTell) 
   tree_.Add(0, Function("PCI\\VEN_0001&DEV_0002"));
   tree_.Add(0, Function("PCI\\VEN_0001&DEV_0002"));  // a second one that nobody has seen
   const PciDeviceList list;
-  EXPECT_EQ(list.Devices()[0].bus * 10000 + list.Devices()[0].device * 100 + list.Devices()[0].function, 20501);
-  EXPECT_EQ(list.Devices()[1].bus + list.Devices()[1].device + list.Devices()[1].function, 0);
+  EXPECT_EQ(PlaceOf(list.Devices()[0]), 20501);
+  EXPECT_EQ(PlaceOf(list.Devices()[1]), 0);
+  // Nor for numbers that are no place.
+  const std::pair<const char*, int> kTexts[] = {{"PCI bus 255, device 31, function 7", 2553107},
+                                                {"PCI bus 256, device 31, function 7", 20501},
+                                                {"PCI bus 255, device 32, function 7", 20501},
+                                                {"PCI bus 255, device 31, function 8", 20501},
+                                                {"PCI bus 255, device 31", 20501}};
+  for (const auto& [text, place] : kTexts) {
+    tree_.devices.clear();
+    auto told = Function("PCI\\VEN_0001&DEV_0002");
+    told.properties[13] = TextProperty(text);
+    tree_.Add(0, told);
+    EXPECT_EQ(PlaceOf(PciDeviceList().Devices()[0]), place) << text;
+  }
 }
 
 TEST_F(SetupDITest, TheInventoryHasALimitAndCannotBeWithoutIds) {

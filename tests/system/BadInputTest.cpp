@@ -196,5 +196,24 @@ TEST(SystemBadInput, AMissingXmlComponentIsNoCorruptFile) {
   EXPECT_EQ(installation.Read("log.xml"), "<DiagnosticsData/>");
 }
 
+TEST(SystemBadInput, AMissingDrawingComponentIsToldOnceAndTheRunGoesOn) {
+  const Installation installation;
+  const fs::path programs = PANELGLOW_BINARY_DIR;
+  fs::copy_file(programs / "panelglow-diags-sim", installation.Path("panelglow-diags"));
+  fs::copy_file(programs / "../lib/libpanelglow-xml.so", installation.Path("libpanelglow-xml.so"));
+  installation.Write("pictures.msg", "[all multimedia]\n24=.\\super.ico\n");  // of the first prompt and of the second
+  SimulatedRun run = LedRun(installation.Machine("desktop.toml"), "Desktop",
+                            {"-AutoStart=false", "-Retries=1", "-integratormsgfile=pictures.msg"}, "wrong:1");
+  const Outcome outcome =
+      RunProgram(installation.Path("panelglow-diags").string(), run.arguments, installation.Path(""),
+                 {{"PANELGLOW_SIM_MACHINE", run.machine}, {"PANELGLOW_SIM_OPERATOR", run.person}});
+  EXPECT_EQ(outcome.exitCode, 0) << outcome.output;
+  EXPECT_TRUE(outcome.IsOrderly());
+  const std::string told = "libpanelglow-drawing.so cannot be loaded";
+  const std::size_t first = outcome.errors.find(told);
+  ASSERT_NE(first, std::string::npos) << outcome.errors << outcome.output;
+  EXPECT_EQ(outcome.errors.find(told, first + 1), std::string::npos) << outcome.errors;
+}
+
 }  // namespace
 }  // namespace panelglow::systemtest

@@ -171,8 +171,8 @@ Number IniReader::ReadNumber(const Result& result, const std::string& entry, Num
     value = kSigned ? static_cast<Number>(CDMUtil::ToInt(trimmed))
                     : static_cast<Number>(CDMUtil::ToUnsignedLong(trimmed));
     const bool limited = kSigned && bits == 32 && CDMUtil::ToInt64(trimmed) > std::numeric_limits<int>::max();
-    const std::uint32_t kept = static_cast<std::uint32_t>(value) & (0xFFFFFFFFU >> (32 - bits));
-    CheckNumber(trimmed, limited ? 31 : bits, kept, {result.text, result.place});
+    const std::uint32_t kept = static_cast<std::uint32_t>(value) & (bits < kIntBits ? (1U << bits) - 1 : ~0U);
+    CheckNumber(trimmed, limited ? kIntBits : bits, kept, {result.text, result.place});
   } else if (result.status == kUndefined) {
     Record(entry, "(undef)");
     return 0;
@@ -192,7 +192,7 @@ int IniReader::ReadIniInt(const std::string& key, status_t& status, int defaultV
   const Sources from = GetSources();
   const Result result = LookUp(from, key);
   status = result.status;
-  return ReadNumber(result, from.section + " " + key, defaultValue);
+  return ReadNumber(result, from.section + " " + key, defaultValue, kIntBits);
 }
 
 unsigned int IniReader::ReadIniUnsigned(const std::string& key, status_t& status, unsigned int defaultValue,
@@ -337,7 +337,9 @@ std::uint16_t ReadChipWord(const std::string& chipSection, const std::string& ke
 }
 
 std::uint32_t ReadChipDword(const std::string& chipSection, const std::string& key, std::uint32_t defaultValue) {
-  return static_cast<std::uint32_t>(ReadChipInt(chipSection, key, static_cast<int>(defaultValue)));
+  IniReader::status_t status = IniReader::kNotFound;
+  return static_cast<std::uint32_t>(
+      IniReader::Instance().ReadChipInt(chipSection, key, status, static_cast<int>(defaultValue), 32));
 }
 
 }  // namespace panelglow

@@ -44,7 +44,7 @@ class IniReader {
                             const std::string& defaultValue);
   /// People are told of a number that does not fit into `bits`, which is what the caller keeps of it.
   int ReadChipInt(const std::string& chipSection, const std::string& key, status_t& status, int defaultValue,
-                  unsigned bits = 32);
+                  unsigned bits = kIntBits);
 
   /// A text with its place.
   Setting ReadIniSetting(const std::string& key, const std::string& defaultValue);
@@ -91,7 +91,7 @@ class IniReader {
   void Record(const std::string& entry, const std::string& value);
   std::string ReadText(const Result& result, const std::string& entry, const std::string& defaultValue);
   template <class Number>
-  Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue, unsigned bits = 32);
+  Number ReadNumber(const Result& result, const std::string& entry, Number defaultValue, unsigned bits);
 
   std::mutex guard;  // of all that follows; never held while a file is touched, which may wait
   std::optional<Sources> sources;

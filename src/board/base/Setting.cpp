@@ -8,7 +8,8 @@ namespace panelglow {
 namespace {
 
 bool Fits(std::int64_t number, unsigned bits) {
-  return number >= -(std::int64_t{1} << (bits - 1)) && number < std::int64_t{1} << bits;
+  const std::int64_t beyond = std::int64_t{1} << bits;
+  return number >= (bits == kIntBits ? -beyond : 0) && number < beyond;
 }
 
 }  // namespace

@@ -21,6 +21,9 @@ struct Setting {
 /// Tells people `what` (a sentence without its full stop) of a setting that has a place.
 void TellOf(const Setting& setting, const std::string& what);
 
+/// The bits of an int. A number of this width has a sign as well; those of every other width have none.
+constexpr unsigned kIntBits = 31;
+
 /// Tells people when a token of a setting is no number, or one that does not fit into `bits`; `counted` is what it
 /// counts as.
 void CheckNumber(const std::string& token, unsigned bits, std::uint32_t counted, const Setting& setting);

@@ -17,11 +17,12 @@ struct RegisterPair {
   RegisterId second;
 };
 
-/// `count` pairs of neighbours, from the register `first` on.
-inline std::vector<RegisterPair> RegisterPairs(std::uint8_t place, std::uint8_t first, std::size_t count) {
+/// `count` pairs of neighbours, from the register `first` on, one every `stride` registers.
+inline std::vector<RegisterPair> RegisterPairs(std::uint8_t place, std::uint8_t first, std::size_t count,
+                                               std::size_t stride = 2) {
   std::vector<RegisterPair> pairs;
   for (std::size_t i = 0; i < count; ++i) {
-    const auto reg = static_cast<std::uint8_t>(first + 2 * i);
+    const auto reg = static_cast<std::uint8_t>(first + stride * i);
     pairs.push_back({{place, reg}, {place, static_cast<std::uint8_t>(reg + 1)}});
   }
   return pairs;

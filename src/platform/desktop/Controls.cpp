@@ -237,6 +237,7 @@ std::intptr_t WindowSystem::ControlProcedure(const Message& message) {
       OnControlUp(message.window, XOf(message), YOf(message));
       return 0;
     case message::kKillFocus:
+    case message::kSysKeyUp:  // a Space that is released with Alt is none
       if (std::exchange(window->spaceHeld, false)) {
         window->pressed = false;
         Changed();

@@ -14,12 +14,13 @@ constexpr std::uintptr_t kCancelCommand = 2;
 
 char16_t UpperLetter(char16_t c) { return c >= u'a' && c <= u'z' ? static_cast<char16_t>(c - 32) : c; }
 
-// The letter behind the first single '&' of a caption, 0 when there is none.
+// The letter behind the first single '&' of a caption, 0 when there is none. A blank is none: Space is the focused
+// button's, and Alt with it no button's.
 char16_t MnemonicOf(std::u16string_view caption) {
   for (std::size_t i = 0; i + 1 < caption.size(); ++i) {
     if (caption[i] == u'&') {
       if (caption[i + 1] != u'&') {
-        return UpperLetter(caption[i + 1]);
+        return caption[i + 1] == u' ' ? u'\0' : UpperLetter(caption[i + 1]);
       }
       ++i;
     }

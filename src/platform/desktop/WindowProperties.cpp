@@ -20,6 +20,21 @@ int FrameWidth(std::uint32_t windowStyle) {
   return (windowStyle & style::kBorder) != 0 ? 1 : 0;
 }
 
+// Where nothing can be drawn, and so nothing measured: as if every character were half as wide as it is high.
+Rectangle EstimateText(std::u16string_view text, int width, const Font& font) {
+  const int charWidth = std::max(1, font.height / 2);
+  const auto most = static_cast<std::size_t>(std::max(1, width / charWidth));  // of a line
+  std::size_t lines = 0;
+  std::size_t longest = 0;
+  for (std::size_t begin = 0; begin <= text.size();) {
+    const std::size_t end = std::min(text.find(u'\n', begin), text.size());
+    lines += std::max<std::size_t>(1, (end - begin + most - 1) / most);
+    longest = std::max(longest, std::min(end - begin, most));
+    begin = end + 1;
+  }
+  return {0, 0, static_cast<int>(longest) * charWidth, static_cast<int>(lines) * font.height};
+}
+
 }  // namespace
 
 void WindowSystem::ShowWindow(WindowHandle handle, bool visible) {
@@ -209,7 +224,7 @@ void WindowSystem::Invalidate(WindowHandle handle) {
 Rectangle WindowSystem::MeasureText(std::u16string_view text, int width, const Font& font) {
   SceneDrawing* drawing = drawing_ ? drawing_() : nullptr;
   if (drawing == nullptr) {
-    return {0, 0, width, font.height};
+    return EstimateText(text, width, font);
   }
   const auto [w, h] = drawing->MeasureText(text, width, font, language_);
   return {0, 0, w, h};

@@ -246,20 +246,11 @@ ChipDescription ReadChip(Section& section) {
 
 FirmwareCallSetup ReadFirmwareCall(Section& section) {
   // The faults of the answer, then the steps of a call in their order.
-  constexpr std::array<std::string_view, 13> kFaults{"",
-                                                     "wrong-signature",
-                                                     "short-data",
-                                                     "get-method",
-                                                     "get-class",
-                                                     "spawn-parameters",
-                                                     "get-input-class",
-                                                     "spawn-input",
-                                                     "populate-input",
-                                                     "put-input",
-                                                     "execute",
-                                                     "get-output",
-                                                     "query-output"};
-  constexpr std::size_t kFirstStep = 3;
+  constexpr std::array<std::string_view, 14> kFaults{
+      "",          "wrong-signature",  "short-data",      "stale-record", "get-method",
+      "get-class", "spawn-parameters", "get-input-class", "spawn-input",  "populate-input",
+      "put-input", "execute",          "get-output",      "query-output"};
+  constexpr std::size_t kFirstStep = 4;
   constexpr std::uint8_t kRecordBytes = 128;
   FirmwareCallSetup setup;
   setup.path = section.Get("path", setup.path);

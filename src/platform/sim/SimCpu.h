@@ -23,7 +23,15 @@ class SimCpu : public Cpu {
       return amd ? CpuidRegisters{13, 0x68747541, 0x444D4163, 0x69746E65}
                  : CpuidRegisters{13, 0x756E6547, 0x6C65746E, 0x49656E69};
     }
-    return leaf == 1 ? CpuidRegisters{0x000306A9, 0, 0, 0} : CpuidRegisters{};
+    constexpr std::uint32_t kLongMode = 1U << 29U;
+    switch (leaf) {
+      case 1:
+        return {0x000306A9, 0, 0, 0};
+      case 0x80000001:
+        return {0, 0, 0, machine_.is64Bit ? kLongMode : 0};
+      default:
+        return {};
+    }
   }
   bool Is64BitSystem() override { return machine_.is64Bit; }
   std::uint64_t Affinity() override { return mask_; }

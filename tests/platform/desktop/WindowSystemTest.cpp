@@ -33,7 +33,7 @@ class DialogTest : public ::testing::Test {
   }
 
   WindowHandle AddButton(int column, int id, std::uint32_t more) {
-    static const char16_t* const kCaptions[] = {u"&Red", u"Fish && Chips", u"&Green"};
+    static const char16_t* const kCaptions[] = {u"&Red", u"Fish && Chips & more", u"&Green"};
     WindowRequest request;
     request.className = "BUTTON";
     request.text = kCaptions[column];
@@ -140,6 +140,8 @@ TEST_F(DialogTest, KeysOfADialog) {
       {"an arrow walks", 0x27, 0, false, 0, 12, {}},
       {"Enter presses the focused button", 0x0D, 0, false, 2, 13, {"command 13"}},
       {"Space presses it too", 0x20, u' ', false, 0, 11, {"command 11"}},
+      {"but not with Alt", 0x20, u' ', true, 0, 11, {}},
+      {"nor a button behind a single ampersand", 0x20, u' ', false, 2, 13, {"command 13"}},
       {"Escape is command 2", 0x1B, 0, false, 0, 11, {"command 2"}},
       {"Alt and a letter press", 'G', u'g', true, 0, 13, {"command 13"}},
       {"a doubled ampersand is none", 'C', u'c', true, 0, 11, {}},
@@ -199,6 +201,14 @@ TEST_F(DialogTest, SpaceThatIsHeldWhileTheFocusMovesPressesNothing) {
   EXPECT_FALSE(desktop_.MakeScene().windows.at(1).pressed);
 
   desktop_.KeyDown(0x20, u' ', false, false);
+  desktop_.KeyUp(0x20, true);  // Alt has been pressed meanwhile
+  desktop_.KeyDown(0x20, u' ', true, false);
+  desktop_.KeyUp(0x20, false);  // Alt has been released
+  Pump(30);
+  EXPECT_TRUE(notes_.empty());
+  EXPECT_FALSE(desktop_.MakeScene().windows.at(1).pressed);
+
+  desktop_.KeyDown(0x20, u' ', false, false);
   Pump(10);
   desktop_.LoseForeground(u"other");  // which gets the release
   EXPECT_FALSE(desktop_.MakeScene().windows.at(1).pressed);
@@ -222,6 +232,22 @@ TEST_F(DialogTest, TheFocusedButtonHasTheHeavyFrameAndTheDefaultOneWhenNoneIs) {
   EXPECT_THAT(heavy(), ElementsAre(11));
   desktop_.SetFocus(0);
   EXPECT_THAT(heavy(), ElementsAre(12));
+}
+
+// Each row's number of lines, and characters of the longest.
+TEST_F(DialogTest, ATextHasAPlausibleSizeWithoutTheDrawingModule) {
+  desktop_.SetDrawing([] { return nullptr; });
+  const Font font{18, 600};
+  const std::tuple<std::u16string, int, int, int> kCases[] = {{u"", 100, 1, 0},
+                                                              {u"59", 10'000, 1, 2},
+                                                              {u"59", 0, 2, 1},
+                                                              {u"one\nthree\n", 32'767, 3, 5},
+                                                              {u"1234567890", 36, 3, 4}};
+  for (const auto& [text, width, lines, longest] : kCases) {
+    const Rectangle size = desktop_.MeasureText(text, width, font);
+    EXPECT_EQ(size.Height(), lines * font.height) << width;
+    EXPECT_EQ(size.Width(), longest * font.height / 2) << width;
+  }
 }
 
 TEST_F(DialogTest, EnterWithoutAFocusedButtonPressesTheDefaultOne) {

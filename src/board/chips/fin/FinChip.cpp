@@ -61,7 +61,7 @@ FinChip::FinChip(std::string chipName)
       ledRegisters(config),
       button(devio, 0, PowerEventButton::Check::kReadBack) {
   ReadKeys({"chip.fin.", 0x800, 0xA05, 0x4E, 0xC0, 0x30, 0x60});
-  fans = {.tachs = {{{0, 0xA0}, {0, 0xA1}}, {{0, 0xB0}, {0, 0xB1}}, {{0, 0xC0}, {0, 0xC1}}},
+  fans = {.tachs = RegisterPairs(0, 0xA0, 3, 0x10),
           .tachOrder = PairOrder::kHighFirst,
           .tachOverflow = kTachOverflow,
           .duties = RegistersAt(0, {0xA3, 0xB3, 0xC3}),

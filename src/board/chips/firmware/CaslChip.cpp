@@ -35,7 +35,7 @@ std::vector<std::uint8_t> ReadThermalRecord(std::uint8_t what) {
   return CallBios(kThermalRead, kThermalType, {what, 0, 0, 0}, kRecordAnswer);
 }
 
-// The byte of item `n`; 0 beyond the record.
+// The byte of item `n`; 0 for one that is not in the record.
 std::uint8_t ItemOf(const std::vector<std::uint8_t>& record, int n) {
   const auto index = static_cast<std::size_t>(n) + 1;
   return n >= 0 && index < record.size() ? record[index] : std::uint8_t{0};
@@ -114,7 +114,7 @@ bool CaslChip::ReadLatchedPort(std::uint16_t /*port*/, std::uint32_t mask, bool&
 bool CaslChip::ReadFanRpm(int fan, int& rpm, int multiplier) {
   const std::vector<std::uint8_t> record = ReadThermalRecord(kFanSpeeds);
   const std::uint8_t speed = ItemOf(record, fan);
-  if (fan < 0 || fan >= record.front() || speed == 0) {
+  if (fan >= record.front() || speed == 0) {
     return false;
   }
   rpm = speed * multiplier;

@@ -37,7 +37,7 @@ NuvNct5572Chip::NuvNct5572Chip() : NuvW83667Chip("nuv_nct5572"), buttonPorts(dev
   buttonPorts = PortRegisters(devio, pmbar);
   // The mode registers that manual mode changes are not among the saved ones: the part keeps its fans manual until it
   // is started anew.
-  fans = {.tachs = {{{6, 0x56}, {6, 0x57}}, {{6, 0x58}, {6, 0x59}}},
+  fans = {.tachs = RegisterPairs(6, 0x56, 2),
           .tachOrder = PairOrder::kHighFirst,
           .tachOverflow = kSpeedOverflow,
           .duties = {kFan1Duty, kFan2Duty},

@@ -38,6 +38,8 @@ constexpr std::uint8_t kOn = 0x01;
 constexpr std::uint8_t kAllowedBySoftware = 0x02;
 constexpr std::uint8_t kAllowedOtherwise = 0x0C;
 
+constexpr std::uint8_t kStale = 0x55;  // a byte that no answer has set
+
 constexpr std::uint8_t kFanSpeeds = 3;
 constexpr std::uint8_t kFanDuties = 0x23;
 
@@ -112,7 +114,8 @@ ManagementCallResult FirmwareCall::Call(const ManagementCall& call) {
   const bool isGood = answer && setup_.fault != FirmwareCallSetup::Fault::kWrongSignature;
   Bytes data = answer.value_or(Bytes());
   data.resize(setup_.fault == FirmwareCallSetup::Fault::kShortData ? std::min<std::size_t>(1, method->answerBytes)
-                                                                   : method->answerBytes);
+                                                                   : method->answerBytes,
+              setup_.fault == FirmwareCallSetup::Fault::kStaleRecord ? kStale : std::uint8_t{0});
   ManagementCallResult result;
   result.output.Set(u"Sign", ArrayOf(isGood ? kGood : kBad));
   if (!data.empty()) {

@@ -17,6 +17,7 @@ struct FirmwareCallSetup {
     kNone,
     kWrongSignature,  // answers are not signed as good ones
     kShortData,       // answers hold one byte only
+    kStaleRecord,     // behind what they say, answers hold bytes of an earlier one
     kFailingStep,     // a step of the call fails in the management service
   };
 
