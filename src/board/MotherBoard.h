@@ -11,6 +11,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "board/ChipTable.h"
@@ -110,7 +111,8 @@ class MotherBoard {
   /// Builds the class of a name of the chip table in its place; a class that this version does not have stays "none".
   void Place(std::string_view chipName);
 
-  /// `place` counts from 1.
+  // Places count from 1.
+  void Put(std::size_t place, std::unique_ptr<Chip> chip) { chips[place - 1] = std::move(chip); }
   [[nodiscard]] Chip& ChipAt(std::size_t place) { return *chips[place - 1]; }
 
   /// The chip that serves one LED (or the button): found at first use by the name in the INI files, unless a board

@@ -12,6 +12,7 @@
 
 #include "board/BoardBench.h"
 #include "board/ChipTable.h"
+#include "board/base/mblib_exception.h"
 
 namespace panelglow {
 
@@ -130,6 +131,63 @@ inline void ExpectLed(BoardBench& bench, Chip& chip, const std::function<std::st
     }
   }
   ExpectCases(bench, chip, cases);
+}
+
+/// Every operation once, with a number for whatever it wants one for. What a generic class says of a number that its
+/// lists do not have is left alone.
+inline void AskEverything(Chip& chip, int number) {
+  int value = 0;
+  bool yes = false;
+  std::uint8_t byte = 0;
+  const std::string text = std::to_string(number);
+  const std::function<void()> kOperations[] = {
+      [&] { chip.ReadFanRpm(number, value, number); },
+      [&] { chip.ReadFanRpmRaw(number, value, number); },
+      [&] { chip.SetFanFullSpeed(number); },
+      [&] { chip.SetFanPwmPercent(number, number); },
+      [&] { chip.SetManualFanMode(true); },
+      [&] { chip.SetManualFanMode(false); },
+      [&] { chip.SaveFanControl(number); },
+      [&] { chip.TakeFanControl(number); },
+      [&] { chip.RestoreFanControl(number); },
+      [&] { chip.ReadProcessorTemperature(number, value, true, text); },
+      [&] { chip.ReadVirtualTemperature(number, true, value); },
+      [&] { chip.ReadTemperature(number, value); },
+      [&] { chip.ReadLowLimitTemperature(number, value); },
+      [&] { chip.ReadThreshold(number, value); },
+      [&] { chip.ReadEnvironmentRegister(static_cast<std::uint16_t>(number), byte); },
+      [&] { chip.ReadConfigBit(0xFF, 0xFF, number, yes); },
+      [&] { chip.ReadIntrusionLatch(number, true, yes); },
+      [&] { chip.LockHood(number, true); },
+      [&] { chip.UnlockHood(number, true); },
+      [&] { chip.ReadLineByNames(static_cast<std::uint32_t>(number), text, text); },
+      [&] { chip.ReadLine(number); },
+      [&] { chip.ReadLineDirect(number); },
+      [&] { chip.ReadLineActivity(number, value); },
+      [&] { chip.ReadLatchedPort(static_cast<std::uint16_t>(number), 1, yes); },
+      [&] { chip.ReadLatchedPortDword(static_cast<std::uint16_t>(number), 1, yes); },
+      [&] { chip.DetectDashCable(number, text); },
+      [&] { chip.ReadRegister(number); },
+  };
+  for (const std::function<void()>& operation : kOperations) {
+    try {
+      operation();
+    } catch (const mblib_exception&) {
+      continue;
+    }
+  }
+  constexpr bool (Chip::*kStates[])() = {
+      &Chip::SavePowerButtonState, &Chip::ArmPowerButton,          &Chip::RestorePowerButtonState,
+      &Chip::SavePowerLedState,    &Chip::AssertPowerLedGreen,     &Chip::AssertPowerLedRed,
+      &Chip::DeassertPowerLed,     &Chip::BlinkPowerLedGreen,      &Chip::BlinkPowerLedRed,
+      &Chip::RestorePowerLedState, &Chip::SaveChargeLedState,      &Chip::AssertChargeLedWhite,
+      &Chip::AssertChargeLedRed,   &Chip::RestoreChargeLedState,   &Chip::SaveHdLedState,
+      &Chip::AssertHdLedRed,       &Chip::RestoreHdLedState,       &Chip::SaveWirelessLedState,
+      &Chip::AssertWirelessLed,    &Chip::RestoreWirelessLedState, &Chip::SaveSpeakerLedState,
+      &Chip::AssertSpeakerLed,     &Chip::AssertMicrophoneLed,     &Chip::RestoreSpeakerLedState};
+  for (const auto operation : kStates) {
+    (chip.*operation)();
+  }
 }
 
 /// Wherever a worker is ended, what it has changed of the fans and the power LED by then can be put back.

@@ -125,61 +125,6 @@ TEST(MotherBoard, ALedIsServedByTheChipThatTheFilesName) {
   EXPECT_EQ(lit("test.wirelessled.chip=G_IOSPACE\ntest.hdled.chip=none\n"), "wireless ");
 }
 
-// Each LED by its own key: one chip for it, another for all others.
-TEST(MotherBoard, EachLedAsksTheChipOfItsOwnKeyAndNoOther) {
-  constexpr std::uint32_t kPort = 0xA20;
-  BoardBench bench("chip = [{name = \"m\", kind = \"memory-registers\", base = 0xFE000000, initial = [0]}]\n");
-  const char* const lists[] = {"powerled.green.assert", "powerled.green.deassert", "powerled.red.assert",
-                               "powerled.red.deassert", "chargeled.white.assert",  "chargeled.white.deassert",
-                               "chargeled.red.assert",  "chargeled.red.deassert",  "hdled.red.assert",
-                               "hdled.red.deassert",    "wirelessled.assert",      "wirelessled.deassert"};
-  std::string chip = "[g_iospace]\n";
-  for (const char* list : lists) {
-    chip += list + std::string(".sequence=") + std::to_string(kPort) + ":1\n";
-  }
-  chip += "[g_memoryspace]\n";
-  for (const char* list : lists) {
-    chip += list + std::string(".sequence=0xFE000000:1\n");
-  }
-  using Operation = bool (MotherBoard::*)();
-  const std::pair<const char*, std::vector<Operation>> kLeds[] = {
-      {"power",
-       {&MotherBoard::AssertPowerLedGreen, &MotherBoard::AssertPowerLedRed, &MotherBoard::DeassertPowerLed,
-        &MotherBoard::RestorePowerLedState}},
-      {"charge",
-       {&MotherBoard::AssertChargeLedWhite, &MotherBoard::DeassertChargeLedWhite, &MotherBoard::AssertChargeLedRed,
-        &MotherBoard::DeassertChargeLedRed}},
-      {"hd",
-       {&MotherBoard::SaveHdLedState, &MotherBoard::AssertHdLedRed, &MotherBoard::DeassertHdLedRed,
-        &MotherBoard::RestoreHdLedState}},
-      {"wireless",
-       {&MotherBoard::SaveWirelessLedState, &MotherBoard::AssertWirelessLed, &MotherBoard::DeassertWirelessLed,
-        &MotherBoard::RestoreWirelessLedState}},
-  };
-  for (const auto& [own, ownOperations] : kLeds) {
-    std::string test = "[7D10]\n";
-    for (const auto& [led, operations] : kLeds) {
-      test += std::string("test.") + led + "led.chip=" + (led == own ? "g_memoryspace\n" : "g_iospace\n");
-    }
-    bench.SetFiles("[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n", test, chip);
-    const std::unique_ptr<MotherBoard> board = BoardBench::Board();
-    for (const auto& [led, operations] : kLeds) {
-      for (const Operation operation : operations) {
-        const std::string traffic = bench.Traffic([&] { EXPECT_TRUE(((*board).*operation)()); });
-        EXPECT_EQ(traffic.substr(0, 4), led == own ? "FE00" : "0A20") << own << " " << led;
-      }
-    }
-  }
-  // The codec's two: each pin by its own key.
-  bench.SetFiles(
-      "[7D10]\nplatform=generic\nchips=g_codec\nchip.codec.hdabar=0xFE0F0000\n"
-      "test.microphoneled.chip=g_codec\n",
-      "", "[g_codec]\ncodecgpio.state.set.sequence=1,2,3\n");
-  const std::unique_ptr<MotherBoard> board = BoardBench::Board();
-  EXPECT_TRUE(board->AssertMicrophoneLed() && board->DeassertMicrophoneLed());
-  EXPECT_FALSE(board->AssertSpeakerLed() || board->DeassertSpeakerLed());
-}
-
 TEST(MotherBoard, TheSmallClassesHaveTheirOwnChipsAndPowerLed) {
   struct Case {
     const char* platform;
