@@ -452,10 +452,12 @@ TEST(BridgeChips, WhatIsHeldForAMomentIsLetGoWhereverTheThreadEnds) {
       {hudson, [](Chip& c) { c.ReadLine(238); }, 0xFED8005A, true},
       {hudson, [](Chip& c) { c.ReadLineByNames(0x5A, "2", "1"); }, 0xCD7, false},
       {hudson, [](Chip& c) { c.ReadLine(35); }, 0xFED80D23, true},
+      {hudson, [](Chip& c) { c.ReadLine(35); }, 0xCD7, false},
       {ich, [](Chip& c) { c.DetectDashCable(0, "0x14E4 0x1653 0x103C 0x3033"); }, 0xF00000B9, true},
   };
   for (const Case& c : kCases) {
-    for (std::uint32_t after_us = 0; after_us < 160'000; after_us += after_us < 60 ? 1 : 5000) {
+    bool isDone = false;
+    for (platform::sim::Microseconds after_us = 0; !isDone; after_us += after_us < 60 ? 1 : 5000) {
       BridgeBench bench(Answers{{0x1293, {0xFF}}, {0xF866, {0x01}}, {0xF867, {0}}, {0xCD6, {0}}, {0xCD7, {0x40}}}, "",
                         true, kController);
       platform::sim::Buses& hardware = bench.machine.Hardware();
@@ -467,11 +469,10 @@ TEST(BridgeChips, WhatIsHeldForAMomentIsLetGoWhereverTheThreadEnds) {
       };
       const std::uint32_t before = value();
       const std::unique_ptr<Chip> chip = c.make();
-      platform::Threads& threads = bench.machine.TheMachine().threads;
-      const platform::ThreadHandle thread = threads.Start("chip", [&] { c.act(*chip); });
-      bench.machine.Time().SleepFor(after_us);
-      threads.Terminate(thread);
-      threads.Wait(thread, platform::Threads::kNoLimit);
+      bench.EndAfter(after_us, [&] {
+        c.act(*chip);
+        isDone = true;
+      });
       EXPECT_EQ(value(), before) << (&c - kCases) << " " << after_us;
     }
   }

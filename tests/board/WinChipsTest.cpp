@@ -579,6 +579,7 @@ TEST(AdtChips, ATransactionThatFailsIsTheLastWriteAndIsPutBack) {
   };
   const auto ok = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "80", "FF"); };
   const auto failed = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "00", "FF"); };
+  const std::string taken = ok("40->42 40<-40 5C<-E0 5D<-E0 5E<-E0 62->E0 62<-E7 63<-77");
   const std::string restored = ok("40<-42 5C<-42 5D<-42 5E<-42 30<-42 31<-42 32<-42 62<-42 63<-42");
   ExpectCases(bench, *MakeChip("adt"),
               {{failing(2, Tach(1)), 0xFFFF, ok("28->42") + failed("29->42")},
@@ -587,7 +588,12 @@ TEST(AdtChips, ATransactionThatFailsIsTheLastWriteAndIsPutBack) {
                 ok("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 40->42 40<-40") +
                     failed("5C<-E0") + ok("62->E0") + restored},
                {Manual(false), 1, ""},
-               {Manual(true), 1, ok("40->42 40<-40 5C<-E0 5D<-E0 5E<-E0 62->E0 62<-E7 63<-77")},
+               {failing(3, failing(5, Manual(true))), 0,
+                ok("40->42 40<-40") + failed("5C<-E0") + ok("62->E0") + failed("40<-42")},
+               {Manual(true), 1, taken},
+               {Manual(true), 1, ""},
+               {failing(2, Manual(false)), 0, ok("40<-42") + failed("5C<-42")},
+               {Manual(true), 1, taken},
                {failing(1, Manual(false)), 0, failed("40<-42")},
                {Manual(false), 1, restored}});
 }
