@@ -117,6 +117,7 @@ TEST(SystemBoardClasses, AWrongWordOrAnIllPartKeepsTheGreenLampFromBlinking) {
     const Outcome outcome = run.In(installation);
     EXPECT_TRUE(outcome.IsOrderly());
     EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_THAT(outcome.Tagged("ReportFailure"), ::testing::ElementsAre("ReportFailure 770133"));
     EXPECT_EQ(outcome.TimesLit("power-green"), 0U);
     EXPECT_THAT(outcome.errors, HasSubstr(c.told));
     EXPECT_THAT(outcome.leftBehind, IsEmpty());
