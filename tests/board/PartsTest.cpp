@@ -5,7 +5,6 @@
 #include "board/parts/ConfigMode.h"
 #include "board/parts/ConfigRegisters.h"
 #include "board/parts/LineActivity.h"
-#include "board/parts/PowerEventButton.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -40,16 +39,6 @@ TEST(LineActivity, ASignalIsCountedAndALevelIsTheMoreFrequentOne) {
   // A line that is read in no time: the watch ends all the same.
   const BoardBench bench;
   EXPECT_EQ(MeasureLineActivity([] { return true; }), 1);
-}
-
-TEST(PowerEventButton, WithoutACheckTheEnableWordIsChangedAsItIsNow) {
-  BoardBench bench;
-  PowerEventButton button(BoardDevio(), 0x900, PowerEventButton::Check::kNone);
-  EXPECT_EQ(bench.Traffic([&] {
-    button.Save();
-    EXPECT_TRUE(button.Arm() && button.Restore());
-  }),
-            "0902->FFFF 0902->FFFF 0902<-FEFE 0900<-0100 0902<-FFFF ");
 }
 
 TEST(ConfigRegisters, SelectADeviceWhenItChanges) {
