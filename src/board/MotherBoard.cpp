@@ -176,7 +176,7 @@ MotherBoard::MotherBoard(std::string boardClass, std::uint16_t boardId)
 
 void MotherBoard::Place(std::string_view chipName) {
   if (const ChipRow* row = FindChipRow(chipName); row != nullptr) {
-    chips[row->place - 1] = row->make();
+    Put(row->place, row->make());
   }
 }
 

@@ -11,6 +11,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "board/ChipTable.h"
@@ -242,7 +243,8 @@ class MotherBoard {
   /// The chip that serves a fan, zone or device; GetChip, unless a board class has one of its own.
   virtual Chip& ChipFor(const std::string& chipName) { return GetChip(chipName); }
 
-  /// `place` counts from 1.
+  // Places count from 1.
+  void Put(std::size_t place, std::unique_ptr<Chip> chip) { chips[place - 1] = std::move(chip); }
   [[nodiscard]] Chip& ChipAt(std::size_t place) { return *chips[place - 1]; }
 
   /// The chip that serves one LED (or the button): found at first use by the name in the INI files, unless a board

@@ -10,6 +10,9 @@
 #include "board/base/BoardDevio.h"
 #include "board/base/IniReader.h"
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
+#include "hw/PciDeviceList.h"
+#include "hw/WMIDiscovery.h"
 #include "platform/Host.h"
 #include "platform/sim/Simulation.h"
 
@@ -19,10 +22,15 @@ class BoardBench {
  public:
   /// `chips` is the machine's hardware, in the words of a machine's file.
   explicit BoardBench(const std::string& chips = "") : machine(chips) {
+    Forget();
     SetFiles("[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n", "", "");
     BoardDevio().LoadDriver();
     machine.Trace().Keep();
   }
+
+  ~BoardBench() { Forget(); }
+  BoardBench(const BoardBench&) = delete;
+  BoardBench& operator=(const BoardBench&) = delete;
 
   void SetFiles(const std::string& detect, const std::string& test, const std::string& chip) {
     machine.DiskFiles().Put(".\\mbdetect.ini", detect);
@@ -72,6 +80,14 @@ class BoardBench {
   }
 
   platform::sim::Simulation machine;
+
+ private:
+  // What one machine has told is no other machine's.
+  static void Forget() {
+    WMIDiscovery::Forget();
+    PciDeviceList::Forget();
+    Notices::Forget();
+  }
 };
 
 }  // namespace panelglow

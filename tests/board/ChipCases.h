@@ -3,7 +3,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
+#include <iterator>
 #include <memory>
 #include <sstream>
 #include <stdexcept>
@@ -12,14 +14,20 @@
 
 #include "board/BoardBench.h"
 #include "board/ChipTable.h"
+#include "board/base/mblib_exception.h"
+#include "harness/base/CDMException.h"
 
 namespace panelglow {
 
-/// A machine whose layered files say `keys`.
+/// A machine whose layered files say `keys`, and whose chip file is `chips`.
 class KeyBench : public BoardBench {
  public:
-  explicit KeyBench(const std::string& hardware, const std::string& keys = "") : BoardBench(hardware) {
-    SetFiles("[7D10]\n" + keys, "", "");
+  explicit KeyBench(const std::string& hardware, const std::string& keys = "", const std::string& chips = "")
+      : BoardBench(hardware) {
+    Use(keys, chips);
+  }
+  void Use(const std::string& keys, const std::string& chips) {
+    SetFiles("[7D10]\n" + keys, "", chips);
     IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
   }
 };
@@ -130,6 +138,66 @@ inline void ExpectLed(BoardBench& bench, Chip& chip, const std::function<std::st
     }
   }
   ExpectCases(bench, chip, cases);
+}
+
+/// Every operation once, but for the watch over a line's activity, which takes long, with a number for whatever it
+/// wants one for. What a generic class says of a number that its lists do not have, and what the firmware refuses, is
+/// left alone.
+inline void AskEverything(Chip& chip, int number) {
+  int value = 0;
+  bool yes = false;
+  std::uint8_t byte = 0;
+  const std::string text = std::to_string(number);
+  const std::function<void()> kOperations[] = {
+      [&] { chip.ReadFanRpm(number, value, number); },
+      [&] { chip.ReadFanRpmRaw(number, value, number); },
+      [&] { chip.SetFanFullSpeed(number); },
+      [&] { chip.SetFanPwmPercent(number, number); },
+      [&] { chip.SetManualFanMode(true); },
+      [&] { chip.SetManualFanMode(false); },
+      [&] { chip.SaveFanControl(number); },
+      [&] { chip.TakeFanControl(number); },
+      [&] { chip.RestoreFanControl(number); },
+      [&] { chip.ReadProcessorTemperature(number, value, true, text); },
+      [&] { chip.ReadVirtualTemperature(number, true, value); },
+      [&] { chip.ReadTemperature(number, value); },
+      [&] { chip.ReadLowLimitTemperature(number, value); },
+      [&] { chip.ReadThreshold(number, value); },
+      [&] { chip.ReadEnvironmentRegister(static_cast<std::uint16_t>(number), byte); },
+      [&] { chip.ReadConfigBit(0xFF, 0xFF, number, yes); },
+      [&] { chip.ReadIntrusionLatch(number, true, yes); },
+      [&] { chip.LockHood(number, true); },
+      [&] { chip.UnlockHood(number, true); },
+      [&] { chip.ReadLineByNames(static_cast<std::uint32_t>(number), text, text); },
+      [&] { chip.ReadLine(number); },
+      [&] { chip.ReadLineDirect(number); },
+      [&] { chip.ReadLatchedPort(static_cast<std::uint16_t>(number), 1, yes); },
+      [&] { chip.ReadLatchedPortDword(static_cast<std::uint16_t>(number), 1, yes); },
+      [&] { chip.DetectDashCable(number, text); },
+      [&] { chip.ReadRegister(number); },
+  };
+  const auto ask = [](const auto& operation) {
+    try {
+      operation();
+    } catch (const mblib_exception&) {
+      return;
+    } catch (const CDMException&) {
+      return;
+    }
+  };
+  std::for_each(std::begin(kOperations), std::end(kOperations), ask);
+  constexpr bool (Chip::*kStates[])() = {
+      &Chip::SavePowerButtonState, &Chip::ArmPowerButton,          &Chip::RestorePowerButtonState,
+      &Chip::SavePowerLedState,    &Chip::AssertPowerLedGreen,     &Chip::AssertPowerLedRed,
+      &Chip::DeassertPowerLed,     &Chip::BlinkPowerLedGreen,      &Chip::BlinkPowerLedRed,
+      &Chip::RestorePowerLedState, &Chip::SaveChargeLedState,      &Chip::AssertChargeLedWhite,
+      &Chip::AssertChargeLedRed,   &Chip::RestoreChargeLedState,   &Chip::SaveHdLedState,
+      &Chip::AssertHdLedRed,       &Chip::RestoreHdLedState,       &Chip::SaveWirelessLedState,
+      &Chip::AssertWirelessLed,    &Chip::RestoreWirelessLedState, &Chip::SaveSpeakerLedState,
+      &Chip::AssertSpeakerLed,     &Chip::AssertMicrophoneLed,     &Chip::RestoreSpeakerLedState};
+  for (const auto operation : kStates) {
+    ask([&] { (chip.*operation)(); });
+  }
 }
 
 /// Wherever a worker is ended, what it has changed of the fans and the power LED by then can be put back.

@@ -142,7 +142,6 @@ TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
       {[&] { ReadChipByte("parts", "x", 1); },
        ".\\chip.ini, section [parts], key \"base\": there is no section [g_ce]"},
   };
-  Notices::Forget();
   for (const auto& [read, told] : kReads) {
     bench.machine.ClearOutput();
     read();

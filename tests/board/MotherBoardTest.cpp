@@ -41,20 +41,7 @@ TEST(ChipTable, EveryNameIsUniqueAndLeadsToItsOwnPlace) {
   }
 }
 
-// The published order of the places, and of the names that share one.
-TEST(ChipTable, StandsInItsOrder) {
-  std::string order;
-  for (const ChipRow& row : ChipRows()) {
-    order += std::to_string(row.place) + " " + std::string(row.name) + ", ";
-  }
-  EXPECT_EQ(order,
-            "1 chip, 2 adt, 3 adt_sio11, 4 acpi, 5 casl, 6 ec, 7 ec_wpc8763, 8 ec_it8512, 9 ec_it8518, 10 fin, "
-            "11 fin_f8000, 12 fin_f71858, 13 fin_f71855, 14 fin_f71863, 15 fin_f71808a, 16 fin_f71808e, 17 hudson, "
-            "19 intelc200, 18 ich, 20 ite, 21 ite_8758, 22 ite_8721, 23 ite_8772, 24 mcp, 25 nuv_w83667, "
-            "26 nuv_nct5571, 27 nuv_nct5572, 28 sbx, 29 sb710, 30 sio, 31 smbus_device, 32 smsc5407, 33 win, "
-            "34 win_w83202g, 35 win_wpcd376, 36 vt1211, 37 nuv_npcd378h, 38 smsc_sch5327b, 39 g_fintek, 39 g_it8702, "
-            "39 g_ite, 39 g_sio, 40 g_ec_it8519, 40 g_ec, 41 videochip, 42 smsc_mec1322, 43 smsc_kbc1126, "
-            "44 g_iospace, 45 g_memoryspace, 46 g_codec, ");
+TEST(ChipTable, OfTheNamesThatShareAPlaceOneIsBuilt) {
   BoardBench bench;
   const std::string settings =
       "chip.codec.hdabar=0xFE5C0000\nchip.g_ec.ec.set_pwm.cmd=1\nchip.g_ec_it8519.ec.set_pwm.cmd=1\n";
@@ -123,61 +110,6 @@ TEST(MotherBoard, ALedIsServedByTheChipThatTheFilesName) {
   };
   EXPECT_EQ(lit(""), "");
   EXPECT_EQ(lit("test.wirelessled.chip=G_IOSPACE\ntest.hdled.chip=none\n"), "wireless ");
-}
-
-// Each LED by its own key: one chip for it, another for all others.
-TEST(MotherBoard, EachLedAsksTheChipOfItsOwnKeyAndNoOther) {
-  constexpr std::uint32_t kPort = 0xA20;
-  BoardBench bench("chip = [{name = \"m\", kind = \"memory-registers\", base = 0xFE000000, initial = [0]}]\n");
-  const char* const lists[] = {"powerled.green.assert", "powerled.green.deassert", "powerled.red.assert",
-                               "powerled.red.deassert", "chargeled.white.assert",  "chargeled.white.deassert",
-                               "chargeled.red.assert",  "chargeled.red.deassert",  "hdled.red.assert",
-                               "hdled.red.deassert",    "wirelessled.assert",      "wirelessled.deassert"};
-  std::string chip = "[g_iospace]\n";
-  for (const char* list : lists) {
-    chip += list + std::string(".sequence=") + std::to_string(kPort) + ":1\n";
-  }
-  chip += "[g_memoryspace]\n";
-  for (const char* list : lists) {
-    chip += list + std::string(".sequence=0xFE000000:1\n");
-  }
-  using Operation = bool (MotherBoard::*)();
-  const std::pair<const char*, std::vector<Operation>> kLeds[] = {
-      {"power",
-       {&MotherBoard::AssertPowerLedGreen, &MotherBoard::AssertPowerLedRed, &MotherBoard::DeassertPowerLed,
-        &MotherBoard::RestorePowerLedState}},
-      {"charge",
-       {&MotherBoard::AssertChargeLedWhite, &MotherBoard::DeassertChargeLedWhite, &MotherBoard::AssertChargeLedRed,
-        &MotherBoard::DeassertChargeLedRed}},
-      {"hd",
-       {&MotherBoard::SaveHdLedState, &MotherBoard::AssertHdLedRed, &MotherBoard::DeassertHdLedRed,
-        &MotherBoard::RestoreHdLedState}},
-      {"wireless",
-       {&MotherBoard::SaveWirelessLedState, &MotherBoard::AssertWirelessLed, &MotherBoard::DeassertWirelessLed,
-        &MotherBoard::RestoreWirelessLedState}},
-  };
-  for (const auto& [own, ownOperations] : kLeds) {
-    std::string test = "[7D10]\n";
-    for (const auto& [led, operations] : kLeds) {
-      test += std::string("test.") + led + "led.chip=" + (led == own ? "g_memoryspace\n" : "g_iospace\n");
-    }
-    bench.SetFiles("[7D10]\nplatform=generic\nchips=g_iospace,g_memoryspace\n", test, chip);
-    const std::unique_ptr<MotherBoard> board = BoardBench::Board();
-    for (const auto& [led, operations] : kLeds) {
-      for (const Operation operation : operations) {
-        const std::string traffic = bench.Traffic([&] { EXPECT_TRUE(((*board).*operation)()); });
-        EXPECT_EQ(traffic.substr(0, 4), led == own ? "FE00" : "0A20") << own << " " << led;
-      }
-    }
-  }
-  // The codec's two: each pin by its own key.
-  bench.SetFiles(
-      "[7D10]\nplatform=generic\nchips=g_codec\nchip.codec.hdabar=0xFE0F0000\n"
-      "test.microphoneled.chip=g_codec\n",
-      "", "[g_codec]\ncodecgpio.state.set.sequence=1,2,3\n");
-  const std::unique_ptr<MotherBoard> board = BoardBench::Board();
-  EXPECT_TRUE(board->AssertMicrophoneLed() && board->DeassertMicrophoneLed());
-  EXPECT_FALSE(board->AssertSpeakerLed() || board->DeassertSpeakerLed());
 }
 
 TEST(MotherBoard, TheSmallClassesHaveTheirOwnChipsAndPowerLed) {
@@ -359,7 +291,6 @@ TEST(MotherBoard, TellsPeopleOnceWhatItCannotUse) {
   };
   for (const Case& c : kCases) {
     SCOPED_TRACE(c.detect + std::string(c.test) + c.chip);
-    Notices::Forget();
     BoardBench bench;
     bench.SetFiles(c.detect, c.test, c.chip);
     SMBIOSDiscovery::Instance().productText = "7D10";

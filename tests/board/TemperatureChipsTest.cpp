@@ -2,14 +2,11 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "board/BoardBench.h"
+#include "board/ChipCases.h"
 #include "board/base/SelectedSystem.h"
 #include "board/chips/sensor/AcpiChip.h"
 #include "board/chips/sensor/VideoChip.h"
 #include "harness/base/CDMException.h"
-#include "harness/base/Notices.h"
-#include "hw/PciDeviceList.h"
-#include "hw/WMIDiscovery.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -19,21 +16,12 @@ using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 
-class TemperatureBench : public BoardBench {
+class TemperatureBench : public KeyBench {
  public:
   TemperatureBench(const std::string& hardware, const std::string& settings,
                    SelectedSystem processor = {"Intel", 6, "", ""})
-      : BoardBench(hardware) {
-    WMIDiscovery::Forget();
-    PciDeviceList::Forget();
-    Notices::Forget();
-    SetFiles("[Common]\n" + settings, "", "");
-    IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+      : KeyBench(hardware, settings) {
     SetSelectedSystem(std::move(processor));
-  }
-  ~TemperatureBench() {
-    WMIDiscovery::Forget();
-    PciDeviceList::Forget();
   }
 };
 

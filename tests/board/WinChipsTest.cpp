@@ -1,39 +1,13 @@
-// What the Winbond, SMSC and VIA classes with registers in code, and the monitors behind an SMBus, do on the ports,
-// request by request.
-#include <gmock/gmock.h>
-
-#include <algorithm>
+// What the Winbond and Nuvoton classes with registers in code do on the ports, request by request.
 #include <climits>
-#include <cstdio>
 
-#include "board/ChipCases.h"
+#include "board/SuperIoTraffic.h"
 
 namespace panelglow {
 namespace {
 
-// ---- requests
+// ---- requests: the part is at 0x4E, or where it is told to be; its monitor's base is 0x290
 
-std::string Hex(unsigned port) {
-  char text[8];
-  std::snprintf(text, sizeof text, "%04X", port);
-  return text;
-}
-
-// "F3->21 30<-01": registers behind an index port and the data port above it.
-std::string At(unsigned index, const std::string& accesses) { return Accesses(Hex(index), Hex(index + 1), accesses); }
-
-std::string Repeated(int times, const std::string& requests) {
-  std::string text;
-  for (int i = 0; i < times; ++i) {
-    text += requests;
-  }
-  return text;
-}
-
-// The Winbond line at 0x4E, or where it is told to be; its monitor's base is 0x290.
-std::string Open(const std::string& requests, unsigned port = 0x4E) {
-  return Hex(port) + "<-87 " + Hex(port) + "<-87 " + requests + Hex(port) + "<-AA ";
-}
 std::string Config(const char* device, const std::string& requests, unsigned port = 0x4E) {
   return Each(requests, [&](const std::string& request) {
     return Open(At(port, std::string("07<-") + device + " " + request), port);
@@ -45,41 +19,6 @@ std::string Monitor(const char* bank, const std::string& requests, unsigned port
                 port);
   });
 }
-
-// A byte of a device behind an SMBus host.
-std::string Smbus(const std::string& host, const char* address, const std::string& requests, const char* status,
-                  const std::string& control = "07") {
-  return Each(requests, [&](const std::string& word) {
-    const std::string start = host + "2<-" + address + " " + host + "3<-" + word.substr(0, 2) + " ";
-    const std::string end = "20ms " + host + "1->" + status + " ";
-    return word[2] == '<'
-               ? start + host + "4" + word.substr(2) + " " + host + "0<-06 " + end
-               : start + host + "0<-07 " + end + host + "4" + word.substr(2) + " " + host + "0->" + control + " ";
-  });
-}
-
-// ---- hardware
-
-std::string SuperIo(unsigned port, const std::string& enter, const std::string& devices) {
-  return "[[chip]]\nname = \"s\"\nkind = \"super-io\"\nbase = " + std::to_string(port) + "\nenter = [" + enter +
-         "]\n" + devices;
-}
-std::string Device(int number, const std::string& registers) {
-  return "[[chip.device]]\nnumber = " + std::to_string(number) + "\n[chip.device.registers]\n" + registers + "\n";
-}
-std::string Environment(int device, const std::string& registers, int index) {
-  return "[chip.environment]\ndevice = " + std::to_string(device) + "\nindex = " + std::to_string(index) +
-         "\ndata = " + std::to_string(index + 1) + "\n[chip.environment.settings]\n" + registers;
-}
-
-// Two ports: the first holds what is written, the second always reads `second`.
-std::string Ports(unsigned port, int first, int second = 0) {
-  return "[[chip]]\nname = \"p" + Hex(port) + "\"\nkind = \"gpio-block\"\nbase = " + std::to_string(port) +
-         "\noutputs = 0\ninputs = " + std::to_string(second) + "\ninitial = [" + std::to_string(first) + "]\n";
-}
-
-// An index port and a data port that reads as the index: the base of every device is 0x6061.
-const std::string kEchoingPorts = "[[chip]]\nname = \"i\"\nkind = \"gpio-block\"\nbase = 0x2E\n";
 
 const std::string kWinDevices = Device(7, "30 = 1\nE5 = 0xB1\nED = 0x12\nF5 = 0x40\nE1 = 4\nE9 = 2\nE6 = 0x20") +
                                 Device(8, "30 = 1\nF1 = 0x80\nF3 = 1") +
@@ -96,33 +35,10 @@ const std::string kWinDevices = Device(7, "30 = 1\nE5 = 0xB1\nED = 0x12\nF5 = 0x
                                             "09 = 0x99\n56 = 0x04\n57 = 0xD2\n58 = 0xFF\n",
                                             5);
 
-// What was printed.
-std::string Expect(const std::string& name, const std::string& hardware, const std::vector<ChipCase>& cases,
-                   const std::string& keys = "") {
-  KeyBench bench(hardware, keys);
-  const std::unique_ptr<Chip> chip = MakeChip(name);
-  ExpectCases(bench, *chip, cases);
-  return bench.machine.Output();
-}
-
 void ExpectWin(const std::string& name, const std::vector<ChipCase>& cases, unsigned port = 0x4E) {
   Expect(name, SuperIo(port, "0x87, 0x87", kWinDevices), cases);
 }
 
-void ExpectConstruction(const std::string& name, const std::string& hardware, const std::string& requests) {
-  KeyBench bench(hardware);
-  const std::string traffic = bench.Traffic([&] { MakeChip(name); });
-  EXPECT_THAT(traffic, ::testing::HasSubstr(requests)) << name;
-  // Nothing else but the waits for the files.
-  EXPECT_EQ(std::count(traffic.begin(), traffic.end(), '-'), std::count(requests.begin(), requests.end(), '-'))
-      << name;
-}
-
-// ---- operations
-
-Ask Hood(bool locks, int line, bool check) {
-  return [=](Chip& c) { return locks ? c.LockHood(line, check) : c.UnlockHood(line, check); };
-}
 Ask Control(void (Chip::*operation)(int), int fan) {
   return [=](Chip& c) {
     (c.*operation)(fan);
@@ -142,17 +58,6 @@ Ask ConfigBit(int number) {
   };
 }
 int Rpm(Chip& c) { return c.TachToRpm(1000, 3) + c.TachToRpm(0, 3); }
-
-// As ExpectLed, with the requests themselves, and without the blinks that these classes do not have.
-void ExpectLedOf(const std::string& name, const std::string& hardware, const std::string& save,
-                 const std::string& green, const std::string& red, const std::string& off,
-                 const std::string& restore) {
-  KeyBench bench(hardware);
-  ExpectLed(bench, *MakeChip(name), [](const std::string& requests) { return requests; },
-            {save, green, red, off, "-", "-", restore});
-}
-
-// ---- the Winbond line
 
 TEST(WinChips, ThePowerLedIsConfigurationRegisters) {
   const std::string at2e = SuperIo(0x2E, "0x87, 0x87", kWinDevices);
@@ -364,150 +269,7 @@ TEST(WinChips, APartThatIsToldOfWritesIsToldBeforeAndBehindEach) {
          "chip.nuv_npcd378h.gpiobar=0x420\n");
 }
 
-// ---- the SMSC line
-
-// A monitor at 0x480; no other part of the Super-I/O is used.
-std::string SmscMonitor(const char* base) {
-  return SuperIo(0x164E, "0x55",
-                 Device(4, std::string("30 = 1\n") + base) +
-                     Environment(4,
-                                 "28 = 0x34\n29 = 0x12\n3A = 0x35\n3B = 0x13\n40 = 0xFE\n5C = 0x01\n5D = 0x02\n"
-                                 "5E = 0x03\n62 = 0x77\n63 = 0x66\n25 = 0x2A\n26 = 0x80\n27 = 0xF6\n80 = 0x30\n"
-                                 "69 = 0x55\nA4 = 0x0F\nA0 = 0x31\nA5 = 0x0D\nA1 = 0x32\nA6 = 0x0C\nA2 = 0x33\n",
-                                 0));
-}
-
-TEST(SioChips, MonitorLinesHoodLockAndLed) {
-  const auto intruder = [](int line) {
-    return [=](Chip& c) {
-      bool value = true;
-      return c.ReadIntrusionLatch(line, false, value) ? int{value} : -1;
-    };
-  };
-  const auto activity = [](int line) {
-    return [=](Chip& c) {
-      int value = 7;
-      return c.ReadLineActivity(line, value) ? 100 + value : value;
-    };
-  };
-  const std::string hardware = SmscMonitor("60 = 0x04\n61 = 0x80") + Ports(0x433, 0xFF, 0x0F) + Ports(0x44B, 0x80) +
-                               Ports(0x44D, 0x3D) + Ports(0x451, 0x01, 0x20);
-  const std::string printed =
-      Expect("sio", hardware + Ports(0x45C, 0, 0x10),
-             {{Tach(1), 0x1234, At(0x480, "28->34 29->12")},
-              {Tach(5), 0, At(0x480, "34->00 35->00")},
-              {Tach(8), 0x1335, At(0x480, "3A->35 3B->13")},
-              {Tach(9), 0xFFFF, ""},
-              {Duty(2, 0x180), 1, At(0x480, "31<-80")},
-              {Duty(0, 0x180), 0, ""},
-              {Full(1), 0, ""},
-              {Manual(true), 1,
-               At(0x480, "40->FE 5C->01 5D->02 5E->03 62->77 63->66 40<-FD 5C<-E1 5D<-E2 5E<-E3 62<-70 63<-00")},
-              {&Chip::RestoreFanState, 1, At(0x480, "40<-FE 5C<-01 5D<-02 5E<-03 62<-77 63<-66")},
-              {Zone(1), 0x2A, At(0x480, "25->2A")},
-              {Zone(2), 255, At(0x480, "26->80")},
-              {Zone(3), -10, At(0x480, "27->F6")},
-              {Zone(4), 0x30, At(0x480, "80->30")},
-              {Zone(5), -1000, ""},
-              {Limit(1), 0, At(0x480, "67->00")},
-              {Limit(2), 0, At(0x480, "68->00")},
-              {Limit(3), 0x55, At(0x480, "69->55")},
-              {Limit(4), 0, At(0x480, "83->00")},
-              {Line(17), 3, "044B->80 "},
-              {Line(36), 4, "044D->3D "},
-              {Line(70), 3, "0451->01 "},
-              {Line(85), 3, "0452->20 "},
-              {Line(86), -1, ""},
-              {Line(18), -1, ""},
-              {activity(86), -1, ""},
-              {intruder(238), 0, ""},
-              {intruder(17), 1, "044B->80 "},
-              {intruder(9), -1, ""},
-              {Hood(true, 17, false), 1, "045D->10 045D<-11 "},
-              {Hood(true, 17, true), 0, "045D->10 045D<-11 10ms 044B->80 "},
-              {Hood(false, 17, true), 1, "045D->10 045D<-12 10ms 044B->80 "},
-              {Red, 1, ""},
-              {&Chip::RestorePowerLedState, 1, ""},
-              {&Chip::SavePowerLedState, 1, "0433->FF 0433<-FB 0434->0F 0434<-0B "},
-              {&Chip::AssertPowerLedGreen, 1, "044D->3D 044D<-3E "},
-              {&Chip::AssertPowerLedRed, 1, "044D->3E 044D<-3D "},
-              {&Chip::DeassertPowerLed, 1, "044D->3D 044D<-3C "},
-              {&Chip::RestorePowerLedState, 1, "0433->FB 0433<-FF 0434->0F 0434<-0F "},
-              {&Chip::RestorePowerLedState, 1, ""}});
-  EXPECT_EQ(printed, "\n SIO Detection using SIO INTRUDER signal (is a STUB!!!)\n");
-  const KeyBench bench(Ports(0x44B, 0x80));
-  EXPECT_EQ(activity(17)(*MakeChip("sio")), 101);
-  Expect("sio", Ports(0x45C, 0, 0x13), {{Hood(false, 17, false), 0, "045D->13 " + Repeated(39, "75ms 045D->13 ")}});
-  Expect("sio", Ports(0x534, 0, 4), {{Hood(true, 17, false), 1, "0535->04 0535<-05 "}, {Line(17), 3, "054B->FF "}},
-         "chip.sio.pmbar=0x500\nchip.sio.hoodlockoffset=0x35\n");
-}
-
-TEST(SioChips, TheSch5327bKeepsItsLedInRuntimeRegisters) {
-  const std::string part =
-      SuperIo(0x2E, "0x55", Device(10, "60 = 0x06\n61 = 0x00")) + Ports(0x65B, 0x20) + Ports(0x677, 0x11);
-  const auto open = [](const std::string& requests) { return "002E<-55 " + requests + "002E<-AA "; };
-  ExpectConstruction("smsc_sch5327b", part, open(At(0x2E, "07<-0A 60->06 61->00")));
-  ExpectLedOf("smsc_sch5327b", part, open("065B->20 0677->11 "), open("065B<-2E 0677<-00 "),
-              open("065B<-2F 0677<-00 "), open("065B<-00 0677<-00 "), open("065B<-20 0677<-11 "));
-  Expect("smsc_sch5327b", SmscMonitor("60 = 0x08\n61 = 0x80") + Ports(0xF84B, 0x80),
-         {{Manual(true), 1,
-           At(0x880, "A4->0F A0->31 A5->0D A1->32 A6->0C A2->33 A4->0F A4<-07 A5->0D A5<-05 A6->0C A6<-04")},
-          {Duty(3, 0x180), 1, At(0x880, "A2<-80")},
-          {&Chip::RestoreFanState, 1, At(0x880, "A4<-0F A0<-31 A5<-0D A1<-32 A6<-0C A2<-33") + "2000ms "},
-          {Line(17), 3, "F84B->80 "},
-          {Red, 1, ""}});
-  Expect("smsc_sch5327b", part,
-         {{&Chip::SavePowerLedState, 1, open("065B->20 0677->11 ")},
-          {&Chip::AssertPowerLedGreen, 1, open("065B<-21 0677<-00 ")},
-          {&Chip::AssertPowerLedRed, 1, open("065B<-22 0677<-00 ")}},
-         "chip.smsc_sch5327b.multifunction_select2_register.green=1\n"
-         "chip.smsc_sch5327b.multifunction_select2_register.red=2\n");
-}
-
-TEST(SioChips, APartIsLookedForAtBothPlaces) {
-  const std::string runtime = Device(10, "30 = 1\n60 = 0x06\n61 = 0x00");
-  const std::string ports = Ports(0x647, 0x2B) + Ports(0x65D, 0x17);
-  const std::string monitor = Environment(10, "26 = 0x26\n25 = 0x25\n27 = 0x27\n", 0x70);
-  const auto base = [](unsigned port) {
-    return Hex(port) + "<-55 " + At(port, "07<-0A 60->06 61->00") + Hex(port) + "<-AA ";
-  };
-  ExpectConstruction("smsc5407", SuperIo(0x2E, "0x55", runtime) + ports, "002E<-55 002F->00 002E<-AA " + base(0x2E));
-  const std::string second = SuperIo(0x4E, "0x55", runtime + monitor) + ports;
-  ExpectConstruction("smsc5407", second, "002E<-55 002F->FF 002E<-AA " + base(0x4E));
-  Expect("smsc5407", second,
-         {{Zone(1), 0x26, At(0x670, "26->26")},
-          {Zone(2), 0x25, At(0x670, "25->25")},
-          {Zone(3), 0x27, At(0x670, "27->27")},
-          {&Chip::DeassertPowerLed, 1, ""}});
-  ExpectLedOf("smsc5407", second, "0647->2B 065D->17 ", "0647<-27 065D<-14 ", "-", "065D<-17 0647<-2B ",
-              "065D<-17 0647<-2B ");
-
-  const std::string via =
-      SuperIo(0x4E, "0x87, 0x87",
-              Device(8, "60 = 0x05") + Device(10, "60 = 0x06\n61 = 0x10") + Device(11, "60 = 0x0C")) +
-      Ports(0x62C, 0x15) + Ports(0xC1F, 0x31, 0x33) + Ports(0xC21, 0x32);
-  ExpectConstruction("vt1211", via,
-                     "002E<-87 002E<-87 002F->FF 002E<-AA " + Open(At(0x4E, "07<-08 60->05 61->00")) +
-                         Open(At(0x4E, "07<-0A 60->06 61->10")) + Open(At(0x4E, "07<-0B 60->0C 61->00")));
-  Expect("vt1211", via, {{Zone(1), 0x31, "0C1F->31 "}, {Zone(2), 0x32, "0C21->32 "}, {Zone(3), 0x33, "0C20->33 "}});
-  ExpectLedOf("vt1211", via, Open(At(0x4E, "07<-0A 30->00 30<-01") + "062C->15 062C<-12 "), "", "-", "",
-              Open("062C<-15 " + At(0x4E, "07<-0A 30<-00")));
-}
-
-// Also a part that opens and reads as nobody, and one whose reader is told to end.
-TEST(SioChips, APartThatIsLookedForIsClosedAgain) {
-  bool isDone = false;
-  for (platform::sim::Microseconds step = 0; !isDone; step += 2) {
-    KeyBench bench(SuperIo(0x2E, "0x55", "[chip.registers]\n00 = 0xFF\n"));
-    bench.EndAfter(step, [&] {
-      MakeChip("smsc5407");
-      isDone = true;
-    });
-    EXPECT_THAT(bench.machine.HardwareState(), ::testing::HasSubstr("configuration mode = closed")) << step;
-  }
-}
-
-TEST(SioChips, WhereThereIsNoBaseNothingIsTouched) {
+TEST(SuperIoWithBases, WhereThereIsNoBaseNothingIsTouched) {
   const std::vector<ChipCase> lamp = {{&Chip::SavePowerLedState, 0, ""},
                                       {&Chip::AssertPowerLedGreen, 0, ""},
                                       {&Chip::AssertPowerLedRed, 0, ""},
@@ -528,75 +290,7 @@ TEST(SioChips, WhereThereIsNoBaseNothingIsTouched) {
   }
 }
 
-// ---- monitors behind an SMBus
-
-TEST(AdtChips, ARegisterIsATransaction) {
-  const auto bus = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "80"); };
-  const std::string printed = Expect(
-      "adt", Ports(0xFC00, 0, 0x80) + Ports(0xFC04, 0x43),
-      {{Tach(1), 0x4343, bus("28->43 29->43")},
-       {Tach(4), 0x4343, bus("2E->43 2F->43")},
-       {Tach(5), 0xFFFF, ""},
-       {Zone(3), 0x43, bus("27->43")},
-       {Zone(4), -1000, ""},
-       {Duty(0, 0x180), 0, ""},
-       {Manual(true), 1,  // a written byte is the next one read: the host has but one data register
-        bus("40->43 5C->43 5D->43 5E->43 30->43 31->43 32->43 62->43 63->43 40->43 40<-40 5C<-E0 5D<-E0 5E<-E0 "
-            "62->E0 62<-E7 63<-77")},
-       {Duty(3, 0x180), 1, bus("32<-80")},
-       {&Chip::RestoreFanState, 1, bus("40<-43 5C<-43 5D<-43 5E<-43 30<-43 31<-43 32<-43 62<-43 63<-43")}});
-  EXPECT_EQ(printed, "LogMessage 14 20000 \"Invalid PWM index specified\" \"\"\n");
-  const auto reg = [](int number) { return [=](Chip& c) { return c.ReadRegister(number); }; };
-  const auto bus11 = [](const std::string& requests) { return Smbus("080", "5C", requests, "80"); };
-  Expect("adt_sio11", Ports(0x800, 0, 0x80) + Ports(0x804, 0x43),
-         {{reg(0x1A), 0x43, bus11("1A->43")},
-          {reg(256), 0, ""},
-          {&Chip::SaveFanState, 1,
-           bus11("40->43 5C->43 5D->43 5E->43 30->43 31->43 32->43 62->43 63->43 64->43 65->43 66->43 38->43 39->43 "
-                 "3A->43")}});
-}
-
-TEST(AdtChips, WithoutAnAnswerNothingIsSavedOrTakenOver) {
-  const auto failed = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "00"); };
-  const std::string save = failed("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42");
-  Expect("adt", Ports(0xFC00, 0) + Ports(0xFC04, 0x42),
-         {{Zone(1), -1255, failed("25->42")},
-          {Manual(true), 0, save},
-          {&Chip::SaveFanState, 0, save},
-          {&Chip::RestoreFanState, 1, ""}});
-}
-
-TEST(AdtChips, ATransactionThatFailsIsTheLastWriteAndIsPutBack) {
-  KeyBench bench(Ports(0xFC01, 0x80) + Ports(0xFC04, 0x42));  // the status alone; nobody is at the control register
-  const auto failing = [&bench](int transaction, const Ask& ask) {  // of 20 ms each, from 1 on
-    return [=, &machine = bench.machine](Chip& chip) {
-      for (const auto& [ms, status] : {std::pair(-10, 0x00U), std::pair(10, 0x80U)}) {
-        machine.Time().At(machine.Time().Now() + (20 * transaction + ms) * 1000,
-                          [&, value = status] { machine.Hardware().WritePort(0xFC01, 1, value); });
-      }
-      return ask(chip);
-    };
-  };
-  const auto ok = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "80", "FF"); };
-  const auto failed = [](const std::string& requests) { return Smbus("FC0", "2D", requests, "00", "FF"); };
-  const std::string restored = ok("40<-42 5C<-42 5D<-42 5E<-42 30<-42 31<-42 32<-42 62<-42 63<-42");
-  ExpectCases(bench, *MakeChip("adt"),
-              {{failing(2, Tach(1)), 0xFFFF, ok("28->42") + failed("29->42")},
-               {failing(1, Duty(1, 0x42)), 0, failed("30<-42")},
-               {failing(12, Manual(true)), 0,
-                ok("40->42 5C->42 5D->42 5E->42 30->42 31->42 32->42 62->42 63->42 40->42 40<-40") +
-                    failed("5C<-E0") + ok("62->E0") + restored},
-               {Manual(false), 1, ""},
-               {Manual(true), 1, ok("40->42 40<-40 5C<-E0 5D<-E0 5E<-E0 62->E0 62<-E7 63<-77")},
-               {failing(1, Manual(false)), 0, failed("40<-42")},
-               {Manual(false), 1, restored}});
-}
-
-// ---- all of them
-
 TEST(WinChips, ATakeoverThatIsInterruptedCanBePutBack) {
-  ExpectInterruptedCanBePutBack("sio", SmscMonitor("60 = 0x04\n61 = 0x80") + Ports(0x433, 0xFF));
-  ExpectInterruptedCanBePutBack("vt1211", SuperIo(0x2E, "0x87, 0x87", Device(10, "60 = 0x06")) + Ports(0x61C, 0x15));
   // The last register that is put back is the pins', behind the green of the firmware.
   ExpectInterruptedCanBePutBack("win_wpcd376", Ports(0x2E, 0x25) + Ports(0x420, 0x40));
 }
@@ -617,45 +311,9 @@ TEST(WinChips, EveryKeyIsRead) {
       {"win_wpcd376", "gpiobar=0x430", {&Chip::AssertPowerLedGreen, 1, "0430<-40 "}},
       {"nuv_npcd378h", "cfgbar=0x4E", {ConfigBit(0), 1, At(0x4E, "07<-04 60->FF")}},
       {"nuv_npcd378h", "gpiobar=0", {&Chip::AssertPowerLedGreen, 1, "6061<-1E "}},
-      {"smsc_sch5327b", "cfgbar=0x4E", {&Chip::SavePowerLedState, 0, ""}},
-      {"sio", "hwmbar=0x295", {Zone(1), -1, At(0x295, "25->FF")}},
-      {"adt", "smbusbar=0xB00\nchip.adt.smbussar=0x2C", {Zone(1), 255, Smbus("0B0", "2C", "25->FF", "FF", "FF")}}};
+  };
   for (const auto& [name, keys, row] : kRows) {
     Expect(name, kEchoingPorts, {row}, std::string("chip.") + name + "." + keys + "\n");
-  }
-}
-
-// On machines where nobody answers, where all ports read 0, and where a bus never gets ready.
-TEST(WinChips, AnyNumberIsAnsweredInBoundedTime) {
-  constexpr platform::sim::Microseconds kMostForAll_us = 60'000'000;
-  for (const std::string& hardware :
-       {std::string(), Ports(0xFC00, 0, 0x1A) + Ports(0x800, 0, 0x1A) + kEchoingPorts}) {
-    for (const char* name : {"win", "nuv_w83667", "nuv_nct5571", "nuv_nct5572", "win_w83202g", "win_wpcd376",
-                             "nuv_npcd378h", "sio", "smsc_sch5327b", "smsc5407", "vt1211", "adt", "adt_sio11"}) {
-      KeyBench bench(hardware);
-      const platform::sim::Microseconds start = bench.machine.Time().Now();
-      const std::unique_ptr<Chip> chip = MakeChip(name);
-      for (const int number : {INT_MIN, -1, 0, 1, 10, 99, INT_MAX}) {
-        int value = 0;
-        bool yes = false;
-        std::uint8_t byte = 0;
-        chip->ReadFanRpm(number, value, number);
-        chip->SetFanPwm(number, number);
-        chip->SaveFanControl(number);
-        chip->TakeFanControl(number);
-        chip->RestoreFanControl(number);
-        chip->ReadTemperature(number, value);
-        chip->ReadLowLimitTemperature(number, value);
-        chip->ReadLine(number);
-        chip->ReadLineDirect(number);
-        chip->ReadRegister(number);
-        chip->ReadIntrusionLatch(number, true, yes);
-        chip->ReadConfigBit(0xFF, 0xFF, number, yes);
-        chip->ReadEnvironmentRegister(0xFFFF, byte);
-      }
-      chip->LockHood(INT_MAX, true);
-      EXPECT_LT(bench.machine.Time().Now() - start, kMostForAll_us) << name;
-    }
   }
 }
 

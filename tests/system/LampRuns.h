@@ -20,8 +20,9 @@ struct Board {
   std::string section = "TwoColorPower";  // "Default": the lamp has one colour
   std::vector<Edit> edits = {};
   unsigned furtherSeed = 2;
+  bool hasSignal = true;  // the status indicator can light and darken the lamp
 
-  /// Which it is, for a failure's text.
+  /// Which it is, for a failure's text: its machine, and what is edited in few words.
   [[nodiscard]] std::string Name() const;
 };
 
@@ -35,7 +36,7 @@ void ExpectLampsBlink(const Board& board);
 /// dark phases, and by the operator.
 void ExpectStoppedRunsPutBack(const Board& board);
 
-/// The status indicator blinks the green lamp and puts it back.
+/// The status indicator blinks the green lamp and puts it back, or says that it cannot light it.
 void ExpectSignal(const Board& board);
 
 }  // namespace panelglow::systemtest

@@ -271,6 +271,11 @@ void IniReader::DumpLookups() {
   platform::TheHost().console.Write(text);
 }
 
+void IniReader::ForgetLookups() {
+  const std::lock_guard<std::mutex> lock(guard);
+  lookups.clear();
+}
+
 // ---- free functions
 
 std::string ReadIniValue(const std::string& key, IniReader::status_t& status, const std::string& defaultValue) {

@@ -61,6 +61,9 @@ class IniReader {
   /// Writes the record of all look-ups to standard output.
   void DumpLookups();
 
+  /// The record begins anew.
+  void ForgetLookups();
+
   [[nodiscard]] bool IsChipIniPresent() { return GetSources().chipIniPresent; }
   [[nodiscard]] std::string GetChipIniPath() { return GetSources().chipIniPath; }
 

@@ -101,7 +101,7 @@ bool SmscKbc1126Chip::SetFanPwm(int fan, int value) {
 bool SmscKbc1126Chip::SetFanFullSpeed(int fan) { return SetFanPwm(fan, 1); }
 
 bool SmscKbc1126Chip::SetFanPwmPercent(int fan, int percent) {
-  return SetFanPwm(fan, (100 - percent) * kFullScale / 100);
+  return SetFanPwm(fan, static_cast<int>((100 - std::int64_t{percent}) * kFullScale / 100));
 }
 
 bool SmscKbc1126Chip::SetManualFanMode(bool on) {

@@ -89,7 +89,9 @@ bool GChip::SetFanFullSpeed(int fan) {
   return all;
 }
 
-bool GChip::SetFanPwmPercent(int fan, int percent) { return SetFanPwm(fan, percent * fullSpeedData / 100); }
+bool GChip::SetFanPwmPercent(int fan, int percent) {
+  return SetFanPwm(fan, static_cast<int>(std::int64_t{percent} * fullSpeedData / 100));
+}
 
 std::uint8_t GChip::ReadPort(std::uint16_t base, std::uint16_t offset) {
   return devio.InportByte(static_cast<std::uint16_t>(base + offset));

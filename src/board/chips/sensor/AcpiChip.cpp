@@ -56,6 +56,11 @@ class AffinityHold {
   std::uint64_t before_;
 };
 
+// Neither way of reading needs it; read so that the record of look-ups is whole.
+void ReadTjMax(const std::string& prefix, std::uint32_t defaultValue) {
+  ReadIniUnsigned(prefix + ".tjmax", defaultValue);
+}
+
 void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kNote, text); }
 
 }  // namespace
@@ -75,10 +80,12 @@ std::optional<AcpiChip::Source> AcpiChip::FindSource() {
     }
     const Setting mechanism = IniReader::Instance().ReadIniSetting(prefix + ".mechanism", "Mechanism not defined");
     if (mechanism.text == "msr") {
+      ReadTjMax(prefix, 90);
       return Source{Mechanism::kModelRegisters, ReadIniUnsigned(prefix + ".maxtempreg", 0x1A2),
                     ReadIniUnsigned(prefix + ".tempprobereg", 0x19C)};
     }
     if (mechanism.text == "pci") {
+      ReadTjMax(prefix, 0);
       return Source{Mechanism::kPciConfiguration, 0, ReadIniUnsigned(prefix + ".tempprobereg", 0xA4)};
     }
     TellOf(mechanism, "\"" + mechanism.text + "\" is no way to read a processor's temperature; it is msr or pci");

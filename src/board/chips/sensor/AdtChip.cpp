@@ -79,7 +79,8 @@ bool AdtChip::RestoreFanState() {
   hasFailed = false;
   const bool wasManual = manualFanMode;
   RegisterChip::RestoreFanState();
-  manualFanMode = wasManual && hasFailed;  // to be put back again
+  isHalfBack = wasManual && hasFailed;
+  manualFanMode = isHalfBack;  // to be put back again
   return !hasFailed;
 }
 
@@ -88,6 +89,9 @@ bool AdtChip::SetManualFanMode(bool on) {
     return false;
   }
   hasFailed = false;
+  if (on && std::exchange(isHalfBack, false)) {
+    manualFanMode = false;  // to be taken over again
+  }
   RegisterChip::SetManualFanMode(on);
   if (on && hasFailed) {
     RestoreFanState();

@@ -15,7 +15,8 @@ class AdtChip : public RegisterChip {
   AdtChip();
 
   // False, and a count of 0xFFFF, where the device does not answer. Nothing is then saved, what was taken over is put
-  // back, and the first write that fails is the last of its operation. A restore that fails can be done again.
+  // back, and the first write that fails is the last of its operation. After a restore that fails both can be done
+  // again, it and the take-over.
   std::uint32_t ReadFanTach(int fan, int arg) override;
   bool SaveFanState() override;
   bool RestoreFanState() override;
@@ -42,6 +43,7 @@ class AdtChip : public RegisterChip {
   bool hasFailed = false;  // a transaction, since this was last cleared
 
  private:
+  bool isHalfBack = false;  // the fans, by a restore that failed
   SmbusHost host;
   std::uint8_t address = 0;
   RegistersOf<AdtChip> monitor;
