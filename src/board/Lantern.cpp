@@ -15,12 +15,25 @@ constexpr std::uint16_t kPinPort = 0x2F;
 constexpr std::uint8_t kNotForLed = 0x02;
 constexpr std::uint8_t kForLed = 0x05;
 
+// Hardware monitor: a mode for all fans, and their duties.
+constexpr std::int64_t kFanDivisor = 1'500'000;
+constexpr RegisterId kFanMode{0, 0x96};
+constexpr std::uint8_t kAllManual = 0xFF;
+
+FanTable Fans() {
+  return {.tachOverflow = 0x0FFF,  // 12 bits
+          .duties = RegistersAt(0, {0xA3, 0xB3, 0xC3}),
+          .fullSpeed = 0xFF,
+          .saved = {kFanMode},
+          .manual = {Put(kFanMode, kAllManual)}};
+}
+
 }  // namespace
 
 Lantern::Lantern(std::string boardClass, std::uint16_t boardId, std::uint16_t indexPort)
-    : OldestBoard(std::move(boardClass), boardId, {.indexPort = indexPort, .fanLatched = false}),
-      powerBase(ReadFlatWord("PowerIOBaseAddr")),
-      button(devio, powerBase, PowerEventButton::Check::kNone) {}
+    : OldestBoard(std::move(boardClass), boardId,
+                  {.indexPort = indexPort, .fanLatched = false, .fanDivisor = kFanDivisor, .fans = Fans()}),
+      button(devio, Settings().powerIoBase, PowerEventButton::Check::kNone) {}
 
 std::uint8_t Lantern::OpenAndKeep() {
   isOpen = true;

@@ -38,9 +38,8 @@ class Lantern : public OldestBoard {
   static constexpr std::uint16_t kIndexPort = 0x2E;
 
   /// Without its base nothing is known of the button: ports 0 and 2 are other parts'.
-  [[nodiscard]] bool HasButton() const { return powerBase != 0; }
+  [[nodiscard]] bool HasButton() const { return Settings().powerIoBase != 0; }
 
-  std::uint16_t powerBase;  // of the power management block
   PowerEventButton button;
   bool isOpen = false;
   std::optional<std::uint8_t> savedPins;

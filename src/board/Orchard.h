@@ -21,12 +21,16 @@ class Orchard : public OldestBoard {
   /// The LED is green again, its pins as they are after a start; does nothing without a save.
   bool RestorePowerLedState() override;
 
+  /// The cable of a network controller is found by driving that controller's pin.
+  bool DetectLegacyDevice(LegacyDevice device, bool& present) override;
+
   bool SavePowerButton() override;
   bool RestorePowerButton() override;
   bool ArmPowerButton() override;
   bool IsPowerButtonPressed(bool& pressed) override;
 
  private:
+  bool DetectNicDashCable(int line, bool& present);
   bool Light(std::uint8_t lines);
 
   PowerButton button;

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "harness/base/CDMout.h"
+#include "hw/PciDeviceList.h"
 #include "platform/DriverRecords.h"
 #include "platform/Host.h"
 
@@ -224,23 +225,41 @@ std::uint8_t CDevio::ReadPciBar(std::uint16_t location, std::uint16_t reg, std::
   return 0;
 }
 
-bool CDevio::FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
-                                std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location) {
-  constexpr std::array<std::uint16_t, 4> kIdRegisters{0x00, 0x02, 0x2C, 0x2E};
-  const std::array<std::uint16_t, 4> wanted{vendor, deviceId, subVendor, subDevice};
+template <class Wanted>
+bool CDevio::FindPciFunction(std::uint32_t classCode, std::uint16_t& location, Wanted isWanted) {
+  constexpr PciIds kIdRegisters{0x00, 0x02, 0x2C, 0x2E};
   constexpr std::uint32_t kMostFunctions = 0x10000;  // every location once
   for (std::uint32_t index = 0;
        index < kMostFunctions && FindPciClass(classCode, static_cast<std::uint16_t>(index), location) == 0; ++index) {
-    std::array<std::uint16_t, 4> ids{};
+    PciIds ids{};
     for (std::size_t i = 0; i < ids.size(); ++i) {
       ReadPciConfigWord(location, kIdRegisters[i], ids[i]);
     }
-    if (ids == wanted) {
+    if (isWanted(ids)) {
       return true;
     }
   }
   location = 0;
   return false;
+}
+
+bool CDevio::FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
+                                std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location) {
+  const PciIds wanted{vendor, deviceId, subVendor, subDevice};
+  return FindPciFunction(classCode, location, [&](const PciIds& ids) { return ids == wanted; });
+}
+
+bool CDevio::FindPciDeviceByName(std::uint32_t classCode, const std::string& name, unsigned occurrence,
+                                 std::uint16_t& location) {
+  return FindPciFunction(classCode, location, [&](const PciIds& ids) {
+    PciDevice entry;
+    try {
+      PciDeviceList::Instance().FindDevice(ids[0], ids[1], ids[2], ids[3], 1, entry);
+    } catch (int) {  // no inventory, and so no description
+      return false;
+    }
+    return entry.description.find(name) != std::string::npos && !entry.description.empty() && occurrence-- == 0;
+  });
 }
 
 // ---- physical memory

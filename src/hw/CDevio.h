@@ -79,6 +79,11 @@ class CDevio {
   bool FindPciDeviceByIds(std::uint32_t classCode, std::uint16_t vendor, std::uint16_t deviceId,
                           std::uint16_t subVendor, std::uint16_t subDevice, std::uint16_t& location);
 
+  /// The `occurrence`-th (from 0) function of the class whose description in the device tree contains `name`; false,
+  /// and location 0, when there is none.
+  bool FindPciDeviceByName(std::uint32_t classCode, const std::string& name, unsigned occurrence,
+                           std::uint16_t& location);
+
   // ---- physical memory; results are the bytes copied: `length`, or 0 on failure. `length` is limited to the buffer.
   std::uint32_t ReadPhysicalMemory(std::uint32_t address, std::uint32_t length, std::span<std::byte> buffer);
   std::uint32_t ReadPhysicalMemory64(std::uint32_t low, std::uint32_t high, std::uint32_t length,
@@ -102,6 +107,11 @@ class CDevio {
   std::uint16_t ReadFirmwareWord(std::uint16_t segment, std::uint16_t offset);
 
  private:
+  using PciIds = std::array<std::uint16_t, 4>;  // vendor, device, subsystem vendor, subsystem device
+
+  /// The first function of the class that is the wanted one.
+  template <class Wanted>
+  bool FindPciFunction(std::uint32_t classCode, std::uint16_t& location, Wanted isWanted);
   explicit CDevio(DriverNames given);
   std::uint32_t Inport(std::uint32_t code, std::uint16_t port, std::uint32_t width);
   bool Outport(std::uint32_t code, std::uint16_t port, std::uint32_t width, std::uint32_t value,

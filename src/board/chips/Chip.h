@@ -63,6 +63,9 @@ class Chip {
   virtual bool ReadLowLimitTemperature(int /*zone*/, int& /*value*/) { return false; }
   virtual bool ReadThreshold(int /*zone*/, int& /*value*/) { return false; }
   virtual int MapTemperature(int raw) { return raw; }
+
+  /// The graphics cards whose temperatures it reads, each a zone from 0.
+  virtual int CountCards() { return 0; }
   virtual void ReservedOperation21() {}
 
   /// A register of the hardware monitor; where it has banks, the bank stands in the high byte of the number.

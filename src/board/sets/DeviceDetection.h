@@ -59,6 +59,10 @@ class DeviceDetection {
   }
 
  private:
+  bool IsNamed(DeviceKind kind, const std::string& prefix, DEVICE_INFO& device);
+  static bool ReadPlace(const std::string& prefix, const char* offsetLabel, DEVICE_INFO& device);
+  void Look(DeviceKind kind, const std::string& prefix, DEVICE_INFO& device);
+
   ChipFinder chipOf;
   std::array<std::vector<DEVICE_INFO>, kDeviceKinds> lists;
 };

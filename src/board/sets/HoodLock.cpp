@@ -2,9 +2,42 @@
 
 namespace panelglow {
 
-bool HoodLock::Load() { return true; }
-bool HoodLock::Read(bool& /*present*/) { return false; }
-int HoodLock::Lock() { return 0; }
-int HoodLock::Unlock() { return 0; }
+bool HoodLock::Load() {
+  presenceChip = ReadChipName("detect.hoodlock.chip", "ich", chipOf);
+  presence = ReadLineNumber("detect.hoodlock.gpio");
+  reversed = ReadYesNo("detect.hoodlock.reversedlogic", false);
+  chip = ReadChipName("test.hoodlock.chip", presenceChip, chipOf);
+  lockLine = ReadLineNumber("test.hoodlock.gpio.lock");
+  unlockLine = ReadLineNumber("test.hoodlock.gpio.unlock");
+  check = !SaysNo("test.hoodlock.check");
+  isPresent = false;
+  return true;
+}
+
+bool HoodLock::Read(bool& present) {
+  if (!presence.isSet) {
+    return false;
+  }
+  const int state = chipOf(presenceChip).ReadLine(presence.line);
+  if (state == Chip::kNoSuchLine) {
+    return false;
+  }
+  present = isPresent = (state == Chip::kAsserted) != reversed;
+  return true;
+}
+
+// Nothing is locked that could not be unlocked again.
+int HoodLock::Move(bool (Chip::*move)(int, bool), const LineSetting& line) {
+  if (!isPresent) {
+    return 0;
+  }
+  if (!lockLine.isSet || !unlockLine.isSet) {
+    return kNoLines;
+  }
+  return (chipOf(chip).*move)(line.line, check) ? 1 : 0;
+}
+
+int HoodLock::Lock() { return Move(&Chip::LockHood, lockLine); }
+int HoodLock::Unlock() { return Move(&Chip::UnlockHood, unlockLine); }
 
 }  // namespace panelglow

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "board/sets/ChipFinder.h"
+#include "board/sets/ReadSettings.h"
 
 namespace panelglow {
 
@@ -25,7 +26,17 @@ class HoodLock {
   int Unlock();
 
  private:
+  int Move(bool (Chip::*move)(int line, bool check), const LineSetting& line);
+
   ChipFinder chipOf;
+  std::string presenceChip;
+  LineSetting presence;
+  bool reversed = false;
+  std::string chip;  // that moves it
+  LineSetting lockLine;
+  LineSetting unlockLine;
+  bool check = true;       // the line must show that it moved
+  bool isPresent = false;  // as Read found it
 };
 
 }  // namespace panelglow

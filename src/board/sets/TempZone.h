@@ -14,6 +14,7 @@ inline constexpr int kChipReadFailed = 512;
 inline constexpr int kFirmwareReadFailed = 513;  // a processor or the firmware
 
 struct TempZone {
+  int number = 0;  // of its keys; the cards that stand for one key share it
   std::string name;
   std::string chip;
   int index = 0;                  // the chip's number for it
@@ -38,7 +39,8 @@ struct TempZone {
   int consecutiveHigh = 0;
   int consecutiveLow = 0;
   int invalidReadings = 0;
-  int maxReading = kNoLimit;  // kNoLimit: nothing was read yet
+  int lastReading = kNoLimit;  // kNoLimit: nothing was read yet
+  int maxReading = kNoLimit;
   int minReading = kNoLimit;
   std::vector<int> coreReadings;  // of the last reading
   int coreMax = kNoLimit;
@@ -51,7 +53,7 @@ struct TempZone {
 /// Zones that are tested together.
 struct ZoneGroup {
   std::string name;
-  std::vector<int> zones;  // their numbers, from 1
+  std::vector<int> zones;  // their numbers in the list, from 1
 };
 
 /// What one check of a zone found.

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -51,6 +52,7 @@ class TestButtons {
  private:
   ChipFinder chipOf;
   std::vector<TestButton> buttons;
+  std::optional<TestButton> current;
 };
 
 }  // namespace panelglow

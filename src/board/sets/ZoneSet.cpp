@@ -1,20 +1,348 @@
 #include "board/sets/ZoneSet.h"
 
+#include <algorithm>
+#include <cstddef>
+#include <limits>
+
+#include "board/base/IniReader.h"
+#include "board/base/mblib_exception.h"
+#include "board/parts/BitName.h"
+#include "board/parts/RowOf.h"
+#include "board/sets/ReadSettings.h"
+#include "harness/base/CDMUtil.h"
+#include "harness/base/CDMout.h"
+
 namespace panelglow {
 
-bool ZoneSet::Load() { return true; }
+namespace {
+
+// Chips that are read in ways of their own.
+constexpr const char* kProcessors = "acpi";
+constexpr const char* kGraphics = "videochip";
+constexpr const char* kFirmware = "casl";
+
+constexpr const char* kAllCards = "allcards";  // in place of an index
+
+// What the processor's throttling bits say.
+constexpr int kAtLow = 1;
+constexpr int kAtHigh = 3;
+
+void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kNote, text); }
+
+// Limits come from files: sums of them stay numbers.
+int Sum(int limit, int difference) {
+  const std::int64_t sum = std::int64_t{limit} + difference;
+  return static_cast<int>(
+      std::clamp<std::int64_t>(sum, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()));
+}
+
+void Extend(int& max, int& min, int value) {
+  const bool isFirst = max == kNoLimit || max >= kFirstInvalidReading;
+  max = isFirst ? value : std::max(max, value);
+  min = isFirst ? value : std::min(min, value);
+}
+
+// One limit of a zone and its cores, each kNoLimit when there is none: whether one applied, and the checks in a row
+// that were beyond one of them.
+template <class Beyond>
+bool Judge(Beyond beyond, const TempZone& zone, int limit, int hottestOrColdest, int coreLimit, int& inARow,
+           bool& isBeyond) {
+  const bool applies = limit != kNoLimit;
+  const bool appliesToCores = coreLimit != kNoLimit && !zone.coreReadings.empty();
+  if (!applies && !appliesToCores) {
+    return false;
+  }
+  isBeyond = (applies && beyond(zone.lastReading, limit)) || (appliesToCores && beyond(hottestOrColdest, coreLimit));
+  inARow = isBeyond ? inARow + 1 : 0;
+  return true;
+}
+
+}  // namespace
+
+// ---- from the files
+
+TempZone ZoneSet::ReadZone(const std::string& prefix) const {
+  const auto limit = [&](const char* key) { return ReadIniInt(prefix + key, kNoLimit); };
+  TempZone zone;
+  zone.thresholdAdj = ReadIniInt(prefix + "threshold.adj", zone.thresholdAdj);
+  zone.thresholdDelta = limit("threshold.delta");
+  zone.thresholdFix = limit("threshold.fix");
+  const Setting type = IniReader::Instance().ReadIniSetting(prefix + "type", zone.type);
+  if (type.text == "cpu" || type.text == "gpu") {
+    zone.type = type.text;
+  } else {
+    TellOf(type, "\"" + type.text + "\" is neither cpu nor gpu and counts as " + zone.type);
+  }
+  zone.thresholdHigh = limit("threshold.high");
+  zone.thresholdLow = limit("threshold.low");
+  zone.thresholdLowFix = limit("thresholdlow.fix");
+  zone.tjmaxDelta = limit("threshold.tjmax.delta");
+  zone.cpuCore = ReadWord(prefix + "cpu.core", "true", "false");
+  zone.coreHigh = limit("cpu.core.threshold.high");
+  zone.coreTjmaxDelta = limit("cpu.core.threshold.tjmax.delta");
+  zone.coreLow = limit("cpu.core.threshold.low");
+  zone.prochot = ReadYesNo(prefix + "prochot", zone.prochot);
+  zone.prochotChip = ReadIniValue(prefix + "prochot.chip", "");
+  zone.prochotOffset = ReadIniInt(prefix + "prochot.offset", zone.prochotOffset);
+  zone.prochotLowBit = CDMUtil::Trim(ReadIniValue(prefix + "prochot.threshold.low.bit", ""));
+  zone.prochotHighBit = CDMUtil::Trim(ReadIniValue(prefix + "prochot.threshold.high.bit", ""));
+  return zone;
+}
+
+bool ZoneSet::Load() {
+  probe.rate_s = ReadIniInt("test.tempcaution.proberate", ProbeSettings{}.rate_s);
+  probe.consecutiveHigh = ReadIniInt("test.tempcaution.consecutivehigh", ProbeSettings{}.consecutiveHigh);
+  probe.consecutiveLow = ReadIniInt("test.tempcaution.consecutivelow", ProbeSettings{}.consecutiveLow);
+  probe.retriesOnInvalid = ReadIniInt("test.tempcaution.retriesoninvalidtemp", ProbeSettings{}.retriesOnInvalid);
+  const std::string usualChip = ReadIniValue("test.tempcaution.chip", "sio");
+  std::vector<TempZone> list;
+  for (int n = 1;; ++n) {
+    const std::string prefix = "test.tempcaution.zone." + CDMUtil::ToString(n) + ".";
+    const std::string name = ReadIniValue(prefix + "name", "");
+    if (name.empty()) {
+      break;
+    }
+    TempZone zone = ReadZone(prefix);
+    zone.number = n;
+    zone.name = name;
+    zone.chip = ReadChipName(prefix + "chip", usualChip, chipOf);
+    AddZone(std::move(zone), prefix, list);
+  }
+  Take(std::move(list), probe);
+  return true;
+}
+
+// Of graphics cards that stand for one key each gets its number behind the name, and the limits that the files have
+// for its kind where the zone has none.
+void ZoneSet::AddZone(TempZone zone, const std::string& prefix, std::vector<TempZone>& list) const {
+  if (zone.prochot && zone.prochotLowBit.empty() && zone.prochotHighBit.empty()) {
+    Log(zone.name + " : Low or High bit values are missing for Prochot in INI file");
+  }
+  if (zone.chip != kGraphics || CDMUtil::Trim(ReadIniValue(prefix + "index", "")) != kAllCards) {
+    zone.index = ReadIniInt(prefix + "index", zone.index);
+    LimitByTjMax(zone);
+    list.push_back(std::move(zone));
+    return;
+  }
+  Chip& graphics = chipOf(zone.chip);
+  const int cards = graphics.CountCards();
+  for (int card = 0; card < cards; ++card) {
+    TempZone one = zone;
+    one.index = card;
+    one.name += " " + CDMUtil::ToString(card + 1);
+    LimitByTjMax(one);
+    if (one.thresholdHigh == kNoLimit) {
+      graphics.ReadThreshold(card, one.thresholdHigh);
+    }
+    if (one.thresholdLow == kNoLimit) {
+      graphics.ReadLowLimitTemperature(card, one.thresholdLow);
+    }
+    list.push_back(std::move(one));
+  }
+}
+
+void ZoneSet::LimitByTjMax(TempZone& zone) const {
+  const auto limit = [&](int delta, const char* sign, int& threshold) {
+    if (delta == kNoLimit) {
+      return;
+    }
+    Log(zone.name + " : Delta value from ini  " + sign + " " + CDMUtil::ToString(delta));
+    if (!chipOf(zone.chip).ReadThreshold(zone.index, zone.tjMax)) {
+      return;
+    }
+    threshold = Sum(zone.tjMax, -delta);
+    Log(zone.name + " : TjMax value using MSR " + sign + " " + CDMUtil::ToString(zone.tjMax));
+    Log(zone.name + " : Max threshold value (TjMax - Delta) " + sign + " " + CDMUtil::ToString(threshold));
+  };
+  limit(zone.tjmaxDelta, "=", zone.thresholdHigh);
+  limit(zone.coreTjmaxDelta, ":", zone.coreHigh);
+}
+
 void ZoneSet::Take(std::vector<TempZone> list, const ProbeSettings& settings) {
   zones = std::move(list);
   probe = settings;
+  startTime = TimeStamp();
 }
-bool ZoneSet::LoadGroups() { return true; }
-const TempZone* ZoneSet::Find(int /*zone*/) const { return nullptr; }
-bool ZoneSet::IsSkipped(int /*zone*/) const { return false; }
-bool ZoneSet::SetSkipped(int /*zone*/, bool /*skip*/) { return false; }
-int ZoneSet::Read(int /*zone*/) { return kChipReadFailed; }
-bool ZoneSet::Check(int /*zone*/, ZoneCheck& /*check*/) { return false; }
-int ZoneSet::ReadProchot(int /*zone*/) { return 0; }
-int ZoneSet::GetHigh(int /*zone*/) { return kNoLimit; }
-int ZoneSet::GetLow(int /*zone*/) const { return kNoLimit; }
+
+bool ZoneSet::LoadGroups() {
+  constexpr const char* kBad = "Missing or invalid Zone Group information";
+  groups.clear();
+  for (int n = 1;; ++n) {
+    const std::string prefix = "test.tempzones.group." + CDMUtil::ToString(n);
+    ZoneGroup group{ReadIniValue(prefix + ".name", ""), {}};
+    if (group.name.empty()) {
+      return true;
+    }
+    for (const int number : NumbersIn(IniReader::Instance().ReadIniSetting(prefix + ".zones", ""))) {
+      const std::size_t before = group.zones.size();
+      for (std::size_t i = 0; i < zones.size(); ++i) {
+        if (zones[i].number == number) {
+          group.zones.push_back(static_cast<int>(i) + 1);
+        }
+      }
+      if (group.zones.size() == before) {
+        throw mblib_exception(kBad);
+      }
+    }
+    if (group.zones.empty()) {
+      throw mblib_exception(kBad);
+    }
+    groups.push_back(std::move(group));
+  }
+}
+
+// ---- one zone
+
+const TempZone* ZoneSet::Find(int zone) const { return RowOf(zones, zone); }
+
+TempZone* ZoneSet::At(int zone) {
+  return Find(zone) == nullptr ? nullptr : &zones[static_cast<std::size_t>(zone) - 1];
+}
+
+bool ZoneSet::IsSkipped(int zone) const {
+  const TempZone* found = Find(zone);
+  return found != nullptr && found->skipped;
+}
+
+bool ZoneSet::SetSkipped(int zone, bool skip) {
+  TempZone* found = At(zone);
+  if (found != nullptr) {
+    found->skipped = skip;
+  }
+  return found != nullptr;
+}
+
+int ZoneSet::GetHigh(int zone) {
+  const TempZone* found = Find(zone);
+  if (found == nullptr) {
+    return kNoLimit;
+  }
+  if (found->thresholdFix != kNoLimit) {
+    return found->thresholdFix;
+  }
+  if (found->thresholdHigh != kNoLimit || found->thresholdDelta == kNoLimit) {
+    return found->thresholdHigh;
+  }
+  Chip& chip = chipOf(found->chip);
+  int threshold = 0;
+  if (chip.ReadThreshold(found->index, threshold)) {
+    return Sum(threshold, found->thresholdDelta);
+  }
+  return chip.ReadLowLimitTemperature(found->index, threshold)
+             ? Sum(Sum(threshold, found->thresholdAdj), found->thresholdDelta)
+             : kNoLimit;
+}
+
+int ZoneSet::GetLow(int zone) const {
+  const TempZone* found = Find(zone);
+  if (found == nullptr) {
+    return kNoLimit;
+  }
+  return found->thresholdLowFix != kNoLimit ? found->thresholdLowFix : found->thresholdLow;
+}
+
+int ZoneSet::Read(int zone) {
+  TempZone* found = At(zone);
+  if (found == nullptr) {
+    return kChipReadFailed;
+  }
+  Chip& chip = chipOf(found->chip);
+  found->coreReadings.clear();
+  int value = 0;
+  bool done = false;
+  int failure = kChipReadFailed;
+  if (found->chip == kProcessors) {
+    done = chip.ReadProcessorTemperature(found->index, value, found->cpuCore, found->name);
+    failure = kFirmwareReadFailed;
+  } else if (found->chip == kFirmware) {
+    done = chip.ReadVirtualTemperature(found->index, found->cpuCore, value);
+    failure = kFirmwareReadFailed;
+  } else {
+    done = chip.ReadTemperature(found->index, value);
+  }
+  if (!done) {
+    return failure;
+  }
+  found->coreReadings = chip.GetCoreTemperatures();
+  found->readingTime = TimeStamp();
+  return chip.MapTemperature(value);
+}
+
+int ZoneSet::ReadProchot(int zone) {
+  constexpr int kLastRegister = 0xFFFF;
+  const TempZone* found = Find(zone);
+  if (found == nullptr || found->prochotOffset < 0 || found->prochotOffset > kLastRegister) {
+    return 0;
+  }
+  std::uint8_t value = 0;
+  if (!chipOf(found->prochotChip).ReadEnvironmentRegister(static_cast<std::uint16_t>(found->prochotOffset), value)) {
+    return 0;
+  }
+  const auto isSet = [value](const std::string& bit) { return !bit.empty() && (value & MaskOfBitName(bit, 8)) != 0; };
+  const bool low = isSet(found->prochotLowBit);
+  const bool high = isSet(found->prochotHighBit);
+  if (found->prochotHighBit.empty()) {
+    return low ? kAtLow : 0;
+  }
+  return low || high ? kAtHigh : 0;
+}
+
+// ---- checks
+
+bool ZoneSet::Measure(int zone, int& value) {
+  TempZone* found = At(zone);
+  if (found == nullptr) {
+    return false;
+  }
+  value = found->lastReading = Read(zone);
+  if (value >= kFirstInvalidReading) {
+    found->minReading = found->maxReading = value;
+    ++found->invalidReadings;
+    return false;
+  }
+  Extend(found->maxReading, found->minReading, value);
+  if (!found->coreReadings.empty()) {
+    const auto [coldest, hottest] = std::minmax_element(found->coreReadings.begin(), found->coreReadings.end());
+    found->coreMin = *coldest;
+    found->coreMax = *hottest;
+  }
+  return true;
+}
+
+bool ZoneSet::JudgeHigh(int zone, bool& high) {
+  TempZone* found = At(zone);
+  return found != nullptr && found->lastReading < kFirstInvalidReading && found->lastReading != kNoLimit &&
+         Judge([](int value, int limit) { return value > limit; }, *found, GetHigh(zone), found->coreMax,
+               found->coreHigh, found->consecutiveHigh, high);
+}
+
+bool ZoneSet::JudgeLow(int zone, bool& low) {
+  TempZone* found = At(zone);
+  return found != nullptr && found->lastReading < kFirstInvalidReading && found->lastReading != kNoLimit &&
+         Judge([](int value, int limit) { return value < limit; }, *found, GetLow(zone), found->coreMin,
+               found->coreLow, found->consecutiveLow, low);
+}
+
+bool ZoneSet::Check(int zone, ZoneCheck& check) {
+  TempZone* found = At(zone);
+  if (found == nullptr) {
+    return false;
+  }
+  check = {};
+  bool applied = false;
+  if (Measure(zone, check.value)) {
+    if (found->prochot) {
+      check.prochotStatus = ReadProchot(zone);
+      found->prochotStatus = check.prochotStatus == 0 ? found->prochotStatus : check.prochotStatus;
+    }
+    const bool hasHigh = JudgeHigh(zone, check.high);
+    const bool hasLow = JudgeLow(zone, check.low);
+    applied = hasHigh || hasLow;
+  }
+  check.consecutiveHigh = found->consecutiveHigh;
+  check.consecutiveLow = found->consecutiveLow;
+  check.invalid = found->invalidReadings;
+  return applied;
+}
 
 }  // namespace panelglow

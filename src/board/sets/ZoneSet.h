@@ -48,14 +48,24 @@ class ZoneSet {
   [[nodiscard]] const ProbeSettings& Probe() const { return probe; }
   void SetProbeRate(int seconds) { probe.rate_s = seconds; }
 
+  /// When the zones were loaded, for logs.
+  [[nodiscard]] const std::string& StartTime() const { return startTime; }
+
   [[nodiscard]] bool IsSkipped(int zone) const;
   bool SetSkipped(int zone, bool skip);
 
   /// A reading in degrees; kFirstInvalidReading and above is none.
   int Read(int zone);
 
-  /// Reads the zone and judges it; true when at least one limit applied.
+  /// Reads the zone and judges it; true when at least one limit applied. A reading that is none is false and only
+  /// counted as such.
   bool Check(int zone, ZoneCheck& check);
+
+  // The parts of a check: the reading (false when it is none), and what its last reading is by the one limit and by
+  // the other (false when there is no such limit).
+  bool Measure(int zone, int& value);
+  bool JudgeHigh(int zone, bool& high);
+  bool JudgeLow(int zone, bool& low);
 
   /// Whether the processor has throttled itself: 1 at the low threshold, 3 at the high one, else 0.
   int ReadProchot(int zone);
@@ -66,11 +76,15 @@ class ZoneSet {
 
  private:
   [[nodiscard]] TempZone* At(int zone);
+  [[nodiscard]] TempZone ReadZone(const std::string& prefix) const;
+  void AddZone(TempZone zone, const std::string& prefix, std::vector<TempZone>& list) const;
+  void LimitByTjMax(TempZone& zone) const;
 
   ChipFinder chipOf;
   std::vector<TempZone> zones;
   std::vector<ZoneGroup> groups;
   ProbeSettings probe;
+  std::string startTime;
 };
 
 }  // namespace panelglow

@@ -57,16 +57,15 @@ void VideoChip::FindCards() {
   }
 }
 
-std::size_t VideoChip::CountCards() {
+int VideoChip::CountCards() {
   if (!cards) {
     FindCards();
   }
-  return cards->size();
+  return static_cast<int>(cards->size());
 }
 
 const VideoChip::Card* VideoChip::CardAt(int zone) {
-  return zone >= 0 && static_cast<std::size_t>(zone) < CountCards() ? &(*cards)[static_cast<std::size_t>(zone)]
-                                                                    : nullptr;
+  return zone >= 0 && zone < CountCards() ? &(*cards)[static_cast<std::size_t>(zone)] : nullptr;
 }
 
 platform::GraphicsLibrary* VideoChip::LibraryOf(const Card& card) {

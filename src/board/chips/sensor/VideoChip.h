@@ -17,8 +17,7 @@ class VideoChip : public Chip {
  public:
   VideoChip() : Chip("videochip") {}
 
-  /// The graphics cards of the machine; a zone is one of them, from 0.
-  std::size_t CountCards();
+  int CountCards() override;
 
   /// The hottest of the card's sensors, in degrees. False for a card that there is not, one of a maker whose library
   /// is not known or not installed, and one without a sensor; people are told what is missing.

@@ -4,19 +4,22 @@
 #include <cstddef>
 #include <vector>
 
+#include "board/parts/ConfigMode.h"
+#include "board/parts/Lines.h"
 #include "harness/base/CDMUtil.h"
+#include "platform/Host.h"
 
 namespace panelglow {
 
 namespace {
 
-constexpr std::uint32_t kNetworkClass = 0x20000;
 constexpr std::uint16_t kMemoryBar = 0x18;
 constexpr std::uint64_t kBarFlags = 15;
 constexpr std::uint64_t kPinControl = 0xB8;
 constexpr std::uint32_t kOutputEnabled = 0x80000;
 constexpr std::uint32_t kOutputHigh = 0x800;
 constexpr std::int64_t kLargestId = 0xFFFF;
+constexpr std::uint32_t kPinSettle_ms = 10;
 
 using Dword = std::array<std::byte, 4>;
 
@@ -37,36 +40,79 @@ std::optional<DashController> DashController::Find(CDevio& client, const std::st
     ids[i] = static_cast<std::uint16_t>(id);
   }
   std::uint16_t location = 0;
-  std::uint64_t base = 0;
-  if (!client.FindPciDeviceByIds(kNetworkClass, ids[0], ids[1], ids[2], ids[3], location) ||
-      client.ReadPciBar(location, kMemoryBar, base) != 0 || (base & ~kBarFlags) == 0) {
-    return std::nullopt;
-  }
-  return DashController(client, (base & ~kBarFlags) + kPinControl);
+  return client.FindPciDeviceByIds(kNetworkClass, ids[0], ids[1], ids[2], ids[3], location) ? At(client, location)
+                                                                                            : std::nullopt;
 }
 
-bool DashController::Change(std::uint32_t clear, std::uint32_t set) const {
+std::optional<DashController> DashController::At(CDevio& client, std::uint16_t location) {
+  std::uint64_t base = 0;
+  if (client.ReadPciBar(location, kMemoryBar, base) != 0 || (base & ~kBarFlags) == 0) {
+    return std::nullopt;
+  }
+  return DashController(client, base & ~kBarFlags);
+}
+
+// The pin driven low, and high behind it whatever was seen; for the life of a ConfigMode.
+class DashController::LowPin {
+ public:
+  LowPin(const DashController& of, DashWatcher& by) : controller(of), watcher(by) {}
+  void EnterConfigMode() { isDriven = controller.SetOutput(false, watcher); }
+  void ExitConfigMode() { isDriven = controller.SetOutput(true, watcher); }
+
+  /// Whether the last change reached the controller.
+  [[nodiscard]] bool IsDriven() const { return isDriven; }
+
+ private:
+  const DashController& controller;
+  DashWatcher& watcher;
+  bool isDriven = false;
+};
+
+bool DashController::LineFollows(const std::function<int()>& readLine, DashWatcher& watcher) const {
+  const auto sees = [&](bool high) {
+    platform::TheHost().clock.Sleep(kPinSettle_ms);
+    const bool follows = readLine() == LineState(high);
+    watcher.See(high, follows);
+    return follows;
+  };
+  if (!Change(0, kOutputEnabled, watcher)) {
+    return false;
+  }
+  LowPin pin(*this, watcher);
+  bool followsLow = false;
+  {
+    const ConfigMode low(pin);
+    followsLow = pin.IsDriven() && sees(false);
+  }
+  return pin.IsDriven() && sees(true) && followsLow;
+}
+
+bool DashController::Change(std::uint32_t clear, std::uint32_t set, DashWatcher& watcher) const {
+  const std::uint64_t pins = base + kPinControl;
   const auto low = static_cast<std::uint32_t>(pins);
   const auto high = static_cast<std::uint32_t>(pins >> 32U);
   Dword bytes{};
-  if (devio->ReadPhysicalMemory64(low, high, sizeof bytes, bytes) == 0) {
-    return false;
-  }
+  const std::uint32_t read = devio->ReadPhysicalMemory64(low, high, sizeof bytes, bytes);
   std::uint32_t value = 0;
   for (std::size_t i = bytes.size(); i-- > 0;) {
     value = value << 8U | std::to_integer<std::uint32_t>(bytes[i]);
+  }
+  watcher.Read(pins, value, read);
+  if (read == 0) {
+    return false;
   }
   value = (value & ~clear) | set;
   for (std::size_t i = 0; i < bytes.size(); ++i) {
     bytes[i] = static_cast<std::byte>(value >> (8 * i));
   }
+  watcher.Write(pins, value);
   // A base below 4 GB is all that a 32-bit system has, and the wide request is not for it.
   return (high == 0 ? devio->WritePhysicalMemory(low, sizeof bytes, bytes)
                     : devio->WritePhysicalMemory64(low, high, sizeof bytes, bytes)) != 0;
 }
 
-bool DashController::EnableOutput() const { return Change(0, kOutputEnabled); }
-
-bool DashController::SetOutput(bool high) const { return Change(high ? 0 : kOutputHigh, high ? kOutputHigh : 0); }
+bool DashController::SetOutput(bool high, DashWatcher& watcher) const {
+  return Change(high ? 0 : kOutputHigh, high ? kOutputHigh : 0, watcher);
+}
 
 }  // namespace panelglow

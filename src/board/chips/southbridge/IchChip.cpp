@@ -31,8 +31,6 @@ constexpr std::uint8_t kIntruderPulled = 0xFD;
 constexpr std::uint8_t kIntruderFree = 0xFF;
 constexpr std::uint32_t kIntruderSettle_ms = 75;
 
-constexpr std::uint32_t kPinSettle_ms = 10;  // of the network controller
-
 // The intruder input held down; for the life of a ConfigMode.
 class PulledInput {
  public:
@@ -50,21 +48,6 @@ class PulledInput {
  private:
   CDevio& devio;
   bool staysPulled = false;
-};
-
-// The controller's pin driven low, and high behind it whatever was seen; for the life of a ConfigMode.
-class LowPin {
- public:
-  explicit LowPin(const DashController& of) : controller(of) {}
-  void EnterConfigMode() { isDriven = controller.SetOutput(false); }
-  void ExitConfigMode() { isDriven = controller.SetOutput(true); }
-
-  /// Whether the last change reached the controller.
-  [[nodiscard]] bool IsDriven() const { return isDriven; }
-
- private:
-  const DashController& controller;
-  bool isDriven = false;
 };
 
 }  // namespace
@@ -242,22 +225,9 @@ bool IchChip::DetectDashCable(int line, const std::string& idList) {
   if (!HasLine(line)) {
     return false;
   }
+  DashWatcher nobody;
   const std::optional<DashController> controller = DashController::Find(devio, idList);
-  if (!controller || !controller->EnableOutput()) {
-    return false;
-  }
-  LowPin pin(*controller);
-  bool followsLow = false;
-  {
-    const ConfigMode low(pin);
-    followsLow = pin.IsDriven() && ReadsAfterSettling(line, kNotAsserted);
-  }
-  return pin.IsDriven() && ReadsAfterSettling(line, kAsserted) && followsLow;
-}
-
-bool IchChip::ReadsAfterSettling(int line, int state) {
-  platform::TheHost().clock.Sleep(kPinSettle_ms);
-  return ReadLine(line) == state;
+  return controller && controller->LineFollows([&] { return ReadLine(line); }, nobody);
 }
 
 }  // namespace panelglow

@@ -62,7 +62,6 @@ class IchChip : public Chip {
 
   /// Makes the latch set itself, and clears it. False when it stays clear.
   bool PullIntruderInput();
-  bool ReadsAfterSettling(int line, int state);
   bool IsLatched();
 
   std::uint16_t pmbar;
