@@ -60,10 +60,10 @@ TEST(GCodecChip, WithoutADriverALampTakesItsTimeAndDoesNothing) {
 }
 
 TEST(GCodecChip, ALampIsThreeVerbsWithTheSavedPinsAndItsOwn) {
-  // Registers that never change: always idle, always with the answer 0xABCD0004.
+  // Registers that never change: always idle, always with the answer 0xABCD0085.
   KeyBench bench(
       "chip = [{name = \"hda\", kind = \"memory-registers\", base = 0xFE0F0000,"
-      " initial = [0, 0, 0, 0, 0x04, 0x00, 0xCD, 0xAB, 2, 0]}]\n",
+      " initial = [0, 0, 0, 0, 0x85, 0x00, 0xCD, 0xAB, 2, 0]}]\n",
       "chip.codec.hdabar=0xFE0F0000\nchip.g_codec.codec.icw.reg=0\nchip.g_codec.codec.irr.reg=4\n"
       "chip.g_codec.codec.ics.reg=8\n",
       kVerbs);
@@ -117,12 +117,15 @@ TEST(GCodecChip, AListWithoutExactlyThreeVerbsServesNoLamp) {
 
 TEST(GCodecChip, ItsControllerIsFoundByPlaceOrByTheFilesBase) {
   const auto base = [](const std::string& settings) {
-    KeyBench bench("pci = [{device = 0x1B, function = 2, registers = {\"10\" = 0xF7F10004, \"14\" = 0}}]\n", settings,
-                   "");
+    KeyBench bench(
+        "pci = [{device = 0x1B, function = 2, registers = {\"10\" = 0xF7F10004, \"14\" = 0}},"
+        " {bus = 5, device = 0x1B, function = 2, registers = {\"14\" = 0xE7F10004, \"18\" = 0}}]\n",
+        settings, "");
     GCodecChip chip;
     return bench.Traffic([&] { chip.SendVerb(1); }).substr(0, 8);
   };
   EXPECT_EQ(base("chip.codec.pciloc=0x001B0210\nchip.codec.hdabar=0xFE0F0000\n"), "F7F10060");
+  EXPECT_EQ(base("chip.codec.pciloc=0x051B0214\n"), "E7F10060");
   EXPECT_EQ(base("chip.codec.pciloc=0x001B0110\nchip.codec.hdabar=0xF0000000\n"), "F0000060");  // nothing there
   for (const char* settings : {"", "chip.codec.hdabar=15\n", "chip.codec.pciloc=0x001B0110\n"}) {
     EXPECT_THAT([&] { base(settings); },
@@ -186,7 +189,7 @@ TEST(CaslChip, FansAndTemperaturesAreItemsOfCountedRecords) {
 }
 
 TEST(CaslChip, WhatAnEarlierRecordLeftBehindTheLastFanIsNoFan) {
-  ChipBench bench(std::string(kFirmware) + "fault = \"stale-record\"\n");
+  KeyBench bench(std::string(kFirmware) + "fault = \"stale-record\"\n");
   int value = 0;
   EXPECT_TRUE(CaslChip().ReadFanRpm(0, value, 100));
   EXPECT_FALSE(CaslChip().ReadFanRpm(2, value, 100) || CaslChip().ReadFanRpm(-1, value, 100));
