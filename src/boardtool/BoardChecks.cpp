@@ -360,7 +360,7 @@ class BoardCheck {
           continue;
         }
         if (isChipFile ? readKeys.contains(key) && readSections.contains(section)
-                       : lookUps_.contains({file.path, section, key})) {
+                       : lookUps_.contains({file.path, section, key}) || KnownKeys::IsReadElsewhere(key)) {
           continue;
         }
         if (Known().IsKnown(key, isChipFile)) {

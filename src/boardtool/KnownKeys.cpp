@@ -1,5 +1,6 @@
 #include "boardtool/KnownKeys.h"
 
+#include <algorithm>
 #include <array>
 
 #include "board/ChipTable.h"
@@ -13,15 +14,25 @@ constexpr const char* kOwnSection = "own";
 constexpr const char* kOwnPrefix = "chip.own.";
 constexpr const char* kBaseKey = "base";
 
-// Read by the tests themselves, not by the board library.
-constexpr std::array kOfTheTests{"test.panelglow.network.1.name", "test.panelglow.network.1.msgid",
-                                 "test.powerled.color.1.msgid", "test.powerled.color.2.msgid"};
+// Read by the tests themselves, or only on a machine with such a processor or card.
+constexpr std::array kReadElsewhere{"test.panelglow.network.1.name",
+                                    "test.panelglow.network.1.msgid",
+                                    "test.powerled.color.1.msgid",
+                                    "test.powerled.color.2.msgid",
+                                    "test.tempcaution.processor.1.manufacturer",
+                                    "test.tempcaution.processor.1.familyid",
+                                    "test.tempcaution.processor.1.mechanism",
+                                    "test.tempcaution.processor.1.maxtempreg",
+                                    "test.tempcaution.processor.1.tempprobereg",
+                                    "test.tempcaution.processor.1.tjmax",
+                                    "test.graphics.1.pci_ids",
+                                    "test.graphics.1.temp_zones",
+                                    "test.graphics.1.upper_threshold",
+                                    "test.graphics.1.lower_threshold"};
 
 // What the numbered lists need so that their first entry is read.
 constexpr const char* kLists =
-    "chip.codec.hdabar=0xFE000000\nchip.own.ec.set_pwm.cmd=1\n"
-    "test.tempcaution.processor.1.manufacturer=x\ntest.tempcaution.processor.1.familyid=1\n"
-    "test.tempcaution.processor.1.mechanism=msr\ntest.graphics.1.PCI_IDS=1 2\n"
+    "chip.codec.hdabar=0xFE000000\n"
     "detect.fan.1.name=x\ndetect.fan.1.tach.chip=ich\ndetect.jumper.1.name=x\ndetect.frontpanel.1.name=x\n"
     "detect.security.1.name=x\ndetect.cable.1.name=x\ndetect.powereddevice.1.name=x\ndetect.heatsink.name=x\n"
     "detect.heatsink.cpufanname=x\ndetect.dashcable.name=x\ndetect.riser.name=x\ndetect.internalspeaker.is_present="
@@ -34,20 +45,6 @@ constexpr const char* kLists =
 constexpr std::array kLedKeys{"test.powerled.chip",    "test.chargeled.chip",  "test.hdled.chip",
                               "test.wirelessled.chip", "test.speakerled.chip", "test.microphoneled.chip",
                               "test.powerbutton.chip", "test.tempcaution.chip"};
-
-// Numbers in keys count things.
-std::string PatternOf(const std::string& key) {
-  std::string pattern;
-  for (const char c : key) {
-    const bool isDigit = c >= '0' && c <= '9';
-    if (!isDigit) {
-      pattern += c;
-    } else if (pattern.empty() || pattern.back() != '#') {
-      pattern += '#';
-    }
-  }
-  return pattern;
-}
 
 bool IsGenericEc(std::string_view chip) { return chip == "g_ec" || chip == "g_ec_it8519"; }
 
@@ -83,12 +80,32 @@ KnownKeys::KnownKeys(const BoardFiles& names, platform::Host& machine) {
   for (const char* const board : {"Orchard", "Lantern"}) {
     gather("MotherboardClass=" + std::string(board) + "\n", "");
   }
-  for (const char* const key : kOfTheTests) {
+  for (const char* const key : kReadElsewhere) {
     boardPatterns_.insert(PatternOf(key));
     board_.emplace_back(key);
   }
   chipPatterns_.insert(kBaseKey);
   chip_.emplace_back(kBaseKey);
+}
+
+// Numbers in keys count things.
+std::string KnownKeys::PatternOf(const std::string& key) {
+  std::string pattern;
+  for (const char c : key) {
+    const bool isDigit = c >= '0' && c <= '9';
+    if (!isDigit) {
+      pattern += c;
+    } else if (pattern.empty() || pattern.back() != '#') {
+      pattern += '#';
+    }
+  }
+  return pattern;
+}
+
+bool KnownKeys::IsReadElsewhere(const std::string& key) {
+  const std::string pattern = PatternOf(key);
+  return std::any_of(kReadElsewhere.begin(), kReadElsewhere.end(),
+                     [&](const char* known) { return PatternOf(known) == pattern; });
 }
 
 bool KnownKeys::IsKnown(const std::string& key, bool isChipFile) const {

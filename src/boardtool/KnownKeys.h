@@ -18,6 +18,12 @@ class KnownKeys {
   /// A key in lower case, of the chip file or of the two others.
   [[nodiscard]] bool IsKnown(const std::string& key, bool isChipFile) const;
 
+  /// True when no rehearsal can tell whether a board reads the key: it hangs on the machine, or a test reads it.
+  [[nodiscard]] static bool IsReadElsewhere(const std::string& key);
+
+  /// The form of a key in which numbers do not differ.
+  [[nodiscard]] static std::string PatternOf(const std::string& key);
+
   /// Keys to suggest; a number stands as 1.
   [[nodiscard]] const std::vector<std::string>& All(bool isChipFile) const { return isChipFile ? chip_ : board_; }
 
