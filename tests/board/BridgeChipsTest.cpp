@@ -356,7 +356,7 @@ TEST(BridgeChips, WhatIsHeldForAMomentIsLetGoWhereverTheThreadEnds) {
   };
   for (const Case& c : kCases) {
     bool isDone = false;
-    for (platform::sim::Microseconds after_us = 0; !isDone; after_us += after_us < 60 ? 1 : 5000) {
+    for (platform::sim::Microseconds after_us = 0; !isDone; after_us += after_us < 60 ? 2 : 5000) {
       AnsweringBench bench(Answers{{0x1293, {0xFF}}, {0xF866, {0x01}}, {0xF867, {0}}, {0xCD6, {0}}, {0xCD7, {0x40}}},
                            "", true, kController);
       platform::sim::Buses& hardware = bench.machine.Hardware();

@@ -294,13 +294,25 @@ const KeyRow kKeys[] = {
          Under("codecgpio.state.", "set.sequence save.sequence restore.sequence")},
 };
 
-// What a machine must have for a class to get as far as its last key.
-constexpr const char* kHardware =
-    "libraries = ['nvapi.dll']\nfirmware_call = {radio = [{number = 1, offset = 6, on = true}], fan = [{speed = 24, "
-    "duty = 0x60}], temperatures = "
-    "[41]}\n[[firmware.processor]]\n[driver.msr]\n\"1A2\" = 0x640000\n"
-    "\"19C\" = 0x280000\n[[pci]]\ndevice = 1\nregisters = { 0 = 0x1C0310DE, 8 = 0x03000000 }\n"
-    "temperatures = [40]\n";
+// What a machine must have for a class to get as far as its last key; and a controller that is always ready.
+constexpr const char* kHardware = R"(
+libraries = ["nvapi.dll"]
+firmware_call = {radio = [{number = 1, offset = 6}], fan = [{speed = 24, duty = 0x60}], temperatures = [41]}
+[[chip]]
+name = "controller"
+kind = "gpio-block"
+base = 0x65
+outputs = 0
+inputs = 0x01
+[[firmware.processor]]
+[driver.msr]
+"1A2" = 0x640000
+"19C" = 0x280000
+[[pci]]
+device = 1
+registers = { 0 = 0x1C0310DE, 8 = 0x03000000 }
+temperatures = [40]
+)";
 constexpr const char* kNeeded =
     "chip.own.ec.set_pwm.cmd=1\nchip.codec.hdabar=0xFE5C0000\ntest.graphics.1.PCI_IDS=10DE 1C03\n"
     "test.tempcaution.processor.1.manufacturer=Intel\ntest.tempcaution.processor.1.familyid=6\n"
