@@ -165,7 +165,10 @@ std::string ByteName(const ImaginedHardware::Cell& cell) {
 std::string LedText(const BoardPlan& plan, const LedPlan& led, const Files& files, const Weights& weights) {
   std::string text = "\n" + std::string(led.led->id) + ": " + std::string(led.led->title) + "\n";
   const std::string decided = Decided(plan, files, std::string(led.led->chipKey));
-  text += Line("  chip      ", decided.empty() ? "no key \"" + std::string(led.led->chipKey) + "\" chooses one" : "",
+  text += Line("  chip      ",
+               decided.empty() ? "no key \"" + std::string(led.led->chipKey) + "\" chooses one" +
+                                     (led.IsLit() ? ": the board's class lights it itself" : "")
+                               : "",
                decided);
   if (!led.failure.empty()) {
     text += "  ends with  " + led.failure + "\n";

@@ -8,11 +8,11 @@
 
 #include "boardtool/BoardOnMachine.h"
 #include "boardtool/CapturedDrivers.h"
+#include "boardtool/HostWith.h"
 #include "boardtool/Machine.h"
 #include "boardtool/Readings.h"
 #include "boardtool/Rehearsal.h"
 #include "boardtool/Table.h"
-#include "boardtool/TraceText.h"
 #include "hw/PciDeviceList.h"
 #include "hw/SMBIOSDiscovery.h"
 #include "hw/WMIDiscovery.h"
@@ -143,7 +143,7 @@ class ReportMaker {
     platform::Host& machine = platform::TheHost();
     MakeLeds(machine);
     CapturedDrivers drivers(machine.drivers);
-    platform::Host captured = HostWith(machine, drivers, machine.clock, machine.services);
+    platform::Host captured = HostWith(machine, {.drivers = &drivers});
     const platform::HostInPlace inPlace(captured);
     std::optional<BoardOnMachine> board;
     Json registers = Json::object();

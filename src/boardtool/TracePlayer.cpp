@@ -4,6 +4,7 @@
 #include <sstream>
 
 #include "boardtool/AlwaysRunningServices.h"
+#include "boardtool/HostWith.h"
 #include "boardtool/Installation.h"
 #include "boardtool/Trace.h"
 #include "boardtool/TraceText.h"
@@ -185,7 +186,8 @@ std::shared_ptr<TraceScript> ScriptIn(const std::string& path) {
 
 struct TracePlayer::Parts {
   Parts(const std::string& path, platform::Host& machine)
-      : script(ScriptIn(path)), host(HostWith(machine, drivers, clock, services)) {}
+      : script(ScriptIn(path)),
+        host(HostWith(machine, {.clock = &clock, .drivers = &drivers, .services = &services})) {}
   std::shared_ptr<TraceScript> script;
   PlayedDrivers drivers{script};
   PlayedClock clock{script};

@@ -1,6 +1,7 @@
 #include <mutex>
 
 #include "boardtool/HardwareAccess.h"
+#include "boardtool/HostWith.h"
 #include "boardtool/Installation.h"
 #include "boardtool/Trace.h"
 #include "boardtool/TraceText.h"
@@ -114,7 +115,7 @@ struct TraceRecorder::Parts {
   Parts(const std::string& filePath, platform::Host& machine)
       : path(filePath),
         file(std::make_shared<TraceFile>(filePath)),
-        host(HostWith(machine, drivers, clock, machine.services)),
+        host(HostWith(machine, {.clock = &clock, .drivers = &drivers})),
         drivers(machine.drivers, file),
         clock(machine.clock, file) {}
   std::string path;

@@ -12,6 +12,7 @@
 #include "board/base/BoardDevio.h"
 #include "boardtool/BoardOnMachine.h"
 #include "boardtool/HardwareAccess.h"
+#include "boardtool/HostWith.h"
 #include "boardtool/Installation.h"
 #include "boardtool/MemoryFiles.h"
 #include "boardtool/RecordedProfiles.h"
@@ -190,35 +191,12 @@ class WalkFiles {
 class WalkHost {
  public:
   WalkHost(const std::vector<IniOutline>& files, const platform::Host& machine)
-      : profiles_(files), files_(profiles_), host_(With(machine, profiles_, files_)), inPlace_(host_) {}
+      : profiles_(files),
+        files_(profiles_),
+        host_(HostWith(machine, {.files = &files_, .profiles = &profiles_})),
+        inPlace_(host_) {}
 
  private:
-  static platform::Host With(const platform::Host& machine, platform::ProfileFiles& profiles,
-                             platform::Files& files) {
-    return {.cameras = machine.cameras,
-            .clock = machine.clock,
-            .connections = machine.connections,
-            .console = machine.console,
-            .cpu = machine.cpu,
-            .desktop = machine.desktop,
-            .deviceTree = machine.deviceTree,
-            .drivers = machine.drivers,
-            .environment = machine.environment,
-            .files = files,
-            .images = machine.images,
-            .keyboard = machine.keyboard,
-            .management = machine.management,
-            .modules = machine.modules,
-            .mutexes = machine.mutexes,
-            .profiles = profiles,
-            .rawDisks = machine.rawDisks,
-            .registry = machine.registry,
-            .services = machine.services,
-            .threads = machine.threads,
-            .touchpad = machine.touchpad,
-            .xmlDocuments = machine.xmlDocuments};
-  }
-
   RecordedProfiles profiles_;
   MemoryFiles files_;
   platform::Host host_;
