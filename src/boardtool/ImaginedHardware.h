@@ -45,7 +45,7 @@ class ImaginedHardware {
     int indexPort = -1;
     int logicalDevice = -1;
     std::uint64_t address = 0;  // of the port, byte of memory, or PCI location and register; a register's number
-    auto operator<=>(const Cell&) const = default;
+    auto operator<=>(const Cell&) const = default;  // NOLINT(modernize-use-nullptr): the check misreads it
   };
 
   /// The bytes that were written, as they are now, but for index ports and what steers the access to others.

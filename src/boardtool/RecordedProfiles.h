@@ -17,7 +17,7 @@ struct LookUp {
   std::string path;
   std::string section;
   std::string key;
-  auto operator<=>(const LookUp&) const = default;
+  auto operator<=>(const LookUp&) const = default;  // NOLINT(modernize-use-nullptr): the check misreads it
 };
 
 class RecordedProfiles : public platform::ProfileFiles {

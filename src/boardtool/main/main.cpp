@@ -27,8 +27,8 @@ using namespace panelglow::boardtool;
 constexpr int kWrongCall = 2;
 constexpr int kCouldNotRun = 3;
 
-int Complain(int code, const std::string& problem) {
-  std::fprintf(stderr, "panelglow-board: %s\n", problem.c_str());
+int Complain(int code, const char* problem) {
+  std::fprintf(stderr, "panelglow-board: %s\n", problem);
   return code;
 }
 
@@ -95,11 +95,13 @@ class Program {
   }
 
   int Run(int argc, char** argv) {
-    app_.parse(argc, argv);
+    try {
+      app_.parse(argc, argv);
+    } catch (const CLI::ParseError& answer) {  // a call for help, too
+      return app_.exit(answer) == 0 ? 0 : kWrongCall;
+    }
     return OnMachine(between_, run_);
   }
-
-  int Exit(const CLI::Error& error) const { return app_.exit(error); }
 
  private:
   void AddExplain() {
@@ -202,16 +204,8 @@ class Program {
 }  // namespace
 
 int main(int argc, char** argv) {
-  Program program;
   try {
-    return program.Run(argc, argv);
-  } catch (const CLI::CallForHelp& call) {
-    return program.Exit(call);
-  } catch (const CLI::CallForAllHelp& call) {
-    return program.Exit(call);
-  } catch (const CLI::ParseError& wrong) {
-    program.Exit(wrong);
-    return kWrongCall;
+    return Program().Run(argc, argv);
   } catch (const WrongCall& wrong) {
     return Complain(kWrongCall, wrong.what());
   } catch (const std::exception& problem) {
