@@ -44,7 +44,8 @@ TEST(SystemBoardTool, HelpsAnybodyAndTellsWrongCallsFromWhatCannotBe) {
     const char* says;
   };
   for (const Call& call :
-       {Call{{}, 2, "subcommand"}, Call{{"explian"}, 2, ""}, Call{{"explain"}, 2, "--board"},
+       {Call{{}, 2, "name a verb: explain, check, report,"}, Call{{"explian"}, 2, "name a verb: explain"},
+        Call{{"replay", "ui.xml"}, 2, "name the verb that the trace is played to"}, Call{{"explain"}, 2, "--board"},
         Call{{"explain", "--board", "7D10", "lamp"}, 2, "there is no LED \"lamp\": name one of power-"},
         Call{{"explain", "--board", "7D10", "--folder", "none"}, 3, "can be read: start in the folder"},
         Call{{"explain", "--board", "0000"}, 1, ""}, Call{{"check", "--format", "xml"}, 2, ""},
@@ -193,7 +194,8 @@ TEST(SystemBoardTool, ATraceAnswersInPlaceOfTheMachine) {
   for (const Damage& damage :
        {Damage{"control 220010 200a", "control 220010 210a", "damaged:6: the trace has"},
         Damage{"board 7D10\n", "board 7D10\nopen x 0\n", "damaged:4: the trace has \"open x 0\""},
-        Damage{" 0 00 ;", " 0 zz ;", "a number is missing or damaged"}, Damage{" 0 00 ;", " 0 0000 ;", "an answer of 1 bytes"},
+        Damage{" 0 00 ;", " 0 zz ;", "a number is missing or damaged"},
+        Damage{" 0 00 ;", " 0 0000 ;", "an answer of 1 bytes"},
         Damage{"sleep 32", "sleep 33", "where the program asks \"sleep 32\""}}) {
     std::string damaged = trace;
     damaged.replace(damaged.find(damage.from), std::string(damage.from).size(), damage.to);

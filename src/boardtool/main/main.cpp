@@ -98,12 +98,26 @@ class Program {
     try {
       app_.parse(argc, argv);
     } catch (const CLI::ParseError& answer) {  // a call for help, too
+      if (answer.get_exit_code() != 0 && app_.get_subcommands().empty()) {
+        throw WrongCall("name a verb: " + Verbs() + "; --help says what each is for");
+      }
       return app_.exit(answer) == 0 ? 0 : kWrongCall;
+    }
+    if (!run_) {
+      throw WrongCall("name the verb that the trace is played to, behind its file");
     }
     return OnMachine(between_, run_);
   }
 
  private:
+  std::string Verbs() {
+    std::string names;
+    for (const CLI::App* const verb : app_.get_subcommands({})) {
+      names += (names.empty() ? "" : ", ") + verb->get_name();
+    }
+    return names;
+  }
+
   void AddExplain() {
     CLI::App& verb = *app_.add_subcommand(
         "explain", "The requests to the hardware by which a board's LEDs are lit; needs no hardware");
