@@ -1,6 +1,7 @@
 #include "boardtool/Check.h"
 
 #include <algorithm>
+#include <array>
 
 #include "boardtool/BoardChecks.h"
 #include "boardtool/ControllerChecks.h"
@@ -19,6 +20,37 @@ std::string FolderOf(const std::string& path) {
   return slash == std::string::npos ? "." : path.substr(0, slash);
 }
 
+constexpr std::array kFileNames{"mbdetect.ini",
+                                "mbtest.ini",
+                                "chip.ini",
+                                "msctrl.ini",
+                                "ui.xml",
+                                "buttondefinition.xml",
+                                "panelglow-diags.msg",
+                                "nonui_panelglow-diags.msg",
+                                "x_panelglow-diags.msg"};
+
+// The files that are asked for, by the paths that findings have.
+std::vector<std::string> PathsOf(const CheckOptions& options) {
+  std::vector<std::string> paths;
+  for (const std::string& path : options.files) {
+    const std::string name = FileNameOf(path);
+    if (std::find(kFileNames.begin(), kFileNames.end(), name) == kFileNames.end()) {
+      std::string names;
+      for (const char* const known : kFileNames) {
+        names += (names.empty() ? "" : ", ") + std::string(known);
+      }
+      throw WrongCall("the files of an installation are called " + names + "; " + path + " is none of them");
+    }
+    if (FolderOf(path) != FolderOf(options.files.front())) {
+      throw WrongCall("the files of one installation lie in one folder: " + path + " does not lie in " +
+                      FolderOf(options.files.front()));
+    }
+    paths.push_back(PathIn(FolderOf(path), name));
+  }
+  return paths;
+}
+
 bool IsSilenced(const Finding& finding, const std::vector<IniOutline>& files) {
   return std::any_of(files.begin(), files.end(), [&](const IniOutline& file) {
     return file.path == finding.path && file.IsSilenced(finding.line, finding.rule->name);
@@ -29,15 +61,8 @@ bool IsSilenced(const Finding& finding, const std::vector<IniOutline>& files) {
 
 std::vector<Finding> FindingsOf(const CheckOptions& options, platform::Host& machine) {
   Findings findings;
-  std::string folder = options.folder;
-  if (!options.files.empty()) {
-    folder = FolderOf(options.files.front());
-    for (const std::string& path : options.files) {
-      if (FolderOf(path) != folder) {
-        throw WrongCall("the files of one installation lie in one folder: " + path + " does not lie in " + folder);
-      }
-    }
-  }
+  const std::vector<std::string> asked = PathsOf(options);
+  const std::string folder = options.files.empty() ? options.folder : FolderOf(options.files.front());
   const BoardFiles names = BoardFilesIn(folder);
   std::vector<IniOutline> files;
   for (const std::string& path : {names.detectPath, names.testPath, names.chipPath}) {
@@ -62,8 +87,7 @@ std::vector<Finding> FindingsOf(const CheckOptions& options, platform::Host& mac
   }
   std::vector<Finding> sorted = findings.Sorted();
   std::erase_if(sorted, [&](const Finding& finding) {
-    const bool isAsked = options.files.empty() ||
-                         std::find(options.files.begin(), options.files.end(), finding.path) != options.files.end();
+    const bool isAsked = asked.empty() || std::find(asked.begin(), asked.end(), finding.path) != asked.end();
     return !isAsked || IsSilenced(finding, files);
   });
   return sorted;

@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "boardtool/Check.h"
+#include "boardtool/Installation.h"
 #include "platform/HostInPlace.h"
 #include "platform/sim/Simulation.h"
 
@@ -227,6 +228,13 @@ TEST(Check, TellsOfTheFilesThatItIsAskedForAndNotTooMuch) {
   EXPECT_EQ(std::count(findings.begin(), findings.end(), '\n'), 50);
   EXPECT_NE(findings.find("(and 10 more like this in the file)"), std::string::npos);
   EXPECT_EQ(findings.find("icon"), std::string::npos);
+  options.files = {"./mbtest.ini", "./chip.ini"};
+  EXPECT_EQ(FindingsIn(files, options), findings);
+  for (const std::vector<std::string>& wrong :
+       {std::vector<std::string>{"mbtset.ini"}, {"mbtest.ini", "a/chip.ini"}}) {
+    options.files = wrong;
+    EXPECT_THROW(FindingsIn(files, options), WrongCall);
+  }
 }
 
 TEST(Check, FindsNothingInWhatIsShipped) {
