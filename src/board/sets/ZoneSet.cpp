@@ -30,8 +30,8 @@ constexpr int kAtHigh = 3;
 void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kNote, text); }
 
 // Limits come from files: sums of them stay numbers.
-int Sum(int limit, int difference) {
-  const std::int64_t sum = std::int64_t{limit} + difference;
+int Sum(std::int64_t limit, std::int64_t difference) {
+  const std::int64_t sum = limit + difference;
   return static_cast<int>(
       std::clamp<std::int64_t>(sum, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()));
 }
@@ -150,7 +150,7 @@ void ZoneSet::LimitByTjMax(TempZone& zone) const {
     if (!chipOf(zone.chip).ReadThreshold(zone.index, zone.tjMax)) {
       return;
     }
-    threshold = Sum(zone.tjMax, -delta);
+    threshold = Sum(zone.tjMax, -std::int64_t{delta});
     Log(zone.name + " : TjMax value using MSR " + sign + " " + CDMUtil::ToString(zone.tjMax));
     Log(zone.name + " : Max threshold value (TjMax - Delta) " + sign + " " + CDMUtil::ToString(threshold));
   };

@@ -38,10 +38,10 @@ struct DeviceMaker {
     return std::make_unique<HdaCodec>(setup, time);
   }
   std::unique_ptr<Device> operator()(const IndexedRegistersSetup& setup) const {
-    return std::make_unique<IndexedRegisters>(setup);
+    return std::make_unique<IndexedRegisters>(setup, time);
   }
   std::unique_ptr<Device> operator()(const PortRegistersSetup& setup) const {
-    return std::make_unique<PortRegisters>(setup);
+    return std::make_unique<PortRegisters>(setup, time);
   }
   std::unique_ptr<Device> operator()(const SmbusHostSetup& setup) const {
     return std::make_unique<SmbusHost>(setup, time);

@@ -145,8 +145,9 @@ void DeviceInventory::AddPciFunctions(const MachineDescription& machine, DeviceN
     if (controller != machine.controllers.end()) {
       node = AddController(machine, *controller, bridge);
     } else {
-      node =
-          Add(bridge, {.instanceId = PciInstanceId(*function), .description = "PCI device", .classId = kSystemClass});
+      node = Add(
+          bridge,
+          {.instanceId = PciInstanceId(*function), .description = function->description, .classId = kSystemClass});
     }
     entries_[node - 1].hardwareIds = PciHardwareIds(*function);
     entries_[node - 1].location = LocationText(*function);

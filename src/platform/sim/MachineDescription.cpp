@@ -90,6 +90,7 @@ void ReadPci(Section& section, MachineDescription& machine) {
     }
   });
   function.temperatures = section.Numbers<int>("temperatures");
+  function.description = section.Get("description", function.description);
   machine.pci.push_back(function);
 }
 

@@ -14,6 +14,29 @@ PortRegistersSetup ReadPortRegisters(Section& section) {
   setup.registers = section.AddressedBytes<std::uint16_t>("registers");
   setup.clearByOne = section.AddressedBytes<std::uint16_t>("clear_by_one");
   setup.readOnly = section.AddressedBytes<std::uint16_t>("read_only");
+  setup.lasting = section.AddressedBytes<std::uint16_t>("lasting");
+  section.Each("press", [&](Section& entry) {
+    setup.presses.push_back({.offset = entry.Number<std::uint16_t>("register"),
+                             .mask = entry.Number<std::uint8_t>("mask"),
+                             .from_us = Microseconds{entry.Get<std::uint32_t>("from_ms", 0)} * 1000,
+                             .until_us = Microseconds{entry.Number<std::uint32_t>("until_ms")} * 1000,
+                             .isLow = entry.Get("low", false)});
+  });
+  section.Each("bolt", [&](Section& entry) {
+    PortBolt bolt;
+    bolt.command = entry.Number<std::uint16_t>("command");
+    bolt.lock = entry.Get("lock", bolt.lock);
+    bolt.unlock = entry.Get("unlock", bolt.unlock);
+    bolt.level = entry.Number<std::uint16_t>("level");
+    bolt.unlocked = entry.Number<std::uint8_t>("unlocked");
+    for (const char* key : {"command", "level"}) {
+      if (setup.registers.count(entry.Number<std::uint16_t>(key)) == 0) {
+        entry.Refuse(key, "must be a register that is told");
+      }
+    }
+    bolt.move_us = Microseconds{entry.Get<std::uint32_t>("move_ms", 8)} * 1000;
+    setup.bolts.push_back(bolt);
+  });
   section.Each("lines", [&](Section& entry) {
     const auto offset = [&](std::string_view key) {
       const auto first = entry.Number<std::uint16_t>(key);

@@ -60,6 +60,42 @@ SuperIoLines ReadLines(Section& section) {
   return lines;
 }
 
+FanSetup ReadFan(Section& section) {
+  FanSetup fan;
+  fan.isPlugged = section.Get("plugged", fan.isPlugged);
+  fan.tachHigh = section.Number<std::uint8_t>("tach_high");
+  fan.tachLow = section.Number<std::uint8_t>("tach_low");
+  fan.clock = section.Get("clock", fan.clock);
+  fan.stopped = section.Get("stopped", fan.stopped);
+  fan.duty = OptionalByte(section, "duty");
+  fan.stall = section.Get("stall", fan.stall);
+  fan.full_rpm = section.Get<std::uint16_t>("full_rpm", static_cast<std::uint16_t>(fan.full_rpm));
+  fan.ramp_rpm = section.Get<std::uint16_t>("ramp_rpm", static_cast<std::uint16_t>(fan.ramp_rpm));
+  fan.mode = OptionalByte(section, "mode");
+  fan.manual = section.Get("manual", fan.manual);
+  fan.automatic = section.Get("automatic", fan.automatic);
+  return fan;
+}
+
+CoolingSetup ReadCooling(Section& section) {
+  CoolingSetup cooling;
+  section.Each("fan", [&](Section& fan) { cooling.fans.push_back(ReadFan(fan)); });
+  section.Each("sensor", [&](Section& entry) {
+    SensorSetup sensor;
+    sensor.address = entry.Number<std::uint8_t>("register");
+    sensor.still = entry.Get("still", sensor.still);
+    sensor.cooled = entry.Get("cooled", sensor.cooled);
+    const auto fan = entry.Number<std::uint8_t>("fan");
+    if (fan == 0 || fan > cooling.fans.size()) {
+      entry.Refuse("fan", "must be the number of a fan of this chip, from 1");
+    }
+    sensor.fan = fan - std::size_t{1};
+    sensor.ramp_mdeg = entry.Get<std::uint16_t>("ramp_mdeg", static_cast<std::uint16_t>(sensor.ramp_mdeg));
+    cooling.sensors.push_back(sensor);
+  });
+  return cooling;
+}
+
 }  // namespace
 
 SuperIoLed ReadLedPin(Section& section) {
@@ -98,6 +134,7 @@ IndexedRegistersSetup ReadIndexedRegisters(Section& section) {
   setup.registers = section.AddressedBytes<std::uint8_t>("registers");
   section.Each("banks", [&](Section& banks) { setup.banks = ReadBanks(banks); });
   setup.readOnly = ByteSet(section, "read_only");
+  setup.cooling = ReadCooling(section);
   return setup;
 }
 

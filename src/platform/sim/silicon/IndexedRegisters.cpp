@@ -17,10 +17,18 @@ std::optional<std::uint8_t> HexByte(std::string_view text) {
 
 }  // namespace
 
-IndexedRegisters::IndexedRegisters(const IndexedRegistersSetup& setup) : setup_(setup) {
+IndexedRegisters::IndexedRegisters(const IndexedRegistersSetup& setup, const Scheduler& time)
+    : setup_(setup),
+      time_(time),
+      cooling_(setup.cooling, [this](std::uint8_t address) { return Register(address); }) {
   if (setup_.banks) {
     banks_.emplace(*setup_.banks);
   }
+}
+
+std::uint8_t IndexedRegisters::Register(std::uint8_t address) const {
+  const auto found = setup_.registers.find(address);
+  return found == setup_.registers.end() ? std::uint8_t{0xFF} : found->second;
 }
 
 std::uint8_t IndexedRegisters::ReadPort(std::uint16_t port) {
@@ -30,11 +38,12 @@ std::uint8_t IndexedRegisters::ReadPort(std::uint16_t port) {
   if (banks_ && banks_->Has(index_)) {
     return banks_->Read(index_);
   }
-  const auto found = setup_.registers.find(index_);
-  return found == setup_.registers.end() ? std::uint8_t{0xFF} : found->second;
+  cooling_.Advance(time_.Now(), [this](std::uint8_t address) { return Register(address); });
+  return cooling_.Read(index_).value_or(Register(index_));
 }
 
 void IndexedRegisters::WritePort(std::uint16_t port, std::uint8_t value) {
+  cooling_.Advance(time_.Now(), [this](std::uint8_t address) { return Register(address); });
   if (port == setup_.indexPort) {
     index_ = value;
   } else if (setup_.readOnly.count(index_) != 0) {

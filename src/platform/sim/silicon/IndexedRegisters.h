@@ -7,6 +7,7 @@
 #include <set>
 #include <string>
 
+#include "platform/sim/silicon/CoolingModel.h"
 #include "platform/sim/silicon/Device.h"
 #include "platform/sim/silicon/RegisterBanks.h"
 
@@ -17,13 +18,14 @@ struct IndexedRegistersSetup {
   std::map<std::uint8_t, std::uint8_t> registers;
   std::optional<BankSetup> banks;
   std::set<std::uint8_t> readOnly;  // readings, in every bank: what is written is lost
+  CoolingSetup cooling;             // fans and temperatures that move; their readings are no registers of the above
 };
 
 /// A register that the part does not have reads as 0xFF and takes nothing. Pins: "<register>.<bit>", or
 /// "<bank>:<register>.<bit>" of a banked one, in hexadecimal.
 class IndexedRegisters : public Device {
  public:
-  explicit IndexedRegisters(const IndexedRegistersSetup& setup);
+  IndexedRegisters(const IndexedRegistersSetup& setup, const Scheduler& time);
 
   [[nodiscard]] std::vector<AddressRange> PortRanges() const override { return {{setup_.indexPort, 2}}; }
   std::uint8_t ReadPort(std::uint16_t port) override;
@@ -34,8 +36,12 @@ class IndexedRegisters : public Device {
   [[nodiscard]] std::string State() const override;
 
  private:
+  [[nodiscard]] std::uint8_t Register(std::uint8_t address) const;
+
   IndexedRegistersSetup setup_;
+  const Scheduler& time_;
   std::optional<RegisterBanks> banks_;
+  CoolingModel cooling_;
   std::uint8_t index_ = 0;
 };
 

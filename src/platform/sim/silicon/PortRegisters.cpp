@@ -11,6 +11,7 @@ namespace panelglow::platform::sim {
 namespace {
 
 constexpr std::uint16_t kLineBytes = 4;
+constexpr Microseconds kEventReturns_us = 1000;
 
 std::uint8_t MaskAt(const std::map<std::uint16_t, std::uint8_t>& masks, std::uint16_t offset) {
   const auto found = masks.find(offset);
@@ -55,16 +56,76 @@ std::uint8_t PortRegisters::Outputs(const PortLines& lines, unsigned byte) const
 }
 
 std::uint8_t PortRegisters::Read(std::uint16_t offset) const {
-  const PortLines* const lines = LinesAt(offset);
-  if (lines == nullptr) {
-    return Latch(offset);
+  unsigned value = Latch(offset);
+  if (const PortLines* const lines = LinesAt(offset)) {
+    const auto byte = static_cast<unsigned>(offset - lines->level);
+    const unsigned outputs = Outputs(*lines, byte);
+    value = (value & outputs) | ((lines->outside >> (8U * byte)) & ~outputs);
   }
-  const auto byte = static_cast<unsigned>(offset - lines->level);
-  const unsigned outputs = Outputs(*lines, byte);
-  return static_cast<std::uint8_t>((Latch(offset) & outputs) | ((lines->outside >> (8U * byte)) & ~outputs));
+  const unsigned events = MaskAt(setup_.clearByOne, offset);
+  for (const PortPress& press : setup_.presses) {
+    if (press.offset == offset && IsPressed(press)) {
+      const unsigned levels = press.mask & ~events;  // an event is latched instead
+      value = press.isLow ? value & ~levels : value | levels;
+    }
+  }
+  const auto cleared = clearedAt_.find(offset);
+  if (cleared == clearedAt_.end() || time_.Now() >= cleared->second + kEventReturns_us) {
+    value |= MaskAt(setup_.lasting, offset);
+  }
+  return static_cast<std::uint8_t>(value);
+}
+
+std::uint8_t PortRegisters::ReadPort(std::uint16_t port) {
+  Advance();
+  return Read(static_cast<std::uint16_t>(port - setup_.base));
+}
+
+// ---- what happens by itself
+
+void PortRegisters::Advance() {
+  for (const PortPress& press : setup_.presses) {
+    const unsigned event = press.mask & MaskAt(setup_.clearByOne, press.offset);
+    if (time_.Now() >= press.from_us && latched_.insert(&press).second) {
+      setup_.registers[press.offset] = static_cast<std::uint8_t>(Latch(press.offset) | event);
+    }
+  }
+  for (std::size_t i = 0; i < setup_.bolts.size(); ++i) {
+    const PortBolt& bolt = setup_.bolts[i];
+    if (moving_[i] && time_.Now() >= moving_[i]->end) {
+      std::uint8_t& level = setup_.registers[bolt.level];
+      level = static_cast<std::uint8_t>(moving_[i]->unlocks ? level | bolt.unlocked : level & ~bolt.unlocked);
+      std::uint8_t& command = setup_.registers[bolt.command];
+      command = static_cast<std::uint8_t>(command & ~(bolt.lock | bolt.unlock));
+      moving_[i].reset();
+    }
+  }
+}
+
+std::optional<Microseconds> PortRegisters::UnderWayUntil() const {
+  std::optional<Microseconds> next;
+  for (const std::optional<Move>& move : moving_) {
+    if (move) {
+      next = std::min(next.value_or(move->end), move->end);
+    }
+  }
+  return next;
+}
+
+// A bolt that is told to go both ways, or is under way, stays with what it does.
+void PortRegisters::StartBolts(std::uint16_t offset, std::uint8_t value) {
+  for (std::size_t i = 0; i < setup_.bolts.size(); ++i) {
+    const PortBolt& bolt = setup_.bolts[i];
+    const bool locks = (value & bolt.lock) != 0;
+    const bool unlocks = (value & bolt.unlock) != 0;
+    if (offset == bolt.command && locks != unlocks && !moving_[i]) {
+      moving_[i] = Move{time_.Now() + bolt.move_us, unlocks};
+    }
+  }
 }
 
 void PortRegisters::WritePort(std::uint16_t port, std::uint8_t value) {
+  Advance();
   const auto offset = static_cast<std::uint16_t>(port - setup_.base);
   const unsigned before = Latch(offset);
   const unsigned events = MaskAt(setup_.clearByOne, offset);
@@ -73,6 +134,10 @@ void PortRegisters::WritePort(std::uint16_t port, std::uint8_t value) {
     kept |= ~unsigned{Outputs(*lines, static_cast<unsigned>(offset - lines->level))};
   }
   setup_.registers[offset] = static_cast<std::uint8_t>((value & ~kept) | (before & kept & ~(value & events)));
+  if ((value & MaskAt(setup_.lasting, offset)) != 0) {
+    clearedAt_[offset] = time_.Now();
+  }
+  StartBolts(offset, value);
 }
 
 std::optional<bool> PortRegisters::Signal(std::string_view pin) const {
@@ -91,8 +156,12 @@ std::optional<std::uint64_t> PortRegisters::RegisterOf(std::string_view pin) con
 std::string PortRegisters::State() const {
   std::string text;
   for (const auto& [offset, value] : setup_.registers) {
+    unsigned own = MaskAt(setup_.lasting, offset);
+    for (const PortPress& press : setup_.presses) {
+      own |= press.offset == offset ? press.mask : 0U;
+    }
     char line[32];
-    std::snprintf(line, sizeof line, "port %04X = %02X\n", static_cast<unsigned>(setup_.base) + offset, value);
+    std::snprintf(line, sizeof line, "port %04X = %02X\n", static_cast<unsigned>(setup_.base) + offset, value & ~own);
     text += line;
   }
   return text;
