@@ -8,6 +8,7 @@
 #include "boardtool/DialogChecks.h"
 #include "boardtool/IniChecks.h"
 #include "boardtool/Installation.h"
+#include "boardtool/Output.h"
 
 namespace panelglow::boardtool {
 
@@ -96,9 +97,9 @@ std::vector<Finding> FindingsOf(const CheckOptions& options, platform::Host& mac
 int Check(const CheckOptions& options) {
   platform::Host& machine = platform::TheHost();
   const std::vector<Finding> findings = FindingsOf(options, machine);
-  machine.console.Write(options.format == "sarif"  ? FindingsSarif(findings)
-                        : options.format == "json" ? FindingsJson(findings)
-                                                   : FindingsText(findings));
+  Print(options.format == "sarif"  ? FindingsSarif(findings)
+        : options.format == "json" ? FindingsJson(findings)
+                                   : FindingsText(findings));
   return findings.empty() ? 0 : 1;
 }
 

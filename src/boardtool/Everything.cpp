@@ -57,7 +57,7 @@ void AskEverything(MotherBoard& board) {
     Try([&] { (board.*ask)(yes); });
   }
   for (bool (MotherBoard::*const load)() :
-       {&MotherBoard::IsPanelLedLegacy, &MotherBoard::LoadFanGroups, &MotherBoard::LoadFans, &MotherBoard::LoadZones,
+       {&MotherBoard::IsPanelLedLegacy, &MotherBoard::LoadFans, &MotherBoard::LoadFanGroups, &MotherBoard::LoadZones,
         &MotherBoard::LoadZoneGroups, &MotherBoard::LoadHoodSwitch, &MotherBoard::LoadHoodLock,
         &MotherBoard::LoadButtons, &MotherBoard::LoadLegacySettings, &MotherBoard::DetectFans,
         &MotherBoard::SavePowerButton, &MotherBoard::RestorePowerButton}) {

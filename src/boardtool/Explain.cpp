@@ -1,4 +1,5 @@
 #include "boardtool/Explain.h"
+#include "boardtool/Output.h"
 
 #include <algorithm>
 #include <map>
@@ -311,7 +312,7 @@ int Explain(const ExplainOptions& options) {
   const std::vector<IniOutline> files = ReadBoardFiles(names);
   platform::Host& machine = platform::TheHost();
   const BoardPlan plan = Rehearse(files, names, options.systemId, machine, wish);
-  machine.console.Write(options.json ? ExplainJson(plan, files) : ExplainText(plan, files, wish.led == nullptr));
+  Print(options.json ? ExplainJson(plan, files) : ExplainText(plan, files, wish.led == nullptr));
   return plan.className.empty() ? 1 : 0;
 }
 

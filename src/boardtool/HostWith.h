@@ -8,6 +8,7 @@ namespace panelglow::boardtool {
 /// The services that stand in place of the machine's; null: the machine's own.
 struct HostChanges {
   platform::Clock* clock = nullptr;
+  platform::Console* console = nullptr;
   platform::DriverDevices* drivers = nullptr;
   platform::Files* files = nullptr;
   platform::ProfileFiles* profiles = nullptr;
@@ -19,7 +20,7 @@ inline platform::Host HostWith(const platform::Host& machine, const HostChanges&
   return {.cameras = machine.cameras,
           .clock = pick(changes.clock, machine.clock),
           .connections = machine.connections,
-          .console = machine.console,
+          .console = pick(changes.console, machine.console),
           .cpu = machine.cpu,
           .desktop = machine.desktop,
           .deviceTree = machine.deviceTree,

@@ -4,6 +4,7 @@
 #include <functional>
 
 #include "boardtool/BoardOnMachine.h"
+#include "boardtool/Output.h"
 #include "boardtool/Readings.h"
 #include "config/XmlObject.h"
 #include "platform/Host.h"
@@ -49,7 +50,8 @@ void WriteLogs(const std::string& path, const std::function<void(const LineSink&
   }
   std::string text;
   writeText([&](const std::string& line) { text += line + "\n"; });
-  XmlObject results("results");
+  XmlObject results;
+  results.name = "results";
   writeResults(results);
   if (!platform::TheHost().files.Write(path, text) || !results.SaveToFile(path + ".xml", false, false)) {
     throw CannotRun("the log " + path + " cannot be written");
@@ -71,7 +73,7 @@ int Fans(const ReadOptions& options, const Person& person) {
   BoardOnMachine machine(options.folder);
   const int code = Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<FanReadout> fans = ReadFans(machine.Board());
-    platform::TheHost().console.Write(options.json ? FansJson(fans) : FansText(fans));
+    Print(options.json ? FansJson(fans) : FansText(fans));
     return CodeOf(fans);
   });
   WriteLogs(
@@ -91,7 +93,7 @@ int Zones(const ReadOptions& options, const Person& person) {
   machine.Board().GetProbeRate(rate_s);
   const int code = Show(options, person, static_cast<std::uint32_t>(std::clamp(rate_s, 1, 3600)) * kSecond_ms, [&] {
     const std::vector<ZoneReadout> zones = ReadZones(machine.Board());
-    platform::TheHost().console.Write(options.json ? ZonesJson(zones) : ZonesText(zones));
+    Print(options.json ? ZonesJson(zones) : ZonesText(zones));
     return CodeOf(zones);
   });
   WriteLogs(
@@ -104,7 +106,7 @@ int Detect(const ReadOptions& options, const Person& person) {
   BoardOnMachine machine(options.folder);
   return Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<DeviceReadout> devices = ReadDevices(machine.Board());
-    platform::TheHost().console.Write(options.json ? DevicesJson(devices) : DevicesText(devices));
+    Print(options.json ? DevicesJson(devices) : DevicesText(devices));
     const bool isGood = std::none_of(devices.begin(), devices.end(),
                                      [](const DeviceReadout& device) { return device.status.starts_with("ERROR"); });
     return isGood ? 0 : 1;

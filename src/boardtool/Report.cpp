@@ -10,6 +10,7 @@
 #include "boardtool/CapturedDrivers.h"
 #include "boardtool/HostWith.h"
 #include "boardtool/Machine.h"
+#include "boardtool/Output.h"
 #include "boardtool/Readings.h"
 #include "boardtool/Rehearsal.h"
 #include "boardtool/Table.h"
@@ -267,10 +268,8 @@ std::string ReportText(const Json& report) {
 }  // namespace
 
 int Report(const ReportOptions& options) {
-  platform::Host& machine = platform::TheHost();
   const Json report = ReportMaker(options).Make();
-  machine.console.Write(options.json ? report.dump(2, ' ', false, Json::error_handler_t::replace) + "\n"
-                                     : ReportText(report));
+  Print(options.json ? report.dump(2, ' ', false, Json::error_handler_t::replace) + "\n" : ReportText(report));
   return report["complete"].get<bool>() ? 0 : 1;
 }
 

@@ -15,6 +15,7 @@
 #include "boardtool/HostWith.h"
 #include "boardtool/Installation.h"
 #include "boardtool/MemoryFiles.h"
+#include "boardtool/Output.h"
 #include "boardtool/RecordedProfiles.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/HostInPlace.h"
@@ -342,7 +343,7 @@ int Try(const TryOptions& options, const Person& person) {
     Say("No lamp was found.\n");
     return 1;
   }
-  platform::TheHost().console.Write(Sections(options, systemId, walk, found));
+  Print(Sections(options, systemId, walk, found));
   return 0;
 }
 

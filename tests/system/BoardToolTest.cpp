@@ -59,6 +59,10 @@ TEST(SystemBoardTool, HelpsAnybodyAndTellsWrongCallsFromWhatCannotBe) {
     EXPECT_THAT(outcome.errors, HasSubstr(call.says));
   }
   EXPECT_THAT(Ask(installation, kReal, {"report"}).output, HasSubstr("This report is incomplete:\n"));
+  installation.Write("full.sh", "exec " PANELGLOW_BINARY_DIR "/panelglow-board explain --board 7D10 > /dev/full\n");
+  const Outcome full = RunProgram("/bin/sh", {"full.sh"}, installation.Path(""), {});
+  EXPECT_EQ(full.exitCode, 3);
+  EXPECT_THAT(full.errors, HasSubstr("standard output did not take everything: "));
 }
 
 TEST(SystemBoardTool, CheckSpeaksToProgramsAndStandsWhatIsHostile) {
@@ -207,6 +211,32 @@ TEST(SystemBoardTool, ATraceAnswersInPlaceOfTheMachine) {
   installation.Write("damaged", trace + "tick 1\n");
   EXPECT_THAT(Ask(installation, kSimulated, with({"replay", "damaged"})).errors, HasSubstr("with 1 more requests"));
   EXPECT_EQ(Ask(installation, kSimulated, with({"--machine", machine, "--trace", "none/trace"})).exitCode, 3);
+}
+
+// What a bench with fans, sensors, switches and buttons tells, once and while it is watched.
+TEST(SystemBoardTool, FansZonesAndDevicesAreReadWithTheirStates) {
+  const Installation installation;
+  const std::string machine = installation.Machine("bench-desktop.toml");
+  const Outcome fans = Ask(installation, kSimulated, {"--machine", machine, "fans", "--log", "fans.log"});
+  EXPECT_EQ(fans.exitCode, 0) << fans.errors;
+  EXPECT_THAT(fans.output, AllOf(StartsWith("fan  name"), HasSubstr("Rear fan       fin   -"), HasSubstr("  ok\n")));
+  EXPECT_THAT(installation.Read("fans.log"), HasSubstr("NumberOfFans=3\n"));
+  EXPECT_THAT(installation.Read("fans.log.xml"), HasSubstr("<fantestresults>"));
+  const Outcome zones = Ask(installation, kSimulated,
+                            {"--machine", machine, "zones", "--json", "--watch", "--rounds", "2", "--log", "z.log"});
+  EXPECT_EQ(zones.exitCode, 0) << zones.errors;
+  EXPECT_THAT(zones.output, AllOf(HasSubstr("\"zone\": 2"), HasSubstr("\"state\": \"ok\"")));
+  EXPECT_THAT(installation.Read("z.log"), HasSubstr("Status=NoErr\n"));
+  EXPECT_THAT(installation.Read("z.log.xml"), HasSubstr("<tempcautiontestresults>"));
+  const Outcome devices = Ask(installation, kSimulated, {"--machine", machine, "detect"});
+  EXPECT_EQ(devices.exitCode, 0) << devices.errors;
+  EXPECT_THAT(devices.output, AllOf(HasSubstr("Jumpers"), HasSubstr("Hood"), HasSubstr("Buttons")));
+  const Outcome report = Ask(installation, kSimulated, {"--machine", machine, "report", "--json"});
+  EXPECT_THAT(report.output, AllOf(HasSubstr("\"Chassis fan\""), HasSubstr("\"register 0x"), HasSubstr("\"class\"")));
+  const Outcome refused =
+      Ask(installation, kSimulated, {"--machine", machine, "fans", "--log", "no/such/folder/fans.log"});
+  EXPECT_EQ(refused.exitCode, 3);
+  EXPECT_THAT(refused.errors, EndsWith("the log no/such/folder/fans.log cannot be written\n"));
 }
 
 }  // namespace

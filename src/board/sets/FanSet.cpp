@@ -147,7 +147,7 @@ bool FanSet::LoadGroups() {
     }
     const Setting list = IniReader::Instance().ReadIniSetting(prefix + ".fans", "");
     for (const int index : NumbersIn(list)) {
-      if (Find(index) != nullptr) {
+      if (fans.empty() || Find(index) != nullptr) {  // groups may be loaded first
         group.fans.push_back(index);
       } else {
         TellOf(list, "there is no fan " + CDMUtil::ToString(index));

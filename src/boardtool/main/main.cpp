@@ -12,7 +12,9 @@
 #include "boardtool/BoardOnMachine.h"
 #include "boardtool/Check.h"
 #include "boardtool/Explain.h"
+#include "boardtool/HostWith.h"
 #include "boardtool/Machine.h"
+#include "boardtool/Output.h"
 #include "boardtool/ReadVerbs.h"
 #include "boardtool/Report.h"
 #include "boardtool/Trace.h"
@@ -43,10 +45,18 @@ void AddFolder(CLI::App& verb, std::string& folder) {
   verb.add_option("--folder", folder, "Folder of the installation (default: the current one)");
 }
 
+// Whether all that was said reached its reader.
+void RequireOutput(platform::Console& console) {
+  if (const std::string problem = console.OutputProblem(); !problem.empty()) {
+    throw CannotRun("standard output did not take everything: " + problem);
+  }
+}
+
 // Runs a verb on the machine, on a recorded one, or on one that is being recorded.
 int OnMachine(const Between& between, const std::function<int()>& verb) {
-  UseMachine(between.machine);
-  platform::Host& machine = platform::TheHost();
+  OwnOutput output(platform::TheHost());
+  platform::Host machine = HostWith(platform::TheHost(), {.console = &output.LibraryConsole()});
+  const platform::HostInPlace ownLines(machine);
   if (!between.replayFile.empty()) {
     TracePlayer player(between.replayFile, machine, IsSimulated());
     const platform::HostInPlace inPlace(player.TheHost());
@@ -106,7 +116,10 @@ class Program {
     if (!run_) {
       throw WrongCall("name the verb that the trace is played to, behind its file");
     }
-    return OnMachine(between_, run_);
+    UseMachine(between_.machine);
+    const int code = OnMachine(between_, run_);
+    RequireOutput(platform::TheHost().console);
+    return code;
   }
 
  private:
