@@ -34,7 +34,7 @@ DriverLoader Loader() { return {platform::TheHost().services, platform::TheHost(
 
 }  // namespace
 
-CDevio::CDevio() : device(Loader().LoadPresentOrOlder(platform::TheHost().cpu.Is64BitSystem(), names, loadState)) {}
+CDevio::CDevio() { LoadOnce(); }
 
 CDevio::CDevio(std::string service, std::string display, std::string deviceLink, std::string image)
     : CDevio(DriverNames{std::move(service), std::move(display), std::move(deviceLink), std::move(image)}) {}
@@ -43,6 +43,13 @@ CDevio::CDevio(const std::string& service, const std::string& display, const std
     : CDevio(DriverNames{service, display, deviceLink, "system32\\drivers\\" + service + ".sys"}) {}
 
 CDevio::CDevio(DriverNames given) : names(std::move(given)) { LoadDriver(); }
+
+bool CDevio::LoadOnce() {
+  if (!IsDriverLoaded() && loadState == LoadState::kNotStarted) {
+    device = Loader().LoadPresentOrOlder(platform::TheHost().cpu.Is64BitSystem(), names, loadState);
+  }
+  return IsDriverLoaded();
+}
 
 bool CDevio::LoadDriver() {
   device.reset();

@@ -33,6 +33,10 @@ class CDevio {
   /// The image path is "system32\drivers\" with the service's name and ".sys".
   CDevio(const std::string& service, const std::string& display, const std::string& deviceLink);
 
+  /// Nothing is loaded before LoadOnce: for an object that exists before anybody knows whether the hardware is needed.
+  struct LoadLater {};
+  explicit CDevio(LoadLater /*later*/) {}
+
   /// Closes the device. The service stays running.
   virtual ~CDevio() = default;
   CDevio(const CDevio&) = delete;
@@ -44,6 +48,10 @@ class CDevio {
   /// Registers the service if it is new, starts it and opens the device, under the names of this object. True when
   /// the device is open.
   bool LoadDriver();
+
+  /// As the constructor without names, unless the device is open or its service was started before. True when the
+  /// device is open.
+  bool LoadOnce();
 
   /// One debug line with the driver's name and version.
   void LogDriverVersion();

@@ -22,7 +22,7 @@ constexpr const char* kRequiredFileMissing = "990100";
 
 }  // namespace
 
-CDevio g_objDriverObjectCustom;
+CDevio g_objDriverObjectCustom{CDevio::LoadLater{}};  // an informational request needs no hardware
 std::array<wstring, kMostButtons> CustomLEDTest::_sButtonArr;
 
 CustomLEDTest::CustomLEDTest() : FrontPanelTest(g_objDriverObjectCustom) {

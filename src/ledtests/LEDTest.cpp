@@ -118,7 +118,7 @@ bool IsPresent(std::string_view function) {
 
 }  // namespace
 
-CDevio g_objDriverObject;
+CDevio g_objDriverObject{CDevio::LoadLater{}};  // an informational request needs no hardware
 std::array<wstring, LEDTest::kButtons> LEDTest::_sButtonArr;
 
 LEDTest::LEDTest() : FrontPanelTest(g_objDriverObject) {

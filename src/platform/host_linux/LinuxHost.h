@@ -3,13 +3,13 @@
 
 #include "platform/AbsentDevices.h"
 #include "platform/Host.h"
-#include "platform/host_linux/AbsentDriver.h"
 #include "platform/host_linux/AbsentInputs.h"
 #include "platform/host_linux/EmptyManagement.h"
 #include "platform/host_linux/LinuxClock.h"
 #include "platform/host_linux/LinuxConsole.h"
 #include "platform/host_linux/LinuxCpu.h"
 #include "platform/host_linux/LinuxDesktop.h"
+#include "platform/host_linux/LinuxDriver.h"
 #include "platform/host_linux/LinuxEnvironment.h"
 #include "platform/host_linux/LinuxFiles.h"
 #include "platform/host_linux/LinuxMutexes.h"
@@ -25,7 +25,7 @@ struct LinuxHost {
   LinuxClock clock;
   LinuxConsole console;
   LinuxCpu cpu;
-  AbsentDriver driver;
+  LinuxDriver driver;
   LinuxEnvironment environment;
   LinuxFiles files;
   posix::LazyDrawing drawing;

@@ -1,0 +1,339 @@
+#include "platform/host_linux/LinuxDriver.h"
+
+#include <fcntl.h>
+#include <sched.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <fstream>
+#include <vector>
+
+#include "platform/DriverRecords.h"
+#include "platform/host_linux/CurrentThread.h"
+#include "platform/host_linux/PortAccess.h"
+#include "platform/posix/Descriptor.h"
+#include "platform/posix/TellPeople.h"
+
+namespace panelglow::platform::host_linux {
+
+namespace {
+
+using driver::NumberAt;
+using driver::PutNumber;
+
+constexpr ServiceHandle kManager = 1;
+constexpr ServiceHandle kService = 2;
+constexpr std::string_view kLink = "tmbhalcyon";
+
+constexpr std::uint32_t kErrorInvalidFunction = 1;
+constexpr std::uint32_t kErrorInvalidParameter = 87;
+constexpr std::uint32_t kErrorGeneralFailure = 31;
+constexpr std::uint8_t kPciNotFound = 0x86;
+constexpr std::uint32_t kVersion = 100;  // 1.0, in the older form
+
+constexpr std::uint16_t kClassAndRevision = 0x08;
+
+// The kernel's lockdown, in its own word; empty where it does not tell.
+std::string Lockdown() {
+  std::ifstream file("/sys/kernel/security/lockdown");
+  std::string line;
+  std::getline(file, line);
+  const std::size_t begin = line.find('[');
+  const std::size_t end = line.find(']', begin);
+  return begin == std::string::npos || end == std::string::npos ? "" : line.substr(begin + 1, end - begin - 1);
+}
+
+std::string WhatToDo(int error) {
+  const std::string lockdown = Lockdown();
+  if (!lockdown.empty() && lockdown != "none") {
+    return "the kernel is locked down (" + lockdown + "): switch secure boot off, or start it without lockdown";
+  }
+  if (error == ENOSYS || error == ENOENT) {
+    return "this kernel has no such door: it needs one with I/O port access and /dev/mem";
+  }
+  return ::geteuid() == 0 ? "it needs the capability CAP_SYS_RAWIO, which a container does not have"
+                          : "start it as root, or give it CAP_SYS_RAWIO and the right to /dev/mem";
+}
+
+bool HasSizes(std::span<const std::byte> in, std::span<const std::byte> out, std::size_t size) {
+  return in.size() == size && out.size() == size;
+}
+
+}  // namespace
+
+std::uint32_t HomeErrorOf(int error) {
+  switch (error) {
+    case 0:
+      return 0;
+    case ENOENT:
+    case ENXIO:
+    case ENODEV:
+      return kErrorFileNotFound;
+    case EINVAL:
+      return kErrorInvalidParameter;
+    case EPERM:
+    case EACCES:
+    case ENOSYS:
+      return kErrorAccessDenied;
+    default:
+      return kErrorGeneralFailure;
+  }
+}
+
+class LinuxDriver::Device : public DriverDevice {
+ public:
+  explicit Device(LinuxDriver& owner) : owner_(owner) {}
+
+  std::uint32_t Control(std::uint32_t code, std::span<const std::byte> request, std::span<std::byte> out) override {
+    CurrentThread::CheckEndRequest();
+    const std::vector<std::byte> in(request.begin(), request.end());  // `out` may be the same memory
+    switch (code) {
+      case driver::kGetVersion:
+        return out.size() < 4 ? kErrorInvalidParameter : (PutNumber(out, 0, 4, kVersion), 0U);
+      case driver::kInportByte:
+      case driver::kInportWord:
+      case driver::kInportDword:
+      case driver::kOutportByte:
+      case driver::kOutportWord:
+      case driver::kOutportDword:
+        return Port(code, in, out);
+      case driver::kReadPciConfigByte:
+      case driver::kReadPciConfigWord:
+      case driver::kReadPciConfigDword:
+      case driver::kWritePciConfigByte:
+      case driver::kWritePciConfigWord:
+      case driver::kWritePciConfigDword:
+        return Pci(code, in, out);
+      case driver::kFindPciDevice:
+      case driver::kFindPciClass:
+        return Search(code, in, out);
+      case driver::kMapPhysicalMemory:
+        return Map(in, out);
+      case driver::kUnmapPhysicalMemory:
+        return in.size() == driver::kMapSize32 && owner_.memory_.Unmap(NumberAt(in, 8, 4)) ? 0
+                                                                                           : kErrorInvalidParameter;
+      case driver::kReadMsr:
+        return Msr(in, out);
+      case driver::kReadFirmwareByte:
+      case driver::kReadFirmwareWord:
+        return Firmware(code, in, out);
+      default:
+        return kErrorInvalidFunction;
+    }
+  }
+
+  std::uint32_t ReadMapped(std::uint64_t mapped, std::size_t width) override {
+    CurrentThread::CheckEndRequest();
+    return width == 4 ? *reinterpret_cast<const volatile std::uint32_t*>(mapped)
+                      : *reinterpret_cast<const volatile std::uint8_t*>(mapped);
+  }
+
+  void WriteMapped(std::uint64_t mapped, std::size_t width, std::uint32_t value) override {
+    CurrentThread::CheckEndRequest();
+    if (width == 4) {
+      *reinterpret_cast<volatile std::uint32_t*>(mapped) = value;
+    } else {
+      *reinterpret_cast<volatile std::uint8_t*>(mapped) = static_cast<std::uint8_t>(value);
+    }
+  }
+
+ private:
+  static std::uint32_t Port(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
+    constexpr std::array<unsigned, 3> kWidths{1, 2, 4};
+    const bool isWrite = code >= driver::kOutportByte;
+    if (in.size() != driver::kPortSize || (!isWrite && out.size() != 4)) {
+      return kErrorInvalidParameter;
+    }
+    const unsigned width = kWidths[((code - driver::kInportByte) / 4) % 3];
+    const auto port = static_cast<std::uint16_t>(NumberAt(in, driver::kPortNumber, 4));
+    if (NumberAt(in, driver::kPortWidth, 4) != width) {
+      return kErrorInvalidParameter;
+    }
+    if (const int error = PortAccess::Allow(); error != 0) {
+      return HomeErrorOf(error);
+    }
+    if (isWrite) {
+      PortAccess::Out(port, width, static_cast<std::uint32_t>(NumberAt(in, driver::kPortValue, 4)));
+    } else {
+      PutNumber(out, 0, 4, PortAccess::In(port, width));
+    }
+    return 0;
+  }
+
+  std::uint32_t Pci(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) const {
+    if (!HasSizes(in, out, driver::kPciSize)) {
+      return kErrorInvalidParameter;
+    }
+    std::copy(in.begin(), in.end(), out.begin());
+    const bool isWrite = code >= driver::kWritePciConfigByte;
+    const unsigned width = 1U << ((code - (isWrite ? driver::kWritePciConfigByte : driver::kReadPciConfigByte)) / 4);
+    const auto location = static_cast<std::uint16_t>(NumberAt(in, driver::kPciLocation, 2));
+    const auto reg = static_cast<std::uint16_t>(NumberAt(in, driver::kPciRegister, 2));
+    bool isDone = false;
+    if (isWrite) {
+      isDone =
+          owner_.pci_.Write(location, reg, width, static_cast<std::uint32_t>(NumberAt(in, driver::kPciValue, 4)));
+    } else if (const auto value = owner_.pci_.Read(location, reg, width)) {
+      PutNumber(out, driver::kPciValue, 4, *value);
+      isDone = true;
+    }
+    PutNumber(out, driver::kPciStatus, 1, isDone ? 0 : kPciNotFound);
+    return 0;
+  }
+
+  std::uint32_t Search(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) const {
+    if (!HasSizes(in, out, driver::kSearchSize)) {
+      return kErrorInvalidParameter;
+    }
+    std::copy(in.begin(), in.end(), out.begin());
+    auto index = static_cast<unsigned>(NumberAt(in, driver::kSearchIndex, 2));
+    const auto ids = static_cast<std::uint32_t>(NumberAt(in, driver::kSearchVendor, 2) |
+                                                NumberAt(in, driver::kSearchDevice, 2) << 16U);
+    for (const std::uint16_t location : owner_.pci_.Functions()) {
+      const bool byClass = code == driver::kFindPciClass;
+      const auto value = owner_.pci_.Read(location, byClass ? kClassAndRevision : 0, 4);
+      const bool matches = value && (byClass ? *value >> 8U == NumberAt(in, driver::kSearchClass, 4) : *value == ids);
+      if (matches && index-- == 0) {
+        PutNumber(out, driver::kSearchLocation, 2, location);
+        PutNumber(out, driver::kSearchStatus, 1, 0);
+        return 0;
+      }
+    }
+    PutNumber(out, driver::kSearchStatus, 1, kPciNotFound);
+    return 0;
+  }
+
+  std::uint32_t Map(std::span<const std::byte> in, std::span<std::byte> out) {
+    const bool isWide = in.size() == driver::kMapSize64;
+    if (in.size() != out.size() || (!isWide && in.size() != driver::kMapSize32)) {
+      return kErrorInvalidParameter;
+    }
+    std::copy(in.begin(), in.end(), out.begin());
+    const std::size_t field = isWide ? 8 : 4;
+    const std::uint64_t address = NumberAt(in, 0, field);
+    int error = 0;
+    const std::uint64_t mapped = owner_.memory_.Map(address, NumberAt(in, field, field), error);
+    constexpr std::uint64_t kNarrow = 0xFFFFFFFF;
+    if (error == 0 && !isWide && mapped > kNarrow) {
+      owner_.memory_.Unmap(mapped);
+      error = ENOMEM;  // no place for it in the narrow record
+    }
+    if (error != 0) {
+      owner_.TellOfMemory(address, error);
+      return HomeErrorOf(error);
+    }
+    PutNumber(out, 2 * field, field, mapped);
+    return 0;
+  }
+
+  static std::uint32_t Msr(std::span<const std::byte> in, std::span<std::byte> out) {
+    if (!HasSizes(in, out, driver::kMsrSize)) {
+      return kErrorInvalidParameter;
+    }
+    const int core = ::sched_getcpu();
+    const std::string path = "/dev/cpu/" + std::to_string(core < 0 ? 0 : core) + "/msr";
+    const posix::Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
+    if (!file) {
+      return HomeErrorOf(errno);
+    }
+    std::uint64_t value = 0;
+    if (::pread(file.Get(), &value, sizeof value, static_cast<off_t>(NumberAt(in, driver::kMsrIndex, 4))) !=
+        static_cast<ssize_t>(sizeof value)) {
+      return kErrorInvalidParameter;  // the processor has no such register
+    }
+    PutNumber(out, 0, driver::kMsrSize, value);
+    return 0;
+  }
+
+  std::uint32_t Firmware(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
+    if (in.size() != driver::kFirmwareSize || out.size() != driver::kFirmwareAnswerSize) {
+      return kErrorInvalidParameter;
+    }
+    const std::uint64_t address = NumberAt(in, 0, 2) * 16 + NumberAt(in, 2, 2);
+    const unsigned width = code == driver::kReadFirmwareWord ? 2 : 1;
+    int error = 0;
+    const std::uint64_t mapped = owner_.memory_.Map(address, width, error);
+    if (error != 0) {
+      return HomeErrorOf(error);
+    }
+    std::uint64_t value = 0;
+    for (unsigned i = 0; i < width; ++i) {
+      value |= std::uint64_t{*reinterpret_cast<const volatile std::uint8_t*>(mapped + i)} << (8 * i);
+    }
+    PutNumber(out, 0, 2, value);
+    owner_.memory_.Unmap(mapped);
+    return 0;
+  }
+
+  LinuxDriver& owner_;
+};
+
+std::unique_ptr<DriverDevice> LinuxDriver::Open(std::string_view linkName, std::uint32_t& error) {
+  if (linkName != kLink) {
+    error = kErrorFileNotFound;
+    return nullptr;
+  }
+  error = 0;
+  return std::make_unique<Device>(*this);
+}
+
+void LinuxDriver::TellOfMemory(std::uint64_t address, int error) {
+  std::array<char, 32> text{};
+  std::snprintf(text.data(), text.size(), "0x%llX", static_cast<unsigned long long>(address));
+  const std::lock_guard<std::mutex> lock(guard_);
+  if (toldOf_.find(std::string(text.data()) + ";") != std::string::npos) {
+    return;
+  }
+  toldOf_ += std::string(text.data()) + ";";
+  posix::TellPeople("the kernel refuses the memory at " + std::string(text.data()) + " (" + std::strerror(error) +
+                    "): it is RAM, or a kernel driver has it; unbind that driver, or start the kernel with "
+                    "iomem=relaxed. Nothing was written there.");
+}
+
+// ---- service manager
+
+ServiceHandle LinuxDriver::OpenManager(std::uint32_t /*access*/, std::uint32_t& error) {
+  error = 0;
+  return kManager;
+}
+
+ServiceHandle LinuxDriver::OpenService(ServiceHandle manager, std::string_view name, std::uint32_t /*access*/,
+                                       std::uint32_t& error) {
+  error = manager != kManager ? kErrorInvalidHandle : name == kLink ? 0 : kErrorServiceDoesNotExist;
+  return error == 0 ? kService : 0;
+}
+
+ServiceHandle LinuxDriver::CreateService(ServiceHandle /*manager*/, const ServiceDefinition& /*definition*/,
+                                         std::uint32_t& error) {
+  error = kErrorAccessDenied;
+  return 0;
+}
+
+std::uint32_t LinuxDriver::Start(ServiceHandle service) {
+  if (service != kService) {
+    return kErrorInvalidHandle;
+  }
+  const int ports = PortAccess::Allow();
+  const int memory = memory_.Open();
+  if (ports == 0 && memory == 0) {
+    return 0;
+  }
+  const std::lock_guard<std::mutex> lock(guard_);
+  if (!std::exchange(isTold_, true)) {
+    const int error = ports != 0 ? ports : memory;
+    posix::TellPeople("there is no way to the hardware (" + std::string(ports != 0 ? "I/O ports: " : "/dev/mem: ") +
+                      std::strerror(error) + "): " + WhatToDo(error) +
+                      ". Without the hardware, try panelglow-diags-sim.");
+  }
+  return kErrorAccessDenied;
+}
+
+std::uint32_t LinuxDriver::Delete(ServiceHandle /*service*/) { return 0; }
+
+void LinuxDriver::Close(ServiceHandle /*handle*/) {}
+
+}  // namespace panelglow::platform::host_linux

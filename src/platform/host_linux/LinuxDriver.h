@@ -1,0 +1,50 @@
+// What stands for the suite's privileged driver under Linux: the kernel's own doors to ports, memory, configuration
+// space and model-specific registers, behind the driver's requests.
+//
+// "Starting the driver's service" is asking the kernel for the ports and for /dev/mem. Where it refuses, the service
+// does not start, and people are told once what the bench lacks; nothing is ever lit on a machine that refused.
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <string>
+
+#include "platform/DriverDevice.h"
+#include "platform/ServiceManager.h"
+#include "platform/host_linux/PciConfiguration.h"
+#include "platform/host_linux/PhysicalMemory.h"
+
+namespace panelglow::platform::host_linux {
+
+class LinuxDriver : public DriverDevices, public ServiceManager {
+ public:
+  // ---- DriverDevices
+  std::unique_ptr<DriverDevice> Open(std::string_view linkName, std::uint32_t& error) override;
+
+  // ---- ServiceManager
+  ServiceHandle OpenManager(std::uint32_t access, std::uint32_t& error) override;
+  ServiceHandle OpenService(ServiceHandle manager, std::string_view name, std::uint32_t access,
+                            std::uint32_t& error) override;
+  ServiceHandle CreateService(ServiceHandle manager, const ServiceDefinition& definition,
+                              std::uint32_t& error) override;
+  std::uint32_t Start(ServiceHandle service) override;
+  std::uint32_t Delete(ServiceHandle service) override;
+  void Close(ServiceHandle handle) override;
+
+ private:
+  class Device;
+
+  /// One sentence about a refused range of memory, each range once.
+  void TellOfMemory(std::uint64_t address, int error);
+
+  PhysicalMemory memory_;
+  PciConfiguration pci_;
+  std::mutex guard_;
+  bool isTold_ = false;
+  std::string toldOf_;  // refused ranges
+};
+
+/// The error number of the program's home system for one of this kernel.
+std::uint32_t HomeErrorOf(int error);
+
+}  // namespace panelglow::platform::host_linux

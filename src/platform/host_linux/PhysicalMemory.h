@@ -1,0 +1,41 @@
+// The machine's physical address space, by mappings of /dev/mem that are kept: device memory cannot be read or
+// written there, only mapped.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <mutex>
+
+namespace panelglow::platform::host_linux {
+
+class PhysicalMemory {
+ public:
+  PhysicalMemory() = default;
+  ~PhysicalMemory();
+  PhysicalMemory(const PhysicalMemory&) = delete;
+  PhysicalMemory& operator=(const PhysicalMemory&) = delete;
+
+  /// Whether the kernel lets anybody in: 0, or its error number.
+  int Open();
+
+  /// The address in this process, the same one for the same pages; 0 with the kernel's error number: RAM and ranges
+  /// that a kernel driver has are refused.
+  std::uint64_t Map(std::uint64_t address, std::uint64_t length, int& error);
+
+  /// Gives a mapping back when nobody has it any more; false for an address that is none.
+  bool Unmap(std::uint64_t mapped);
+
+ private:
+  struct Mapping {
+    std::uint64_t begin = 0;  // of the pages, in the process
+    std::size_t length = 0;
+    unsigned users = 0;
+  };
+
+  std::mutex guard_;
+  int file_ = -1;
+  std::map<std::pair<std::uint64_t, std::uint64_t>, Mapping> mappings_;  // by first page and length
+};
+
+}  // namespace panelglow::platform::host_linux
