@@ -48,6 +48,7 @@ const std::vector<Board>& Generic() {
       {"ich-desktop.toml",  // a class that has the lamp from the one it comes from
        "TwoColorPower",
        {{"mbdetect.ini", "chips=ich\n", "chips=hudson\n"}, {"mbtest.ini", "chip=ich\n", "chip=hudson\n"}}},
+      {"bench-desktop.toml"},  // beside much else
       Classed("sio-wpcd376.toml", "ich_win", "win_wpcd376", true),
       Classed("sio-lpc47.toml", "sb7sch5", "sio", true),
       Classed("sio-ite-old.toml", "mistral", "ite", true),
@@ -64,6 +65,7 @@ const std::vector<Board>& WithoutSignal() {
   static const std::vector<Board> kBoards = {
       {"smbus-desktop.toml"},
       Oldest("sio-wpcd376.toml", "Orchard", "win_wpcd376", "TwoColorPower"),
+      {"orchard-desktop.toml"},
       {"saddle-desktop.toml", "Default"},
   };
   return kBoards;
