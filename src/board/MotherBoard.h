@@ -103,8 +103,8 @@ class MotherBoard {
   virtual bool DetectFans();
   [[nodiscard]] const std::vector<FanGroup>& GetFanGroups() const { return fans.Groups(); }
 
-  // ---- temperature zones (see ZoneSet). They are loaded first; a zone is named by its number from 1. The getters
-  // are true when zones were loaded, also when there are none.
+  // ---- temperature zones (see ZoneSet). They are loaded first; a zone is named by its number from 1. What gives the
+  // list or a setting is always true.
   virtual bool GetZones(std::vector<TempZone>& list);
   virtual bool LoadZones();
   virtual bool LoadZoneGroups();
