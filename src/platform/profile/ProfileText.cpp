@@ -19,7 +19,6 @@ using lines::Line;
 using lines::LineEnd;
 using lines::Lower;
 using lines::NextHeader;
-using lines::NextLine;
 using lines::SameName;
 using lines::Section;
 using lines::TrimBlanks;
