@@ -51,7 +51,7 @@ bool Lantern::SavePowerLedState() {
 
 bool Lantern::RestorePowerLedState() {
   if (!isOpen) {
-    return false;
+    return true;
   }
   if (savedPins) {
     superIo.Write(kPinRegister, *savedPins);

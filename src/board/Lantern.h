@@ -38,7 +38,7 @@ class Lantern : public OldestBoard {
   static constexpr std::uint16_t kIndexPort = 0x2E;
 
   /// Without its base nothing is known of the button: ports 0 and 2 are other parts'.
-  [[nodiscard]] bool HasButton() const { return Settings().powerIoBase != 0; }
+  [[nodiscard]] bool HasButton() const { return button.Base() != 0; }
 
   PowerEventButton button;
   bool isOpen = false;

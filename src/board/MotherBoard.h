@@ -237,7 +237,7 @@ class MotherBoard {
   /// For the classes with a list of chips of their own: the chip "none" in every place.
   MotherBoard(std::string boardClass, std::uint16_t boardId);
 
-  /// Builds the class of a name of the chip table in its place; a class that this version does not have stays "none".
+  /// Builds the class of a name of the chip table in its place.
   void Place(std::string_view chipName);
 
   /// The chip that serves a fan, zone or device; GetChip, unless a board class has one of its own.

@@ -176,10 +176,14 @@ TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
       {[](MotherBoard& board) { return board.SavePowerButton(); }, true, "0402->FFFF "},
       {[](MotherBoard& board) { return board.ArmPowerButton(); }, true, "0402->FFFF 0402<-FEFE "},
       {pressed, true, "0400->FFFF "},
+      {[](MotherBoard& board) { return board.SavePowerButton(); }, true, ""},  // nothing is kept twice
       {[](MotherBoard& board) { return board.RestorePowerButton(); }, true, "0400<-0100 0402<-FFFF "},
+      {[](MotherBoard& board) { return board.ArmPowerButton(); }, true, "0402->FFFF 0402->FFFF 0402<-FEFE "},
+      {[](MotherBoard& board) { return board.RestorePowerButton(); }, true, "0400<-0100 0402<-FFFF "},
+      {[](MotherBoard& board) { return board.RestorePowerButton(); }, false, ""},
   };
   const std::vector<Row> kOrchard = {
-      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, false, ""},
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, true, ""},
       {[](MotherBoard& board) { return board.SavePowerLedState(); }, true,
        "002E<-25 002F<-58 002E<-07 002F<-07 002E<-F0 002F<-04 002E<-F1 002F<-03 002E<-F0 002F<-06 002E<-F1 "
        "002F<-03 "},
@@ -193,7 +197,7 @@ TEST(MotherBoard, TheOldestClassesDriveLedAndButtonThemselves) {
       {[](MotherBoard& board) { return board.RestorePowerButton(); }, true, "F801<-01 F802<-FFFF 0458<-FF "},
   };
   const std::vector<Row> kLantern = {
-      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, false, ""},
+      {[](MotherBoard& board) { return board.RestorePowerLedState(); }, true, ""},
       {[](MotherBoard& board) { return board.SavePowerLedState(); }, true,
        "002E<-87 002E<-87 002E<-2A 002F->FF 002F<-FD "},
       {[](MotherBoard& board) { return board.AssertPowerLedGreen(); }, false, ""},
