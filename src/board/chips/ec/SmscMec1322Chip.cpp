@@ -163,10 +163,10 @@ void SmscMec1322Chip::RestoreMux(List which) {
   WriteByte(savedMux);
 }
 
-// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back.
+// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back. One
+// without a list is at an address that nobody knows, and is left alone.
 bool SmscMec1322Chip::SavePowerLedState() {
-  SaveMux(kPowerGreenSaveMux);
-  isPowerMuxSaved = true;
+  isPowerMuxSaved = SaveMux(kPowerGreenSaveMux) || isPowerMuxSaved;
   RunList(kPowerGreenEnableMux);
   return true;
 }
@@ -180,13 +180,15 @@ bool SmscMec1322Chip::RestorePowerLedState() {
 }
 
 bool SmscMec1322Chip::SaveChargeLedState() {
-  SaveMux(kChargeRedSaveMux);
-  savedMuxRed = savedMux;
-  isChargeRedMuxSaved = true;
+  if (SaveMux(kChargeRedSaveMux)) {
+    savedMuxRed = savedMux;
+    isChargeRedMuxSaved = true;
+  }
   RunList(kChargeRedEnableMux);
-  SaveMux(kChargeGreenSaveMux);
-  savedMuxGreen = savedMux;
-  isChargeGreenMuxSaved = true;
+  if (SaveMux(kChargeGreenSaveMux)) {
+    savedMuxGreen = savedMux;
+    isChargeGreenMuxSaved = true;
+  }
   RunList(kChargeGreenEnableMux);
   return true;
 }
