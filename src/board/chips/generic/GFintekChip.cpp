@@ -5,7 +5,6 @@
 #include <optional>
 
 #include "board/base/IniReader.h"
-
 #include "board/parts/Bits.h"
 #include "board/parts/ClearedLatch.h"
 #include "board/parts/ConfigMode.h"
