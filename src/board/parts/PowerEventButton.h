@@ -16,16 +16,21 @@ class PowerEventButton {
 
   PowerEventButton(CDevio& client, std::uint16_t basePort, Check how) : devio(&client), base(basePort), check(how) {}
 
+  /// False for a part that is nowhere: nothing is to be touched then, other parts have ports 0 and 2.
+  [[nodiscard]] bool HasBase() const { return base != 0; }
+
+  /// Nothing is kept twice before it was put back.
   void Save();
 
-  /// Disables the button's events, so that a press is only latched. False when the word reads as before: the part
-  /// ignores it. Without a check the word is changed as it is now, not as it was saved, and the result is true.
+  /// Saves, unless that is done, and disables the button's events, so that a press is only latched. False when the
+  /// word reads as before: the part ignores it. Without a check the word is changed as it is now, not as it was
+  /// saved, and the result is true.
   bool Arm();
   [[nodiscard]] bool IsPressed() const;
 
-  /// False, and nothing is done, without a save; false when the enable word does not read as saved within three
-  /// reads, 100 ms apart.
-  bool Restore() const;
+  /// Puts back what was kept, and forgets it; true, and nothing is done, without a save. False when the enable word
+  /// does not read as saved within three reads, 100 ms apart; it stays kept then.
+  bool Restore();
 
  private:
   [[nodiscard]] std::uint16_t EnablePort() const { return static_cast<std::uint16_t>(base + 2); }

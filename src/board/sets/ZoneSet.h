@@ -27,6 +27,9 @@ class ZoneSet {
  public:
   explicit ZoneSet(ChipFinder finder) : chipOf(std::move(finder)) {}
 
+  /// The chip of zones without one, in place of the key that names it, which is not read then.
+  void PresetChip(std::string chipName) { presetChip = std::move(chipName); }
+
   /// Reads zones and probe settings from the files, in place of those before. Throws what the chips throw of whose
   /// thresholds limits are made.
   bool Load();
@@ -81,6 +84,7 @@ class ZoneSet {
   void LimitByTjMax(TempZone& zone) const;
 
   ChipFinder chipOf;
+  std::string presetChip;  // empty: that of the files
   std::vector<TempZone> zones;
   std::vector<ZoneGroup> groups;
   ProbeSettings probe;
