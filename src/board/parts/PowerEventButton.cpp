@@ -33,7 +33,7 @@ bool PowerEventButton::IsPressed() const { return (devio->InportWord(base) & kPr
 
 bool PowerEventButton::Restore() {
   if (!savedEnable) {
-    return false;
+    return true;
   }
   devio->OutportWord(base, kPressed);
   devio->OutportWord(EnablePort(), *savedEnable);

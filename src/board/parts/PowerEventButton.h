@@ -25,11 +25,12 @@ class PowerEventButton {
   bool Arm();
   [[nodiscard]] bool IsPressed() const;
 
-  /// False, and nothing is done, without a save; false when the enable word does not read as saved within three
+  /// True, and nothing is done, without a save; false when the enable word does not read as saved within three
   /// reads, 100 ms apart; then the save is kept, and a further try puts it back.
   bool Restore();
 
-  [[nodiscard]] std::uint16_t Base() const { return base; }
+  /// Without one nothing is known of the button: ports 0 and 2 are other parts'.
+  [[nodiscard]] bool HasBase() const { return base != 0; }
 
  private:
   [[nodiscard]] std::uint16_t EnablePort() const { return static_cast<std::uint16_t>(base + 2); }

@@ -163,7 +163,8 @@ void SmscMec1322Chip::RestoreMux(List which) {
   WriteByte(savedMux);
 }
 
-// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back.
+// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back. One
+// without a list is at an address that nobody knows, and is left alone.
 bool SmscMec1322Chip::SavePowerLedState() {
   isPowerLedTaken = true;
   isPowerMuxSaved = SaveMux(kPowerGreenSaveMux);
