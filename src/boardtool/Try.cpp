@@ -76,6 +76,10 @@ class Walk {
     if (hasMasks_ && (!CDMUtil::IsInteger(options.at) || range_.second >= kBits)) {
       throw WrongCall("name the register with --at, as 0xA20, and bits of it, as 0-7");
     }
+    constexpr std::int64_t kLastAddress = 0xFFFFFFFF;
+    if (hasMasks_ && (CDMUtil::ToInt64(options.at) < 0 || CDMUtil::ToInt64(options.at) > kLastAddress)) {
+      throw WrongCall("an address is 0 to 0xFFFFFFFF");
+    }
     at_ = CDMUtil::ToUnsignedLong(options.at);
     constexpr std::uint32_t kLastPort = 0xFFFE;
     if (options.chip == "g_iospace" && (at_ == 0 || at_ > kLastPort)) {
