@@ -1,4 +1,5 @@
-// The integrator's program on the installation that is shipped: a whole check, and an explanation of all LEDs of a board.
+// The integrator's program on the installation that is shipped: a whole check, and an explanation of all LEDs of a
+// board.
 #include <benchmark/benchmark.h>
 
 #include "boardtool/Check.h"

@@ -61,8 +61,7 @@ std::unique_ptr<Chip> Make() {
   return std::make_unique<Class>();
 }
 
-// A name is compared whole and with letter case. A row without a factory is a class still to be written; a new one
-// gets its factory here.
+// A name is compared whole and with letter case.
 constexpr ChipRow kRows[] = {
     {1, "chip", Make<Chip>},
     {2, "adt", Make<AdtChip>},

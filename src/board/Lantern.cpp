@@ -51,7 +51,7 @@ bool Lantern::SavePowerLedState() {
 
 bool Lantern::RestorePowerLedState() {
   if (!isOpen) {
-    return false;
+    return true;
   }
   if (savedPins) {
     superIo.Write(kPinRegister, *savedPins);
@@ -63,17 +63,17 @@ bool Lantern::RestorePowerLedState() {
 }
 
 bool Lantern::SavePowerButton() {
-  if (!HasButton()) {
+  if (!button.HasBase()) {
     return false;
   }
   button.Save();
   return true;
 }
-bool Lantern::RestorePowerButton() { return HasButton() && button.Restore(); }
-bool Lantern::ArmPowerButton() { return HasButton() && button.Arm(); }
+bool Lantern::RestorePowerButton() { return button.HasBase() && button.Restore(); }
+bool Lantern::ArmPowerButton() { return button.HasBase() && button.Arm(); }
 bool Lantern::IsPowerButtonPressed(bool& pressed) {
-  pressed = HasButton() && button.IsPressed();
-  return HasButton();
+  pressed = button.HasBase() && button.IsPressed();
+  return button.HasBase();
 }
 
 }  // namespace panelglow

@@ -18,9 +18,10 @@ class Lantern : public OldestBoard {
   /// Opens the Super-I/O's configuration mode, which stays open for the blinking, and gives the pin to the LED.
   bool SavePowerLedState() override;
 
-  /// Puts the pin back and closes the mode; does nothing without a save.
+  /// Puts the pin back and closes the mode; true, and nothing is done, without a save.
   bool RestorePowerLedState() override;
 
+  // The button is where the first settings have it; false, and nothing is touched, when they have it nowhere.
   bool SavePowerButton() override;
   bool RestorePowerButton() override;
   bool ArmPowerButton() override;
@@ -36,9 +37,6 @@ class Lantern : public OldestBoard {
 
  private:
   static constexpr std::uint16_t kIndexPort = 0x2E;
-
-  /// Without its base nothing is known of the button: ports 0 and 2 are other parts'.
-  [[nodiscard]] bool HasButton() const { return Settings().powerIoBase != 0; }
 
   PowerEventButton button;
   bool isOpen = false;

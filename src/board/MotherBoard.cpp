@@ -187,6 +187,7 @@ MotherBoard::MotherBoard(const std::string& systemIdText) : MotherBoard("generic
     BuildAllChips();
     return;
   }
+  hasList = true;
   CDMUtil::Split(list.text, listed, ", ");
   for (const std::string& name : listed) {
     if (FindChipRow(name) == nullptr && name != kNoChip) {
@@ -259,7 +260,15 @@ Chip& MotherBoard::ChipOf(ChipChoice& choice) {
   return *choice.chip;
 }
 
-std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
+// Composed once: an LED is asked again and again.
+const std::string& MotherBoard::WhyNothing(ChipChoice& choice) const {
+  if (choice.whyNothing.empty()) {
+    choice.whyNothing = FindWhyNothing(choice);
+  }
+  return choice.whyNothing;
+}
+
+std::string MotherBoard::FindWhyNothing(const ChipChoice& choice) const {
   IniReader& reader = IniReader::Instance();
   if (choice.isPreset) {
     return "the board class " + className + " gives it to the chip \"" + choice.name + "\", which has nothing for it";
@@ -276,7 +285,7 @@ std::string MotherBoard::WhyNothing(const ChipChoice& choice) const {
   if (FindChipRow(choice.name) == nullptr) {
     return chip + " does not exist";
   }
-  if (!listed.empty() && std::find(listed.begin(), listed.end(), choice.name) == listed.end()) {
+  if (hasList && std::find(listed.begin(), listed.end(), choice.name) == listed.end()) {
     return chip + " is not in the list of the key \"chips\"";
   }
   if (choice.chip != nullptr && choice.chip->GetName() == kNoChip) {

@@ -103,8 +103,8 @@ class MotherBoard {
   virtual bool DetectFans();
   [[nodiscard]] const std::vector<FanGroup>& GetFanGroups() const { return fans.Groups(); }
 
-  // ---- temperature zones (see ZoneSet). They are loaded first; a zone is named by its number from 1. The getters
-  // are true when zones were loaded, also when there are none.
+  // ---- temperature zones (see ZoneSet). They are loaded first; a zone is named by its number from 1. What gives the
+  // list or a setting is always true.
   virtual bool GetZones(std::vector<TempZone>& list);
   virtual bool LoadZones();
   virtual bool LoadZoneGroups();
@@ -237,7 +237,7 @@ class MotherBoard {
   /// For the classes with a list of chips of their own: the chip "none" in every place.
   MotherBoard(std::string boardClass, std::uint16_t boardId);
 
-  /// Builds the class of a name of the chip table in its place; a class that this version does not have stays "none".
+  /// Builds the class of a name of the chip table in its place.
   void Place(std::string_view chipName);
 
   /// The chip that serves a fan, zone or device; GetChip, unless a board class has one of its own.
@@ -255,8 +255,9 @@ class MotherBoard {
     const char* settings;  // beginning of its keys in a chip's section
     std::string name = {};
     Chip* chip = nullptr;
-    bool isPreset = false;  // the name is the board class's own
-    bool wasLit = false;    // by this board
+    bool isPreset = false;        // the name is the board class's own
+    bool wasLit = false;          // by this board
+    std::string whyNothing = {};  // the end of what people are told; empty until it is
   };
   Chip& ChipOf(ChipChoice& choice);
 
@@ -286,11 +287,13 @@ class MotherBoard {
   void BuildListedChips();
   void BuildAllChips();
   void InitializeGeneric(std::size_t place);
-  [[nodiscard]] std::string WhyNothing(const ChipChoice& choice) const;
+  [[nodiscard]] const std::string& WhyNothing(ChipChoice& choice) const;
+  [[nodiscard]] std::string FindWhyNothing(const ChipChoice& choice) const;
 
   platform::NamedMutexLock lock;  // in front of the chips: given up behind them, also when the construction fails
   std::array<std::unique_ptr<Chip>, kChipPlaces> chips;  // never null
-  std::vector<std::string> listed;                       // the value of "chips", in names; none: every class
+  std::vector<std::string> listed;                       // the value of "chips", in names
+  bool hasList = false;                                  // there is such a value; without: every class
   std::uint16_t systemId;
   std::string className;
   HoodSwitch hoodSwitch{Finder()};

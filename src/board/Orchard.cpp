@@ -131,7 +131,7 @@ bool Orchard::DeassertPowerLed() { return Light(kDark); }
 
 bool Orchard::RestorePowerLedState() {
   if (!isSaved) {
-    return false;
+    return true;
   }
   Light(kGreen);
   superIo.Write(kPinMultiplexer, kPinsAtStart);

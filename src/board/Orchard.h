@@ -18,7 +18,7 @@ class Orchard : public OldestBoard {
   bool AssertPowerLedRed() override;
   bool DeassertPowerLed() override;
 
-  /// The LED is green again, its pins as they are after a start; does nothing without a save.
+  /// The LED is green again, its pins as they are after a start; true, and nothing is done, without a save.
   bool RestorePowerLedState() override;
 
   /// The cable of a network controller is found by driving that controller's pin.

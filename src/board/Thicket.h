@@ -16,6 +16,7 @@ class Thicket : public MotherBoard {
     Place("ite");
     Place("acpi");
     powerLed.name = "ite";
+    zones.PresetChip("ite");
   }
 };
 

@@ -3,6 +3,7 @@
 #include <set>
 
 #include "boardtool/BoardOnMachine.h"
+#include "boardtool/Output.h"
 #include "boardtool/Rehearsal.h"
 #include "platform/Host.h"
 
@@ -12,10 +13,6 @@ namespace {
 
 constexpr std::uint32_t kPhase_ms = 500;
 constexpr std::uint32_t kLook_ms = 50;
-
-void Say(const std::string& sentence) {
-  platform::TheHost().console.WriteError("panelglow-board: " + sentence + "\n");
-}
 
 // Where a plan writes, each place once.
 std::string PlacesOf(const LedPlan& plan) {

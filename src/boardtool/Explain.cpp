@@ -57,7 +57,10 @@ struct ShownLine {
 };
 
 bool SelectsNext(const PlannedAccess& access, const PlannedAccess& next) {
+  // Above the configuration ports an index is only one way to see it: an output in front of its pins looks the same.
+  constexpr int kLastConfigPort = 0x3FF;
   return access.access.kind == HardwareAccess::Kind::kPortWrite && next.access.reg >= 0 &&
+         next.access.indexPort <= kLastConfigPort &&
          access.access.address == static_cast<std::uint64_t>(next.access.indexPort) &&
          access.access.value == static_cast<std::uint64_t>(next.access.reg);
 }

@@ -28,7 +28,7 @@ constexpr std::array kRules{
     Rule{"duplicate-section", Severity::kWarning, "A section stands twice; the first counts."},
     Rule{"file-missing", Severity::kError, "A file of the installation is missing or cannot be read."},
     Rule{"file-too-large", Severity::kError, "A file is larger than any file of an installation can be."},
-    Rule{"icon-missing", Severity::kWarning, "A button's icon is missing or is no picture."},
+    Rule{"icon-missing", Severity::kError, "A button's icon is missing or is no picture."},
     Rule{"led-not-lit", Severity::kError, "No board of the files lights a LED that a test asks for."},
     Rule{"malformed-sequence", Severity::kError, "An entry of a sequence is no command with its data."},
     Rule{"message-format", Severity::kError, "A text has a place for something that the program does not give."},

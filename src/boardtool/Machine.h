@@ -22,6 +22,9 @@ void UseMachine(const MachineOptions& options);
 /// What a person would see of a simulated machine's panel at this moment, as "power-green lit"; empty on a real one.
 std::string PanelNow();
 
+/// Lets a simulated machine take notice of what came from outside, as a signal, while somebody is waited for.
+void LetMachineNotice();
+
 /// A person at a terminal.
 struct Person {
   bool isThere = false;                                // standard input is a terminal

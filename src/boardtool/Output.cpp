@@ -1,5 +1,7 @@
 #include "boardtool/Output.h"
 
+#include <string>
+
 namespace panelglow::boardtool {
 
 namespace {
@@ -9,6 +11,10 @@ platform::Console* g_own = nullptr;  // the machine's, while the library's lines
 }  // namespace
 
 void Print(std::string_view text) { (g_own == nullptr ? platform::TheHost().console : *g_own).Write(text); }
+
+void Say(std::string_view sentence) {
+  platform::TheHost().console.WriteError("panelglow-board: " + std::string(sentence) + "\n");
+}
 
 OwnOutput::OwnOutput(platform::Host& machine) : library_(machine.console) { g_own = &machine.console; }
 

@@ -11,6 +11,9 @@ namespace panelglow::boardtool {
 /// Writes to standard output.
 void Print(std::string_view text);
 
+/// Writes a sentence to standard error, behind the program's name.
+void Say(std::string_view sentence);
+
 /// While it exists, what the library writes to standard output goes to standard error: the output is the tool's own.
 class OwnOutput {
  public:

@@ -71,6 +71,7 @@ int CodeOf(const Readouts& readouts) {
 
 int Fans(const ReadOptions& options, const Person& person) {
   BoardOnMachine machine(options.folder);
+  Say("reads the fans; one that the files say turns only with a duty is given it for as long as it is looked for.");
   const int code = Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<FanReadout> fans = ReadFans(machine.Board());
     Print(options.json ? FansJson(fans) : FansText(fans));
@@ -85,6 +86,7 @@ int Fans(const ReadOptions& options, const Person& person) {
 int Zones(const ReadOptions& options, const Person& person) {
   constexpr std::uint32_t kSecond_ms = 1000;
   BoardOnMachine machine(options.folder);
+  Say("reads the temperatures; nothing but index registers is written.");
   const std::string failure = FailureOf([&] { machine.Board().LoadZones(); });
   if (!failure.empty()) {
     throw CannotRun("the temperature zones cannot be loaded: " + failure);
@@ -104,6 +106,7 @@ int Zones(const ReadOptions& options, const Person& person) {
 
 int Detect(const ReadOptions& options, const Person& person) {
   BoardOnMachine machine(options.folder);
+  Say("reads lines; the latched bit of a button is cleared by reading it.");
   return Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<DeviceReadout> devices = ReadDevices(machine.Board());
     Print(options.json ? DevicesJson(devices) : DevicesText(devices));

@@ -28,7 +28,7 @@ constexpr std::uint32_t kSlow_ms = 1000;
 constexpr std::uint32_t kLook_ms = 50;
 constexpr unsigned kBits = 8;
 
-void Say(const std::string& text) { platform::TheHost().console.WriteError(text); }
+void Tell(const std::string& text) { platform::TheHost().console.WriteError(text); }
 
 // How an LED's keys begin in the section of a chip with masks.
 struct LedKeys {
@@ -75,6 +75,10 @@ class Walk {
     }
     if (hasMasks_ && (!CDMUtil::IsInteger(options.at) || range_.second >= kBits)) {
       throw WrongCall("name the register with --at, as 0xA20, and bits of it, as 0-7");
+    }
+    constexpr std::int64_t kLastAddress = 0xFFFFFFFF;
+    if (hasMasks_ && (CDMUtil::ToInt64(options.at) < 0 || CDMUtil::ToInt64(options.at) > kLastAddress)) {
+      throw WrongCall("an address is 0 to 0xFFFFFFFF");
     }
     at_ = CDMUtil::ToUnsignedLong(options.at);
     constexpr std::uint32_t kLastPort = 0xFFFE;
@@ -221,7 +225,7 @@ class KeptBoard {
       putBack_();
     });
     if (!failure.empty()) {
-      Say("it could not be put back: " + failure + "\n");
+      Tell("it could not be put back: " + failure + "\n");
     }
   }
   KeptBoard(const KeptBoard&) = delete;
@@ -246,7 +250,7 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
     throw CannotRun("the board cannot be built: " + failure);
   }
   const KeptBoard kept(*board, walk.Kept());
-  Say(walk.NameOf(number) + ": ");
+  Tell(walk.NameOf(number) + ": ");
   board->SavePowerLedState();
   if (walk.HasMasks()) {
     board->AssertPowerLedGreen();
@@ -263,14 +267,14 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
         "the chip does not blink: its section needs powerled.green.blink.sequence with primary_led in it");
   }
   if (const std::string panel = PanelNow(); !panel.empty()) {
-    Say(panel + "; ");
+    Tell(panel + "; ");
   }
   for (;;) {
-    Say("which lamp moved? ");
+    Tell("which lamp moved? ");
     const std::optional<std::string> answer = person.answer();
     const std::string word = answer ? CDMUtil::ToLower(CDMUtil::Trim(*answer)) : "q";
     if (word == "q" || word == "quit") {
-      Say("\n");
+      Tell("\n");
       return std::nullopt;
     }
     const auto known =
@@ -279,10 +283,10 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
     if (word.empty() || (known != kLedKeys.end() && (walk.HasMasks() || isPower))) {
       return word;
     }
-    Say("\"" + word + "\" is no answer: press Enter for none, or type " +
-        (walk.HasMasks() ? "power-green, power-red, charge-white, charge-red, drive-red, wireless"
-                         : "power-green, power-red") +
-        ", or q to end. ");
+    Tell("\"" + word + "\" is no answer: press Enter for none, or type " +
+         (walk.HasMasks() ? "power-green, power-red, charge-white, charge-red, drive-red, wireless"
+                          : "power-green, power-red") +
+         ", or q to end. ");
   }
 }
 
@@ -321,14 +325,14 @@ int Try(const TryOptions& options, const Person& person) {
     throw CannotRun("no driver on this machine, so that nothing can be tried");
   }
   const auto [first, last] = walk.Range();
-  Say("This walk changes " + std::string(walk.HasMasks() ? walk.Place() + ", bits " : "lines ") +
-      std::to_string(first) + " to " + std::to_string(last) + (IsSimulated() ? " of a simulated machine" : "") +
-      ", one at a time, and puts each back.\nWhat else hangs there moves, too. Ctrl-C or q ends it. For each, type "
-      "the "
-      "lamp that moved, or press Enter for none:\n" +
-      (walk.HasMasks() ? "power-green, power-red, charge-white, charge-red, drive-red, wireless"
-                       : "power-green, power-red") +
-      "\n");
+  Tell("This walk changes " + std::string(walk.HasMasks() ? walk.Place() + ", bits " : "lines ") +
+       std::to_string(first) + " to " + std::to_string(last) + (IsSimulated() ? " of a simulated machine" : "") +
+       ", one at a time, and puts each back.\nWhat else hangs there moves, too. Ctrl-C or q ends it. For each, type "
+       "the "
+       "lamp that moved, or press Enter for none:\n" +
+       (walk.HasMasks() ? "power-green, power-red, charge-white, charge-red, drive-red, wireless"
+                        : "power-green, power-red") +
+       "\n");
   std::map<std::string, unsigned> found;
   for (unsigned number = first; number <= last && !StopRequest::IsMade(); ++number) {
     const std::optional<std::string> lamp = Ask(walk, options, systemId, number, person);
@@ -340,7 +344,7 @@ int Try(const TryOptions& options, const Person& person) {
     }
   }
   if (found.empty()) {
-    Say("No lamp was found.\n");
+    Tell("No lamp was found.\n");
     return 1;
   }
   Print(Sections(options, systemId, walk, found));

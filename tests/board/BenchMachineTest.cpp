@@ -163,6 +163,24 @@ TEST(BenchDesktop, ZonesAreReadOfTheMonitorAndOfEachCore) {
   EXPECT_EQ(zones[1].coreHigh, 95);
 }
 
+// A board class with a hardware monitor of its own does not ask the files for it.
+TEST(BoardClasses, APresetMonitorServesTheZonesThatNameNone) {
+  const std::pair<const char*, const char*> kClasses[] = {{"mistral", "ite a"}, {"cobble", "adt a"}};
+  for (const auto& [name, chips] : kClasses) {
+    BoardBench bench;
+    bench.SetFiles(std::string("[7D10]\nplatform=") + name + "\n",
+                   "[7D10]\ntest.tempcaution.chip=adt\ntest.tempcaution.zone.1.name=Y\n"
+                   "test.tempcaution.zone.2.name=Z\ntest.tempcaution.zone.2.chip=a\n",
+                   "");
+    const auto board = BoardBench::Board();
+    board->LoadZones();
+    std::vector<TempZone> zones;
+    board->GetZones(zones);
+    ASSERT_EQ(zones.size(), 2U);
+    EXPECT_EQ(zones[0].chip + " " + zones[1].chip, chips);
+  }
+}
+
 TEST(OrchardDesktop, ReadsAllByItsFlatKeys) {
   InstalledBench bench("orchard-desktop.toml", "2A60");
   const auto board = MotherBoard::Instance(".\\mbdetect.ini");

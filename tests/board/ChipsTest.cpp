@@ -175,6 +175,8 @@ TEST(Chip, ThePlainChipKnowsThePowerButtonAndLatchedBits) {
     EXPECT_EQ(bench.Traffic([&] { EXPECT_FALSE(board->ReadLatchedBit(0xA30, bit)); }), "0A30->FFFF1212 ");
   }
   Chip& chip = board->GetChip("");
+  int rpm = 5;
+  EXPECT_TRUE(!chip.ReadFanRpm(1, rpm, 1) && rpm == 0);
   EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 0x02, out) && out); }), "0A30->12 0A30<-12 ");
   EXPECT_EQ(bench.Traffic([&] { EXPECT_TRUE(chip.ReadLatchedPort(0xA30, 0x01, out) && !out); }), "0A30->12 ");
 }

@@ -340,6 +340,19 @@ TEST(SmscMec1322Chip, LampsAreListsOfPortsAndTheirMultiplexersGoThroughTheMailbo
   }
 }
 
+TEST(SmscMec1322Chip, AMultiplexerThatNoListReachesIsNotPutBack) {
+  ChipBench bench(kMailbox, "",
+                  "[smsc_mec1322]\npowerled.green.assert.sequence=0xA0:1\nchargeled.red.enablemux.sequence=0xD1:6\n");
+  SmscMec1322Chip chip;
+  const std::tuple<Operation, const char*> kOperations[] = {{&Chip::SavePowerLedState, ""},
+                                                            {&Chip::RestorePowerLedState, "00A0<-01 30ms "},
+                                                            {&Chip::SaveChargeLedState, "00D1<-06 30ms "},
+                                                            {&Chip::RestoreChargeLedState, ""}};
+  for (const auto& [operation, traffic] : kOperations) {
+    EXPECT_EQ(bench.Traffic([&, run = operation] { EXPECT_TRUE((chip.*run)()); }), traffic);
+  }
+}
+
 TEST(SmscMec1322Chip, TheFanIsBehindAPageOfTheMailbox) {
   const auto at = [](const std::string& low) {
     return "0200<-85 0201<-40 50ms 0200<-84 0201<-00 50ms 0200<-82 0201<-1D 50ms "

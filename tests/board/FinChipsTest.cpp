@@ -113,7 +113,7 @@ TEST(FinChip, ThePowerButtonIsAnEventThatCanBeTakenAway) {
     FinBench bench(keys);
     FinChip chip;
     ExpectCases(bench, chip,
-                {{&Chip::RestorePowerButtonState, 0, ""},  // nothing is kept yet
+                {{&Chip::RestorePowerButtonState, 1, ""},  // nothing is kept yet
                  {&Chip::SavePowerButtonState, 1, enable + "->FFFF "},
                  {&Chip::ArmPowerButton, isTaken, enable + "<-FEFE " + enable + "->" + armed + " "},
                  {Pressed, 1, status + "->FFFF "},

@@ -86,6 +86,16 @@ TEST(IniReader, NumbersAreDecimalOrPrefixedAndEveryReadIsRecorded) {
             "7D10 none = a (dflt)\n7D10 none2 = ffffffff (dflt)\n");
 }
 
+TEST(IniReader, AnAddressOfZeroIsNone) {
+  BoardBench bench;
+  bench.SetFiles("[7D10]\na=0\nb=1\nc=undef\n", "", "");
+  IniReader::Instance("7D10", ".\\mbdetect.ini", ".\\mbtest.ini", ".\\chip.ini");
+  for (const auto& [key, value] : {std::pair("a", 7U), {"b", 1U}, {"c", 7U}, {"none", 7U}}) {
+    EXPECT_EQ(ReadIniWordUnlessZero(key, 7), value) << key;
+    EXPECT_EQ(ReadIniUnsignedUnlessZero(key, 7), value) << key;
+  }
+}
+
 TEST(IniReader, WhatIsNoNumberOrDoesNotFitIsToldWithItsPlace) {
   BoardBench bench;
   bench.SetFiles(

@@ -157,7 +157,7 @@ const BrokenCase kBroken[] = {
     {"buttondefinition.xml", "'1016'", "'1017'",
      "\"drivered\" has the command \"1017\"; the answer to this LED is 1016"},
     {"buttondefinition.xml", "'p.ico'", "'q.ico'",
-     "buttondefinition.xml:2:1: warning: the icon \"q.ico\" of \"powergre"},
+     "buttondefinition.xml:2:1: error: the icon \"q.ico\" of \"powergre"},
     {"buttondefinition.xml", "'drivered'", "'powergreen'",
      "buttondefinition.xml:3:1: warning: the definition of \"powergreen\" stands above already"},
     {"p.ico", "", "none", "the icon \"p.ico\" of \"powergreen\" is no picture [icon-missing]"},

@@ -176,6 +176,12 @@ TEST(ObjectStream, AnyTreeComesBackAsItWas) {
   }
   innermost->SetAttribute("a", "b");
   EXPECT_EQ(RoundTrip(deep), deep.ToString(false));
+  XmlObject wide;  // its list moves as its items come in
+  for (int i = 0; i < 300; ++i) {
+    wide.AddChild(XmlObject())->value = std::to_string(i);
+    wide.SetAttribute("a" + std::to_string(i), i);
+  }
+  EXPECT_EQ(RoundTrip(wide), wide.ToString(false));
   innermost->AddChild(deep);
   EXPECT_THROW(Written([&](optstream& out) { out.WriteValue(deep); }), std::runtime_error);
 }

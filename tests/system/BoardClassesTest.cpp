@@ -52,6 +52,7 @@ const std::vector<Board>& Boards() {
       {"ich-desktop.toml",  // a class that has the lamp from the one it comes from
        "TwoColorPower",
        {{"mbdetect.ini", "chips=ich\n", "chips=hudson\n"}, {"mbtest.ini", "chip=ich\n", "chip=hudson\n"}}},
+      {"bench-desktop.toml"},  // beside much else
       Classed("sio-wpcd376.toml", "ich_win", "win_wpcd376", true),
       Classed("sio-lpc47.toml", "sb7sch5", "sio", true),
       Classed("sio-ite-old.toml", "mistral", "ite", true),
@@ -66,6 +67,7 @@ const std::vector<Board>& Boards() {
            {"machine.toml", "\"F3\" = 0x40", "\"F3\" = 0x29"}}),
       {.machine = "smbus-desktop.toml", .hasSignal = false},
       Oldest("sio-wpcd376.toml", "Orchard", "win_wpcd376", "TwoColorPower"),
+      {.machine = "orchard-desktop.toml", .hasSignal = false},
       {.machine = "saddle-desktop.toml", .section = "Default", .hasSignal = false},
   };
   return kBoards;

@@ -53,7 +53,9 @@ TEST(SystemBoardTool, HelpsAnybodyAndTellsWrongCallsFromWhatCannotBe) {
         Call{{"blink", "power-green", "--seconds", "1"}, 3, "no driver on this machine"},
         Call{{"fans"}, 3, "no driver on this machine"}, Call{{"try", "--chip", "fin"}, 2, "the walk knows g_iospace"},
         Call{{"try", "--chip", "g_iospace", "--at", "A20"}, 2, "name the register with --at"},
-        Call{{"report"}, 1, ""}, Call{{"replay", "ui.xml", "fans"}, 3, "is no trace of panelglow-board"}}) {
+        Call{{"try", "--chip", "g_memoryspace", "--at", "0x1FFFFFFFF"}, 2, "an address is 0 to"},
+        Call{{"try", "--chip", "g_memoryspace", "--at=-1"}, 2, "an address is 0 to"}, Call{{"report"}, 1, ""},
+        Call{{"replay", "ui.xml", "fans"}, 3, "is no trace of panelglow-board"}}) {
     const Outcome outcome = Ask(installation, kReal, call.arguments);
     EXPECT_EQ(outcome.exitCode, call.exitCode) << ::testing::PrintToString(call.arguments) << outcome.errors;
     EXPECT_THAT(outcome.errors, HasSubstr(call.says));

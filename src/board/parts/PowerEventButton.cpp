@@ -13,15 +13,17 @@ constexpr std::uint32_t kBetweenReads_ms = 100;
 
 }  // namespace
 
-void PowerEventButton::Save() { savedEnable = devio->InportWord(EnablePort()); }
+void PowerEventButton::Save() {
+  if (!savedEnable) {
+    savedEnable = devio->InportWord(EnablePort());
+  }
+}
 
 bool PowerEventButton::Arm() {
+  Save();
   if (check == Check::kNone) {
     devio->OutportWord(EnablePort(), devio->InportWord(EnablePort()) & kNoEvents);
     return true;
-  }
-  if (!savedEnable) {
-    Save();
   }
   devio->OutportWord(EnablePort(), *savedEnable & kNoEvents);
   return devio->InportWord(EnablePort()) != *savedEnable;
@@ -29,13 +31,14 @@ bool PowerEventButton::Arm() {
 
 bool PowerEventButton::IsPressed() const { return (devio->InportWord(base) & kPressed) != 0; }
 
-bool PowerEventButton::Restore() const {
+bool PowerEventButton::Restore() {
   if (!savedEnable) {
-    return false;
+    return true;
   }
   devio->OutportWord(base, kPressed);
   devio->OutportWord(EnablePort(), *savedEnable);
   if (check == Check::kNone) {
+    savedEnable.reset();
     return true;
   }
   for (int read = 1; devio->InportWord(EnablePort()) != *savedEnable; ++read) {
@@ -44,6 +47,7 @@ bool PowerEventButton::Restore() const {
     }
     platform::TheHost().clock.Sleep(kBetweenReads_ms);
   }
+  savedEnable.reset();
   return true;
 }
 

@@ -60,6 +60,15 @@ class FlatKeys {
     return number;
   }
 
+  [[nodiscard]] int Percent(const std::string& key, int defaultValue) const {
+    const int percent = Number(key, defaultValue);
+    const int limited = std::clamp(percent, 0, 100);
+    if (limited != percent) {
+      TellOf(Text(key), std::to_string(percent) + " percent is no duty and counts as " + std::to_string(limited));
+    }
+    return limited;
+  }
+
   [[nodiscard]] std::uint16_t Word(const std::string& key) const {
     const Setting setting = Text(key);
     return setting.text.empty() ? std::uint16_t{0} : static_cast<std::uint16_t>(NumberIn(setting.text, 16, setting));
@@ -89,7 +98,7 @@ std::vector<Fan> ReadFans(const FlatKeys& keys) {
     fan.tachIndex = keys.Number(prefix + "TachIndex", fan.tachIndex);
     fan.nominal = ReadLimits(keys, prefix + "Nominal");
     fan.pwmIndex = n;
-    fan.pwmDuty = std::clamp(keys.Number(prefix + "PWM", fan.pwmDuty), 0, 100);
+    fan.pwmDuty = keys.Percent(prefix + "PWM", fan.pwmDuty);
     fan.pwm = ReadLimits(keys, prefix + "PWM");
     fan.full = ReadLimits(keys, prefix + "Full");
     fans.push_back(std::move(fan));

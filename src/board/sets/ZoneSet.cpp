@@ -94,7 +94,7 @@ bool ZoneSet::Load() {
   probe.consecutiveHigh = ReadIniInt("test.tempcaution.consecutivehigh", ProbeSettings{}.consecutiveHigh);
   probe.consecutiveLow = ReadIniInt("test.tempcaution.consecutivelow", ProbeSettings{}.consecutiveLow);
   probe.retriesOnInvalid = ReadIniInt("test.tempcaution.retriesoninvalidtemp", ProbeSettings{}.retriesOnInvalid);
-  const std::string usualChip = ReadIniValue("test.tempcaution.chip", "sio");
+  const std::string usualChip = presetChip.empty() ? ReadIniValue("test.tempcaution.chip", "sio") : presetChip;
   std::vector<TempZone> list;
   for (int n = 1;; ++n) {
     const std::string prefix = "test.tempcaution.zone." + CDMUtil::ToString(n) + ".";

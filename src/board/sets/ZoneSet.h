@@ -27,6 +27,9 @@ class ZoneSet {
  public:
   explicit ZoneSet(ChipFinder finder) : chipOf(std::move(finder)) {}
 
+  /// The chip of zones that name none, in place of the files' own word for it.
+  void PresetChip(std::string name) { presetChip = std::move(name); }
+
   /// Reads zones and probe settings from the files, in place of those before. Throws what the chips throw of whose
   /// thresholds limits are made.
   bool Load();
@@ -81,6 +84,7 @@ class ZoneSet {
   void LimitByTjMax(TempZone& zone) const;
 
   ChipFinder chipOf;
+  std::string presetChip;  // empty: the files say it
   std::vector<TempZone> zones;
   std::vector<ZoneGroup> groups;
   ProbeSettings probe;

@@ -8,6 +8,8 @@ namespace panelglow::boardtool {
 
 bool IsSimulated() { return true; }
 
+void LetMachineNotice() { platform::sim::CurrentSimulation().Time().SleepFor(1); }
+
 std::string PanelNow() {
   const platform::sim::FrontPanel& panel = platform::sim::CurrentSimulation().Panel();
   std::string lit;

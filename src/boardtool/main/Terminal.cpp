@@ -35,6 +35,7 @@ std::optional<std::string> ReadLine() {
   std::string line;
   while (!StopRequest::IsMade()) {
     if (!HasInput(kLook_ms)) {
+      LetMachineNotice();
       continue;
     }
     const std::optional<char> byte = ReadByte();

@@ -163,30 +163,31 @@ void SmscMec1322Chip::RestoreMux(List which) {
   WriteByte(savedMux);
 }
 
-// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back.
+// Each multiplexer counts as saved before the LED gets it: a save that is interrupted behind it can be put back. One
+// without a list is at an address that nobody knows, and is left alone.
 bool SmscMec1322Chip::SavePowerLedState() {
-  SaveMux(kPowerGreenSaveMux);
-  isPowerMuxSaved = true;
+  isPowerLedTaken = true;
+  isPowerMuxSaved = SaveMux(kPowerGreenSaveMux);
   RunList(kPowerGreenEnableMux);
   return true;
 }
 
 bool SmscMec1322Chip::RestorePowerLedState() {
-  if (!isPowerMuxSaved) {
+  if (!isPowerLedTaken) {
     return true;
   }
-  RestoreMux(kPowerGreenSaveMux);
+  if (isPowerMuxSaved) {
+    RestoreMux(kPowerGreenSaveMux);
+  }
   return AssertPowerLedGreen();
 }
 
 bool SmscMec1322Chip::SaveChargeLedState() {
-  SaveMux(kChargeRedSaveMux);
+  isChargeRedMuxSaved = SaveMux(kChargeRedSaveMux);
   savedMuxRed = savedMux;
-  isChargeRedMuxSaved = true;
   RunList(kChargeRedEnableMux);
-  SaveMux(kChargeGreenSaveMux);
+  isChargeGreenMuxSaved = SaveMux(kChargeGreenSaveMux);
   savedMuxGreen = savedMux;
-  isChargeGreenMuxSaved = true;
   RunList(kChargeGreenEnableMux);
   return true;
 }

@@ -71,6 +71,7 @@ class SmscMec1322Chip : public EcChip {
   std::uint8_t savedMux = 0;
   std::uint8_t savedMuxRed = 0;
   std::uint8_t savedMuxGreen = 0;  // of the charge LED; kept too, so that putting back can be begun again
+  bool isPowerLedTaken = false;    // by a save; a multiplexer is saved where the files say how
   bool isPowerMuxSaved = false;
   bool isChargeRedMuxSaved = false;
   bool isChargeGreenMuxSaved = false;

@@ -1,7 +1,6 @@
 #include "board/chips/generic/GChip.h"
 
 #include "board/base/IniReader.h"
-#include "board/parts/IndexedPorts.h"
 #include "board/parts/Sequence.h"
 #include "harness/base/CDMUtil.h"
 
@@ -91,18 +90,6 @@ bool GChip::SetFanFullSpeed(int fan) {
 
 bool GChip::SetFanPwmPercent(int fan, int percent) {
   return SetFanPwm(fan, static_cast<int>(std::int64_t{percent} * fullSpeedData / 100));
-}
-
-std::uint8_t GChip::ReadPort(std::uint16_t base, std::uint16_t offset) {
-  return devio.InportByte(static_cast<std::uint16_t>(base + offset));
-}
-
-std::uint8_t GChip::ReadIndexed(std::uint16_t indexPort, std::uint8_t reg) {
-  return IndexedPorts(devio, indexPort).Read(reg);
-}
-
-void GChip::WriteIndexed(std::uint16_t indexPort, std::uint8_t reg, std::uint8_t value) {
-  IndexedPorts(devio, indexPort).Write(reg, value);
 }
 
 }  // namespace panelglow

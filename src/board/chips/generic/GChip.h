@@ -25,10 +25,6 @@ class GChip : public Chip {
   virtual void LoadTemperatureConfiguration();
   virtual void LoadPowerLedConfiguration();
 
-  virtual std::uint8_t ReadPort(std::uint16_t base, std::uint16_t offset);
-  virtual std::uint8_t ReadIndexed(std::uint16_t indexPort, std::uint8_t reg);
-  virtual void WriteIndexed(std::uint16_t indexPort, std::uint8_t reg, std::uint8_t value);
-
   virtual bool EnterManualFanMode() { return false; }
   virtual bool LeaveManualFanMode() { return false; }
 

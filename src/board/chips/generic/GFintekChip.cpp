@@ -5,11 +5,11 @@
 #include <optional>
 
 #include "board/base/IniReader.h"
-
 #include "board/parts/Bits.h"
 #include "board/parts/ClearedLatch.h"
 #include "board/parts/ConfigMode.h"
 #include "board/parts/Lines.h"
+#include "board/parts/ReadBase.h"
 #include "board/parts/RpmOf.h"
 #include "board/parts/Sequence.h"
 
@@ -72,12 +72,12 @@ bool GFintekChip::ReadIntrusionLatch(int line, bool /*clearFirst*/, bool& value)
 }
 
 int GFintekChip::ReadLine(int line) {
-  if (line == kIntrusionLine) {
+  if (line == kIntrusionLine && IsBase(hwmBar)) {
     return LineState(ReadClearedLatch(environment, {0, kIntrusionStatus}, kIntrusion, kClearSettle_ms));
   }
   std::uint8_t reg = 0;
   std::uint8_t mask = 0;
-  if (!MapGpioLine(line, reg, mask)) {
+  if (!HasConfigPorts() || !MapGpioLine(line, reg, mask)) {
     return kNoSuchLine;
   }
   const ConfigMode mode(*this);

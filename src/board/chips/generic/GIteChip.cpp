@@ -5,6 +5,7 @@
 #include "board/parts/Bits.h"
 #include "board/parts/ConfigMode.h"
 #include "board/parts/LedLineMap.h"
+#include "board/parts/ReadBase.h"
 #include "board/parts/Step.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
@@ -53,6 +54,9 @@ void GIteChip::Initialize() {
 void GIteChip::ExitConfigMode() { ConfigPorts().SetBits(kConfigureControl, kReturnToWaitForKey); }
 
 std::uint32_t GIteChip::ReadChipId() {
+  if (!HasConfigPorts()) {
+    return 0;
+  }
   const ConfigMode mode(*this);
   const std::uint32_t id1 = ReadConfigRegister(kChipId1);
   const std::uint32_t id2 = ReadConfigRegister(kChipId2);
@@ -73,7 +77,7 @@ bool GIteChip::EnterManualFanMode() {
 }
 
 int GIteChip::ReadLine(int line) {
-  if (line != kIntrusionLine) {
+  if (line != kIntrusionLine || !IsBase(hwmBar)) {
     return kNoSuchLine;
   }
   platform::Clock& clock = platform::TheHost().clock;

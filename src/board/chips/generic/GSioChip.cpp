@@ -8,6 +8,7 @@
 #include "board/parts/ConfigMode.h"
 #include "board/parts/LevelPorts.h"
 #include "board/parts/NumberedLists.h"
+#include "board/parts/ReadBase.h"
 #include "board/parts/RpmOf.h"
 #include "board/parts/Sequence.h"
 #include "platform/Host.h"
@@ -71,6 +72,9 @@ std::uint16_t GSioChip::FindBar(const BarKeys& keys) {
   if (ldnStatus == IniReader::kUndefined || regStatus == IniReader::kUndefined) {
     return 0;
   }
+  if (!HasConfigPorts()) {
+    return 0;
+  }
   std::uint16_t bar = 0;
   {
     const ConfigMode mode(*this);
@@ -100,9 +104,17 @@ IndexedPorts GSioChip::EnvPorts() const {
   return {devio, static_cast<std::uint16_t>(hwmBar + envIndexReg), static_cast<std::uint16_t>(hwmBar + envDataReg)};
 }
 
-std::uint8_t GSioChip::ReadEnvRegister(std::uint8_t reg) { return EnvPorts().Read(reg); }
+// Without a base the ports would be those of other parts.
+std::uint8_t GSioChip::ReadEnvRegister(std::uint8_t reg) {
+  constexpr std::uint8_t kNobody = 0xFF;
+  return IsBase(hwmBar) ? EnvPorts().Read(reg) : kNobody;
+}
 
-void GSioChip::WriteEnvRegister(std::uint8_t reg, std::uint8_t value) { EnvPorts().Write(reg, value); }
+void GSioChip::WriteEnvRegister(std::uint8_t reg, std::uint8_t value) {
+  if (IsBase(hwmBar)) {
+    EnvPorts().Write(reg, value);
+  }
+}
 
 // ---- fans
 
@@ -171,7 +183,7 @@ bool GSioChip::ReadLowLimitTemperature(int zone, int& value) {
 
 int GSioChip::MapTemperature(int raw) { return raw < kHottest ? raw : kNoTemperature; }
 
-int GSioChip::ReadLine(int line) { return ReadLevelLine(devio, gpioBar, line); }
+int GSioChip::ReadLine(int line) { return IsBase(gpioBar) ? ReadLevelLine(devio, gpioBar, line) : kNoSuchLineState; }
 
 // ---- power LED
 
@@ -181,6 +193,9 @@ bool GSioChip::IsPowerLedRedSupported(bool& supported) {
 }
 
 bool GSioChip::SavePowerLedState() {
+  if (!HasConfigPorts()) {
+    return false;
+  }
   if (!savedPowerLed.Holds()) {
     const ConfigMode mode(*this);
     SelectLogicalDevice(powerLedLdn);
@@ -216,7 +231,7 @@ Steps GSioChip::StepsOf(const PairList& list) {
 }
 
 bool GSioChip::RunBlinkList(const PairList& list) {
-  if (list.empty()) {
+  if (list.empty() || !HasConfigPorts()) {
     return false;
   }
   const ConfigMode mode(*this);

@@ -69,6 +69,8 @@ class GSioChip : public GChip {
   [[nodiscard]] virtual std::string FanIntegrityText() const;
   void CheckFanIntegrity() const;
 
+  /// Without them in the files nothing is to be touched: port 0 is another part's.
+  [[nodiscard]] bool HasConfigPorts() const { return indexPort != 0 && dataPort != 0; }
   [[nodiscard]] IndexedPorts ConfigPorts() const { return {devio, indexPort, dataPort}; }
 
   RegistersOf<GSioChip> config;       // of the selected logical device
