@@ -4,15 +4,18 @@
 #include "platform/AbsentDevices.h"
 #include "platform/Host.h"
 #include "platform/host_linux/AbsentInputs.h"
-#include "platform/host_linux/EmptyManagement.h"
 #include "platform/host_linux/LinuxClock.h"
 #include "platform/host_linux/LinuxConsole.h"
 #include "platform/host_linux/LinuxCpu.h"
 #include "platform/host_linux/LinuxDesktop.h"
+#include "platform/host_linux/LinuxDeviceTree.h"
 #include "platform/host_linux/LinuxDriver.h"
 #include "platform/host_linux/LinuxEnvironment.h"
 #include "platform/host_linux/LinuxFiles.h"
+#include "platform/host_linux/LinuxManagement.h"
+#include "platform/host_linux/LinuxModules.h"
 #include "platform/host_linux/LinuxMutexes.h"
+#include "platform/host_linux/LinuxRegistry.h"
 #include "platform/host_linux/LinuxThreads.h"
 #include "platform/posix/LazyDrawing.h"
 #include "platform/posix/LazyXmlDocuments.h"
@@ -32,7 +35,10 @@ struct LinuxHost {
   LinuxDesktop desktop{drawing};
   posix::DrawnImages images{drawing};
   AbsentInputs inputs;
-  EmptyManagement management;
+  LinuxDeviceTree deviceTree;
+  LinuxManagement management;
+  LinuxModules modules;
+  LinuxRegistry registry;
   LinuxMutexes mutexes;
   profile::ProfileFilesOnFiles profiles{files};
   LinuxThreads threads;
@@ -44,18 +50,18 @@ struct LinuxHost {
             .console = console,
             .cpu = cpu,
             .desktop = desktop,
-            .deviceTree = devices,
+            .deviceTree = deviceTree,
             .drivers = driver,
             .environment = environment,
             .files = files,
             .images = images,
             .keyboard = inputs,
             .management = management,
-            .modules = devices,
+            .modules = modules,
             .mutexes = mutexes,
             .profiles = profiles,
             .rawDisks = devices,
-            .registry = devices,
+            .registry = registry,
             .services = driver,
             .threads = threads,
             .touchpad = inputs,
