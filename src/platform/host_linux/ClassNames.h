@@ -1,4 +1,4 @@
-// What a PCI function is, in words, by its class code.
+// What devices are, in words.
 #pragma once
 
 #include <string>
@@ -7,7 +7,10 @@
 
 namespace panelglow::platform::host_linux {
 
-/// "PCI device" for a class without a name here. The names of products are not known to the kernel.
+inline constexpr const char* kCardName = "Memory Card";
+
+/// By its class code; "PCI device" for a class without a name here. The names of products are not known to the
+/// kernel.
 std::string DescriptionOf(const PciFunctionIds& identity);
 
 }  // namespace panelglow::platform::host_linux

@@ -75,7 +75,11 @@ void LinuxDeviceTree::Look() {
                              {}));
   }
   for (const SysfsDisk& disk : storage.Disks()) {
-    Note(disk.owner ? functions[*disk.owner] : root, disk.instanceId,
+    DeviceNode parent = disk.owner ? functions[*disk.owner] : root;
+    if (!disk.cardId.empty()) {
+      parent = Note(parent, disk.cardId, {.description = kCardName, .hardwareIds = {DeviceIdOf(disk.cardId)}}, {});
+    }
+    Note(parent, disk.instanceId,
          {.description = disk.model, .hardwareIds = {DeviceIdOf(disk.instanceId), "GenDisk"}, .driverKey = "disk"},
          DiskInterfacePath(disk.instanceId));
   }

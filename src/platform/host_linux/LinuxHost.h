@@ -1,4 +1,4 @@
-// The real machine under Linux. What it cannot reach yet (driver, management, keys) answers as absent.
+// The real machine under Linux. What it cannot reach yet answers as absent.
 #pragma once
 
 #include "platform/AbsentDevices.h"

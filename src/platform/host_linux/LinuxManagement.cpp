@@ -44,7 +44,19 @@ Rows Controllers(const KernelFolders& folders, ControllerKind kind) {
 }
 
 Rows IdeControllers(const KernelFolders& folders) { return Controllers(folders, ControllerKind::kIde); }
-Rows ScsiControllers(const KernelFolders& folders) { return Controllers(folders, ControllerKind::kScsi); }
+
+// Memory cards stand for controllers of their own here.
+Rows ScsiControllers(const KernelFolders& folders) {
+  Rows rows = Controllers(folders, ControllerKind::kScsi);
+  const PciInventory pci(folders);
+  const StorageInventory storage(folders, pci);
+  for (const SysfsDisk& disk : storage.Disks()) {
+    if (!disk.cardId.empty()) {
+      rows.push_back(RowOfDevice(disk.cardId, kCardName));
+    }
+  }
+  return rows;
+}
 
 Rows DiskDrives(const KernelFolders& folders) {
   const PciInventory pci(folders);

@@ -19,6 +19,7 @@ constexpr std::size_t kAtaRevision = 8;
 constexpr std::size_t kScsiVendor = 8;
 constexpr std::size_t kScsiProduct = 16;
 constexpr std::size_t kScsiRevision = 4;
+constexpr std::size_t kCardProduct = 6;
 
 // A field of an identification as an instance id holds it.
 std::string IdField(std::string text, std::size_t length) {
@@ -96,6 +97,20 @@ std::string DeviceIdOfDisk(const Identification& found, bool isUsb, bool isCard,
     return "IDE\\Disk" + PaddedField(found.model, kAtaModel) + PaddedField(found.revision, kAtaRevision);
   }
   return "SCSI\\Disk&Ven_" + IdField(found.vendor, kScsiVendor) + "&Prod_" + IdField(found.model, kScsiProduct);
+}
+
+// A memory card, soldered ones included, by its identification register. Empty when the kernel does not show it.
+std::string DeviceIdOfCard(const std::string& device) {
+  const auto manufacturer = ReadKernelNumber(device + "/manfid", 0xFF);
+  const auto application = ReadKernelNumber(device + "/oemid", 0xFFFF);
+  const std::string product = ReadKernelText(device + "/name");
+  if (!manufacturer || !application || product.empty()) {
+    return {};
+  }
+  std::array<char, 32> numbers{};
+  std::snprintf(numbers.data(), numbers.size(), "SD\\VID_%02X&OID_%04X&PID_", static_cast<unsigned>(*manufacturer),
+                static_cast<unsigned>(*application));
+  return numbers.data() + IdField(product, kCardProduct);
 }
 
 // What tells the disks of one kind apart; ends with the name, by which the file is found again.
@@ -180,6 +195,8 @@ void StorageInventory::AddDisk(const std::string& folder, const std::string& nam
   const ControllerKind kind =
       disk.owner ? ControllerKindOf(pci.Functions()[*disk.owner].identity) : ControllerKind::kNone;
   disk.instanceId = DeviceIdOfDisk(identification, IsUsb(folder), isCard, kind) + InstanceOf(name, pci, disk.owner);
+  const std::string card = isCard ? DeviceIdOfCard(device) : std::string();
+  disk.cardId = card.empty() ? card : card + InstanceOf(name, pci, disk.owner);
   // An ATA disk's vendor is only the name of its command set.
   disk.model = identification.vendor.empty() || identification.vendor == "ATA" || identification.vendor == "NVMe"
                    ? identification.model

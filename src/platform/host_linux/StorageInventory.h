@@ -20,6 +20,7 @@ ControllerKind ControllerKindOf(const PciFunctionIds& identity);
 struct SysfsDisk {
   std::string name = {};  // the kernel's
   std::string instanceId = {};
+  std::string cardId = {};  // instance id of the memory card that it is on, which stands for its controller
   std::string model = {};
   std::string serialNumber = {};
   std::uint64_t size_bytes = 0;
