@@ -8,6 +8,7 @@
 
 #include "platform/AsciiCase.h"
 #include "platform/host_linux/CurrentThread.h"
+#include "platform/host_linux/NvidiaLibrary.h"
 #include "platform/host_linux/PciInventory.h"
 
 namespace panelglow::platform::host_linux {
@@ -101,7 +102,10 @@ std::unique_ptr<GraphicsLibrary> LinuxModules::LoadGraphics(std::string_view /*f
     isMonitored = isMonitored || !card.sensors.empty();
     cards.push_back(std::move(card));
   }
-  return isMonitored ? std::make_unique<MonitoredCards>(std::move(cards)) : nullptr;
+  if (isMonitored) {
+    return std::make_unique<MonitoredCards>(std::move(cards));
+  }
+  return interface == GraphicsInterface::kNvApi && !cards.empty() ? LoadNvidiaLibrary(nvidiaLibrary_) : nullptr;
 }
 
 }  // namespace panelglow::platform::host_linux

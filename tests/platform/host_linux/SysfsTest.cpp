@@ -280,6 +280,22 @@ TEST_F(SysfsTest, ACardsTemperaturesAreThoseOfItsDriver) {
   EXPECT_EQ(modules.LoadGraphics("nvapi.dll", GraphicsInterface::kNvApi), nullptr);
 }
 
+TEST_F(SysfsTest, CardsUnderTheirMakersDriverAreThoseOfItsLibrary) {
+  LinuxModules installed(tree.Folders(), PANELGLOW_MADE_UP_GRAPHICS);
+  EXPECT_EQ(installed.LoadGraphics("nvapi.dll", GraphicsInterface::kNvApi), nullptr);  // no card of that maker
+  tree.AddFunction("0000:02:00.0", {"0x10de", "0x2204", "0", "0"}, "0x030000", "nvidia");
+  EXPECT_EQ(LinuxModules(tree.Folders(), "libnone.so").LoadGraphics("", GraphicsInterface::kNvApi), nullptr);
+  for (int i = 0; i < 2; ++i) {
+    const auto library = installed.LoadGraphics("nvapi.dll", GraphicsInterface::kNvApi);
+    ASSERT_NE(library, nullptr);
+    ASSERT_EQ(library->Cards().size(), 2U);
+    EXPECT_EQ(library->Cards()[0].vendorId, 0x10DE);
+    EXPECT_EQ(library->Cards()[0].deviceId, 0x2204);
+    EXPECT_EQ(library->ReadTemperature(0, 0), 61);
+    EXPECT_FALSE(library->ReadTemperature(0, 1) || library->ReadTemperature(1, 0));
+  }
+}
+
 TEST_F(SysfsTest, ALibraryIsTriedUnderItsNameHere) {
   EXPECT_TRUE(modules.CanLoad("XML2.dll"));
   for (const char* name : {"storelib-that-is-not-there.dll", "xml2", "../xml2.dll", ""}) {
