@@ -220,6 +220,27 @@ TEST_F(SysfsTest, AMemoryCardIsAControllerWithOneDisk) {
   EXPECT_EQ(Query("SELECT * FROM Win32_DiskDrive").size(), 4U);
 }
 
+TEST_F(SysfsTest, OnlyDisksThatPeopleKnowAreListedAndSharedOnesHaveAController) {
+  const std::string subsystem = "sys/devices/virtual/nvme-subsystem/nvme-subsys1";
+  tree.Put(subsystem + "/model", "Shared\n");
+  tree.Put(subsystem + "/nvme1n1/size", "8\n");
+  tree.Link(subsystem + "/nvme1n1/device", subsystem);
+  tree.Link("sys/block/nvme1n1", subsystem + "/nvme1n1");
+  tree.Link(subsystem + "/nvme1", KernelTree::kBridge + "0000:00:03.0/nvme/nvme1"s);
+  const std::string hidden = "0000:00:03.0/nvme/nvme1";
+  tree.AddDisk(hidden, "/nvme1c1n1", "", "Shared");
+  tree.Put(KernelTree::kBridge + hidden + "/nvme1c1n1/hidden", "1\n");
+  const std::string optical = "0000:00:1f.2/ata7/host6/target6:0:0/6:0:0:0";
+  tree.AddDisk(optical, "/block/sr0", "", "DVD");
+  tree.Put(KernelTree::kBridge + optical + "/type", "5\n");
+  tree.AddDisk("0000:00:1f.2/usb1/1-1/host9/target9:0:0/9:0:0:0", "/block/sdc", "Maker", "Stick");
+  const std::vector<std::string> onNvme = ChildrenOf(kNvme);
+  ASSERT_EQ(onNvme.size(), 2U);
+  EXPECT_EQ(onNvme[1], R"(SCSI\Disk&Ven_NVMe&Prod_Shared\4&0018&0&nvme1n1)");
+  EXPECT_EQ(ChildrenOf(kEmptySata),
+            std::vector<std::string>{R"(USBSTOR\Disk&Ven_Maker&Prod_Stick&Rev_\4&00FA&0&sdc)"});
+}
+
 TEST_F(SysfsTest, ADeviceThatComesBackHasItsNodeAgain) {
   const std::string id = ChildrenOf(kNvme).at(0);
   const DeviceNode node = devices.Locate(id);
