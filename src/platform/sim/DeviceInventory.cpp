@@ -3,7 +3,8 @@
 #include <algorithm>
 #include <cstdio>
 
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/AsciiCase.h"
+#include "platform/DeviceIds.h"
 
 namespace panelglow::platform::sim {
 
@@ -24,68 +25,31 @@ std::uint32_t RegisterOf(const PciFunction& function, std::uint16_t offset) {
   return found == function.registers.end() ? 0 : found->second;
 }
 
-// Everything ahead of the last backslash: what the device is, without which one of its kind it is.
-std::string DeviceIdOf(const std::string& instanceId) { return instanceId.substr(0, instanceId.rfind('\\')); }
-
-// The system's list, from the narrowest to the widest.
-std::vector<std::string> PciHardwareIds(const PciFunction& function) {
+PciFunctionIds IdentityOf(const PciFunction& function) {
   const std::uint32_t id = RegisterOf(function, kIdRegister);
+  const std::uint32_t subsystem = RegisterOf(function, kSubsystemRegister);
   const std::uint32_t classAndRevision = RegisterOf(function, kClassRegister);
-  char device[32];
-  char subsystem[64];
-  char number[16];
-  std::snprintf(device, sizeof device, "PCI\\VEN_%04X&DEV_%04X", static_cast<unsigned>(id & 0xFFFFU),
-                static_cast<unsigned>(id >> 16U));
-  std::snprintf(subsystem, sizeof subsystem, "%s&SUBSYS_%08X", device,
-                static_cast<unsigned>(RegisterOf(function, kSubsystemRegister)));
-  std::snprintf(number, sizeof number, "&REV_%02X", static_cast<unsigned>(classAndRevision & 0xFFU));
-  std::vector<std::string> ids{std::string(subsystem) + number, subsystem};
-  std::snprintf(number, sizeof number, "&CC_%06X", static_cast<unsigned>(classAndRevision >> 8U));
-  ids.push_back(std::string(device) + number);
-  std::snprintf(number, sizeof number, "&CC_%04X", static_cast<unsigned>(classAndRevision >> 16U));
-  ids.push_back(std::string(device) + number);
-  return ids;
-}
-
-std::string LocationText(const PciFunction& function) {
-  const unsigned location = function.location;
-  char text[64];
-  std::snprintf(text, sizeof text, "PCI bus %u, device %u, function %u", location >> 8U, location >> 3U & 31U,
-                location & 7U);
-  return text;
+  return {.vendorId = static_cast<std::uint16_t>(id),
+          .deviceId = static_cast<std::uint16_t>(id >> 16U),
+          .subVendorId = static_cast<std::uint16_t>(subsystem),
+          .subDeviceId = static_cast<std::uint16_t>(subsystem >> 16U),
+          .classCode = classAndRevision >> 8U,
+          .revision = static_cast<std::uint8_t>(classAndRevision)};
 }
 
 }  // namespace
 
 std::string PciInstanceId(const PciFunction& function) {
-  const std::uint32_t id = RegisterOf(function, kIdRegister);
-  const auto bus = static_cast<unsigned>(function.location >> 8U);
-  char way[16] = "3&11583659";  // from the host bridge on
-  if (bus != 0) {
-    std::snprintf(way, sizeof way, "4&%08X", bus);
-  }
-  char text[96];
-  std::snprintf(text, sizeof text, "PCI\\VEN_%04X&DEV_%04X&SUBSYS_%08X&REV_%02X\\%s&0&%02X",
-                static_cast<unsigned>(id & 0xFFFFU), static_cast<unsigned>(id >> 16U),
-                static_cast<unsigned>(RegisterOf(function, kSubsystemRegister)),
-                static_cast<unsigned>(RegisterOf(function, kClassRegister) & 0xFFU), way,
-                unsigned{function.location} & 0xFFU);
-  return text;
-}
-
-std::string DiskInterfacePath(const std::string& instanceId) {
-  std::string path = Lowered(instanceId);
-  std::replace(path.begin(), path.end(), '\\', '#');
-  return "\\\\?\\" + path + "#{" + Lowered(kDiskInterface) + "}";
+  return platform::PciInstanceId(IdentityOf(function), function.location);
 }
 
 DeviceInventory::DeviceInventory(const MachineDescription& machine, std::function<bool(const std::string&)> isThere)
     : isThere_(std::move(isThere)) {
   Add(0, {.instanceId = "HTREE\\ROOT\\0"});
-  const DeviceNode bridge = Add(kRoot, {.instanceId = "ACPI\\PNP0A08\\0",
-                                        .description = "PCI Express Root Complex",
-                                        .hardwareIds = {"ACPI\\PNP0A08", "*PNP0A08"},
-                                        .classId = kSystemClass});
+  const DeviceNode bridge =
+      Add(kRoot, {.instanceId = "ACPI\\PNP0A08\\0",
+                  .told = {.description = "PCI Express Root Complex", .hardwareIds = {"ACPI\\PNP0A08", "*PNP0A08"}},
+                  .classId = kSystemClass});
   AddPciFunctions(machine, bridge);
   for (const ControllerDescription& controller : machine.controllers) {
     if (NodeOf(controller.instanceId) == 0) {
@@ -100,8 +64,7 @@ DeviceInventory::DeviceInventory(const MachineDescription& machine, std::functio
                          ", which is no device of this machine ahead of it");
     }
     Add(parent, {.instanceId = device.instanceId,
-                 .description = device.description,
-                 .hardwareIds = device.hardwareIds,
+                 .told = {.description = device.description, .hardwareIds = device.hardwareIds},
                  .classId = kSystemClass});
   }
 }
@@ -114,10 +77,10 @@ DeviceNode DeviceInventory::Add(DeviceNode parent, InventoryEntry entry) {
   if (!entry.classId.empty()) {
     char number[16];
     std::snprintf(number, sizeof number, "\\%04u", drivers_[entry.classId]++);
-    entry.driverKey = entry.classId + number;
+    entry.told.driverKey = entry.classId + number;
   }
-  if (entry.hardwareIds.empty()) {
-    entry.hardwareIds = {DeviceIdOf(entry.instanceId)};
+  if (entry.told.hardwareIds.empty()) {
+    entry.told.hardwareIds = {DeviceIdOf(entry.instanceId)};
   }
   entry.parent = parent;
   if (parent != 0) {
@@ -145,12 +108,12 @@ void DeviceInventory::AddPciFunctions(const MachineDescription& machine, DeviceN
     if (controller != machine.controllers.end()) {
       node = AddController(machine, *controller, bridge);
     } else {
-      node = Add(
-          bridge,
-          {.instanceId = PciInstanceId(*function), .description = function->description, .classId = kSystemClass});
+      node = Add(bridge, {.instanceId = PciInstanceId(*function),
+                          .told = {.description = function->description},
+                          .classId = kSystemClass});
     }
-    entries_[node - 1].hardwareIds = PciHardwareIds(*function);
-    entries_[node - 1].location = LocationText(*function);
+    entries_[node - 1].told.hardwareIds = PciHardwareIds(IdentityOf(*function));
+    entries_[node - 1].told.location = PciLocationText(function->location);
   }
 }
 
@@ -158,14 +121,12 @@ DeviceNode DeviceInventory::AddController(const MachineDescription& machine, con
                                           DeviceNode parent) {
   const DeviceNode node =
       Add(parent, {.instanceId = controller.instanceId,
-                   .description = controller.description,
-                   .classId = controller.kind == ControllerDescription::Kind::kIde ? kIdeClass : kScsiClass,
-                   .uiNumber = controller.uiNumber});
+                   .told = {.description = controller.description, .uiNumber = controller.uiNumber},
+                   .classId = controller.kind == ControllerDescription::Kind::kIde ? kIdeClass : kScsiClass});
   for (const DiskSetup& disk : machine.disks) {
     if (disk.controller == controller.name) {
       Add(node, {.instanceId = disk.instanceId,
-                 .description = disk.description,
-                 .hardwareIds = {DeviceIdOf(disk.instanceId), "GenDisk"},
+                 .told = {.description = disk.description, .hardwareIds = {DeviceIdOf(disk.instanceId), "GenDisk"}},
                  .classId = kDiskClass,
                  .interfacePath = disk.interfacePath,
                  .device = disk.name});

@@ -10,6 +10,7 @@
 #include <utility>
 #include <vector>
 
+#include "platform/DeviceProperties.h"
 #include "platform/DeviceTree.h"
 #include "platform/sim/MachineDescription.h"
 
@@ -17,12 +18,8 @@ namespace panelglow::platform::sim {
 
 struct InventoryEntry {
   std::string instanceId = {};
-  std::string description = {};
-  std::vector<std::string> hardwareIds = {};
-  std::string classId = {};    // of its set-up class; empty: none
-  std::string driverKey = {};  // made from the class
-  std::string location = {};
-  std::optional<std::uint32_t> uiNumber = {};
+  DeviceDescription told = {};     // the driver key is made from the class
+  std::string classId = {};        // of its set-up class; empty: none
   std::string interfacePath = {};  // of the disk interface; empty: it has none
   std::string device = {};         // name of the part behind it when that can go; empty otherwise
 
@@ -69,8 +66,5 @@ class DeviceInventory {
 
 /// The instance id that the system gives a function.
 std::string PciInstanceId(const PciFunction& function);
-
-/// The path of a device's disk interface, as the system makes it from the instance id.
-std::string DiskInterfacePath(const std::string& instanceId);
 
 }  // namespace panelglow::platform::sim

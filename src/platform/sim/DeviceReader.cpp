@@ -2,8 +2,9 @@
 
 #include <algorithm>
 
+#include "platform/AsciiCase.h"
+#include "platform/DeviceIds.h"
 #include "platform/sim/DeviceInventory.h"
-#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

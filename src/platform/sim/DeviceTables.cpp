@@ -1,11 +1,8 @@
 #include "platform/sim/DeviceTables.h"
 
-#include <type_traits>
-#include <variant>
-
-#include "platform/Text.h"
+#include "platform/AsciiCase.h"
+#include "platform/management/DeviceRows.h"
 #include "platform/sim/DeviceInventory.h"
-#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 
@@ -14,47 +11,10 @@ namespace {
 constexpr std::uint32_t kDisplayClass = 0x03;
 constexpr std::uint16_t kClassRegister = 0x08;
 
-void SetText(ManagementRow& row, std::u16string_view property, std::string_view text) {
-  row.Set(property, {ManagementScalar(WideFromUtf8(text))});
-}
-
-ManagementRow RowOfDevice(const std::string& instanceId, const std::string& description) {
-  ManagementRow row;
-  SetText(row, u"PNPDeviceID", instanceId);
-  SetText(row, u"DeviceID", instanceId);
-  SetText(row, u"Description", description);
-  SetText(row, u"Name", description);
-  return row;
-}
-
-// A value as a condition compares it; nothing for a null and for a list.
-std::optional<std::string> TextOf(const ManagementValue* value) {
-  const ManagementScalar* scalar = value == nullptr ? nullptr : std::get_if<ManagementScalar>(&value->content);
-  if (scalar == nullptr) {
-    return std::nullopt;
-  }
-  return std::visit(
-      [](const auto& content) -> std::optional<std::string> {
-        using Content = std::decay_t<decltype(content)>;
-        if constexpr (std::is_same_v<Content, std::monostate>) {
-          return std::nullopt;
-        } else if constexpr (std::is_same_v<Content, wstring>) {
-          return Utf8FromWide(content);
-        } else if constexpr (std::is_same_v<Content, bool>) {
-          return content ? "true" : "false";
-        } else {
-          return std::to_string(content);
-        }
-      },
-      *scalar);
-}
+using management::RowOfDevice;
+using management::SetText;
 
 }  // namespace
-
-bool Fulfils(const ManagementRow& row, const WqlCondition& condition) {
-  const std::optional<std::string> value = TextOf(row.Find(WideFromUtf8(condition.property)));
-  return value && EqualNames(*value, condition.value);
-}
 
 std::optional<std::vector<ManagementRow>> DeviceTables::Rows(std::string_view className) const {
   const std::string name = Lowered(className);
@@ -76,7 +36,7 @@ std::optional<std::vector<ManagementRow>> DeviceTables::Rows(std::string_view cl
   return std::nullopt;
 }
 
-std::optional<std::vector<ManagementRow>> DeviceTables::Associated(const WqlQuery& query) const {
+std::optional<std::vector<ManagementRow>> DeviceTables::Associated(const management::WqlQuery& query) const {
   if (!EqualNames(query.className, "Win32_PnPEntity") || !EqualNames(query.condition->property, "DeviceID")) {
     return std::nullopt;
   }

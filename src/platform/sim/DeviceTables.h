@@ -9,8 +9,8 @@
 #include <vector>
 
 #include "platform/Management.h"
+#include "platform/management/WqlQuery.h"
 #include "platform/sim/MachineDescription.h"
-#include "platform/sim/WqlQuery.h"
 
 namespace panelglow::platform::sim {
 
@@ -24,7 +24,7 @@ class DeviceTables {
   [[nodiscard]] std::optional<std::vector<ManagementRow>> Rows(std::string_view className) const;
 
   /// What an "ASSOCIATORS OF" query gives: the driver of a device. Nothing when there is no such object.
-  [[nodiscard]] std::optional<std::vector<ManagementRow>> Associated(const WqlQuery& query) const;
+  [[nodiscard]] std::optional<std::vector<ManagementRow>> Associated(const management::WqlQuery& query) const;
 
  private:
   [[nodiscard]] std::vector<ManagementRow> Controllers(ControllerDescription::Kind kind) const;
@@ -35,8 +35,5 @@ class DeviceTables {
   const MachineDescription& machine_;
   std::function<bool(const std::string&)> isThere_;
 };
-
-/// Whether a row fulfils the condition: texts without regard to case, numbers by their value.
-bool Fulfils(const ManagementRow& row, const WqlCondition& condition);
 
 }  // namespace panelglow::platform::sim

@@ -2,7 +2,7 @@
 
 #include <utility>
 
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 
@@ -10,51 +10,6 @@ namespace {
 
 constexpr Microseconds kCallCost_us = 20;
 constexpr Microseconds kListCost_us = 1000;
-
-void AppendText(std::vector<std::uint8_t>& bytes, const std::string& text) {
-  bytes.insert(bytes.end(), text.begin(), text.end());
-  bytes.push_back(0);
-}
-
-std::optional<DeviceProperty> TextProperty(const std::string& text) {
-  if (text.empty()) {
-    return std::nullopt;
-  }
-  DeviceProperty property{kTextType, {}};
-  AppendText(property.bytes, text);
-  return property;
-}
-
-std::optional<DeviceProperty> PropertyOf(const InventoryEntry& entry, std::uint32_t property) {
-  switch (property) {
-    case kDescriptionProperty:
-      return TextProperty(entry.description);
-    case kDriverProperty:
-      return TextProperty(entry.driverKey);
-    case kLocationProperty:
-      return TextProperty(entry.location);
-    case kHardwareIdProperty: {
-      DeviceProperty ids{kMultipleTextType, {}};
-      for (const std::string& id : entry.hardwareIds) {
-        AppendText(ids.bytes, id);
-      }
-      ids.bytes.push_back(0);
-      return ids;
-    }
-    case kUiNumberProperty: {
-      if (!entry.uiNumber) {
-        return std::nullopt;
-      }
-      DeviceProperty number{kNumberType, {}};
-      for (unsigned shift = 0; shift < 32; shift += 8) {
-        number.bytes.push_back(static_cast<std::uint8_t>(*entry.uiNumber >> shift));
-      }
-      return number;
-    }
-    default:
-      return std::nullopt;
-  }
-}
 
 }  // namespace
 
@@ -82,7 +37,7 @@ class SimDeviceTree::List : public DeviceList {
     owner_.scheduler_.Spend(kCallCost_us);
     for (const DeviceNode own : devices_) {
       if (own == device) {
-        return PropertyOf(*owner_.inventory_.FindEver(device), property);
+        return PropertyOf(owner_.inventory_.FindEver(device)->told, property);
       }
     }
     return std::nullopt;
@@ -140,7 +95,7 @@ std::optional<DeviceProperty> SimDeviceTree::NodeProperty(DeviceNode node, std::
   scheduler_.Spend(kCallCost_us);
   const InventoryEntry* entry = inventory_.Find(node);
   constexpr std::uint32_t kShift = kNodeUiNumberProperty - kUiNumberProperty;
-  return entry == nullptr || property < kShift ? std::nullopt : PropertyOf(*entry, property - kShift);
+  return entry == nullptr || property < kShift ? std::nullopt : PropertyOf(entry->told, property - kShift);
 }
 
 std::unique_ptr<DeviceList> SimDeviceTree::Open(std::string_view enumerator, std::uint32_t flags,

@@ -1,17 +1,17 @@
 #include "platform/sim/SimManagement.h"
 
+#include "platform/AsciiCase.h"
 #include "platform/Text.h"
+#include "platform/management/DeviceRows.h"
+#include "platform/management/WqlQuery.h"
 #include "platform/sim/FirmwareTable.h"
-#include "platform/sim/WqlQuery.h"
-#include "platform/sim/base/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 
 namespace {
 
-constexpr std::string_view kFirmwareNameSpace = "root\\wmi";
-constexpr std::string_view kDeviceNameSpace = "root\\cimv2";
-constexpr std::string_view kThisMachine = "\\\\.\\";  // may stand in front of a namespace
+using management::kDeviceNameSpace;
+using management::kFirmwareNameSpace;
 
 // A call goes down into the firmware and back.
 constexpr Microseconds kCallCost_us = 2000;
@@ -30,7 +30,7 @@ class SimManagement::Connection : public ManagementConnection {
         reachesFirmware_(nameSpace == kFirmwareNameSpace) {}
 
   std::optional<std::vector<ManagementRow>> Query(std::u16string_view text) override {
-    const std::optional<WqlQuery> query = ParseWql(Utf8FromWide(text));
+    const std::optional<management::WqlQuery> query = management::ParseWql(Utf8FromWide(text));
     if (!query) {
       return std::nullopt;
     }
@@ -41,7 +41,7 @@ class SimManagement::Connection : public ManagementConnection {
     std::optional<std::vector<ManagementRow>> rows =
         table != tables_.end() ? table->second : Ask([&] { return owner_.devices_.Rows(query->className); });
     if (rows && query->condition) {
-      std::erase_if(*rows, [&](const ManagementRow& row) { return !Fulfils(row, *query->condition); });
+      std::erase_if(*rows, [&](const ManagementRow& row) { return !management::Fulfils(row, *query->condition); });
     }
     return rows;
   }
@@ -78,12 +78,7 @@ SimManagement::SimManagement(const MachineDescription& machine, const DeviceTabl
   nameSpaces_[std::string(kDeviceNameSpace)];
   Tables& wmi = nameSpaces_["root\\wmi"];
   if (machine.firmware.inManagement) {
-    const std::vector<std::uint8_t> table = BuildFirmwareTable(machine.firmware);
-    ManagementRow row;
-    row.Set(u"Size", {ManagementScalar(static_cast<std::uint32_t>(table.size()))});
-    ManagementArray bytes(table.begin(), table.end());
-    row.Set(u"SMBiosData", {std::move(bytes)});
-    wmi["mssmbios_rawsmbiostables"].push_back(std::move(row));
+    wmi["mssmbios_rawsmbiostables"].push_back(management::FirmwareTableRow(BuildFirmwareTable(machine.firmware)));
   }
   if (firmware_ != nullptr) {
     wmi["tmbbintm"].push_back(firmware_->Instance());
@@ -94,12 +89,9 @@ SimManagement::SimManagement(const MachineDescription& machine, const DeviceTabl
 }
 
 std::unique_ptr<ManagementConnection> SimManagement::Connect(std::string_view nameSpace, ManagementError& error) {
-  if (nameSpace.substr(0, kThisMachine.size()) == kThisMachine) {
-    nameSpace.remove_prefix(kThisMachine.size());
-  }
-  const auto found = nameSpaces_.find(Lowered(nameSpace));
+  const auto found = nameSpaces_.find(Lowered(management::LocalNameSpace(nameSpace)));
   if (found == nameSpaces_.end()) {
-    error = {ManagementStep::kConnect, 0x8004100E};  // the namespace does not exist
+    error = {ManagementStep::kConnect, management::kInvalidNameSpace};
     return nullptr;
   }
   return std::make_unique<Connection>(*this, found->second, found->first);

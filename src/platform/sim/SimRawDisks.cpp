@@ -5,7 +5,7 @@
 #include <new>
 #include <optional>
 
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

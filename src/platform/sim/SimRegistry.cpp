@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/AsciiCase.h"
 
 namespace panelglow::platform::sim {
 

@@ -1,10 +1,12 @@
 // The host as a whole: what a start costs, and what a machine without driver, management and display answers.
 #include <gtest/gtest.h>
+#include <sched.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <string>
+#include <thread>
 
 #include "platform/Host.h"
 #include "platform/host_linux/ChildProcess.h"
@@ -51,6 +53,20 @@ TEST(HostTest, AProcessorLeafThatIsNotThereReadsAsZero) {
   EXPECT_GE(host().cpu.Cpuid(0).eax, 1U);
   EXPECT_TRUE(host().cpu.Is64BitSystem());
 #endif
+}
+
+// Registers of one processor are read by a thread that was put there.
+TEST(HostTest, AThreadRunsWhereItIsPutAndNoOtherMoves) {
+  const std::uint64_t before = host().cpu.Affinity();
+  ASSERT_NE(before, 0U);
+  std::thread([before] {
+    for (unsigned cpu = 0; cpu < 64; ++cpu) {
+      const std::uint64_t mask = before & std::uint64_t{1} << cpu;
+      EXPECT_EQ(host().cpu.SetAffinity(mask), mask != 0) << cpu;
+      EXPECT_TRUE(mask == 0 || (host().cpu.Affinity() == mask && ::sched_getcpu() == static_cast<int>(cpu))) << cpu;
+    }
+  }).join();
+  EXPECT_EQ(host().cpu.Affinity(), before);
 }
 
 TEST(HostTest, WithoutADisplayEveryWindowFailsAndNoLoopWaits) {

@@ -1,11 +1,13 @@
-// A query of the management service, in the part of its language that this machine understands.
+// A query of the management service, in the part of its language that the backends understand.
 #pragma once
 
 #include <optional>
 #include <string>
 #include <string_view>
 
-namespace panelglow::platform::sim {
+#include "platform/Management.h"
+
+namespace panelglow::platform::management {
 
 struct WqlCondition {
   std::string property;
@@ -23,4 +25,7 @@ struct WqlQuery {
 /// Nothing for any other text.
 std::optional<WqlQuery> ParseWql(std::string_view text);
 
-}  // namespace panelglow::platform::sim
+/// Whether a row fulfils the condition: texts without regard to case, numbers by their value.
+bool Fulfils(const ManagementRow& row, const WqlCondition& condition);
+
+}  // namespace panelglow::platform::management

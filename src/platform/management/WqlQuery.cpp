@@ -1,10 +1,13 @@
-#include "platform/sim/WqlQuery.h"
+#include "platform/management/WqlQuery.h"
 
 #include <cctype>
+#include <type_traits>
+#include <variant>
 
-#include "platform/sim/base/AsciiCase.h"
+#include "platform/AsciiCase.h"
+#include "platform/Text.h"
 
-namespace panelglow::platform::sim {
+namespace panelglow::platform::management {
 
 namespace {
 
@@ -126,6 +129,28 @@ bool ParseAssociators(Words& words, WqlQuery& query) {
   return !query.resultClass.empty();
 }
 
+// A value as a condition compares it; nothing for a null and for a list.
+std::optional<std::string> TextOf(const ManagementValue* value) {
+  const ManagementScalar* scalar = value == nullptr ? nullptr : std::get_if<ManagementScalar>(&value->content);
+  if (scalar == nullptr) {
+    return std::nullopt;
+  }
+  return std::visit(
+      [](const auto& content) -> std::optional<std::string> {
+        using Content = std::decay_t<decltype(content)>;
+        if constexpr (std::is_same_v<Content, std::monostate>) {
+          return std::nullopt;
+        } else if constexpr (std::is_same_v<Content, wstring>) {
+          return Utf8FromWide(content);
+        } else if constexpr (std::is_same_v<Content, bool>) {
+          return content ? "true" : "false";
+        } else {
+          return std::to_string(content);
+        }
+      },
+      *scalar);
+}
+
 }  // namespace
 
 std::optional<WqlQuery> ParseWql(std::string_view text) {
@@ -138,4 +163,9 @@ std::optional<WqlQuery> ParseWql(std::string_view text) {
                                                                : std::nullopt;
 }
 
-}  // namespace panelglow::platform::sim
+bool Fulfils(const ManagementRow& row, const WqlCondition& condition) {
+  const std::optional<std::string> value = TextOf(row.Find(WideFromUtf8(condition.property)));
+  return value && EqualNames(*value, condition.value);
+}
+
+}  // namespace panelglow::platform::management

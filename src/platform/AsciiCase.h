@@ -5,7 +5,7 @@
 #include <string>
 #include <string_view>
 
-namespace panelglow::platform::sim {
+namespace panelglow::platform {
 
 inline std::string Lowered(std::string_view text) {
   std::string lowered(text);
@@ -16,4 +16,4 @@ inline std::string Lowered(std::string_view text) {
 
 inline bool EqualNames(std::string_view one, std::string_view other) { return Lowered(one) == Lowered(other); }
 
-}  // namespace panelglow::platform::sim
+}  // namespace panelglow::platform
