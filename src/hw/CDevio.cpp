@@ -36,6 +36,8 @@ DriverLoader Loader() { return {platform::TheHost().services, platform::TheHost(
 
 CDevio::CDevio() { LoadOnce(); }
 
+CDevio::CDevio(LoadLater /*later*/) : names(DriverLoader::PresentNames(platform::TheHost().cpu.Is64BitSystem())) {}
+
 CDevio::CDevio(std::string service, std::string display, std::string deviceLink, std::string image)
     : CDevio(DriverNames{std::move(service), std::move(display), std::move(deviceLink), std::move(image)}) {}
 

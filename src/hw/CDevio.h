@@ -35,7 +35,7 @@ class CDevio {
 
   /// Nothing is loaded before LoadOnce: for an object that exists before anybody knows whether the hardware is needed.
   struct LoadLater {};
-  explicit CDevio(LoadLater /*later*/) {}
+  explicit CDevio(LoadLater later);
 
   /// Closes the device. The service stays running.
   virtual ~CDevio() = default;

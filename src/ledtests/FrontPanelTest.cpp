@@ -35,14 +35,7 @@ std::uint32_t Now() { return platform::TheHost().clock.TickCount(); }
 }  // namespace
 
 FrontPanelTest::FrontPanelTest(CDevio& driverClient)
-    : systemId([] {
-        std::uint16_t id = 0;
-        Tsk_GetSystemID(id);
-        return id;
-      }()),
-      driver(driverClient),
-      legacyPorts(driverClient, systemId),
-      startTick(Now()) {}
+    : driver(driverClient), legacyPorts(driverClient), startTick(Now()) {}
 
 FrontPanelTest::~FrontPanelTest() = default;
 
@@ -65,7 +58,10 @@ void FrontPanelTest::BeginRun(const std::string& testName) {
   details.retriesspecified = CDMUtil::ToString(retries);
   details.errorcode = "0";
   xmlCorrupted = CDMUtil::isXMLCorrupted(dataCollectionFile);
-  if (!driver.IsDriverLoaded()) {
+  const bool isDriverThere = driver.LoadOnce();
+  Tsk_GetSystemID(systemId);
+  legacyPorts.SelectModel(systemId);
+  if (!isDriverThere) {
     Notices::Tell(
         "There is no driver on this machine that reaches its LEDs, so nothing can be tested. To see a test on a "
         "simulated machine, try panelglow-diags-sim.");

@@ -133,7 +133,8 @@ class FrontPanelTest : public CDMDiag {
   /// `driverClient` is the client that legacy registers are reached by; it outlives the test.
   explicit FrontPanelTest(CDevio& driverClient);
 
-  /// The run's record is begun, and a driver is there; otherwise throws a new CDMException.
+  /// The run's record is begun, a driver is there and the model is known; otherwise throws a new CDMException. Not
+  /// before this is the machine looked at: an informational request builds the tests, too.
   void BeginRun(const std::string& testName);
 
   /// Throws a new CDMException when an icon of the dialog is missing.

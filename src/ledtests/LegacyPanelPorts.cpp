@@ -24,11 +24,11 @@ std::uint16_t PortAt(std::uint16_t systemId, std::uint16_t offset) {
 
 }  // namespace
 
-LegacyPanelPorts::LegacyPanelPorts(CDevio& devio, std::uint16_t systemId)
-    : devio_(devio),
-      SMC_GREEN_LED_CFG_REG(PortAt(systemId, 0x33)),
-      SMC_RED_LED_CFG_REG(PortAt(systemId, 0x34)),
-      SMC_GP3_DATA_REG(PortAt(systemId, 0x4D)) {}
+void LegacyPanelPorts::SelectModel(std::uint16_t systemId) {
+  SMC_GREEN_LED_CFG_REG = PortAt(systemId, 0x33);
+  SMC_RED_LED_CFG_REG = PortAt(systemId, 0x34);
+  SMC_GP3_DATA_REG = PortAt(systemId, 0x4D);
+}
 
 void LegacyPanelPorts::Change(std::uint16_t port, std::uint8_t keep, std::uint8_t set) {
   devio_.OutportByte(port, static_cast<std::uint8_t>((devio_.InportByte(port) & keep) | set));

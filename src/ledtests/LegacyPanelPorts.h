@@ -10,8 +10,11 @@ namespace panelglow {
 
 class LegacyPanelPorts {
  public:
+  /// The registers of a model that is not known.
+  explicit LegacyPanelPorts(CDevio& devio) : devio_(devio) { SelectModel(0); }
+
   /// The register block stands at 0x800 on three models, at 0x400 on all others.
-  LegacyPanelPorts(CDevio& devio, std::uint16_t systemId);
+  void SelectModel(std::uint16_t systemId);
 
   // In GPIO mode software drives the LED, in native mode the Super-I/O.
   void CustomSetGreenPwrLedGpioMode();
@@ -33,9 +36,9 @@ class LegacyPanelPorts {
   void Change(std::uint16_t port, std::uint8_t keep, std::uint8_t set);
 
   CDevio& devio_;
-  std::uint16_t SMC_GREEN_LED_CFG_REG;
-  std::uint16_t SMC_RED_LED_CFG_REG;
-  std::uint16_t SMC_GP3_DATA_REG;
+  std::uint16_t SMC_GREEN_LED_CFG_REG = 0;
+  std::uint16_t SMC_RED_LED_CFG_REG = 0;
+  std::uint16_t SMC_GP3_DATA_REG = 0;
 };
 
 }  // namespace panelglow

@@ -90,7 +90,8 @@ TEST(BlinkWorkers, WriteTheirRegistersInThisOrder) {
 TEST(BlinkWorkers, ThreeModelsHaveTheirLegacyRegistersElsewhere) {
   for (const int systemId : {0x0AC8, 0x3029, 0x3047, 0x7D10}) {
     Bench bench;
-    LegacyPanelPorts ports(g_objDriverObjectCustom, static_cast<std::uint16_t>(systemId));
+    LegacyPanelPorts ports(g_objDriverObjectCustom);
+    ports.SelectModel(static_cast<std::uint16_t>(systemId));
     bench.sim.Trace().Clear();
     ports.CustomSetGreenPwrLedGpioMode();
     ports.CustomSetRedPwrLedNativeMode();

@@ -1,10 +1,11 @@
-// The real machine under Linux. What it cannot reach yet answers as absent.
+// The real machine under Linux. What Linux has no door to (a touchpad's LED) answers as absent.
 #pragma once
 
-#include "platform/AbsentDevices.h"
 #include "platform/Host.h"
-#include "platform/host_linux/AbsentInputs.h"
+#include "platform/host_linux/AbsentTouchpad.h"
+#include "platform/host_linux/LinuxCameras.h"
 #include "platform/host_linux/LinuxClock.h"
+#include "platform/host_linux/LinuxConnections.h"
 #include "platform/host_linux/LinuxConsole.h"
 #include "platform/host_linux/LinuxCpu.h"
 #include "platform/host_linux/LinuxDesktop.h"
@@ -12,9 +13,11 @@
 #include "platform/host_linux/LinuxDriver.h"
 #include "platform/host_linux/LinuxEnvironment.h"
 #include "platform/host_linux/LinuxFiles.h"
+#include "platform/host_linux/LinuxKeyboard.h"
 #include "platform/host_linux/LinuxManagement.h"
 #include "platform/host_linux/LinuxModules.h"
 #include "platform/host_linux/LinuxMutexes.h"
+#include "platform/host_linux/LinuxRawDisks.h"
 #include "platform/host_linux/LinuxRegistry.h"
 #include "platform/host_linux/LinuxThreads.h"
 #include "platform/posix/LazyDrawing.h"
@@ -25,7 +28,9 @@ namespace panelglow::platform::host_linux {
 
 /// Making it costs next to nothing: whatever is more than an object in memory is made by the call that needs it.
 struct LinuxHost {
+  LinuxCameras cameras;
   LinuxClock clock;
+  LinuxConnections connections;
   LinuxConsole console;
   LinuxCpu cpu;
   LinuxDriver driver;
@@ -34,19 +39,20 @@ struct LinuxHost {
   posix::LazyDrawing drawing;
   LinuxDesktop desktop{drawing};
   posix::DrawnImages images{drawing};
-  AbsentInputs inputs;
+  AbsentTouchpad touchpad;
   LinuxDeviceTree deviceTree;
+  LinuxKeyboard keyboard;
   LinuxManagement management;
   LinuxModules modules;
   LinuxRegistry registry;
   LinuxMutexes mutexes;
   profile::ProfileFilesOnFiles profiles{files};
+  LinuxRawDisks rawDisks;
   LinuxThreads threads;
   posix::LazyXmlDocuments xmlDocuments{files};
-  AbsentDevices devices;
-  Host host{.cameras = devices,
+  Host host{.cameras = cameras,
             .clock = clock,
-            .connections = devices,
+            .connections = connections,
             .console = console,
             .cpu = cpu,
             .desktop = desktop,
@@ -55,16 +61,16 @@ struct LinuxHost {
             .environment = environment,
             .files = files,
             .images = images,
-            .keyboard = inputs,
+            .keyboard = keyboard,
             .management = management,
             .modules = modules,
             .mutexes = mutexes,
             .profiles = profiles,
-            .rawDisks = devices,
+            .rawDisks = rawDisks,
             .registry = registry,
             .services = driver,
             .threads = threads,
-            .touchpad = inputs,
+            .touchpad = touchpad,
             .xmlDocuments = xmlDocuments};
 };
 

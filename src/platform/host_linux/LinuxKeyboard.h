@@ -1,0 +1,28 @@
+// The lock keys' LEDs, on every keyboard that has them: a "press" toggles the LED by the input layer, for a real
+// press of a synthetic device does not reach the Scroll LED on a text console.
+//
+// What is toggled is each keyboard's own state, so that an even number of presses leaves all of them as they were.
+// The lock state itself is not touched: nothing is typed in other letters.
+#pragma once
+
+#include <atomic>
+#include <string>
+
+#include "platform/Keyboard.h"
+
+namespace panelglow::platform::host_linux {
+
+class LinuxKeyboard : public Keyboard {
+ public:
+  /// `inputFolder`: where the event devices are.
+  explicit LinuxKeyboard(std::string inputFolder = "/dev/input") : folder_(std::move(inputFolder)) {}
+
+  /// Keys without a LED do nothing, and neither does a release. People are told once when no LED can be reached.
+  void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) override;
+
+ private:
+  std::string folder_;
+  std::atomic<bool> isTold_{false};
+};
+
+}  // namespace panelglow::platform::host_linux

@@ -1,0 +1,193 @@
+"""A virtual PC with the shipped program on it, and an operator before it who looks at what the devices saw and never at
+the program."""
+import os
+import statistics
+import subprocess
+import sys
+import threading
+import time
+
+sys.dont_write_bytecode = True
+ROOT = os.path.dirname(os.path.dirname(os.path.dirname(os.path.realpath(__file__))))
+sys.path.insert(0, os.path.join(ROOT, "tools"))
+
+from qemu import machine  # noqa: E402
+
+OUT = os.path.join(ROOT, "build", "machine", "runs")
+PROGRAMS = os.path.join(ROOT, "build", "release", "bin")
+
+# The set-up of a bench, in the guest: the installation with this machine's files, the adapter with its address, the
+# camera's driver telling of its stream.
+SET_UP = """
+mkdir /tmp/bench; cp -r {root}/installation/. {root}/machines/qemu/*.ini {root}/machines/qemu/*.xml /tmp/bench
+cd /tmp/bench; export PATH={programs}:$PATH
+for link in /sys/class/net/eth*; do
+  [ -e "$link" ] && [ "$(cat $link/address)" != 52:54:00:00:60:00 ] || continue
+  busybox ip link set ${{link##*/}} name bench-lan
+  busybox ifconfig bench-lan 10.9.8.7 netmask 255.255.255.0
+  busybox ip route add 10.77.0.0/16 via 10.9.8.1
+done
+[ -e /sys/class/video4linux/video0 ] && echo 1 > /sys/class/video4linux/video0/dev_debug && busybox dmesg -n 8
+"""
+
+# Which light a judge's line is about, by the judge; and its new state.
+LEDS_OF_KEYBOARD = ("num", "caps", "scroll")
+
+
+def lights_of(judge, seen):
+    if judge == "trace" and seen.get("device", "").startswith("pc-testdev"):
+        place = seen["device"].split("-")[2] + seen["address"][-3:].replace("0x", "")
+        return {"%s.%d" % (place, bit): int(seen["value"], 16) >> bit & 1 for bit in range(8)}
+    if judge == "keyboard-leds":
+        return {name: seen[name] for name in LEDS_OF_KEYBOARD}
+    if judge == "disk" and "writes" in seen:
+        return {seen["disk"]: int(seen["reads"] + seen["writes"] > 0)}
+    if judge == "network":
+        return {"net": int(seen["link"] == "answers")}
+    if judge == "console" and "VIDIOC_STREAMO" in seen["text"]:
+        return {"camera": int("VIDIOC_STREAMON" in seen["text"])}
+    if judge == "device-log" and "verb 0x715, payload" in seen["text"]:
+        pins = int(seen["text"].split()[-1], 16)
+        return {"pin%d" % bit: pins >> bit & 1 for bit in range(8)}
+    return {}
+
+
+class Screen:
+    """A display of the host's, ended with the object."""
+
+    def __init__(self):
+        read, write = os.pipe()
+        self.server = subprocess.Popen(["Xvfb", "-displayfd", str(write), "-screen", "0", "1280x1024x24", "-nolisten",
+                                        "tcp"], pass_fds=[write], stderr=subprocess.DEVNULL)
+        os.close(write)
+        with os.fdopen(read) as number:
+            self.name = ":" + number.readline().strip()
+
+    def do(self, *words):
+        return subprocess.run(["xdotool", *map(str, words)], capture_output=True, text=True, timeout=20,
+                              env={**os.environ, "DISPLAY": self.name}).stdout
+
+    def windows(self):
+        """(width, height, x, y) of what is shown."""
+        found = []
+        for window in self.do("search", "--onlyvisible", "--name", ".").split():
+            lines = self.do("getwindowgeometry", "--shell", window).split("\n")
+            place = dict(line.split("=") for line in lines if "=" in line)
+            if place:
+                found.append(tuple(int(place[key]) for key in ("WIDTH", "HEIGHT", "X", "Y")))
+        return found
+
+    def picture(self, path):
+        subprocess.run("xwd -root -silent -display %s | convert xwd:- %s" % (self.name, path), shell=True,
+                       stderr=subprocess.DEVNULL)
+
+    def kill(self):
+        self.server.kill()
+        self.server.wait()
+
+
+class Bench:
+    """One run. `section` is shown in the dialog; `buttons` are its buttons in order, each with its lights ("" is
+    nothing blinks)."""
+
+    def __init__(self, name, options, script, display=True):
+        self.screen = Screen() if display else None
+        self.folder = os.path.join(OUT, name)
+        arguments = ["--kernel", os.path.join(ROOT, "build", "machine", "kernel"), "--out", self.folder, *options]
+        if display:
+            arguments += ["--display", self.screen.name]
+        text = SET_UP.format(root=ROOT, programs=PROGRAMS) + script
+        self.machine = machine.VirtualMachine(machine.parser().parse_args(arguments), ["/bin/sh", "-c", text])
+        self.pressed = []
+        self.code = None
+
+    def __enter__(self):
+        self.machine.start()
+        return self
+
+    def __exit__(self, *_):
+        self.machine.close()
+        if self.screen:
+            self.screen.kill()
+
+    def finish(self):
+        self.code = self.machine.wait()
+        return self.code
+
+    def text(self, name="stdout"):
+        with open(os.path.join(self.folder, name), encoding="utf-8", errors="replace") as f:
+            return f.read()
+
+    def changes(self, light=None):
+        """(time, light, state) of every change that a judge saw, in order; of one light when it is named."""
+        state, found = {}, []
+        for at, judge, seen in sorted(self.machine.timeline.notes, key=lambda note: note[0]):
+            for name, value in lights_of(judge, seen).items():
+                if state.get(name, value if judge != "trace" else 0) != value and light in (None, name):
+                    found.append((at, name, value))
+                state[name] = value
+        return found
+
+    def last(self, light):
+        values = [value for at, judge, seen in self.machine.timeline.notes
+                  for name, value in lights_of(judge, seen).items() if name == light]
+        return values[-1] if values else None
+
+    def median_phase(self, light):
+        """Seconds between two changes of a light, as the middle one of all that are shorter than two."""
+        times = [at for at, _, _ in self.changes(light)]
+        phases = [b - a for a, b in zip(times, times[1:]) if b - a < 2]
+        return statistics.median(phases) if len(phases) >= 3 else None
+
+    def operate(self, buttons, wrong=None, upto=None, patience=150):
+        """Presses the button of each light that blinks, until the dialog is gone or `upto` were pressed. `wrong`: the
+        number of the press that goes to the next button instead."""
+        dialog, quiet, gone_since = None, time.time(), None
+        end = time.time() + patience
+        while time.time() < end and self.machine.qemu.poll() is None:
+            tall = [place for place in self.screen.windows() if place[1] > 500]
+            if not tall:
+                gone_since = gone_since or time.time()
+                if dialog and time.time() - gone_since > 2:
+                    return
+                if not dialog and self.screen.windows():
+                    self.screen.do("key", "Return")  # the prompt ahead of the test
+                    time.sleep(0.5)
+                time.sleep(0.1)
+                continue
+            gone_since = None
+            if not dialog:
+                time.sleep(1)  # it is moved to the middle after it has come
+                dialog = [place for place in self.screen.windows() if place[1] > 500][0]
+                quiet = time.time()
+            choice = self._blinking(buttons, quiet)
+            if choice is not None:
+                if wrong == len(self.pressed):
+                    choice = (choice + 1) % len(buttons)
+                self._press(dialog, choice)
+                self.pressed.append(buttons[choice][0])
+                if len(self.pressed) == upto:
+                    return
+                time.sleep(1.5)
+                quiet = time.time()
+            time.sleep(0.05)
+
+    def _blinking(self, buttons, quiet):
+        now = time.time()
+        recent = [name for at, name, _ in self.changes() if at > max(quiet, now - 4)]
+        for number, (_, lights) in enumerate(buttons):
+            if any(recent.count(light) >= 3 for light in lights):
+                return number
+        if now - quiet > 6 and not recent:
+            return next(number for number, (_, lights) in enumerate(buttons) if not lights)
+        return None
+
+    def _press(self, dialog, choice):
+        self.screen.do("mousemove", dialog[2] + 126 + 201 * (choice % 3), dialog[3] + 168 + 46 * (choice // 3), "click",
+                       1)
+
+
+def in_background(function, *arguments):
+    thread = threading.Thread(target=function, args=arguments, daemon=True)
+    thread.start()
+    return thread
