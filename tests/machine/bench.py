@@ -36,7 +36,7 @@ LEDS_OF_KEYBOARD = ("num", "caps", "scroll")
 
 def lights_of(judge, seen):
     if judge == "trace" and seen.get("device", "").startswith("pc-testdev"):
-        place = seen["device"].split("-")[2] + seen["address"][-3:].replace("0x", "")
+        place = "%s%x" % (seen["device"].split("-")[2], int(seen["address"], 16) & 0xFFF)
         return {"%s.%d" % (place, bit): int(seen["value"], 16) >> bit & 1 for bit in range(8)}
     if judge == "keyboard-leds":
         return {name: seen[name] for name in LEDS_OF_KEYBOARD}

@@ -40,8 +40,8 @@ struct LinuxHost {
   LinuxDesktop desktop{drawing};
   posix::DrawnImages images{drawing};
   AbsentTouchpad touchpad;
-  LinuxKeyboard keyboard;
   LinuxDeviceTree deviceTree;
+  LinuxKeyboard keyboard;
   LinuxManagement management;
   LinuxModules modules;
   LinuxRegistry registry;

@@ -12,6 +12,7 @@
 #include <sstream>
 
 #include "platform/host_linux/CurrentThread.h"
+#include "platform/host_linux/StorageInventory.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/TellPeople.h"
 
@@ -100,7 +101,7 @@ void LinuxRawDisks::TellOnce(const std::string& sentence) {
 
 std::unique_ptr<RawDisk> LinuxRawDisks::Open(std::string_view name) {
   CurrentThread::CheckEndRequest();
-  const std::string path(name);
+  const std::string path = DiskFileOf({}, name);
   struct stat status {};
   if (path.empty() || ::stat(path.c_str(), &status) != 0 || !S_ISBLK(status.st_mode)) {
     return nullptr;
