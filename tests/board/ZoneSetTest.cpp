@@ -58,8 +58,9 @@ TEST(ZoneSet, EachChipIsReadInItsWay) {
   }
   SetBench bench(Zone("chip=a"));
   ZoneSet zones = Loaded(bench);
-  bench["a"].readings = {44};
+  bench["a"].readings = {44, 0x80};
   EXPECT_EQ(zones.Read(1), 44);
+  EXPECT_EQ(zones.Read(1), 300);  // as the chip maps it
   EXPECT_EQ(zones.Find(1)->readingTime.size(), 15U);
 }
 
@@ -110,6 +111,25 @@ TEST(ZoneSet, TellsWhatItMakesOfTheProcessorsOwnLimit) {
   EXPECT_EQ(bench.bench.machine.Output(), lines);
 }
 
+TEST(ZoneSet, TellsOfKeysThatItCannotUse) {
+  const std::pair<std::string, const char*> kCases[] = {
+      {Zone(""), "no chip \"sio\", which counts without the key \"test.tempcaution.chip\""},
+      {Zone("") + "test.tempcaution.chip=soi\n", "key \"test.tempcaution.chip\": the board has no chip \"soi\""},
+      {Zone("prochot.chip=soi"), "prochot.chip\": the board has no chip \"soi\""},
+      {Zone("prochot.offset=0x10000"), "prochot.offset\": there is no register 0x10000"},
+      {Zone("prochot.threshold.low.bit=x"), "low.bit\": \"x\" is no number and counts as 0"},
+      {Zone("prochot.threshold.high.bit=8"), "high.bit\": a byte has no bit 8"},
+      {Zone("threshold.tjmax.delta=8"), "threshold.tjmax.delta\": the chip \"sio\" does not tell the limit"},
+  };
+  for (const auto& [keys, told] : kCases) {
+    const SetBench bench(keys);
+    Chip plain;
+    ZoneSet zones([&](const std::string& /*name*/) -> Chip& { return plain; });
+    zones.Load();
+    EXPECT_THAT(bench.bench.machine.Errors(), HasSubstr(told));
+  }
+}
+
 struct Step {
   int reading;  // -1: it fails
   std::vector<int> cores;
@@ -154,6 +174,25 @@ TEST(ZoneSet, ACheckCountsWhatIsBeyondALimitInARow) {
           {71, {90, 60}, "ah 2 0 0 60 71"},
           {60, {9, 80}, "al 0 1 0 60 71"},
           {60, {}, "a 0 1 0 60 71"}});
+}
+
+TEST(ZoneSet, AReadingCountsOnceHoweverOftenItIsJudged) {
+  SetBench bench(Zone("chip=a\nthreshold.high=70\nthreshold.low=5"));
+  ZoneSet zones = Loaded(bench);
+  bench["a"].readings = {71, 72, 4};
+  bool isBeyond = false;
+  for (const auto& [high, low] : {std::pair{1, 0}, std::pair{2, 0}, std::pair{0, 1}}) {
+    int value = 0;
+    EXPECT_TRUE(zones.Measure(1, value));
+    for (int again = 0; again < 2; ++again) {
+      EXPECT_TRUE(zones.JudgeHigh(1, isBeyond));
+      EXPECT_EQ(isBeyond, high != 0);
+      EXPECT_TRUE(zones.JudgeLow(1, isBeyond));
+      EXPECT_EQ(isBeyond, low != 0);
+    }
+    EXPECT_EQ(zones.Find(1)->consecutiveHigh, high);
+    EXPECT_EQ(zones.Find(1)->consecutiveLow, low);
+  }
 }
 
 TEST(ZoneSet, ProchotIsReadByItsBits) {
@@ -216,17 +255,37 @@ TEST(ZoneSet, AKeyForAllCardsIsAZoneForEach) {
   EXPECT_EQ(zones.Find(2)->name + zones.Find(3)->name, "Z1 2Z2");
   EXPECT_EQ(zones.Find(2)->index, 1);
   EXPECT_EQ(zones.GetHigh(2), 88);
-  EXPECT_EQ(zones.GetLow(2), 7);  // the chip's, as the files have none
   EXPECT_TRUE(zones.LoadGroups());
   EXPECT_THAT(zones.Groups().at(0).zones, ElementsAre(3, 1, 2));
+  zones.Load();
+  EXPECT_TRUE(zones.Groups().empty());
   for (const char* bad : {"", "3", "0", "1,x", "-1"}) {
-    SetBench broken(Zone("chip=a") + "test.tempzones.group.1.name=G\ntest.tempzones.group.1.zones=" + bad + "\n");
+    SetBench broken(Zone("chip=a") +
+                    "test.tempzones.group.1.name=Good\ntest.tempzones.group.1.zones=1\n"
+                    "test.tempzones.group.2.name=G\ntest.tempzones.group.2.zones=" +
+                    bad + "\n");
     ZoneSet none = Loaded(broken);
     try {
       none.LoadGroups();
       ADD_FAILURE() << bad;
     } catch (const mblib_exception& refused) {
       EXPECT_STREQ(refused.what(), "Missing or invalid Zone Group information");
+    }
+    EXPECT_TRUE(none.Groups().empty());
+  }
+}
+
+TEST(ZoneSet, ACardsOwnLimitsCountWhereTheZoneHasNoneHoweverItIsNamed) {
+  const std::pair<const char*, int> kLimits[] = {
+      {"threshold.high=88", 88}, {"threshold.delta=-4", 91}, {"type=gpu", 95}};
+  for (const auto& [keys, high] : kLimits) {
+    for (const char* const index : {"allcards", "0"}) {
+      SetBench bench(Zone(std::string("chip=videochip\nindex=") + index + "\n" + keys));
+      bench["videochip"].threshold = 95;
+      bench["videochip"].lowLimit = 7;
+      ZoneSet zones = Loaded(bench);
+      EXPECT_EQ(zones.GetHigh(1), high) << index;
+      EXPECT_EQ(zones.GetLow(1), 7) << index;
     }
   }
 }
@@ -264,7 +323,7 @@ TEST(ZoneReport, SaysHowEachZoneStands) {
 }
 
 TEST(ZoneReport, WritesTextAndXml) {
-  SetBench bench(Zone("chip=acpi\ncpu.core=true\nthreshold.tjmax.delta=8") + Zone("chip=a", 2) +
+  SetBench bench(Zone("chip=acpi\ncpu.core=true\nthreshold.tjmax.delta=8") + Zone("chip=a\nthreshold.delta=1", 2) +
                  "test.tempcaution.proberate=7\ntest.tempcaution.retriesoninvalidtemp=4\n");
   bench["acpi"].threshold = 100;
   ZoneSet zones = Loaded(bench);
@@ -272,6 +331,7 @@ TEST(ZoneReport, WritesTextAndXml) {
   bench["acpi"].cores = {38, 42};
   ZoneCheck check;
   zones.Check(1, check);
+  bench["a"].threshold = 50;  // not asked for a log
   std::string text;
   WriteZoneLog([&](const std::string& line) { text += line + "\n"; }, zones);
   EXPECT_THAT(text, ::testing::StartsWith(std::string(59, '*') + "\nHalcyon Temp Caution Test started:2024"));
