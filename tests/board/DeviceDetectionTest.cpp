@@ -134,6 +134,7 @@ TEST(HoodSwitch, IsReadAsALineAndAsALatch) {
     const auto word = [&](bool done) { return std::string(!done ? "none" : value ? "true" : "false"); };
     EXPECT_EQ(word(hood.Read(value)), c.line);
     EXPECT_EQ(word(hood.ReadLatch(true, value)), c.latch);
+    EXPECT_EQ(bench.bench.machine.Errors(), "");
     EXPECT_EQ(bench.Notes(), c.notes);
   }
 }

@@ -119,7 +119,8 @@ TEST(ZoneSet, TellsOfKeysThatItCannotUse) {
       {Zone("prochot.offset=0x10000"), "prochot.offset\": there is no register 0x10000"},
       {Zone("prochot.threshold.low.bit=x"), "low.bit\": \"x\" is no number and counts as 0"},
       {Zone("prochot.threshold.high.bit=8"), "high.bit\": a byte has no bit 8"},
-      {Zone("threshold.tjmax.delta=8"), "threshold.tjmax.delta\": the chip \"sio\" does not tell the limit"},
+      {Zone("threshold.tjmax.delta=8"),
+       "no limit by \"test.tempcaution.zone.1.threshold.tjmax.delta\": what the chip \"sio\""},
   };
   for (const auto& [keys, told] : kCases) {
     const SetBench bench(keys);

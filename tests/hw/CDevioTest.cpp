@@ -6,8 +6,11 @@
 #include <cstdio>
 #include <functional>
 #include <string>
+#include <tuple>
+#include <utility>
 #include <vector>
 
+#include "hw/PciDeviceList.h"
 #include "platform/sim/Simulation.h"
 
 namespace panelglow {
@@ -157,6 +160,33 @@ TEST_F(CDevioTest, FindsFunctionsByClassAndIds) {
   EXPECT_FALSE(devio_.FindPciDeviceByIds(0x060100, 0x8086, 0x1C02, 0x103C, 0x3049, location_));
   EXPECT_FALSE(devio_.FindPciDeviceByIds(0x060100, 0x10EC, 0x8168, 0x103C, 0x3048, location_));  // of another class
   EXPECT_EQ(location_, 0);
+}
+
+// Of functions whose ids the device tree knows, by their place among those whose description has the name.
+TEST(CDevio, FindsFunctionsByTheNameInTheDeviceTree) {
+  MachineDescription description = Machine(true);
+  const std::pair<std::uint32_t, const char*> kCards[] = {{0x165914E4, "Fast Ethernet"},
+                                                          {0x165A14E4, "Gigabit Ethernet"},
+                                                          {0x165B14E4, "Gigabit Ethernet #2"},
+                                                          {0x165C14E4, "Gigabit Ethernet #3"}};
+  std::uint16_t location = 0x0300;
+  for (const auto& [ids, name] : kCards) {
+    const std::uint32_t classCode = ids == 0x165B14E4 ? 0x02800000 : 0x02000000;
+    description.pci.push_back({location, {{0x00, ids}, {0x08, classCode}, {0x2C, 0x3048103C}}});
+    description.pci.back().description = name;
+    location = static_cast<std::uint16_t>(location + 8);
+  }
+  const Simulation machine(description, {});
+  PciDeviceList::Forget();
+  CDevio devio;
+  const std::tuple<const char*, unsigned, std::uint16_t> kCases[] = {
+      {"Ethernet", 0, 0x0300},         {"Gigabit Ethernet", 0, 0x0308}, {"Gigabit Ethernet", 1, 0x0318},
+      {"Gigabit Ethernet", 2, 0x0000}, {"Ethernet #2", 0, 0x0000},      {"gigabit", 0, 0x0000}};
+  for (const auto& [name, occurrence, found] : kCases) {
+    EXPECT_EQ(devio.FindPciDeviceByName(0x020000, name, occurrence, location), found != 0) << name << occurrence;
+    EXPECT_EQ(location, found) << name << occurrence;
+  }
+  PciDeviceList::Forget();
 }
 
 TEST_F(CDevioTest, ReadsAndWritesConfigurationOfEachWidth) {

@@ -78,7 +78,7 @@ class FlatKeys {
     }
     const std::string token = LeadingNumber(setting);
     const int number = CDMUtil::ToInt(token);
-    CheckNumber(token, 32, static_cast<std::uint32_t>(number), setting);
+    CheckNumber(token, kIntBits, static_cast<std::uint32_t>(number), setting);
     return number;
   }
 

@@ -94,7 +94,7 @@ LineSetting ReadLineNumber(const std::string& key) {
     return {.line = text == "caseopen" ? kCaseOpenLine : kIntruderLine, .isSet = true, .isSpecial = true};
   }
   const int line = CDMUtil::ToInt(text);
-  CheckNumber(text, 32, static_cast<std::uint32_t>(line), setting);
+  CheckNumber(text, kIntBits, static_cast<std::uint32_t>(line), setting);
   return {.line = line, .isSet = line != LineSetting::kNone};
 }
 
@@ -104,7 +104,7 @@ std::vector<int> NumbersIn(const Setting& list) {
   std::vector<int> numbers;
   for (const std::string& token : tokens) {
     numbers.push_back(CDMUtil::ToInt(token));
-    CheckNumber(token, 32, static_cast<std::uint32_t>(numbers.back()), list);
+    CheckNumber(token, kIntBits, static_cast<std::uint32_t>(numbers.back()), list);
   }
   return numbers;
 }

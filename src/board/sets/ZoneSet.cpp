@@ -11,6 +11,7 @@
 #include "board/sets/ReadSettings.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
 
@@ -179,8 +180,8 @@ void ZoneSet::LimitByChip(TempZone& zone, const std::string& prefix) const {
     }
     Log(zone.name + " : Delta value from ini  " + sign + " " + CDMUtil::ToString(delta));
     if (!chip.ReadThreshold(zone.index, zone.tjMax)) {
-      TellOf(IniReader::Instance().ReadIniSetting(prefix + key, ""),
-             "the chip \"" + zone.chip + "\" does not tell the limit that this counts from; there is none of it");
+      Notices::Tell("The zone \"" + zone.name + "\" has no limit by \"" + prefix + key + "\": what the chip \"" +
+                    zone.chip + "\" allows at most is not known.");
       return;
     }
     threshold = Sum(zone.tjMax, -std::int64_t{delta});
