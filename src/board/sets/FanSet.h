@@ -32,7 +32,7 @@ class FanSet {
 
   /// Looks which fans are plugged in, and writes "true", "false" or "ERROR: device detection failed" into
   /// detectionStatus: by the fan's line where it has one, else by its tachometer. Fans that need a duty to turn get
-  /// it for the stabilization wait, and are given back unless software had them before.
+  /// it for the stabilization wait, and are given back unless software had them before: then they keep it.
   bool Detect();
 
   [[nodiscard]] const std::vector<Fan>& List() const { return fans; }
