@@ -84,12 +84,17 @@ TEST(ZoneSet, TheLimitIsTheFirstThatTheFilesGive) {
       {"threshold.delta=2\nthreshold.adj=10", -1, 50, 62, kNoLimit},
       {"threshold.delta=2", -1, -1, kNoLimit, kNoLimit},
       {"threshold.tjmax.delta=-2147483648", 100, -1, 2147483647, kNoLimit},
+      {"index=0", 95, 7, 95, 7},  // of a graphics card from here
+      {"index=allcards", 95, 7, 95, 7},
+      {"index=0\nthreshold.delta=-4\nthreshold.low=3", 95, 7, 91, 3},
+      {"index=allcards\nthreshold.delta=-4\nthreshold.low=3", 95, 7, 91, 3},
   };
   for (const Case& c : kCases) {
     SCOPED_TRACE(c.keys);
-    SetBench bench(Zone(std::string("chip=a\n") + c.keys));
-    bench["a"].threshold = c.threshold;
-    bench["a"].lowLimit = c.lowLimit;
+    const std::string chip = std::string(c.keys).starts_with("index") ? "videochip" : "a";
+    SetBench bench(Zone("chip=" + chip + "\n" + c.keys));
+    bench[chip].threshold = c.threshold;
+    bench[chip].lowLimit = c.lowLimit;
     ZoneSet zones = Loaded(bench);
     EXPECT_EQ(zones.GetHigh(1), c.high);
     EXPECT_EQ(zones.GetLow(1), c.low);
@@ -177,25 +182,6 @@ TEST(ZoneSet, ACheckCountsWhatIsBeyondALimitInARow) {
           {60, {}, "a 0 1 0 60 71"}});
 }
 
-TEST(ZoneSet, AReadingCountsOnceHoweverOftenItIsJudged) {
-  SetBench bench(Zone("chip=a\nthreshold.high=70\nthreshold.low=5"));
-  ZoneSet zones = Loaded(bench);
-  bench["a"].readings = {71, 72, 4};
-  bool isBeyond = false;
-  for (const auto& [high, low] : {std::pair{1, 0}, std::pair{2, 0}, std::pair{0, 1}}) {
-    int value = 0;
-    EXPECT_TRUE(zones.Measure(1, value));
-    for (int again = 0; again < 2; ++again) {
-      EXPECT_TRUE(zones.JudgeHigh(1, isBeyond));
-      EXPECT_EQ(isBeyond, high != 0);
-      EXPECT_TRUE(zones.JudgeLow(1, isBeyond));
-      EXPECT_EQ(isBeyond, low != 0);
-    }
-    EXPECT_EQ(zones.Find(1)->consecutiveHigh, high);
-    EXPECT_EQ(zones.Find(1)->consecutiveLow, low);
-  }
-}
-
 TEST(ZoneSet, ProchotIsReadByItsBits) {
   struct Case {
     const char* low;
@@ -273,21 +259,6 @@ TEST(ZoneSet, AKeyForAllCardsIsAZoneForEach) {
       EXPECT_STREQ(refused.what(), "Missing or invalid Zone Group information");
     }
     EXPECT_TRUE(none.Groups().empty());
-  }
-}
-
-TEST(ZoneSet, ACardsOwnLimitsCountWhereTheZoneHasNoneHoweverItIsNamed) {
-  const std::pair<const char*, int> kLimits[] = {
-      {"threshold.high=88", 88}, {"threshold.delta=-4", 91}, {"type=gpu", 95}};
-  for (const auto& [keys, high] : kLimits) {
-    for (const char* const index : {"allcards", "0"}) {
-      SetBench bench(Zone(std::string("chip=videochip\nindex=") + index + "\n" + keys));
-      bench["videochip"].threshold = 95;
-      bench["videochip"].lowLimit = 7;
-      ZoneSet zones = Loaded(bench);
-      EXPECT_EQ(zones.GetHigh(1), high) << index;
-      EXPECT_EQ(zones.GetLow(1), 7) << index;
-    }
   }
 }
 
