@@ -115,6 +115,9 @@ class NotedChip : public Chip {
   }
   bool Temperature(const std::string& how, int zone, int& value) {
     Note(how + " " + std::to_string(zone));
+    if (breaks) {
+      throw mblib_exception(name + " broke");
+    }
     if (readings.empty()) {
       return false;
     }

@@ -11,6 +11,7 @@
 namespace panelglow {
 namespace {
 
+using ::testing::AnyOf;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ::testing::Not;
@@ -289,6 +290,9 @@ TEST(ZoneReport, SaysHowEachZoneStands) {
     ProbeSettings patient;
     patient.consecutiveHigh = patient.consecutiveLow = 2;
     EXPECT_THAT(ZoneStatus(*zones.Find(1), patient), Not(HasSubstr("rTempErr")));
+    bench[zones.Find(1)->chip].breaks = true;
+    EXPECT_THROW(zones.Check(1, check), mblib_exception);
+    EXPECT_THAT(ZoneStatus(*zones.Find(1), patient), AnyOf("SIOErr", "IniIndexErr"));  // not the one before
     zones.SetSkipped(1, true);
     EXPECT_EQ(ZoneStatus(*zones.Find(1), zones.Probe()), "NotTested");
   }

@@ -338,6 +338,7 @@ bool ZoneSet::Measure(int zone, int& value) {
   if (found == nullptr) {
     return false;
   }
+  found->lastReading = kChipReadFailed;  // ... it stays, when the chip throws
   value = found->lastReading = steps.read ? steps.read(zone) : Read(zone);
   found->isHighCounted = found->isLowCounted = false;
   if (value >= kFirstInvalidReading) {
