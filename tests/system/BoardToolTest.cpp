@@ -108,6 +108,11 @@ TEST(SystemBoardTool, CheckSpeaksToProgramsAndStandsWhatIsHostile) {
   EXPECT_THAT(Ask(installation, kReal, {"check", "--format", "sarif"}).output,
               AllOf(HasSubstr("\"version\": \"2.1.0\""), HasSubstr("\"startLine\": 22")));
 
+  installation.Replace("chip.ini", "powerled.color.primary.gpio=22", "powerled.color.primary.gpio=18");
+  EXPECT_THAT(
+      Ask(installation, kReal, {"check"}).output,
+      HasSubstr(":29: error: invalid primary led map. Check powerled.color.primary.gpio entry. [board-fails]\n"));
+
   std::string deep = "<UI>";
   for (int i = 0; i < 100000; ++i) {
     deep += "<a>";
@@ -217,6 +222,12 @@ TEST(SystemBoardTool, BlinkPutsBackHoweverItEnds) {
     EXPECT_THAT(installation.Read("report"), HasSubstr("\nedge ")) << name;
   }
   const std::string machine = installation.Machine("sio-fintek.toml");
+  const Outcome dark =
+      Ask(installation, kSimulated,
+          {"--machine", installation.Machine("desktop.toml"), "blink", "charge-amber", "--seconds", "1"});
+  EXPECT_EQ(dark.exitCode, 1);
+  EXPECT_THAT(dark.errors, AllOf(StartsWith("panelglow-board-sim: looks whether the charge LED, red or amber"),
+                                 Not(HasSubstr("blinks the"))));
   installation.Write("call.sh", PANELGLOW_BINARY_DIR "/panelglow-board-sim --real-time --machine " + machine +
                                     " blink power-red --seconds 60 &\nsleep 1.5\nkill -$1 $!\nwait $!\n");
   for (const char* const signal : {"INT", "TERM", "HUP"}) {
