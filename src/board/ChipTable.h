@@ -2,7 +2,6 @@
 // select them and how each class is built.
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <memory>
 #include <span>

@@ -23,6 +23,9 @@ class LegacyMonitor : public RegisterChip {
   /// `indexPort` 0: not known.
   LegacyMonitor(CDevio& client, std::uint16_t indexPort, std::uint16_t dataPort, Traits fixed);
 
+  /// Whether the files say where it is.
+  [[nodiscard]] bool IsKnown() const { return isKnown; }
+
   /// `fan`: its first register.
   std::uint32_t ReadFanTach(int fan, int arg) override;
   int TachToRpm(std::uint32_t raw, int multiplier) override;

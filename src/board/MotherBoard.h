@@ -277,7 +277,11 @@ class MotherBoard {
   ChipChoice powerButton{"test.powerbutton.chip", "power button", ""};
 
   FanSet fans{Finder()};
-  ZoneSet zones{Finder()};
+  ZoneSet zones{Finder(),
+                {.read = [this](int zone) { return ReadZone(zone); },
+                 .prochot = [this](int zone) { return ReadProchot(zone); },
+                 .high = [this](int zone) { return GetZoneHigh(zone); },
+                 .low = [this](int zone) { return GetZoneLow(zone); }}};
   DeviceDetection devices{Finder()};
 
  private:

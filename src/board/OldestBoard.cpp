@@ -58,6 +58,8 @@ int OldestBoard::ReadGpioLine(int line) {
   return LineState((devio.InportWord(kGpioPort) >> line & 1) != 0);
 }
 
+void OldestBoard::TellOfLine() { platform::TheHost().console.Write("  Orchard GPIO_ERROR !!!!!!!!!\n"); }
+
 bool OldestBoard::DetectLegacyDevice(LegacyDevice device, bool& present) {
   const int line = settings.lines[static_cast<std::size_t>(device)];
   if (line == LegacySettings::kNoLine) {
@@ -65,7 +67,7 @@ bool OldestBoard::DetectLegacyDevice(LegacyDevice device, bool& present) {
   }
   const int state = ReadGpioLine(line);
   if (state == kNoSuchLineState) {
-    platform::TheHost().console.Write("  Orchard GPIO_ERROR !!!!!!!!!\n");
+    TellOfLine();
     return false;
   }
   present = state == kLineAsserted;
@@ -80,7 +82,7 @@ bool OldestBoard::ReadFan(int index, int& rpm) {
 }
 
 bool OldestBoard::DetectLegacyFan(int index, bool& present) {
-  if (fans.Find(index) == nullptr) {
+  if (fans.Find(index) == nullptr || !monitor.IsKnown()) {
     return false;
   }
   int rpm = 0;

@@ -54,6 +54,9 @@ class OldestBoard : public MotherBoard {
   /// does not have.
   [[nodiscard]] int ReadGpioLine(int line);
 
+  /// Prints that a line cannot be read.
+  static void TellOfLine();
+
   [[nodiscard]] const LegacySettings& Settings() const { return settings; }
 
   CDevio devio;

@@ -37,12 +37,13 @@ constexpr RegisterId kRamp1{0, 0x62};
 constexpr RegisterId kRamp2{0, 0x63};
 
 FanTable Fans() {
-  return {.duties = RegisterRun(0, 0x30, 3),
-          .fullSpeed = 0xFF,
-          .saved = {kStart, kFanModes[0], kFanModes[1], kFanModes[2], kRamp1, kRamp2},
-          .manual = {FromSaved(kStart, 0xFD, 0x01), FromSaved(kFanModes[0], 0xFF, kManual),
-                     FromSaved(kFanModes[1], 0xFF, kManual), FromSaved(kFanModes[2], 0xFF, kManual),
-                     FromSaved(kRamp1, 0xF0, 0), Put(kRamp2, 0)}};
+  return {
+      .duties = RegisterRun(0, 0x30, 3),
+      .fullSpeed = 0xFF,
+      .saved = {kStart, {0, 0x30}, {0, 0x31}, {0, 0x32}, kFanModes[0], kFanModes[1], kFanModes[2], kRamp1, kRamp2},
+      .manual = {FromSaved(kStart, 0xFD, 0x01), FromSaved(kFanModes[0], 0xFF, kManual),
+                 FromSaved(kFanModes[1], 0xFF, kManual), FromSaved(kFanModes[2], 0xFF, kManual),
+                 FromSaved(kRamp1, 0xF0, 0), Put(kRamp2, 0)}};
 }
 
 constexpr const char* kNicName = "Broadcom NetXtreme Gigabit Ethernet";
@@ -105,7 +106,21 @@ bool Orchard::DetectNicDashCable(int line, bool& present) {
   }
   Log("----Got NIC PCI BAR1 = " + Hex(controller->Base(), 8));
   DashLog log;
-  present = line >= 0 && controller->LineFollows([&] { return ReadGpioLine(line); }, log);
+  bool isLine = true;
+  const std::optional<bool> follows = controller->LineFollows(
+      [&] {
+        const int state = ReadGpioLine(line);
+        isLine = state != kNoSuchLineState;
+        return state;
+      },
+      log);
+  if (!isLine) {
+    TellOfLine();
+  }
+  if (!follows) {
+    return false;  // the log has how far it came
+  }
+  present = *follows;
   Log(present ? "----Reporting NIC Dash Cable is installed." : "----Reporting NIC Dash Cable is NOT installed!");
   return true;
 }

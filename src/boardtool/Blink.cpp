@@ -70,7 +70,7 @@ int Blink(const BlinkOptions& options, const Person& person) {
     throw WrongCall("there is no LED \"" + options.led + "\": name one of " + BoardLedNames());
   }
   if (options.seconds <= 0 && !person.isThere) {
-    throw WrongCall("nobody is at the terminal who could press a key: give --seconds");
+    throw WrongCall("nobody is at the terminal who could press Enter: give --seconds");
   }
   const BoardFiles names = BoardFilesIn(options.folder);
   RehearsalWish wish;
@@ -80,9 +80,11 @@ int Blink(const BlinkOptions& options, const Person& person) {
   BoardOnMachine machine(options.folder);
   if (!plan.leds.empty()) {
     const std::string places = PlacesOf(plan.leds.front());
-    Say("blinks the " + std::string(led->title) + " of board " + machine.SystemId() +
-        (IsSimulated() ? " (simulated)" : "") + (places.empty() ? "" : "; it writes " + places) +
-        (options.seconds > 0 ? "." : ". A key ends it."));
+    // Hardware may light it where the imagined one does not.
+    const std::string title(led->title);
+    Say((plan.leds.front().IsLit() ? "blinks the " + title : "looks whether the " + title + " can be lit") +
+        " of board " + machine.SystemId() + (IsSimulated() ? " (simulated)" : "") +
+        (places.empty() ? "" : "; it writes " + places) + (options.seconds > 0 ? "." : ". Enter ends it."));
   }
   MotherBoard& board = machine.Board();
   const bool forKey = options.seconds <= 0;

@@ -3,10 +3,11 @@
 #include <algorithm>
 #include <array>
 #include <map>
-#include <optional>
 
 #include "board/ChipTable.h"
-#include "boardtool/KnownKeys.h"
+#include "boardtool/LayeredFiles.h"
+#include "boardtool/MachineChecks.h"
+#include "boardtool/NameChecks.h"
 #include "harness/base/CDMUtil.h"
 
 namespace panelglow::boardtool {
@@ -15,12 +16,6 @@ namespace {
 
 using Files = std::vector<IniOutline>;
 
-const IniOutline* FileOf(const Files& files, const std::string& path) {
-  const auto found =
-      std::find_if(files.begin(), files.end(), [&](const IniOutline& file) { return file.path == path; });
-  return found == files.end() ? nullptr : &*found;
-}
-
 // What the library tells people begins with a place: `FILE, section [NAME], key "KEY": ...`.
 struct Told {
   const IniOutline* file = nullptr;
@@ -28,7 +23,7 @@ struct Told {
   std::string text;
 };
 
-Told Located(const std::string& notice, const Files& files) {
+Told Located(const std::string& notice, const LayeredFiles& files, const std::string& machine) {
   constexpr std::string_view kSection = ", section [";
   constexpr std::string_view kKey = "], key \"";
   constexpr std::string_view kEnd = "\": ";
@@ -39,11 +34,21 @@ Told Located(const std::string& notice, const Files& files) {
     return {nullptr, nullptr, notice};
   }
   Told told;
-  told.file = FileOf(files, notice.substr(0, section));
+  told.file = files.File(notice.substr(0, section));
   told.text = notice.substr(end + kEnd.size());
+  const std::string sectionName = notice.substr(section + kSection.size(), key - section - kSection.size());
   if (told.file != nullptr) {
-    told.entry = told.file->Find(notice.substr(section + kSection.size(), key - section - kSection.size()),
-                                 notice.substr(key + kKey.size(), end - key - kKey.size()));
+    told.entry = told.file->Find(sectionName, notice.substr(key + kKey.size(), end - key - kKey.size()));
+  }
+  // A list that cannot be used because of another key says so.
+  constexpr std::string_view kCheck = "Check ";
+  if (const std::size_t check = told.text.find(kCheck); check != std::string::npos) {
+    const std::size_t begin = check + kCheck.size();
+    const std::string other = told.text.substr(begin, told.text.find(' ', begin) - begin);
+    if (const PlacedEntry line = files.Chip(machine, sectionName, other)) {
+      told.file = line.file;
+      told.entry = line.entry;
+    }
   }
   return told;
 }
@@ -52,13 +57,14 @@ struct NoticeRule {
   std::string_view words;
   std::string_view rule;
 };
-constexpr std::array<NoticeRule, 8> kNoticeRules{{{"is no number", "not-a-number"},
+constexpr std::array<NoticeRule, 9> kNoticeRules{{{"is no number", "not-a-number"},
                                                   {"does not fit into", "bit-out-of-range"},
                                                   {"neither yes nor no", "yes-or-no"},
                                                   {"there is no board class", "unknown-class"},
                                                   {"there is no chip", "unknown-chip"},
                                                   {"there is no section", "unknown-base"},
                                                   {"malformed sequence entry", "malformed-sequence"},
+                                                  {"invalid ", "board-fails"},
                                                   {"", "unreadable"}}};
 
 std::string_view RuleFor(const std::string& text) {
@@ -70,7 +76,7 @@ std::string_view RuleFor(const std::string& text) {
 class BoardCheck {
  public:
   BoardCheck(const Files& files, const BoardFiles& names, platform::Host& machine, Findings& findings)
-      : files_(files), names_(names), machine_(machine), findings_(findings) {}
+      : files_(files), names_(names), layers_(files, names), machine_(machine), findings_(findings) {}
 
   BoardKnowledge Run() {
     const std::vector<std::string> machines = MachinesOf(files_, names_);
@@ -80,15 +86,15 @@ class BoardCheck {
     for (std::size_t i = 0; i < machines.size() && i < kMostMachines; ++i) {
       const BoardPlan plan = Rehearse(files_, names_, machines[i], machine_, wish);
       CheckPlan(plan);
-      lookUps_.insert(plan.lookUps.begin(), plan.lookUps.end());
+      CheckMachine(plan, layers_, names_, findings_);
+      reached_.lookUps.insert(plan.lookUps.begin(), plan.lookUps.end());
     }
     if (machines.size() > kMostMachines) {
       findings_.Add("too-many-machines", files_.front().path, 1, 1,
                     "only the first " + std::to_string(kMostMachines) + " of " + std::to_string(machines.size()) +
                         " machines were tried");
     }
-    CheckChains();
-    CheckKeys();
+    CheckNames(files_, names_, machine_, reached_, findings_);
     return std::move(knowledge_);
   }
 
@@ -99,24 +105,10 @@ class BoardCheck {
     }
   }
 
-  // The entry that decided a key for a machine, in the order of the look-ups.
-  std::pair<const IniOutline*, const IniEntry*> Deciding(const std::string& section, const std::string& key) const {
-    for (const std::string& path : {names_.testPath, names_.detectPath}) {
-      const IniOutline* const file = FileOf(files_, path);
-      for (const std::string& place : {section, std::string("common")}) {
-        const IniEntry* const entry = file == nullptr ? nullptr : file->Find(place, key);
-        if (entry != nullptr && !entry->value.empty()) {
-          return {file, entry};
-        }
-      }
-    }
-    return {nullptr, nullptr};
-  }
-
   // Where something about a machine as a whole is told.
   void AddOfMachine(std::string_view rule, const std::string& machine, const std::string& text) {
     for (const char* const key : {"platform", "chips", "MotherboardClass"}) {
-      if (const auto [file, entry] = Deciding(machine, key); entry != nullptr) {
+      if (const auto [file, entry] = layers_.Board(machine, key); entry != nullptr) {
         Add(rule, file, entry, text);
         return;
       }
@@ -126,22 +118,51 @@ class BoardCheck {
   void CheckPlan(const BoardPlan& plan) {
     bool isExplained = false;
     for (const std::string& notice : plan.notices) {
-      const Told told = Located(notice, files_);
+      const Told told = Located(notice, layers_, plan.systemId);
       if (told.entry != nullptr) {
         isExplained = true;
         Add(RuleFor(told.text), told.file, told.entry, WithNearestChip(told.text));
       } else if (notice.find("cannot be lit") == std::string::npos &&
+                 notice.find("cannot be darkened") == std::string::npos &&
                  notice.find("is not known") == std::string::npos) {
         AddOfMachine("unreadable", plan.systemId, "[" + plan.systemId + "] " + notice);
       }
     }
     if (!plan.failure.empty() && !isExplained) {
-      AddOfMachine("board-fails", plan.systemId, "[" + plan.systemId + "] cannot be built: " + plan.failure);
+      const std::string text = "[" + plan.systemId + "] cannot be built: " + plan.failure;
+      if (const PlacedEntry bar = LineOfBase(plan)) {
+        Add("board-fails", bar.file, bar.entry, text);
+      } else {
+        AddOfMachine("board-fails", plan.systemId, text);
+      }
+    }
+    if (plan.className.empty()) {
+      reached_.unbuilt.insert(LoweredName(plan.systemId));
+      if (plan.failure.empty() && !isExplained) {
+        reached_.unselected.push_back(plan.systemId);
+      }
     }
     for (const LedPlan& led : plan.leds) {
       CheckLed(plan, led);
     }
     CheckSameBits(plan);
+  }
+
+  // The line that says where a Super-I/O's base stands, when a board fails for want of it.
+  PlacedEntry LineOfBase(const BoardPlan& plan) const {
+    for (const auto& [word, key] : {std::pair("HWMBAR", "hwmbar.bar.reg"), std::pair("GPIOBAR", "gpiobar.bar.reg")}) {
+      if (plan.failure.find(word) == std::string::npos) {
+        continue;
+      }
+      std::vector<std::string> chips;
+      CDMUtil::Split(LoweredName(layers_.Board(plan.systemId, "chips").Value()), chips, ", ");
+      for (const std::string& chip : chips) {
+        if (const PlacedEntry line = layers_.Chip(plan.systemId, layers_.SectionOf(plan.systemId, chip), key)) {
+          return line;
+        }
+      }
+    }
+    return {};
   }
 
   static std::string WithNearestChip(const std::string& text) {
@@ -155,17 +176,6 @@ class BoardCheck {
     return WithNearest(text, name, ChipNames());
   }
 
-  static std::string WithNearest(std::string text, const std::string& name, const std::vector<std::string>& known) {
-    const std::string nearest = Nearest(name, known);
-    if (nearest.empty()) {
-      return text;
-    }
-    if (text.ends_with('.')) {
-      text.pop_back();
-    }
-    return text + "; is \"" + nearest + "\" meant?";
-  }
-
   static std::vector<std::string> ChipNames() {
     std::vector<std::string> names;
     for (const ChipRow& row : ChipRows()) {
@@ -174,8 +184,18 @@ class BoardCheck {
     return names;
   }
 
+  // The line of a chip's key that a finding about an LED is about; where there is none, that of the LED's chip.
+  PlacedEntry LineOf(const BoardPlan& plan, const BoardLed& led, const std::string& key) const {
+    const std::string chip = ChipOf(plan, led);
+    const bool hasMasks = HasMasksOfFiles(plan, led);  // whose lists stand in the section of the chip's own name
+    const PlacedEntry line =
+        chip.empty() ? PlacedEntry{}
+                     : layers_.Chip(plan.systemId, hasMasks ? chip : layers_.SectionOf(plan.systemId, chip), key);
+    return line ? line : layers_.Board(plan.systemId, std::string(led.chipKey));
+  }
+
   void CheckLed(const BoardPlan& plan, const LedPlan& led) {
-    const auto [file, entry] = Deciding(plan.systemId, std::string(led.led->chipKey));
+    const auto [file, entry] = layers_.Board(plan.systemId, std::string(led.led->chipKey));
     const std::string title = "[" + plan.systemId + "] " + std::string(led.led->title);
     if (led.IsLit()) {
       knowledge_.litFunctions.insert(std::string(led.led->function));
@@ -186,7 +206,9 @@ class BoardCheck {
     const PlannedStep* const on = led.Find("on");
     const PlannedStep* const off = led.Find("off");
     if (on != nullptr && off != nullptr && on->answer && !off->answer) {
-      Add("on-without-off", file, entry, title + " can be lit and not darkened: the chip has no keys for it");
+      const PlacedEntry line = LineOf(plan, *led.led, std::string(led.led->chipPrefix) + ".deassert.sequence");
+      Add("on-without-off", line.file, line.entry,
+          title + " can be lit and not darkened: the chip has no keys for it");
     }
     if (const PlannedStep* const save = led.Find("save");
         !led.leftChanged.empty() && led.blinksByItself && save != nullptr && save->answer &&
@@ -195,7 +217,9 @@ class BoardCheck {
       for (const ImaginedHardware::Cell& cell : led.leftChanged) {
         registers += (registers.empty() ? "" : ", ") + Hex(cell.address);
       }
-      Add("not-saved", file, entry, title + ": the blink changes " + registers + ", which no save list has");
+      const PlacedEntry line = LineOf(plan, *led.led, "powerled.state.regs");
+      Add("not-saved", line.file, line.entry,
+          title + ": the blink changes " + registers + ", which no save list has");
     }
     CheckRate(led, title, file, entry);
   }
@@ -238,7 +262,9 @@ class BoardCheck {
       return other.led->chipKey == led.led->chipKey && other.IsLit();
     });
     if (isBuilt && !otherIsLit && led.failure.empty()) {
-      Add("led-not-lit", file, &entry,
+      const PlacedEntry line = LineOf(plan, *led.led, std::string(led.led->chipPrefix) + ".assert.sequence");
+      const bool isOff = line && line.IsUndefined();
+      Add("led-not-lit", isOff ? line.file : file, isOff ? line.entry : &entry,
           "[" + plan.systemId + "] chip \"" + name + "\" lights no " + std::string(led.led->title) +
               ": it has no keys for it, or cannot");
     }
@@ -257,7 +283,7 @@ class BoardCheck {
   }
 
   std::string ChipOf(const BoardPlan& plan, const BoardLed& led) const {
-    const auto [file, entry] = Deciding(plan.systemId, std::string(led.chipKey));
+    const auto [file, entry] = layers_.Board(plan.systemId, std::string(led.chipKey));
     return entry == nullptr ? std::string() : LoweredName(CDMUtil::Trim(entry->value));
   }
 
@@ -279,7 +305,8 @@ class BoardCheck {
           if (same == bits.end() || (same->second & set) == 0) {
             continue;
           }
-          const auto [file, entry] = Deciding(plan.systemId, std::string(second->led->chipKey));
+          const auto [file, entry] =
+              LineOf(plan, *second->led, std::string(second->led->chipPrefix) + ".assert.sequence");
           HardwareAccess access;
           access.kind = place.first;
           access.width = 1;
@@ -293,103 +320,12 @@ class BoardCheck {
     }
   }
 
-  // Chains of base sections, and the sections that chips are bound to.
-  void CheckChains() {
-    const IniOutline* const chip = FileOf(files_, names_.chipPath);
-    if (chip == nullptr) {
-      return;
-    }
-    for (const IniSection& section : chip->sections) {
-      std::set<std::string> visited{LoweredName(section.name)};
-      const IniEntry* base = chip->Find(section.name, "base");
-      while (base != nullptr && !base->value.empty()) {
-        if (!chip->HasSection(base->value)) {
-          Add("unknown-base", chip, base,
-              WithNearest("there is no section [" + base->value + "]", base->value, SectionNames(*chip)));
-          break;
-        }
-        if (!visited.insert(LoweredName(base->value)).second) {
-          if (LoweredName(base->section) == LoweredName(section.name) || base->value == section.name) {
-            Add("base-cycle", chip, base, "the chain of base sections comes back to [" + base->value + "]");
-          }
-          break;
-        }
-        base = chip->Find(base->value, "base");
-      }
-    }
-    for (const IniOutline& file : files_) {
-      for (const IniEntry& entry : file.entries) {
-        const std::string key = LoweredName(entry.key);
-        if (&file != chip && key.starts_with("chip.") && key.ends_with(".data") && !entry.value.empty() &&
-            !chip->HasSection(CDMUtil::Trim(entry.value.substr(0, entry.value.find(';'))))) {
-          Add("unknown-section", &file, &entry,
-              WithNearest(chip->path + " has no section [" + entry.value + "]", entry.value, SectionNames(*chip)));
-        }
-      }
-    }
-  }
-
-  static std::vector<std::string> SectionNames(const IniOutline& file) {
-    std::vector<std::string> names;
-    for (const IniSection& section : file.sections) {
-      names.push_back(section.name);
-    }
-    return names;
-  }
-
-  // Gathered for the first key that the machines of the files did not look up.
-  const KnownKeys& Known() { return known_ ? *known_ : known_.emplace(names_, machine_); }
-
-  // Keys that nothing reads.
-  void CheckKeys() {
-    std::set<std::string> readKeys;      // in a chip file, whatever the section
-    std::set<std::string> readSections;  // of the chip file
-    for (const LookUp& lookUp : lookUps_) {
-      if (lookUp.path == names_.chipPath) {
-        readKeys.insert(lookUp.key);
-        readSections.insert(lookUp.section);
-      }
-    }
-    for (const IniOutline& file : files_) {
-      const bool isChipFile = file.path == names_.chipPath;
-      std::set<std::string> toldSections;
-      for (const IniEntry& entry : file.entries) {
-        const std::string key = LoweredName(entry.key);
-        const std::string section = LoweredName(entry.section);
-        if (!entry.isFirst || entry.key.starts_with('#') || entry.key.starts_with("//")) {
-          continue;
-        }
-        if (isChipFile ? readKeys.contains(key) && readSections.contains(section)
-                       : lookUps_.contains({file.path, section, key}) || KnownKeys::IsReadElsewhere(key)) {
-          continue;
-        }
-        if (Known().IsKnown(key, isChipFile)) {
-          if (isChipFile && readSections.contains(section)) {
-            continue;  // of another class that may use this section
-          }
-          if (isChipFile) {
-            if (toldSections.insert(section).second) {
-              findings_.Add("unused-section", file.path, entry.line, 1,
-                            "no board of the files uses section [" + entry.section + "]");
-            }
-          } else if (section != "common") {
-            findings_.Add("unused-key", file.path, entry.line, entry.column,
-                          "the board of [" + entry.section + "] does not read \"" + entry.key + "\"");
-          }
-          continue;
-        }
-        findings_.Add("unknown-key", file.path, entry.line, entry.column,
-                      WithNearest("nothing reads a key \"" + entry.key + "\"", key, Known().All(isChipFile)));
-      }
-    }
-  }
-
   const Files& files_;
   const BoardFiles& names_;
+  LayeredFiles layers_;
   platform::Host& machine_;
   Findings& findings_;
-  std::set<LookUp> lookUps_;
-  std::optional<KnownKeys> known_;
+  Reached reached_;
   BoardKnowledge knowledge_;
 };
 

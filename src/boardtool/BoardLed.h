@@ -11,10 +11,11 @@ namespace panelglow::boardtool {
 using BoardOperation = bool (MotherBoard::*)();
 
 struct BoardLed {
-  std::string_view id;        // as people type it
-  std::string_view title;     // as people read it
-  std::string_view function;  // its key in buttondefinition.xml
-  std::string_view chipKey;   // names the chip that drives it
+  std::string_view id;          // as people type it
+  std::string_view title;       // as people read it
+  std::string_view function;    // its key in buttondefinition.xml
+  std::string_view chipKey;     // names the chip that drives it
+  std::string_view chipPrefix;  // how its keys in a chip's section begin; empty: it has none of its own
   BoardOperation save;
   BoardOperation blink;  // null: none
   BoardOperation on;
@@ -24,7 +25,7 @@ struct BoardLed {
 
 std::span<const BoardLed> BoardLeds();
 
-/// Null when there is none.
+/// By its id, or by the name of its other colour: "power-white" is "power-green". Null when there is none.
 const BoardLed* FindBoardLed(std::string_view id);
 
 /// All ids, by commas.

@@ -79,6 +79,18 @@ void CheckLine(const IniOutline& file, const Form& form, const std::string& text
 
 }  // namespace
 
+std::vector<std::string> ControllerNamesIn(const IniOutline& file) {
+  std::vector<std::string> names;
+  const auto add = [&](const std::string& line) { names.push_back(FieldsOf(line.substr(0, line.find(';'))).back()); };
+  for (const IniStrayLine& line : file.strays) {
+    add(line.text);
+  }
+  for (const IniEntry& entry : file.entries) {
+    add(entry.key + "=" + entry.value);
+  }
+  return names;
+}
+
 void CheckControllers(const IniOutline& file, Findings& findings) {
   std::string section;
   std::size_t next = 0;

@@ -9,8 +9,10 @@
 #include <set>
 
 #include "boardtool/BoardLed.h"
+#include "boardtool/ControllerChecks.h"
 #include "boardtool/IniChecks.h"
 #include "boardtool/Installation.h"
+#include "boardtool/MessageChecks.h"
 #include "boardtool/XmlTags.h"
 #include "config/XmlObject.h"
 #include "harness/base/CDMUtil.h"
@@ -21,7 +23,6 @@ namespace panelglow::boardtool {
 namespace {
 
 constexpr std::string_view kNoFunction = "none";
-constexpr const char* kMediaSection = "all multimedia";
 constexpr int kShortestPhase_ms = 60;
 constexpr int kLongestPhase_ms = 5000;
 
@@ -82,11 +83,11 @@ class DialogCheck {
       messages_.emplace_back(path, *bytes);
       const IniOutline& file = messages_.back();
       CheckIniText(file, true, findings_);
-      CheckFormats(file);
+      CheckMessages(file, std::string_view(name).front() != 'x', findings_);
       if (std::string_view(name).front() == 'p') {
         hasTexts = true;
         for (const IniSection& section : file.sections) {
-          if (section.name != kMediaSection) {
+          if (IsLanguage(section.name)) {
             languages_.push_back(section.name);
           }
         }
@@ -95,29 +96,6 @@ class DialogCheck {
     }
     if (!hasTexts) {
       texts_.reset();
-    }
-  }
-
-  // A text takes at most one text of the program.
-  void CheckFormats(const IniOutline& file) {
-    for (const IniEntry& entry : file.entries) {
-      if (LoweredName(entry.section) == kMediaSection) {
-        continue;
-      }
-      std::size_t taken = 0;
-      for (std::size_t at = entry.value.find('%'); at != std::string::npos && at + 1 <= entry.value.size();
-           at = entry.value.find('%', at + 2)) {
-        const char kind = at + 1 < entry.value.size() ? entry.value[at + 1] : '\0';
-        taken += kind == 's' ? 1 : 0;
-        if (kind != 's' && kind != '%') {
-          findings_.Add("message-format", file.path, entry.line, entry.valueColumn + at,
-                        "\"%\" begins the place of a text, \"%s\"; a percent sign is \"%%\"");
-        }
-      }
-      if (taken > 1) {
-        findings_.Add("message-format", file.path, entry.line, entry.valueColumn,
-                      "the program gives one text, and this one has places for " + std::to_string(taken));
-      }
     }
   }
 
@@ -276,6 +254,7 @@ class DialogCheck {
     std::set<std::string> sections;
     std::set<std::string> inSection;
     std::string section;
+    std::string function;  // of the last button
     for (const Placed& element : ui.elements) {
       if (element.depth == 1) {
         section = element.Get("ID");
@@ -285,8 +264,13 @@ class DialogCheck {
         }
       } else if (element.depth == 2) {
         CheckButton(ui, element, section, inSection, byId, ids);
+        const auto definition = byId.find(CDMUtil::ToLower(element.Get("ID")));
+        function = definition == byId.end() ? "" : CDMUtil::ToLower(definition->second->Get("Function"));
       } else if (element.depth == 3 && element.element->name == "Config") {
         CheckPhases(ui, element);
+        if (function == "hdgreen") {
+          CheckControllerOf(ui, element);
+        }
       }
     }
   }
@@ -307,7 +291,9 @@ class DialogCheck {
       return;
     }
     const std::string active = button.Get("Active");
-    if (active != "false" && CDMUtil::ToLower(active) == "false") {
+    constexpr std::array kTakenIn{"", "true", "yes", "1", "on"};
+    if (active != "false" &&
+        std::find(kTakenIn.begin(), kTakenIn.end(), CDMUtil::ToLower(active)) == kTakenIn.end()) {
       Add("yes-or-no", ui, button,
           "Active=\"" + active + "\" leaves the LED in the test: only \"false\" takes it out");
     }
@@ -339,6 +325,26 @@ class DialogCheck {
         Add("blink-rate", ui, config,
             std::string(attribute) + " of " + text + " ms is " +
                 (phase_ms < kShortestPhase_ms ? "faster" : "slower") + " than an eye takes for blinking");
+      }
+    }
+  }
+
+  // A drive LED is that of the controllers that are named.
+  void CheckControllerOf(const XmlFile& ui, const Placed& config) {
+    const std::string selection = CDMUtil::ToLower(config.Get("Controller"));
+    if (selection.empty() || selection == "all" || selection == "any") {
+      return;
+    }
+    const std::string path = PathIn(folder_, "msctrl.ini");
+    const std::vector<std::string> known = ControllerNamesIn(IniOutline(path, ReadFile(path).value_or("")));
+    std::vector<std::string> names;
+    CDMUtil::Split(selection, names, ",");
+    for (const std::string& name : names) {
+      if (std::find(known.begin(), known.end(), name) == known.end()) {
+        const std::string nearest = Nearest(name, known);
+        Add("unknown-controller", ui, config,
+            path + " has no controller \"" + name + "\"" +
+                (nearest.empty() ? "" : "; is \"" + nearest + "\" meant?"));
       }
     }
   }

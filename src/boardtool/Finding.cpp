@@ -6,6 +6,8 @@
 #include <numeric>
 #include <stdexcept>
 
+#include "boardtool/IniOutline.h"
+
 namespace panelglow::boardtool {
 
 namespace {
@@ -22,16 +24,23 @@ constexpr std::array kRules{
     Rule{"byte-order-mark", Severity::kError, "A mark in front of the first line hides what stands in it."},
     Rule{"caption-missing", Severity::kWarning, "A button's caption has no text in a language."},
     Rule{"comment-in-value", Severity::kWarning, "A comment behind a value leaves its blank in the value."},
+    Rule{"config-keys", Severity::kError, "A Super-I/O lacks a key by which its configuration is opened or left."},
     Rule{"controller-line", Severity::kError, "A line of the storage controllers is not what it should be."},
+    Rule{"crossed-limits", Severity::kError, "A lowest value is above the highest."},
     Rule{"duplicate-button", Severity::kWarning, "A button, or its definition, stands twice."},
     Rule{"duplicate-key", Severity::kWarning, "A key stands twice in a section; the first counts."},
     Rule{"duplicate-section", Severity::kWarning, "A section stands twice; the first counts."},
     Rule{"file-missing", Severity::kError, "A file of the installation is missing or cannot be read."},
     Rule{"file-too-large", Severity::kError, "A file is larger than any file of an installation can be."},
     Rule{"icon-missing", Severity::kError, "A button's icon is missing or is no picture."},
+    Rule{"inverted-mask", Severity::kError, "A mask is the opposite of what its list needs."},
     Rule{"led-not-lit", Severity::kError, "No board of the files lights a LED that a test asks for."},
+    Rule{"led-without-chip", Severity::kError, "An LED has keys, and none that names its chip."},
     Rule{"malformed-sequence", Severity::kError, "An entry of a sequence is no command with its data."},
     Rule{"message-format", Severity::kError, "A text has a place for something that the program does not give."},
+    Rule{"message-texts", Severity::kError, "A message file holds texts that no run finds, or shows as others."},
+    Rule{"misspelt-section", Severity::kWarning,
+         "A section is used by nothing, and mostly one of another name is meant."},
     Rule{"no-file-text", Severity::kError, "A file holds bytes that are no text."},
     Rule{"not-a-number", Severity::kError, "A number is none and counts as 0."},
     Rule{"not-saved", Severity::kWarning, "A blink changes a register that is not put back."},
@@ -44,12 +53,14 @@ constexpr std::array kRules{
     Rule{"unknown-button", Severity::kError, "A button has no definition, or one of no known function."},
     Rule{"unknown-chip", Severity::kError, "A name stands for no chip, or for one that the board has not."},
     Rule{"unknown-class", Severity::kError, "A name stands for no class of boards."},
+    Rule{"unknown-controller", Severity::kError, "A drive LED names a controller that msctrl.ini does not have."},
     Rule{"unknown-key", Severity::kWarning, "Nothing reads a key of this name."},
     Rule{"unknown-section", Severity::kError, "A chip's data names a section that there is not."},
     Rule{"unreadable", Severity::kWarning, "A value cannot be used as it stands."},
     Rule{"unused-key", Severity::kNote, "The board of a section does not read this key."},
     Rule{"unused-section", Severity::kNote, "No board of the files uses a section of chip.ini."},
     Rule{"value-too-long", Severity::kError, "A value is cut at 254 characters."},
+    Rule{"wrong-separator", Severity::kError, "A list goes on behind the mark of a comment."},
     Rule{"xml", Severity::kError, "A file is not well-formed XML."},
     Rule{"yes-or-no", Severity::kWarning, "A value should be yes or no."},
 };
@@ -92,8 +103,11 @@ std::vector<Finding> Findings::Sorted() const {
       sorted.back().text += " (and " + std::to_string(known.more) + " more like this in the file)";
     }
   }
-  std::stable_sort(sorted.begin(), sorted.end(), [](const Finding& a, const Finding& b) {
-    return std::tie(a.path, a.line, a.column) < std::tie(b.path, b.line, b.column);
+  // What a misspelt header does not reach shows in many other lines.
+  const auto follows = [](const Finding& finding) { return finding.rule->name != "misspelt-section"; };
+  std::stable_sort(sorted.begin(), sorted.end(), [&](const Finding& a, const Finding& b) {
+    return std::tuple(follows(a), std::tie(a.path, a.line, a.column)) <
+           std::tuple(follows(b), std::tie(b.path, b.line, b.column));
   });
   return sorted;
 }
@@ -159,6 +173,9 @@ std::string Nearest(std::string_view name, std::span<const std::string> known) {
   std::string nearest;
   std::vector<std::size_t> row(name.size() + 1);
   for (const std::string& other : known) {
+    if (LoweredName(other) == LoweredName(name)) {
+      continue;
+    }
     const std::size_t difference =
         other.size() > name.size() ? other.size() - name.size() : name.size() - other.size();
     if (difference >= best) {

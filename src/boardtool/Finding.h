@@ -42,7 +42,8 @@ class Findings {
 
   void Add(std::string_view rule, std::string path, std::size_t line, std::size_t column, std::string text);
 
-  /// In the order of files, lines and columns. Where a rule found more in a file than are kept, the last says so.
+  /// In the order of files, lines and columns; misspelt sections first. Where a rule found more in a file than are
+  /// kept, the last says so.
   [[nodiscard]] std::vector<Finding> Sorted() const;
 
  private:
@@ -62,7 +63,8 @@ std::string FindingsJson(const std::vector<Finding>& findings);
 /// The Static Analysis Results Interchange Format, version 2.1.0.
 std::string FindingsSarif(const std::vector<Finding>& findings);
 
-/// The one of `known` that is closest to `name` by edits, when it is close enough to be meant; empty otherwise.
+/// The one of `known` that is closest to `name` by edits, when it is close enough to be meant and not
+/// `name` itself; empty otherwise.
 std::string Nearest(std::string_view name, std::span<const std::string> known);
 
 }  // namespace panelglow::boardtool

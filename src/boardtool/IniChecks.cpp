@@ -4,6 +4,9 @@
 #include <map>
 #include <utility>
 
+#include "board/ChipTable.h"
+#include "harness/base/CDMUtil.h"
+
 namespace panelglow::boardtool {
 
 namespace {
@@ -16,6 +19,18 @@ constexpr std::size_t kLongestValue = 254;
 std::size_t LineAt(const std::string& bytes, std::size_t at) {
   return 1 +
          static_cast<std::size_t>(std::count(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(at), '\n'));
+}
+
+// Whether a list goes on behind the ";" that ends its value: a comment begins with a word.
+bool GoesOnBehind(const IniEntry& entry, std::size_t comment) {
+  const std::string key = LoweredName(entry.key);
+  const bool hasChips = key == "chips";
+  if (comment == std::string::npos || (!hasChips && !key.ends_with("sequence") && !key.ends_with(".regs"))) {
+    return false;
+  }
+  const std::size_t begin = std::min(entry.value.find_first_not_of(" \t", comment + 1), entry.value.size());
+  const std::string next = entry.value.substr(begin, entry.value.find_first_of(" \t,:;", begin) - begin);
+  return hasChips ? ChipPlaceOf(LoweredName(next)) != kPlainChipPlace : CDMUtil::IsInteger(next);
 }
 
 }  // namespace
@@ -90,8 +105,11 @@ void CheckIniText(const IniOutline& file, bool keepsComments, Findings& findings
                    "only the first 254 of " + std::to_string(entry.value.size()) + " characters count");
     }
     const std::size_t comment = entry.value.find(';');
-    if (!keepsComments && comment != std::string::npos && comment > 0 &&
-        (entry.value[comment - 1] == ' ' || entry.value[comment - 1] == '\t')) {
+    if (!keepsComments && GoesOnBehind(entry, comment)) {
+      findings.Add("wrong-separator", file.path, entry.line, entry.valueColumn + comment,
+                   "\";\" begins a comment, so that nothing behind it counts: a list has commas");
+    } else if (!keepsComments && comment != std::string::npos && comment > 0 &&
+               (entry.value[comment - 1] == ' ' || entry.value[comment - 1] == '\t')) {
       findings.Add("comment-in-value", file.path, entry.line, entry.valueColumn + comment,
                    "the blank in front of \";\" is a part of the value: put the comment on a line of its own");
     }

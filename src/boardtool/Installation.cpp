@@ -1,6 +1,8 @@
 #include "boardtool/Installation.h"
 
+#include <filesystem>
 #include <set>
+#include <system_error>
 
 #include "platform/Host.h"
 
@@ -22,7 +24,17 @@ BoardFiles BoardFilesIn(const std::string& folder) {
   return {PathIn(folder, "mbdetect.ini"), PathIn(folder, "mbtest.ini"), PathIn(folder, "chip.ini")};
 }
 
+void RequireReadable(const BoardFiles& names) {
+  for (const std::string& path : {names.detectPath, names.testPath, names.chipPath}) {
+    std::error_code none;
+    if (!ReadFile(path) && std::filesystem::exists(path, none)) {
+      throw CannotRun(path + " is there and cannot be read, and is no file that may be missing");
+    }
+  }
+}
+
 std::vector<IniOutline> ReadBoardFiles(const BoardFiles& names) {
+  RequireReadable(names);
   std::vector<IniOutline> files;
   for (const std::string& path : {names.detectPath, names.testPath, names.chipPath}) {
     if (std::optional<std::string> bytes = ReadFile(path)) {

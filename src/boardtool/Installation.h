@@ -32,7 +32,10 @@ std::optional<std::string> ReadFile(const std::string& path);
 /// The names of the three board files in a folder.
 BoardFiles BoardFilesIn(const std::string& folder);
 
-/// Those of the board files that can be read. Throws CannotRun when none can.
+/// Throws CannotRun for a board file that is there and cannot be read: it would count as one without keys.
+void RequireReadable(const BoardFiles& names);
+
+/// Those of the board files that are there. Throws CannotRun when none is, or one cannot be read.
 std::vector<IniOutline> ReadBoardFiles(const BoardFiles& names);
 
 /// The sections of machines in the detection and test files, each once: all but [Common]. In the order of the files.

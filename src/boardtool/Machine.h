@@ -2,6 +2,7 @@
 // for this machine and the one for a simulated machine.
 #pragma once
 
+#include <cstddef>
 #include <functional>
 #include <optional>
 #include <string>
@@ -16,11 +17,18 @@ struct MachineOptions {
 /// True when the executable has a simulated machine; everything that it shows says so.
 bool IsSimulated();
 
+/// The executable's name, as people are told it.
+const char* ProgramName();
+
 /// To be called before the machine is used. Throws WrongCall for options that this executable has no use for.
 void UseMachine(const MachineOptions& options);
 
-/// What a person would see of a simulated machine's panel at this moment, as "power-green lit"; empty on a real one.
-std::string PanelNow();
+/// A moment in the life of a simulated machine's panel.
+std::size_t PanelMark();
+
+/// Which lamps a person would have seen moving on a simulated machine's panel since then, as "on the panel moves
+/// power-green"; empty on a real one.
+std::string PanelMoves(std::size_t mark);
 
 /// Lets a simulated machine take notice of what came from outside, as a signal, while somebody is waited for.
 void LetMachineNotice();

@@ -2,6 +2,8 @@
 
 #include <string>
 
+#include "boardtool/Machine.h"
+
 namespace panelglow::boardtool {
 
 namespace {
@@ -13,7 +15,7 @@ platform::Console* g_own = nullptr;  // the machine's, while the library's lines
 void Print(std::string_view text) { (g_own == nullptr ? platform::TheHost().console : *g_own).Write(text); }
 
 void Say(std::string_view sentence) {
-  platform::TheHost().console.WriteError("panelglow-board: " + std::string(sentence) + "\n");
+  platform::TheHost().console.WriteError(std::string(ProgramName()) + ": " + std::string(sentence) + "\n");
 }
 
 OwnOutput::OwnOutput(platform::Host& machine) : library_(machine.console) { g_own = &machine.console; }

@@ -27,6 +27,9 @@ bool WaitForNext(const Person& person, std::uint32_t wait_ms) {
   return true;
 }
 
+// Documents that follow one another are lines, so that a program can part them.
+JsonForm FormOf(const ReadOptions& options) { return options.watch ? JsonForm::kLine : JsonForm::kIndented; }
+
 // Reads and shows, once or again and again. Returns what the last reading did.
 int Show(const ReadOptions& options, const Person& person, std::uint32_t between_ms,
          const std::function<int()>& read) {
@@ -74,7 +77,7 @@ int Fans(const ReadOptions& options, const Person& person) {
   Say("reads the fans; one that the files say turns only with a duty is given it for as long as it is looked for.");
   const int code = Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<FanReadout> fans = ReadFans(machine.Board());
-    Print(options.json ? FansJson(fans) : FansText(fans));
+    Print(options.json ? FansJson(fans, FormOf(options)) : FansText(fans));
     return CodeOf(fans);
   });
   WriteLogs(
@@ -95,7 +98,7 @@ int Zones(const ReadOptions& options, const Person& person) {
   machine.Board().GetProbeRate(rate_s);
   const int code = Show(options, person, static_cast<std::uint32_t>(std::clamp(rate_s, 1, 3600)) * kSecond_ms, [&] {
     const std::vector<ZoneReadout> zones = ReadZones(machine.Board());
-    Print(options.json ? ZonesJson(zones) : ZonesText(zones));
+    Print(options.json ? ZonesJson(zones, FormOf(options)) : ZonesText(zones));
     return CodeOf(zones);
   });
   WriteLogs(
@@ -109,7 +112,7 @@ int Detect(const ReadOptions& options, const Person& person) {
   Say("reads lines; the latched bit of a button is cleared by reading it.");
   return Show(options, person, kBetweenReadings_ms, [&] {
     const std::vector<DeviceReadout> devices = ReadDevices(machine.Board());
-    Print(options.json ? DevicesJson(devices) : DevicesText(devices));
+    Print(options.json ? DevicesJson(devices, FormOf(options)) : DevicesText(devices));
     const bool isGood = std::none_of(devices.begin(), devices.end(),
                                      [](const DeviceReadout& device) { return device.status.starts_with("ERROR"); });
     return isGood ? 0 : 1;

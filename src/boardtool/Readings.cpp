@@ -11,7 +11,9 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-std::string Dump(const Json& json) { return json.dump(2, ' ', false, Json::error_handler_t::replace) + "\n"; }
+std::string Dump(const Json& json, JsonForm form) {
+  return json.dump(form == JsonForm::kLine ? -1 : 2, ' ', false, Json::error_handler_t::replace) + "\n";
+}
 
 std::string StateOf(const Fan& fan, int rpm) {
   if (!fan.tested || !fan.nominalTest) {
@@ -151,7 +153,7 @@ std::string DevicesText(const std::vector<DeviceReadout>& devices) {
   return devices.empty() ? "The files name no devices for this board.\n" : TableText(rows);
 }
 
-std::string FansJson(const std::vector<FanReadout>& fans) {
+std::string FansJson(const std::vector<FanReadout>& fans, JsonForm form) {
   Json json = Json::array();
   for (const FanReadout& fan : fans) {
     json.push_back({{"fan", fan.number},
@@ -163,10 +165,10 @@ std::string FansJson(const std::vector<FanReadout>& fans) {
                     {"max", fan.limits.max},
                     {"state", fan.state}});
   }
-  return Dump(json);
+  return Dump(json, form);
 }
 
-std::string ZonesJson(const std::vector<ZoneReadout>& zones) {
+std::string ZonesJson(const std::vector<ZoneReadout>& zones, JsonForm form) {
   Json json = Json::array();
   for (const ZoneReadout& zone : zones) {
     json.push_back({{"zone", zone.number},
@@ -178,15 +180,15 @@ std::string ZonesJson(const std::vector<ZoneReadout>& zones) {
                     {"cores", zone.cores},
                     {"state", zone.state}});
   }
-  return Dump(json);
+  return Dump(json, form);
 }
 
-std::string DevicesJson(const std::vector<DeviceReadout>& devices) {
+std::string DevicesJson(const std::vector<DeviceReadout>& devices, JsonForm form) {
   Json json = Json::array();
   for (const DeviceReadout& device : devices) {
     json.push_back({{"kind", device.kind}, {"name", device.name}, {"chip", device.chip}, {"status", device.status}});
   }
-  return Dump(json);
+  return Dump(json, form);
 }
 
 }  // namespace panelglow::boardtool

@@ -45,12 +45,15 @@ std::vector<ZoneReadout> ReadZones(MotherBoard& board);
 /// Looks for all devices, the hood's switch and lock and the buttons among them.
 std::vector<DeviceReadout> ReadDevices(MotherBoard& board);
 
+/// A document over several lines, or one in a line of its own as JSON Lines has it.
+enum class JsonForm { kIndented, kLine };
+
 // The same for people and for programs.
 std::string FansText(const std::vector<FanReadout>& fans);
 std::string ZonesText(const std::vector<ZoneReadout>& zones);
 std::string DevicesText(const std::vector<DeviceReadout>& devices);
-std::string FansJson(const std::vector<FanReadout>& fans);
-std::string ZonesJson(const std::vector<ZoneReadout>& zones);
-std::string DevicesJson(const std::vector<DeviceReadout>& devices);
+std::string FansJson(const std::vector<FanReadout>& fans, JsonForm form = JsonForm::kIndented);
+std::string ZonesJson(const std::vector<ZoneReadout>& zones, JsonForm form = JsonForm::kIndented);
+std::string DevicesJson(const std::vector<DeviceReadout>& devices, JsonForm form = JsonForm::kIndented);
 
 }  // namespace panelglow::boardtool

@@ -268,6 +268,7 @@ std::string ReportText(const Json& report) {
 }  // namespace
 
 int Report(const ReportOptions& options) {
+  RequireReadable(BoardFilesIn(options.folder));
   const Json report = ReportMaker(options).Make();
   Print(options.json ? report.dump(2, ' ', false, Json::error_handler_t::replace) + "\n" : ReportText(report));
   return report["complete"].get<bool>() ? 0 : 1;

@@ -10,12 +10,15 @@
 
 #include "board/MotherBoard.h"
 #include "board/base/BoardDevio.h"
+#include "board/parts/LedLineMap.h"
+#include "boardtool/BoardLed.h"
 #include "boardtool/BoardOnMachine.h"
 #include "boardtool/HardwareAccess.h"
 #include "boardtool/HostWith.h"
 #include "boardtool/Installation.h"
 #include "boardtool/MemoryFiles.h"
 #include "boardtool/Output.h"
+#include "boardtool/PresentSection.h"
 #include "boardtool/RecordedProfiles.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/HostInPlace.h"
@@ -67,23 +70,23 @@ std::pair<unsigned, unsigned> RangeOf(const std::string& text) {
 // A chip that the walk knows how to walk through.
 class Walk {
  public:
-  explicit Walk(const TryOptions& options) : options_(options), range_(RangeOf(options.range)) {
-    hasMasks_ = options.chip == "g_iospace" || options.chip == "g_memoryspace";
+  explicit Walk(const TryOptions& options)
+      : options_(options), hasMasks_(options.chip == "g_iospace" || options.chip == "g_memoryspace") {
     if (!hasMasks_ && options.chip != "g_ite" && options.chip != "g_it8702") {
       throw WrongCall(
           "the walk knows g_iospace and g_memoryspace with --at and --bits, g_ite and g_it8702 with --lines");
     }
-    if (hasMasks_ && (!CDMUtil::IsInteger(options.at) || range_.second >= kBits)) {
-      throw WrongCall("name the register with --at, as 0xA20, and bits of it, as 0-7");
+    if (hasMasks_ && !options.lines.empty()) {
+      throw WrongCall(options.chip + " has bits and no lines: name the register with --at, and its bits with --bits");
     }
-    constexpr std::int64_t kLastAddress = 0xFFFFFFFF;
-    if (hasMasks_ && (CDMUtil::ToInt64(options.at) < 0 || CDMUtil::ToInt64(options.at) > kLastAddress)) {
-      throw WrongCall("an address is 0 to 0xFFFFFFFF");
+    if (!hasMasks_ && (options.lines.empty() || !options.bits.empty() || !options.at.empty())) {
+      throw WrongCall(options.chip + " has lines: name them with --lines, as 20-27, and no register");
     }
-    at_ = CDMUtil::ToUnsignedLong(options.at);
-    constexpr std::uint32_t kLastPort = 0xFFFE;
-    if (options.chip == "g_iospace" && (at_ == 0 || at_ > kLastPort)) {
-      throw WrongCall("a port is 1 to 0xFFFE");
+    range_ = RangeOf(!hasMasks_ ? options.lines : options.bits.empty() ? std::string("0-7") : options.bits);
+    if (hasMasks_) {
+      CheckPlace();
+    } else if (constexpr unsigned kLastLine = 99; range_.second > kLastLine) {
+      throw WrongCall("the lines of a chip are 10 to 57");
     }
   }
 
@@ -102,7 +105,10 @@ class Walk {
   [[nodiscard]] Lines SettingsFor(unsigned number) const { return SettingsOf({{"power-green", number}}); }
 
   /// Settings that light all that was found, by LED.
-  [[nodiscard]] Lines SettingsOf(const std::map<std::string, unsigned>& found) const {
+  /// `isThere` knows keys that the machine's section has already.
+  [[nodiscard]] Lines SettingsOf(
+      const std::map<std::string, unsigned>& found,
+      const std::function<bool(const std::string&)>& isThere = [](const std::string&) { return false; }) const {
     Lines lines;
     const std::string chip = "chip." + options_.chip + ".";
     if (!hasMasks_) {
@@ -129,6 +135,9 @@ class Walk {
       const bool hasGreen = green != found.end();
       const unsigned mask = 1U << (hasGreen ? green : red)->second;
       const char* const other = hasGreen ? "powerled.red" : "powerled.green";
+      if (isThere(chip + other + ".assert.sequence")) {
+        return lines;  // an earlier walk found it
+      }
       lines.push_back(chip + other + ".assert.sequence=undef");
       lines.push_back(Sequence(chip, other, "deassert", ~mask & 0xFFU));
     }
@@ -150,7 +159,27 @@ class Walk {
     return [address = at_, byte] { BoardDevio().WritePhysicalMemory(address, 1, byte); };
   }
 
+  /// False for a line that the chip's map has no place for.
+  [[nodiscard]] bool Has(unsigned number) const {
+    return hasMasks_ || LedLineMap(static_cast<int>(number)) != kNoLedLineMap;
+  }
+
  private:
+  void CheckPlace() {
+    if (!CDMUtil::IsInteger(options_.at) || range_.second >= kBits) {
+      throw WrongCall("name the register with --at, as 0xA20, and bits of it, as 0-7");
+    }
+    constexpr std::int64_t kLastAddress = 0xFFFFFFFF;
+    if (CDMUtil::ToInt64(options_.at) < 0 || CDMUtil::ToInt64(options_.at) > kLastAddress) {
+      throw WrongCall("an address is 0 to 0xFFFFFFFF");
+    }
+    at_ = CDMUtil::ToUnsignedLong(options_.at);
+    constexpr std::uint32_t kLastPort = 0xFFFE;
+    if (options_.chip == "g_iospace" && (at_ == 0 || at_ > kLastPort)) {
+      throw WrongCall("a port is 1 to 0xFFFE");
+    }
+  }
+
   [[nodiscard]] std::string Sequence(const std::string& chip, std::string_view prefix, const char* kind,
                                      unsigned mask) const {
     return chip + std::string(prefix) + "." + kind + ".sequence=" + Hex(at_) + ":" + Hex(mask);
@@ -247,9 +276,10 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
                                      "platform", systemId);
   });
   if (board == nullptr) {
-    throw CannotRun("the board cannot be built: " + failure);
+    throw CannotRun("the board cannot be built" + (failure.empty() ? ": the files select none" : ": " + failure));
   }
   const KeptBoard kept(*board, walk.Kept());
+  std::size_t mark = PanelMark();
   Tell(walk.NameOf(number) + ": ");
   board->SavePowerLedState();
   if (walk.HasMasks()) {
@@ -257,6 +287,7 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
     if (!WaitSlowly()) {
       return std::nullopt;
     }
+    mark = PanelMark();  // what goes dark for good with the first step is no lamp of this bit
     board->DeassertPowerLed();
     if (!WaitSlowly()) {
       return std::nullopt;
@@ -265,14 +296,22 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
   } else if (!board->BlinkPowerLedGreen()) {
     throw CannotRun(
         "the chip does not blink: its section needs powerled.green.blink.sequence with primary_led in it");
+  } else {
+    mark = PanelMark();
+    if (!WaitSlowly() || !WaitSlowly()) {  // a period of the slowest blinker
+      return std::nullopt;
+    }
   }
-  if (const std::string panel = PanelNow(); !panel.empty()) {
+  if (const std::string panel = PanelMoves(mark); !panel.empty() && !options.isReplayed) {
     Tell(panel + "; ");
   }
   for (;;) {
     Tell("which lamp moved? ");
     const std::optional<std::string> answer = person.answer();
-    const std::string word = answer ? CDMUtil::ToLower(CDMUtil::Trim(*answer)) : "q";
+    std::string word = answer ? CDMUtil::ToLower(CDMUtil::Trim(*answer)) : "q";
+    if (const BoardLed* const led = FindBoardLed(word)) {
+      word = led->id;  // of its other colour's name, too
+    }
     if (word == "q" || word == "quit") {
       Tell("\n");
       return std::nullopt;
@@ -290,14 +329,12 @@ std::optional<std::string> Ask(const Walk& walk, const TryOptions& options, cons
   }
 }
 
-std::string Sections(const TryOptions& options, const std::string& systemId, const Walk& walk,
-                     const std::map<std::string, unsigned>& found) {
-  std::string text = "; mbdetect.ini\n[" + systemId + "]\nplatform=generic\nchips=" + options.chip + "\n" +
-                     Joined(walk.SettingsOf(found)) + "\n; mbtest.ini\n[" + systemId + "]\n";
+Lines TestLines(const TryOptions& options, const std::map<std::string, unsigned>& found) {
+  Lines lines;
   std::string last;
   for (const LedKeys& keys : kLedKeys) {
     if (found.contains(std::string(keys.led)) && keys.chipKey != last) {
-      text += std::string(keys.chipKey) + "=" + options.chip + "\n";
+      lines.push_back(std::string(keys.chipKey) + "=" + options.chip);
       last = keys.chipKey;
     }
   }
@@ -307,17 +344,46 @@ std::string Sections(const TryOptions& options, const std::string& systemId, con
                                                                      {"wireless", "test.wirelessled.support"}}};
   for (const auto& [led, key] : supports) {
     if (found.contains(led)) {
-      text += std::string(key) + "=yes\n";
+      lines.push_back(std::string(key) + "=yes");
     }
   }
-  return text;
+  return lines;
+}
+
+std::string Sections(const TryOptions& options, const std::string& systemId, const Walk& walk,
+                     const std::map<std::string, unsigned>& found) {
+  const BoardFiles names = BoardFilesIn(options.folder);
+  const PresentSection detect(names.detectPath, systemId);
+  const PresentSection test(names.testPath, systemId);
+  std::vector<std::string> chips;
+  CDMUtil::Split(detect.Value("chips"), chips, ", ");
+  if (std::find(chips.begin(), chips.end(), options.chip) == chips.end()) {
+    chips.push_back(options.chip);
+  }
+  std::string list;
+  for (const std::string& chip : chips) {
+    list += (list.empty() ? "" : ",") + chip;
+  }
+  Lines lines{"platform=generic", "chips=" + list};
+  const Lines settings = walk.SettingsOf(found, [&](const std::string& key) { return detect.IsThere(key); });
+  lines.insert(lines.end(), settings.begin(), settings.end());
+  return detect.With(lines, "mbdetect.ini") + "\n" + test.With(TestLines(options, found), "mbtest.ini");
+}
+
+// The sections are found by it.
+std::string CheckedId(const std::string& systemId) {
+  constexpr std::size_t kDigits = 4;
+  if (systemId.size() != kDigits || systemId.find_first_not_of("0123456789ABCDEFabcdef") != std::string::npos) {
+    throw WrongCall("\"" + systemId + "\" is no system id: one has four hexadecimal digits, as 7D10");
+  }
+  return systemId;
 }
 
 }  // namespace
 
 int Try(const TryOptions& options, const Person& person) {
   const Walk walk(options);
-  const std::string systemId = options.systemId.empty() ? MachineId() : options.systemId;
+  const std::string systemId = options.systemId.empty() ? MachineId() : CheckedId(options.systemId);
   if (systemId.empty()) {
     throw CannotRun("the firmware tells no system id: give one with --board");
   }
@@ -333,8 +399,15 @@ int Try(const TryOptions& options, const Person& person) {
        (walk.HasMasks() ? "power-green, power-red, charge-white, charge-red, drive-red, wireless"
                         : "power-green, power-red") +
        "\n");
+  if (options.isReplayed && IsSimulated()) {
+    Tell("A trace has no panel, so that nothing can be shown of it.\n");
+  }
   std::map<std::string, unsigned> found;
   for (unsigned number = first; number <= last && !StopRequest::IsMade(); ++number) {
+    if (!walk.Has(number)) {
+      Tell(walk.NameOf(number) + ": the chip has no such line\n");
+      continue;
+    }
     const std::optional<std::string> lamp = Ask(walk, options, systemId, number, person);
     if (!lamp) {
       break;

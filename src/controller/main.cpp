@@ -26,6 +26,7 @@ namespace {
 using namespace panelglow::controller;
 namespace sim = panelglow::platform::sim;
 
+constexpr int kFailed = 1;
 constexpr int kWrongCall = 2;
 constexpr int kRunImpossible = 3;
 constexpr std::size_t kStripColumns = 64;
@@ -272,13 +273,16 @@ int RunCommandLine(int argc, char** argv) {
       "Runs panelglow-diags on a simulated machine with a simulated operator, follows it as a controller does, and "
       "shows "
       "the front panel's time line and the verdict. Run it in the folder of an installation.\n"
-      "Exits with the program's code (0 passed, 1 failed); 2: a wrong call; 3: a run that could not be made."};
+      "Exits with the program's code (0 passed, 1 failed, also when the output could not be written); 2: a wrong "
+      "call; 3: a run that could not be made."};
   app.name("panelglow-sim");
   app.add_option("--machine", options.machine, "the machine's file, as machines/notebook.toml")->required();
   app.add_option("--operator", options.person,
                  "who sits there: " + sim::Operator::PolicyNames() +
                      " (some take a number: wrong:2, slow:10); perfect, or with --window nobody but you");
-  app.add_option("--seed", options.seed, "another seed is another order of LEDs and events")->capture_default_str();
+  app.add_option("--seed", options.seed, "another seed is another order of LEDs and events")
+      ->capture_default_str()
+      ->check(CLI::NonNegativeNumber);
   app.add_option("--fault", options.faults,
                  "LED=KIND, repeatable; kinds: " + sim::LedFaultNames() + " (swapped:OTHER, shorted:OTHER)")
       ->allow_extra_args(false);
@@ -300,7 +304,10 @@ int RunCommandLine(int argc, char** argv) {
   if (options.person.empty() && !options.window) {
     options.person = "perfect";
   }
-  return Run(options);
+  const int code = Run(options);
+  std::cout.flush();
+  // A verdict that nobody could read is none.
+  return std::cout ? code : Complain(kFailed, "standard output did not take everything, and the verdict may be lost");
 }
 
 }  // namespace

@@ -142,22 +142,22 @@ constexpr const char* kController =
 TEST(IchChip, ADashCableIsALineThatFollowsTheControllersPin) {
   const char* const ids = "0x14E4 0x1653  0x103C 0x3033";
   const auto detect = [](int line, const char* idList) {
-    return [=](Chip& chip) { return int{chip.DetectDashCable(line, idList)}; };
+    return [=](Chip& chip) { return chip.ReadDashCable(line, idList); };
   };
   struct Row {
     std::vector<std::uint8_t> levels;
     int answer;
   };
-  for (const Row& row : {Row{{0x00, 0x01}, 1}, Row{{0x00, 0x00}, 0}, Row{{0x01, 0x01}, 0}}) {
+  for (const Row& row : {Row{{0x00, 0x01}, 3}, Row{{0x00, 0x00}, 4}, Row{{0x01, 0x01}, 4}}) {
     AnsweringBench bench(Answers{{0xFA0C, row.levels}, {0xFA0D, {0}}, {0xFA0E, {0}}, {0xFA0F, {0}}}, "", true,
                          kController);
     const std::vector<std::uint8_t> before{0x00, 0x08, 0x01, 0x00};
     bench.machine.Hardware().LoadMemory(0xF00000B8, before);
     IchChip chip;
-    EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(detect(-1, ids)(chip) + detect(96, ids)(chip), 0); }), "");
+    EXPECT_EQ(bench.Traffic([&] { EXPECT_EQ(detect(-1, ids)(chip) + detect(96, ids)(chip), -2); }), "");
     for (const char* const wrong : {"", "1 2 3", "0x14E4 0x1653 0x103C", "x 0x1653 0x103C 0x3033", "1 2 3 4",
                                     "0x114E4 0x1653 0x103C 0x3033", "1 2 3 4 5"}) {
-      EXPECT_EQ(detect(0, wrong)(chip), 0) << wrong;
+      EXPECT_EQ(detect(0, wrong)(chip), -1) << wrong;
     }
     const std::string traffic = bench.Traffic([&] { EXPECT_EQ(detect(0, ids)(chip), row.answer); });
     const auto level = [](std::uint8_t bit) { return std::string("FA0C->0000000") + (bit != 0 ? "1 " : "0 "); };

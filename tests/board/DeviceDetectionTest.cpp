@@ -55,6 +55,10 @@ TEST(DeviceDetection, EachKindIsLookedForByItsKeys) {
       {DeviceKind::kDashCable, "@dashcable.name=N\n@dashcable.chip=a\n@dashcable.gpio=5\n@dashcable.pciid=1 2 3 4\n",
        "N=true "},
       {DeviceKind::kDashCable, "@dashcable.name=N\n@dashcable.chip=a\n@dashcable.gpio=6\n", "N=false "},
+      {DeviceKind::kDashCable,
+       "@dashcable.name=N\n@dashcable.chip=a\n@dashcable.gpio=7\n@dashcable.reversedlogic=yes\n", kFailed},
+      {DeviceKind::kRiser, "@riser.name=N\n@riser.chip=a\n@riser.reg=4\n", kFailed},
+      {DeviceKind::kRiser, "@riser.name=N\n@riser.chip=unknown\n@riser.reg=4\n@riser.reg.value=0\n", kFailed},
       {DeviceKind::kRiser, "@riser.name=N\n@riser.chip=a\n@riser.reg=3\n@riser.reg.value=0x42\n", "N=true "},
       {DeviceKind::kRiser, "@riser.name=N\n@riser.chip=a\n@riser.reg=4\n@riser.reg.value=0x42\n", "N=false "},
       {DeviceKind::kInternalSpeaker, "@internalspeaker.is_present=yes\n", "internal speaker=unknown "},
@@ -82,7 +86,8 @@ TEST(DeviceDetection, SaysWhatAPlaceLacksAndPassesOnWhatItHas) {
   SetBench bench(
       "detect.jumper.1.name=J\ndetect.jumper.1.gpio.bit=8\ndetect.security.1.name=S\n"
       "detect.security.1.gpio.offset=8\ndetect.security.2.name=T\ndetect.security.2.chip=a\n"
-      "detect.security.2.gpio.offset=0xFFFFFFFF\ndetect.security.2.gpio.bit=3\ndetect.security.2.gpio.clearbit=5\n");
+      "detect.security.2.gpio.offset=0xFFFFFFFF\ndetect.security.2.gpio.bit=3\ndetect.security.2.gpio.clearbit=5\n"
+      "detect.riser.name=R\ndetect.riser.reg=3\ndetect.hoodswitch.gpio.offset=8\n");
   DeviceDetection devices(bench.Finder());
   devices.Detect(DeviceKind::kJumpers);
   devices.Detect(DeviceKind::kSecurityDevices);
@@ -90,6 +95,11 @@ TEST(DeviceDetection, SaysWhatAPlaceLacksAndPassesOnWhatItHas) {
             "LogMessage 14 8 \"Jumper: Missing GPIO offset/bit information\" \"\"\n"
             "LogMessage 14 8 \"Security Devices: Missing GPIO offset/bit information\" \"\"\n");
   EXPECT_EQ(bench.Notes(), "a:bit 4294967295.3/5 ");
+  devices.Detect(DeviceKind::kRiser);
+  HoodSwitch(bench.Finder()).Load();
+  EXPECT_THAT(bench.bench.machine.Errors(), HasSubstr("riser.reg\": it counts only with \"detect.riser.reg.value\""));
+  EXPECT_THAT(bench.bench.machine.Errors(),
+              HasSubstr("offset\": it counts only with \"detect.hoodswitch.gpio.bit\""));
 }
 
 TEST(HoodSwitch, IsReadAsALineAndAsALatch) {
@@ -100,7 +110,7 @@ TEST(HoodSwitch, IsReadAsALineAndAsALatch) {
     const char* notes;
   };
   const Case kCases[] = {
-      {"", "none", "none", ""},
+      {"detect.hoodswitch.gpio=-1\ntest.hoodswitch.gpio=-1\n", "none", "none", ""},
       {"detect.hoodswitch.gpio=1\n", "true", "none", "ich:line 1 "},
       {"detect.hoodswitch.gpio=1\ndetect.hoodswitch.reversedlogic=yes\n", "false", "none", "ich:line 1 "},
       {"detect.hoodswitch.gpio=7\n", "none", "none", "ich:line 7 "},
@@ -124,6 +134,7 @@ TEST(HoodSwitch, IsReadAsALineAndAsALatch) {
     const auto word = [&](bool done) { return std::string(!done ? "none" : value ? "true" : "false"); };
     EXPECT_EQ(word(hood.Read(value)), c.line);
     EXPECT_EQ(word(hood.ReadLatch(true, value)), c.latch);
+    EXPECT_EQ(bench.bench.machine.Errors(), "");
     EXPECT_EQ(bench.Notes(), c.notes);
   }
 }
@@ -140,11 +151,13 @@ TEST(HoodLock, MovesOnlyALockThatWasFoundAndCanBeUndone) {
   const std::string kAll = there + lines;
   const std::string kUnchecked = kAll + "test.hoodlock.check=no\ntest.hoodlock.chip=b\n";
   const std::string kAbsent = kAll + "detect.hoodlock.reversedlogic=yes\n";
-  const std::string kOneWay = there + "test.hoodlock.gpio.lock=4\n";
+  const std::string kNowhere = lines + "detect.hoodlock.gpio=-1\n";
+  const std::string kOneWay = there + "test.hoodlock.gpio.lock=4\ntest.hoodlock.gpio.unlock=-1\n";
   const Case kCases[] = {{lines.c_str(), 0, 0, ""},
                          {kAll.c_str(), 1, 1, "ich:line 1 ich:lock 4! ich:unlock 5! "},
                          {kUnchecked.c_str(), 1, 1, "ich:line 1 b:lock 4 b:unlock 5 "},
                          {kAbsent.c_str(), 0, 0, "ich:line 1 "},
+                         {kNowhere.c_str(), 0, 0, ""},
                          {kOneWay.c_str(), -256, -256, "ich:line 1 "}};
   for (const Case& c : kCases) {
     SCOPED_TRACE(c.keys);

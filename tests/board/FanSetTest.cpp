@@ -12,6 +12,7 @@ namespace panelglow {
 namespace {
 
 using ::testing::ElementsAre;
+using ::testing::EndsWith;
 using ::testing::HasSubstr;
 
 constexpr const char* kFans =
@@ -94,10 +95,14 @@ TEST(FanSet, EachOperationAsksTheChipsOfTheFansUnderTest) {
   EXPECT_EQ(bench.bench.machine.Time().Now() - start, 750'000U);
   fans.ReleaseControl();
   EXPECT_EQ(bench.Notes(), "b:keep 7 b:take 7 b:give 7 ");
+  SetBench readers("detect.fan.1.name=F\ndetect.fan.1.tach.chip=a\n");
+  FanSet undriven = Loaded(readers);
+  undriven.SetManualMode(true);
+  EXPECT_EQ(readers.Notes(), "");
 }
 
 TEST(FanSet, ABrokenChipDoesNotKeepTheOthersFromBeingGivenBack) {
-  SetBench bench(std::string(kFans) + "detect.fan.1.tach.index=9\n");
+  SetBench bench(kFans);
   FanSet fans = Loaded(bench);
   bench["a"].breaks = true;
   EXPECT_THROW(fans.RestoreStates(), mblib_exception);
@@ -124,47 +129,63 @@ TEST(FanSet, ReadingsGoIntoTheirColumn) {
   EXPECT_THAT(fans.Find(4)->readings, ElementsAre(-1, -1, -1));
   EXPECT_THAT(fans.Find(5)->readings, ElementsAre(99, -1, 99));
   EXPECT_EQ(fans.Find(1)->readingTime.size(), 15U);
+  bench["a"].breaks = true;
+  EXPECT_THROW(fans.ReadOne(5), mblib_exception);
+  EXPECT_THAT(fans.Find(5)->readings, ElementsAre(-1, -1, 99));
 }
 
 TEST(FanSet, WaitsForAsLongAsTheFilesSay) {
-  const std::pair<const char*, std::uint64_t> kCases[] = {{"", 5000},
-                                                          {"test.fans.stabilizationwait=3\n", 3000},
-                                                          {"test.fans.stabilizationwait=0\n", 0},
-                                                          {"test.fans.stabilizationwait=-4\n", 0}};
-  for (const auto& [text, wait_ms] : kCases) {
+  const std::tuple<const char*, std::uint64_t, const char*> kCases[] = {
+      {"", 5000, ""},
+      {"test.fans.stabilizationwait=3\n", 3000, ""},
+      {"test.fans.stabilizationwait=0\n", 0, ""},
+      {"test.fans.stabilizationwait=-4\n", 0, "wait\": -4 seconds are no wait"}};
+  for (const auto& [text, wait_ms, told] : kCases) {
     SetBench bench(text);
     const FanSet fans = Loaded(bench);
     const auto start = bench.bench.machine.Time().Now();
     fans.Wait();
     EXPECT_EQ((bench.bench.machine.Time().Now() - start) / 1000, wait_ms) << text;
+    EXPECT_THAT(bench.bench.machine.Errors(), HasSubstr(told));
   }
 }
 
 // By a line, turned over or not; without one by what turns, also when it needs a duty for that; one that cannot be
 // asked hides nothing.
 TEST(FanSet, LooksWhichFansArePluggedIn) {
+  const std::pair<std::vector<const char*>, const char*> kFansAndStates[] = {
+      {{"gpio=1"}, "true"},
+      {{"gpio=2"}, "false"},
+      {{"tach.index=4"}, "true"},
+      {{"gpio=3"}, "ERROR: device detection failed"},
+      {{"tach.index=0"}, "false"},
+      {{"tach.index=9"}, "ERROR: device detection failed"},
+      {{"gpio=1", "gpio.reversedlogic=yes"}, "false"},
+      {{"tach.index=3", "pwm.apply=yes"}, "true"}};
   std::string text;
-  const char* const kKeys[] = {
-      "gpio=1\n", "gpio=2\n", "gpio=3\n",       "gpio=1\n",
-      "",         "",         "tach.index=9\n", "tach.index=3\ndetect.fan.8.pwm.apply=yes\n"};
-  for (int n = 1; n <= 8; ++n) {
-    const std::string fan = "detect.fan." + std::to_string(n) + ".";
-    text.append(fan).append("name=F\n").append(fan).append("tach.chip=a\n").append(fan).append("gpio.chip=a\n");
-    text.append(fan).append("pwm.chip=a\n").append(kKeys[n - 1][0] == '\0' ? "pwm.index=5\n" : fan + kKeys[n - 1]);
+  int n = 0;
+  for (const auto& [keys, unused] : kFansAndStates) {
+    const std::string prefix = "detect.fan." + std::to_string(++n) + ".";
+    text += prefix + "name=F\n" + prefix + "tach.chip=a\n" + prefix + "gpio.chip=a\n" + prefix + "pwm.chip=a\n";
+    for (const char* const key : keys) {
+      text += prefix + key + "\n";
+    }
   }
-  SetBench bench(text + "detect.fan.4.gpio.reversedlogic=yes\ndetect.fan.5.tach.index=4\ntest.fans.pwm=no\n");
+  SetBench bench(text);
   FanSet fans = Loaded(bench);
   bench["a"].lines = {{1, 3}, {2, 4}};
   bench["a"].speeds = {{3, 700}, {4, 900}};
+  const auto start = bench.bench.machine.Time().Now();
   EXPECT_TRUE(fans.Detect());
-  std::string found;
-  for (const Fan& fan : fans.List()) {
-    found += fan.detectionStatus + ", ";
+  EXPECT_EQ(bench.bench.machine.Time().Now() - start, 5'000'000U);
+  for (int i = 0; i < n; ++i) {
+    EXPECT_EQ(fans.Find(i + 1)->detectionStatus, kFansAndStates[i].second) << i;
   }
-  EXPECT_EQ(
-      found,
-      "true, false, ERROR: device detection failed, false, true, false, ERROR: device detection failed, true, ");
-  EXPECT_THAT(bench.Notes(), HasSubstr("a:manual a:100% 0 a:rpm 4x1 a:rpm 0x1 a:rpm 9x1 a:rpm 3x1 a:automatic "));
+  const std::string asked = "a:100% 0 a:rpm 4x1 a:rpm 0x1 a:rpm 9x1 a:rpm 3x1 ";
+  EXPECT_THAT(bench.Notes(), EndsWith("a:manual " + asked + "a:automatic "));
+  fans.SetManualMode(true);
+  fans.Detect();
+  EXPECT_THAT(bench.Notes(), EndsWith("line 1 " + asked));  // who had the fans has them still
 }
 
 TEST(FanSet, GroupsHoldFansThatThereAre) {
@@ -175,6 +196,8 @@ TEST(FanSet, GroupsHoldFansThatThereAre) {
   ASSERT_EQ(fans.Groups().size(), 2U);
   EXPECT_THAT(fans.Groups()[0].fans, ElementsAre(1, 5));
   EXPECT_THAT(bench.bench.machine.Errors(), HasSubstr("there is no fan 2"));
+  fans.Load();
+  EXPECT_TRUE(fans.Groups().empty());
 }
 
 TEST(FanReport, SaysOfEachTestWhetherItsLimitsHold) {
@@ -193,8 +216,8 @@ TEST(FanReport, SaysOfEachTestWhetherItsLimitsHold) {
   };
   const std::string log = text(FanLogForm::kPlain);
   EXPECT_THAT(log, ::testing::StartsWith(std::string(52, '*') + "\nHalcyon Fan Speed Test 2024"));
-  EXPECT_THAT(log, ::testing::EndsWith(
-                       "TestGroup=All\nNumberOfFans=1\nfanName=CPU\nNominalMin=100\nNominalMax=200\nNominalAct=99\n"
+  EXPECT_THAT(log,
+              EndsWith("TestGroup=All\nNumberOfFans=1\nfanName=CPU\nNominalMin=100\nNominalMax=200\nNominalAct=99\n"
                        "NominalErr=LessThanMin\nFullMinLimit=300\nFullMaxLimit=400\nFullMinAct=401\n"
                        "FullMinErr=GreaterThanMax\nPWMSpeedMin=9\nPWMSpeedMax=99999\nPWMSpeedAct=50\n"
                        "PWMSpeedErr=NotTested\n" +

@@ -252,9 +252,11 @@ const KeyRow kKeys[] = {
      kFin + kFinSelect + Under("chip.fin_f8000.", kFinOwn + " multifunction_select3_register.gpios15_16")},
     {"fin_f71858", kFin + Under("chip.fin_f71858.", kFinOwn)},
     {"fin_f71855", kFin + Under("chip.fin_f71855.", kFinOwn)},
+    // Its colours are lists of writes, which a board can replace.
     {"fin_f71863", kFin + kFinSelect + "test.powerled.primary.data_blink test.powerled.secondary.data_blink"},
     {"fin_f71808a", kFin + Under("chip.fin_f71808a.", kFinOwn)},
     {"fin_f71808e", kFin + Under("chip.fin_f71858.", kFinOwn) + Under("chip.fin_f71808e.", kFinOwn)},
+    // Built on "ich", with a power management block and a GPIO block of its own.
     {"hudson", kIch + Under("chip.hudson.", "pmbar gpiobar indirectioaddr")},
     {"intelc200", Under("chip.intelc200.", "rcrbbar spibar")},
     {"ich", kIch + "chip.ich.pmbar"},

@@ -18,7 +18,7 @@ class NotedChip : public Chip {
 
   bool ReadFanRpm(int fan, int& rpm, int multiplier) override {
     Note("rpm " + std::to_string(fan) + "x" + std::to_string(multiplier));
-    if (fan > 8) {
+    if (fan > 8 || breaks) {
       throw mblib_exception("no fan " + std::to_string(fan));
     }
     rpm = speeds.count(fan) == 0 ? 0 : speeds[fan];
@@ -32,7 +32,10 @@ class NotedChip : public Chip {
     }
     return true;
   }
-  bool SetManualFanMode(bool on) override { return Note(on ? "manual" : "automatic"); }
+  bool SetManualFanMode(bool on) override {
+    manualFanMode = on;
+    return Note(on ? "manual" : "automatic");
+  }
   bool SetFanFullSpeed(int fan) override { return Note("full " + std::to_string(fan)); }
   bool SetFanPwmPercent(int fan, int percent) override {
     return Note(std::to_string(percent) + "% " + std::to_string(fan));
@@ -51,6 +54,7 @@ class NotedChip : public Chip {
   [[nodiscard]] std::vector<int> GetCoreTemperatures() const override { return cores; }
   bool ReadThreshold(int /*zone*/, int& value) override { return Take(threshold, value); }
   bool ReadLowLimitTemperature(int /*zone*/, int& value) override { return Take(lowLimit, value); }
+  int MapTemperature(int raw) override { return raw == 0x80 ? 300 : raw; }
   int CountCards() override { return 2; }
   bool ReadEnvironmentRegister(std::uint16_t reg, std::uint8_t& value) override {
     value = static_cast<std::uint8_t>(environment);
@@ -69,8 +73,9 @@ class NotedChip : public Chip {
     value = lines.count(line) == 0 ? -1 : lines[line];
     return value != -1;
   }
-  bool DetectDashCable(int line, const std::string& idList) override {
-    return Note("dash " + std::to_string(line) + " " + idList) && line == 5;
+  int ReadDashCable(int line, const std::string& idList) override {
+    Note("dash " + std::to_string(line) + " " + idList);
+    return line == 5 || line == 6 ? LineState(line == 5) : kNoSuchLine;
   }
   int ReadRegister(int reg) override { return reg == 3 ? 0x42 : 0; }
   bool ReadConfigBit(std::uint8_t ldn, std::uint8_t reg, int bit, bool& value) override {
@@ -110,6 +115,9 @@ class NotedChip : public Chip {
   }
   bool Temperature(const std::string& how, int zone, int& value) {
     Note(how + " " + std::to_string(zone));
+    if (breaks) {
+      throw mblib_exception(name + " broke");
+    }
     if (readings.empty()) {
       return false;
     }

@@ -168,7 +168,7 @@ registers = { 0 = 0x01668086, 8 = 0x03000000 }
   {
     TemperatureBench bench("libraries = ['atiadlxy.dll', 'NVAPI.dll']\n" + kCards, table);
     VideoChip chip;
-    ASSERT_EQ(chip.CountCards(), 4U);
+    ASSERT_EQ(chip.CountCards(), 4);
     const int kNone = -7;
     const int kExpected[][4] = {// zone, temperature, upper and lower limit
                                 {0, 40, kNone, kNone},    {1, 55, 95, kNone},       {2, 41, 90, 5},
@@ -194,7 +194,7 @@ registers = { 0 = 0x01668086, 8 = 0x03000000 }
   EXPECT_FALSE(chip.ReadTemperature(1, value));
   EXPECT_THAT(bare.machine.Errors(), ::testing::AllOf(HasSubstr("nvapi.dll cannot"), HasSubstr("nor atiadlxy.dll")));
   TemperatureBench none("", "");
-  EXPECT_EQ(VideoChip().CountCards(), 0U);
+  EXPECT_EQ(VideoChip().CountCards(), 0);
   EXPECT_THAT(none.machine.Output(),
               HasSubstr("No Video Card information found in the System !!!! WMI Query Failed."));
 }

@@ -11,6 +11,7 @@
 namespace panelglow {
 namespace {
 
+using ::testing::AnyOf;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ::testing::Not;
@@ -58,8 +59,9 @@ TEST(ZoneSet, EachChipIsReadInItsWay) {
   }
   SetBench bench(Zone("chip=a"));
   ZoneSet zones = Loaded(bench);
-  bench["a"].readings = {44};
+  bench["a"].readings = {44, 0x80};
   EXPECT_EQ(zones.Read(1), 44);
+  EXPECT_EQ(zones.Read(1), 300);  // as the chip maps it
   EXPECT_EQ(zones.Find(1)->readingTime.size(), 15U);
 }
 
@@ -83,12 +85,17 @@ TEST(ZoneSet, TheLimitIsTheFirstThatTheFilesGive) {
       {"threshold.delta=2\nthreshold.adj=10", -1, 50, 62, kNoLimit},
       {"threshold.delta=2", -1, -1, kNoLimit, kNoLimit},
       {"threshold.tjmax.delta=-2147483648", 100, -1, 2147483647, kNoLimit},
+      {"index=0", 95, 7, 95, 7},  // of a graphics card from here
+      {"index=allcards", 95, 7, 95, 7},
+      {"index=0\nthreshold.delta=-4\nthreshold.low=3", 95, 7, 91, 3},
+      {"index=allcards\nthreshold.delta=-4\nthreshold.low=3", 95, 7, 91, 3},
   };
   for (const Case& c : kCases) {
     SCOPED_TRACE(c.keys);
-    SetBench bench(Zone(std::string("chip=a\n") + c.keys));
-    bench["a"].threshold = c.threshold;
-    bench["a"].lowLimit = c.lowLimit;
+    const std::string chip = std::string(c.keys).starts_with("index") ? "videochip" : "a";
+    SetBench bench(Zone("chip=" + chip + "\n" + c.keys));
+    bench[chip].threshold = c.threshold;
+    bench[chip].lowLimit = c.lowLimit;
     ZoneSet zones = Loaded(bench);
     EXPECT_EQ(zones.GetHigh(1), c.high);
     EXPECT_EQ(zones.GetLow(1), c.low);
@@ -108,6 +115,26 @@ TEST(ZoneSet, TellsWhatItMakesOfTheProcessorsOwnLimit) {
     lines += std::string("LogMessage 14 8 \"") + line + "\" \"\"\n";
   }
   EXPECT_EQ(bench.bench.machine.Output(), lines);
+}
+
+TEST(ZoneSet, TellsOfKeysThatItCannotUse) {
+  const std::pair<std::string, const char*> kCases[] = {
+      {Zone(""), "no chip \"sio\", which counts without the key \"test.tempcaution.chip\""},
+      {Zone("") + "test.tempcaution.chip=soi\n", "key \"test.tempcaution.chip\": the board has no chip \"soi\""},
+      {Zone("prochot.chip=soi"), "prochot.chip\": the board has no chip \"soi\""},
+      {Zone("prochot.offset=0x10000"), "prochot.offset\": there is no register 0x10000"},
+      {Zone("prochot.threshold.low.bit=x"), "low.bit\": \"x\" is no number and counts as 0"},
+      {Zone("prochot.threshold.high.bit=8"), "high.bit\": a byte has no bit 8"},
+      {Zone("threshold.tjmax.delta=8"),
+       "no limit by \"test.tempcaution.zone.1.threshold.tjmax.delta\": what the chip \"sio\""},
+  };
+  for (const auto& [keys, told] : kCases) {
+    const SetBench bench(keys);
+    Chip plain;
+    ZoneSet zones([&](const std::string& /*name*/) -> Chip& { return plain; });
+    zones.Load();
+    EXPECT_THAT(bench.bench.machine.Errors(), HasSubstr(told));
+  }
 }
 
 struct Step {
@@ -216,11 +243,15 @@ TEST(ZoneSet, AKeyForAllCardsIsAZoneForEach) {
   EXPECT_EQ(zones.Find(2)->name + zones.Find(3)->name, "Z1 2Z2");
   EXPECT_EQ(zones.Find(2)->index, 1);
   EXPECT_EQ(zones.GetHigh(2), 88);
-  EXPECT_EQ(zones.GetLow(2), 7);  // the chip's, as the files have none
   EXPECT_TRUE(zones.LoadGroups());
   EXPECT_THAT(zones.Groups().at(0).zones, ElementsAre(3, 1, 2));
+  zones.Load();
+  EXPECT_TRUE(zones.Groups().empty());
   for (const char* bad : {"", "3", "0", "1,x", "-1"}) {
-    SetBench broken(Zone("chip=a") + "test.tempzones.group.1.name=G\ntest.tempzones.group.1.zones=" + bad + "\n");
+    SetBench broken(Zone("chip=a") +
+                    "test.tempzones.group.1.name=Good\ntest.tempzones.group.1.zones=1\n"
+                    "test.tempzones.group.2.name=G\ntest.tempzones.group.2.zones=" +
+                    bad + "\n");
     ZoneSet none = Loaded(broken);
     try {
       none.LoadGroups();
@@ -228,6 +259,7 @@ TEST(ZoneSet, AKeyForAllCardsIsAZoneForEach) {
     } catch (const mblib_exception& refused) {
       EXPECT_STREQ(refused.what(), "Missing or invalid Zone Group information");
     }
+    EXPECT_TRUE(none.Groups().empty());
   }
 }
 
@@ -258,13 +290,16 @@ TEST(ZoneReport, SaysHowEachZoneStands) {
     ProbeSettings patient;
     patient.consecutiveHigh = patient.consecutiveLow = 2;
     EXPECT_THAT(ZoneStatus(*zones.Find(1), patient), Not(HasSubstr("rTempErr")));
+    bench[zones.Find(1)->chip].breaks = true;
+    EXPECT_THROW(zones.Check(1, check), mblib_exception);
+    EXPECT_THAT(ZoneStatus(*zones.Find(1), patient), AnyOf("SIOErr", "IniIndexErr"));  // not the one before
     zones.SetSkipped(1, true);
     EXPECT_EQ(ZoneStatus(*zones.Find(1), zones.Probe()), "NotTested");
   }
 }
 
 TEST(ZoneReport, WritesTextAndXml) {
-  SetBench bench(Zone("chip=acpi\ncpu.core=true\nthreshold.tjmax.delta=8") + Zone("chip=a", 2) +
+  SetBench bench(Zone("chip=acpi\ncpu.core=true\nthreshold.tjmax.delta=8") + Zone("chip=a\nthreshold.delta=1", 2) +
                  "test.tempcaution.proberate=7\ntest.tempcaution.retriesoninvalidtemp=4\n");
   bench["acpi"].threshold = 100;
   ZoneSet zones = Loaded(bench);
@@ -272,6 +307,7 @@ TEST(ZoneReport, WritesTextAndXml) {
   bench["acpi"].cores = {38, 42};
   ZoneCheck check;
   zones.Check(1, check);
+  bench["a"].threshold = 50;  // not asked for a log
   std::string text;
   WriteZoneLog([&](const std::string& line) { text += line + "\n"; }, zones);
   EXPECT_THAT(text, ::testing::StartsWith(std::string(59, '*') + "\nHalcyon Temp Caution Test started:2024"));

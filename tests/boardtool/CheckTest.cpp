@@ -112,6 +112,14 @@ const BrokenCase kBroken[] = {
     {"chip.ini", "[lpc]\n", "[lpc]\nbase=g_fintek\n", "error: the chain of base sections comes back to [g_fintek]"},
     {"mbdetect.ini", "chips=g_fintek", "chips=g_ec",
      "mbdetect.ini:5:10: error: [7C20] cannot be built: chip.ini missing mandatory entry for EC: ec.set_pwm.cmd"},
+    {"mbdetect.ini", "chips=g_iospace", "chips=g_sio;g_iospace",
+     "mbdetect.ini:3:12: error: \";\" begins a comment, so that nothing behind it counts: a list has commas"},
+    {"chip.ini", "0xA28:0xF7", "0xA28:0xF7;0xA29:0xF7", "chip.ini:7:39: error: \";\" begins a comment"},
+    {"chip.ini", "[g_fintek]", "[g_fintec]",
+     "chip.ini:13:1: warning: no board of the files uses section [g_fintec]; is [g_fintek] meant? "
+     "[misspelt-section]"},
+    {"mbdetect.ini", "[7C20]", "[7C2O]",
+     "mbtest.ini:5:1: warning: no file selects a board for [7C20] by \"platform\"; is [7C2O] meant?"},
     // values
     {"chip.ini", "powerled.ldn=0x0A", "powerled.ldn=A", "chip.ini:19:14: error: \"A\" is no number and counts as 0"},
     {"chip.ini", "config.index.port=0x4E", "config.index.port=0x4E4E4",
@@ -126,10 +134,32 @@ const BrokenCase kBroken[] = {
     // LEDs
     {"chip.ini", "hdled.red.deassert.sequence=0xA28:0xF7\n", "",
      "mbtest.ini:4:17: error: [7D10] drive LED, red can be lit and not darkened"},
+    {"chip.ini", "hdled.red.deassert.sequence=0xA28:0xF7", "hdled.red.deassert.sequence=undef",
+     "chip.ini:7:29: error: [7D10] drive LED, red can be lit and not darkened"},
+    {"chip.ini", "hdled.red.assert.sequence=0xA28:0x08", "hdled.red.assert.sequence=undef",
+     "chip.ini:6:27: error: [7D10] chip \"g_iospace\" lights no drive LED, red"},
+    {"chip.ini", "0xA28:0xF7", "0xA28:0x08",
+     "chip.ini:7:29: error: a deassert mask keeps its bits and clears all others, and this one keeps the LED's; is "
+     "0xF7 meant for 0x08? [inverted-mask]"},
+    {"chip.ini", "0xA28:0x08", "0xA28:0xF7", "chip.ini:6:27: error: an assert mask sets its bits, and this one sets"},
+    {"mbtest.ini", "test.powerled.chip=g_fintek", "test.powerled.redled.support=yes",
+     "mbtest.ini:6:30: error: [7C20] has no key \"test.powerled.chip\", so that nothing drives this LED"},
+    {"mbtest.ini", "test.hdled.chip=g_iospace\n", "chip.g_iospace.hdled.red.assert.sequence=0xA28:0x08\n",
+     "mbtest.ini:4:42: error: [7D10] has no key \"test.hdled.chip\""},
+    {"chip.ini", "config.index.port=0x4E\n", "",
+     "chip.ini:12:1: error: [g_fintek] and its bases lack config.index.port:"},
+    {"chip.ini", "config.mode.exit.sequence=0xAA\n", "",
+     "chip.ini:12:1: error: [g_fintek] and its bases lack config.mode.exit.sequence:"},
+    {"chip.ini", "gpiobar.bar.ldn=6\ngpiobar.bar.reg=0x6061", "gpiobar.bar.ldn=6\ngpiobar.bar.reg=0x606",
+     "chip.ini:18:17: error: [7C20] cannot be built: could not read GPIOBAR from SIO [board-fails]"},
+    {"mbtest.ini", "test.hdled.chip=g_iospace\n",
+     "test.hdled.chip=g_iospace\ntest.fan.1.full.min=900\ntest.fan.1.full.max=90\n",
+     "mbtest.ini:5:21: error: 900 is above the highest value that is allowed, 90: nothing passes [crossed-limits]"},
     {"chip.ini", "0xA28:0x08", "0xA20:0x01",
-     "power LED, green or white and drive LED, red hang on the same bit, 0x01 of port 0x0A20 [same-bit]"},
+     "chip.ini:6:27: error: [7D10] power LED, green or white and drive LED, red hang on the same bit, 0x01 of port "
+     "0x0A20 [same-bit]"},
     {"chip.ini", "0xF8,0xF9", "0xF8",
-     "mbtest.ini:6:20: warning: [7C20] power LED, red or amber: the blink changes 0xF9, which no save list has"},
+     "chip.ini:20:21: warning: [7C20] power LED, red or amber: the blink changes 0xF9, which no save list has"},
     // files
     {"mbtest.ini", "", "\xEF\xBB\xBF", "mbtest.ini:1:1: error: the file begins with a UTF-8 mark"},
     {"mbtest.ini", "", "\xFE\xFF", "mbtest.ini:1:1: error: UTF-16 with the high byte first is read by nothing"},
@@ -145,6 +175,10 @@ const BrokenCase kBroken[] = {
      "\"drivered\""},
     {"ui.xml", "ID='DriveRed'", "ID='PowerGreen'", "ui.xml:4:1: warning: the button \"PowerGreen\" stands twice"},
     {"ui.xml", "'true'", "'False'", "ui.xml:4:1: warning: Active=\"False\" leaves the LED in the test"},
+    {"ui.xml", "'true'", "'no'", "ui.xml:4:1: warning: Active=\"no\" leaves the LED in the test"},
+    {"ui.xml", "'true'", "'0'", "ui.xml:4:1: warning: Active=\"0\" leaves the LED in the test"},
+    {"ui.xml", "Controller='all'", "Controller='onboard,onbord'",
+     "ui.xml:6:1: error: msctrl.ini has no controller \"onbord\"; is \"onboard\" meant? [unknown-controller]"},
     {"ui.xml", "LEDOnTime='500'", "LEDOnTime='5'", "ui.xml:6:1: warning: LEDOnTime of 5 ms is faster than an eye"},
     {"ui.xml", "LEDOnTime='500'", "LEDOnTime='0.5 s'", "ui.xml:6:1: error: LEDOnTime=\"0.5 s\" is no number"},
     {"ui.xml", "Active='true'", "Aktive='true'", "ui.xml:4:1: error: "},
@@ -166,6 +200,13 @@ const BrokenCase kBroken[] = {
     {"panelglow-diags.msg", "42=Strom", "42=%s %s", "panelglow-diags.msg:8:4: error: the program gives one text"},
     {"panelglow-diags.msg", "42=Strom", "42=50 % an",
      "panelglow-diags.msg:8:7: error: \"%\" begins the place of a text"},
+    {"panelglow-diags.msg", "[de_DE]", "[de-DE]",
+     "panelglow-diags.msg:5:1: error: no run finds [de-DE]: a language is called as \"de_DE\"; is [de_DE] meant?"},
+    {"panelglow-diags.msg", "[en_US]", "[en_GB]", "panelglow-diags.msg:1:1: error: the file has no section [en_US]"},
+    {"panelglow-diags.msg", "42=Strom", "42=Leistungsl\xC3\xA4mpchen",
+     "panelglow-diags.msg:8:1: error: the texts are UTF-8, and each of their bytes is shown as a character"},
+    {"nonui_panelglow-diags.msg", "[en_US]\n8=%s\n", "",
+     "nonui_panelglow-diags.msg:1:1: error: the file has no texts, so that numbers stand for them [message-texts]"},
     {"msctrl.ini", "[SATA", "[SATTA", "msctrl.ini:1:1: error: [SATTA CONTROLLERS] is no section of controllers"},
     {"msctrl.ini", ",wind", "", "msctrl.ini:2:1: error: a line of this section has 6 fields, this one has 5"},
     {"msctrl.ini", "0xA282", "A282", "msctrl.ini:2:1: error: \"A282\" stands where an id belongs [not-a-number]"},
@@ -200,6 +241,17 @@ TEST(Check, FindsABlinkThatNoEyeTakesForOne) {
       FindingsIn(files),
       "mbtest.ini:8:20: warning: [7C40] power LED, green or white: switching it \"on\" takes 1600 ms, which no eye "
       "takes for blinking [blink-rate]\n");
+}
+
+// A code page's own letters are no UTF-8; of a machine without a board nothing more is told than that.
+TEST(Check, TellsNoMoreThanThereIs) {
+  InstallationFiles files = Sound();
+  files["panelglow-diags.msg"].replace(files["panelglow-diags.msg"].find("Strom"), 5, "L\xE4mpchen");
+  EXPECT_EQ(FindingsIn(files), "");
+  files["mbdetect.ini"].replace(files["mbdetect.ini"].find("[7C20]"), 6, "[7C2O]");
+  const std::string findings = FindingsIn(files);
+  EXPECT_EQ(findings.rfind("mbtest.ini:5:1: warning: no file selects a board", 0), 0U) << findings;
+  EXPECT_EQ(findings.find("unused-key"), std::string::npos) << findings;
 }
 
 TEST(Check, IsSilencedByACommentInTheLineOrAboveIt) {
@@ -264,6 +316,7 @@ TEST(Nearest, IsNoNameOfAnotherKind) {
   EXPECT_EQ(Nearest("powerled.lnd", known), "powerled.ldn");
   EXPECT_EQ(Nearest("gpiobr", known), "gpiobar");
   EXPECT_EQ(Nearest("colour", known), "");
+  EXPECT_EQ(Nearest("HwmBar", known), "");
 }
 
 }  // namespace

@@ -5,6 +5,10 @@ namespace panelglow::boardtool {
 
 bool IsSimulated() { return true; }
 
-std::string PanelNow() { return {}; }
+const char* ProgramName() { return "panelglow-board-sim"; }
+
+std::size_t PanelMark() { return 0; }
+
+std::string PanelMoves(std::size_t /*mark*/) { return {}; }
 
 }  // namespace panelglow::boardtool

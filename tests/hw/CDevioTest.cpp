@@ -6,8 +6,11 @@
 #include <cstdio>
 #include <functional>
 #include <string>
+#include <tuple>
+#include <utility>
 #include <vector>
 
+#include "hw/PciDeviceList.h"
 #include "platform/sim/Simulation.h"
 
 namespace panelglow {
@@ -40,6 +43,9 @@ MachineDescription Machine(bool is64Bit) {
   machine.pci = {{kBridge, {{0x00, 0x1C4F8086}, {0x08, 0x06010005}, {0x2C, 0x00000000}}},
                  {kSerial, {{0x00, 0x1C028086}, {0x08, 0x06010004}, {0x2C, 0x3048103C}}},
                  {kNetwork, {{0x00, 0x816810EC}, {0x08, 0x02000006}, {0x2C, 0x3048103C}}}};
+  machine.pci[0].description = "A Link";
+  machine.pci[1].description = "A Link #2";
+  machine.pci[2].description = "A Link #3";
   return machine;
 }
 
@@ -157,6 +163,18 @@ TEST_F(CDevioTest, FindsFunctionsByClassAndIds) {
   EXPECT_FALSE(devio_.FindPciDeviceByIds(0x060100, 0x8086, 0x1C02, 0x103C, 0x3049, location_));
   EXPECT_FALSE(devio_.FindPciDeviceByIds(0x060100, 0x10EC, 0x8168, 0x103C, 0x3048, location_));  // of another class
   EXPECT_EQ(location_, 0);
+}
+
+// By a function's place among those of its class whose description in the device tree has the name.
+TEST_F(CDevioTest, FindsFunctionsByName) {
+  PciDeviceList::Forget();
+  const std::tuple<const char*, unsigned, std::uint16_t> kCases[] = {
+      {"Link", 0, kBridge}, {"Link", 1, kSerial}, {"Link", 2, 0}, {"Link #2", 0, kSerial}, {"link", 0, 0}};
+  for (const auto& [name, occurrence, found] : kCases) {
+    EXPECT_EQ(devio_.FindPciDeviceByName(0x060100, name, occurrence, location_), found != 0) << name << occurrence;
+    EXPECT_EQ(location_, found) << name << occurrence;
+  }
+  PciDeviceList::Forget();
 }
 
 TEST_F(CDevioTest, ReadsAndWritesConfigurationOfEachWidth) {

@@ -31,6 +31,11 @@ TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
       {{"--machine", machine, "--fault", "caps-lock"}, 2, "must have the form LED=KIND"},
       {{"--machine", machine, "--fault", "caps-lock=wet"}, 2, "there is no fault \"wet\" (dead"},
       {{"--machine", machine, "--seed", "many"}, 2, "--seed"},
+      {{"--machine", machine, "--seed=-1"}, 2, "--seed"},
+      {{"--machine", "."}, 3, "the machine's file . cannot be read"},
+      {{"--machine", machine, "--trace", "/dev/full", "--", "-subtest=CustomLEDTest"},
+       3,
+       "the trace file /dev/full did not take everything"},
       {{"--machine", "none.toml"}, 3, "none.toml cannot be read"},
       {{"--machine", "broken.toml"}, 3, "broken.toml:1: \"chip.name\" is missing"},
       {{"--machine", machine, "--raw", "--", "-subtest=None"}, 1, ""},
@@ -41,6 +46,16 @@ TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
     EXPECT_EQ(outcome.exitCode, c.exitCode) << ::testing::PrintToString(c.arguments);
     EXPECT_THAT(outcome.errors, HasSubstr(c.error));
   }
+}
+
+TEST(SystemController, AVerdictThatNobodyCouldReadIsNone) {
+  const Installation installation;
+  installation.Write("full.sh", "exec " PANELGLOW_BINARY_DIR "/panelglow-sim --machine " +
+                                    installation.Machine("desktop.toml") +
+                                    " -- -subtest=CustomLEDTest > /dev/full\n");
+  const Outcome full = RunProgram("/bin/sh", {"full.sh"}, installation.Path(""), {});
+  EXPECT_EQ(full.exitCode, 1);
+  EXPECT_THAT(full.errors, HasSubstr("panelglow-sim: standard output did not take everything"));
 }
 
 TEST(SystemController, APersonSeesProgressThePanelAndTheVerdict) {

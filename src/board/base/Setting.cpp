@@ -16,7 +16,7 @@ bool Fits(std::int64_t number, unsigned bits) {
 
 void TellOf(const Setting& setting, const std::string& what) {
   if (!setting.place.empty()) {
-    Notices::Tell(setting.place + ": " + what + ".");
+    Notices::Tell(setting.place + ": " + what + (what.ends_with('.') ? "" : "."));
   }
 }
 

@@ -18,7 +18,7 @@ struct Setting {
   std::string place;  // as in messages: file, section, key; empty for a default
 };
 
-/// Tells people `what` (a sentence without its full stop) of a setting that has a place.
+/// Tells people `what` (a sentence; its full stop may be missing) of a setting that has a place.
 void TellOf(const Setting& setting, const std::string& what);
 
 /// The bits of an int. A number of this width has a sign as well; those of every other width have none.

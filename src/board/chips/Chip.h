@@ -149,11 +149,18 @@ class Chip {
   virtual bool ClearLatchedPortDword(std::uint16_t port, std::uint32_t mask);
 
   // ---- others
-  virtual bool DetectDashCable(int /*line*/, const std::string& /*idList*/) { return false; }
+
+  /// Asserted when the line follows the pin of the network controller of these ids, as a cable makes it; kNoSuchLine
+  /// when the line or the controller cannot be reached.
+  virtual int ReadDashCable(int /*line*/, const std::string& /*idList*/) { return kNoSuchLine; }
+  bool DetectDashCable(int line, const std::string& idList) { return ReadDashCable(line, idList) == kAsserted; }
   virtual int ReadRegister(int /*reg*/) { return 0; }
   virtual bool ReservedOperation77() { return false; }
 
   [[nodiscard]] const std::string& GetName() const { return name; }
+
+  /// Whether SetManualFanMode has given its fans to software.
+  [[nodiscard]] bool IsFanModeManual() const { return manualFanMode; }
 
  protected:
   /// `chipName` is the name in the class table.

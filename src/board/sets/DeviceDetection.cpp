@@ -72,6 +72,26 @@ const char* HeatsinkWord(Chip& chip, int line, bool reversed) {
   return (activity != 0) != reversed ? "high" : "low";
 }
 
+// Whether a register tells of the device: people are told when the files give only one of the two keys for that.
+bool NamesRegister(const std::string& prefix) {
+  const Setting reg = IniReader::Instance().ReadIniSetting(prefix + ".reg", "");
+  const Setting value = IniReader::Instance().ReadIniSetting(prefix + ".reg.value", "");
+  if (reg.text.empty() != value.text.empty()) {
+    TellOf(reg.text.empty() ? value : reg,
+           "it counts only with \"" + prefix + (reg.text.empty() ? ".reg\"" : ".reg.value\""));
+  }
+  return !reg.text.empty();
+}
+
+// What is not there, and what there is nothing to compare with, tells nothing.
+const char* RegisterWord(Chip& chip, const std::string& prefix, bool reversed) {
+  if (!IsThere(chip) || ReadIniValue(prefix + ".reg.value", "").empty()) {
+    return kFailed;
+  }
+  const int wanted = ReadIniInt(prefix + ".reg.value", 0);
+  return WordOf(LineState(chip.ReadRegister(ReadIniInt(prefix + ".reg", 0)) == wanted), reversed);
+}
+
 }  // namespace
 
 const char* TitleOf(DeviceKind kind) { return RowOfKind(kind).title; }
@@ -111,11 +131,9 @@ void DeviceDetection::Look(DeviceKind kind, const std::string& prefix, DEVICE_IN
   if (row.way == Way::kSignal) {
     device.status = HeatsinkWord(chip, line, device.reversedLogic);
   } else if (row.way == Way::kDash) {
-    const bool isThere = chip.DetectDashCable(line, ReadIniValue(prefix + ".pciid", ""));
-    device.status = isThere != device.reversedLogic ? kAsserted : kNotAsserted;
-  } else if (row.way == Way::kRegister && !ReadIniValue(prefix + ".reg", "").empty()) {
-    const bool isThere = chip.ReadRegister(ReadIniInt(prefix + ".reg", 0)) == ReadIniInt(prefix + ".reg.value", 0);
-    device.status = isThere != device.reversedLogic ? kAsserted : kNotAsserted;
+    device.status = WordOf(chip.ReadDashCable(line, ReadIniValue(prefix + ".pciid", "")), device.reversedLogic);
+  } else if (row.way == Way::kRegister && NamesRegister(prefix)) {
+    device.status = RegisterWord(chip, prefix, device.reversedLogic);
   } else if (device.useOffset) {
     device.status = WordOf(chip.ReadLineByNames(device.offset, device.bit, device.clearBit), device.reversedLogic);
   } else {

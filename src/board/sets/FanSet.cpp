@@ -1,7 +1,6 @@
 #include "board/sets/FanSet.h"
 
 #include <algorithm>
-#include <limits>
 
 #include "board/base/IniReader.h"
 #include "board/parts/ConfigMode.h"
@@ -26,6 +25,9 @@ bool IsUnderTest(const Fan& fan) { return fan.present && fan.tested; }
 
 // What a chip's fans are held by is their duty; one that has none is reached by its tachometer's chip.
 const std::string& DrivingChip(const Fan& fan) { return fan.pwmChip.empty() ? fan.tachChip : fan.pwmChip; }
+
+// Whether software can hold it: not when the files name a chip for its speed alone.
+bool HasDuty(const Fan& fan) { return !fan.pwmChip.empty() || fan.tachChip.empty(); }
 
 int ControlNumber(const Fan& fan) { return fan.cfgRegIndex == 0 ? fan.pwmIndex : fan.cfgRegIndex; }
 
@@ -107,12 +109,13 @@ Fan FanSet::ReadFan(int index) const {
 
 bool FanSet::Load() {
   fans.clear();
+  groups.clear();
   nominalTest = ReadBoardTest("test.fans.nominal");
   fullTest = ReadBoardTest("test.fans.full");
   pwmTest = ReadBoardTest("test.fans.pwm");
-  constexpr std::int64_t kLongest = std::numeric_limits<std::uint32_t>::max();
-  const std::int64_t wait_s = ReadIniInt("test.fans.stabilizationwait", kStabilization_s);
-  stabilizationWait_ms = static_cast<std::uint32_t>(std::clamp<std::int64_t>(wait_s * 1000, 0, kLongest));
+  constexpr const char* kWait = "test.fans.stabilizationwait";
+  stabilizationWait_ms =
+      MillisecondsIn(ReadIniInt(kWait, kStabilization_s), IniReader::Instance().ReadIniSetting(kWait, ""));
   if (SaysNo("detect.fans")) {
     return true;
   }
@@ -131,30 +134,31 @@ bool FanSet::Load() {
 
 void FanSet::Take(std::vector<Fan> list, std::uint32_t wait_ms) {
   fans = std::move(list);
+  groups.clear();
   stabilizationWait_ms = wait_ms;
 }
 
 bool FanSet::LoadGroups() {
-  groups.clear();
-  if (SaysNo("detect.fans.group")) {
-    return true;
-  }
-  for (int n = 1;; ++n) {
+  std::vector<FanGroup> found;
+  const bool hasGroups = !SaysNo("detect.fans.group");
+  for (int n = 1; hasGroups; ++n) {
     const std::string prefix = "test.fans.group." + CDMUtil::ToString(n);
     FanGroup group{ReadIniValue(prefix + ".name", ""), {}};
     if (group.name.empty()) {
-      return true;
+      break;
     }
     const Setting list = IniReader::Instance().ReadIniSetting(prefix + ".fans", "");
     for (const int index : NumbersIn(list)) {
-      if (fans.empty() || Find(index) != nullptr) {  // groups may be loaded first
+      if (Find(index) != nullptr) {
         group.fans.push_back(index);
       } else {
         TellOf(list, "there is no fan " + CDMUtil::ToString(index));
       }
     }
-    groups.push_back(std::move(group));
+    found.push_back(std::move(group));
   }
+  groups = std::move(found);
+  return true;
 }
 
 const Fan* FanSet::Find(int index) const {
@@ -190,19 +194,21 @@ void FanSet::DetectByTach(const std::vector<Fan*>& list) {
   };
   std::vector<Chip*> held;
   for (const Fan* fan : list) {
-    if (fan->pwmApply) {
+    if (fan->pwmApply && !chipOf(fan->pwmChip).IsFanModeManual()) {  // who has taken it over already gives it back
       AddOnce(held, chipOf(fan->pwmChip));
     }
   }
   HeldFans fansInHand(held);
   const ConfigMode hold(fansInHand);
+  bool isDriven = false;
   for (Fan* fan : list) {
     fan->detectionStatus.clear();
     if (fan->pwmApply) {
+      isDriven = true;
       attempt(*fan, [&] { chipOf(fan->pwmChip).SetFanPwmPercent(fan->pwmIndex, fan->pwmDutyDetect); });
     }
   }
-  if (!held.empty()) {
+  if (isDriven) {
     Wait();
   }
   for (Fan* fan : list) {
@@ -258,10 +264,10 @@ void FanSet::ReleaseControl() {
   });
 }
 
-std::vector<Chip*> FanSet::ChipsUnderTest() {
+std::vector<Chip*> FanSet::ChipsUnderTest(bool (*serves)(const Fan& fan)) {
   std::vector<Chip*> chips;
   for (const Fan& fan : fans) {
-    if (IsUnderTest(fan)) {
+    if (IsUnderTest(fan) && serves(fan)) {
       AddOnce(chips, chipOf(DrivingChip(fan)));
     }
   }
@@ -269,21 +275,22 @@ std::vector<Chip*> FanSet::ChipsUnderTest() {
 }
 
 bool FanSet::SetManualMode(bool on) {
-  return EachOf(ChipsUnderTest(), [on](Chip* chip) { return chip->SetManualFanMode(on); });
+  return EachOf(ChipsUnderTest(HasDuty), [on](Chip* chip) { return chip->SetManualFanMode(on); });
 }
 
 bool FanSet::SaveStates() {
-  return EachOf(ChipsUnderTest(), [](Chip* chip) { return chip->SaveFanState(); });
+  return EachOf(ChipsUnderTest(IsUnderTest), [](Chip* chip) { return chip->SaveFanState(); });
 }
 
 bool FanSet::RestoreStates() {
-  return EachOf(ChipsUnderTest(), [](Chip* chip) { return chip->RestoreFanState(); });
+  return EachOf(ChipsUnderTest(IsUnderTest), [](Chip* chip) { return chip->RestoreFanState(); });
 }
 
 // ---- speeds
 
 bool FanSet::ReadInto(Fan& fan) {
   int rpm = 0;
+  fan.readings[readingSet] = kNotRead;  // ... it stays, when the chip throws
   const bool done = chipOf(fan.tachChip).ReadFanRpm(fan.tachIndex, rpm, fan.tachMultiplier);
   fan.readings[readingSet] = rpm;
   fan.readingTime = TimeStamp();

@@ -14,17 +14,17 @@ namespace panelglow {
 
 class XmlObject;
 
-/// Fans are named by their number in the keys; a number without a fan is false and touches nothing. Operations on all
-/// fans work on those that are present and under test, and are true when no chip refused. What puts something back
-/// goes on with the next chip when one throws, and throws that mblib_exception in the end.
+/// Fans are named by their number in the keys; a number without a fan is false and touches nothing. What reads,
+/// drives, takes over or gives back all fans works on those that are present and under test, and is true when no chip
+/// refused; it goes on with the next one when one throws, and throws that mblib_exception in the end.
 class FanSet {
  public:
   explicit FanSet(ChipFinder finder) : chipOf(std::move(finder)) {}
 
-  /// Reads the fans from the files, in place of those before.
+  /// Reads the fans from the files, in place of those before; their groups go.
   bool Load();
 
-  /// Puts fans there that come from elsewhere.
+  /// Puts fans there that come from elsewhere; the groups go.
   void Take(std::vector<Fan> list, std::uint32_t wait_ms);
 
   /// Reads the groups. Numbers without a fan are told to people and left out: the fans are loaded first.
@@ -32,7 +32,7 @@ class FanSet {
 
   /// Looks which fans are plugged in, and writes "true", "false" or "ERROR: device detection failed" into
   /// detectionStatus: by the fan's line where it has one, else by its tachometer. Fans that need a duty to turn get
-  /// it for the stabilization wait, and are given back.
+  /// it for the stabilization wait, and are given back unless software had them before: then they keep it.
   bool Detect();
 
   [[nodiscard]] const std::vector<Fan>& List() const { return fans; }
@@ -52,12 +52,13 @@ class FanSet {
   void TakeControl();
   void ReleaseControl();
 
-  // Once for each chip that has a fan under test.
+  // Once for each chip that has a fan under test; of the mode those that drive one.
   bool SetManualMode(bool on);
   bool SaveStates();
   bool RestoreStates();
 
-  /// Reads every fan into the active column: 0 for one that stands or cannot be read.
+  /// Reads every fan into the active column: 0 for one that stands or that its chip does not give, kNotRead when the
+  /// chip throws.
   bool ReadAll();
   bool ReadOne(int index);
 
@@ -79,7 +80,7 @@ class FanSet {
   [[nodiscard]] static BoardTest ReadBoardTest(const char* key);
   [[nodiscard]] Fan ReadFan(int index) const;
   bool ReadInto(Fan& fan);
-  [[nodiscard]] std::vector<Chip*> ChipsUnderTest();
+  [[nodiscard]] std::vector<Chip*> ChipsUnderTest(bool (*serves)(const Fan& fan));
   void DetectByTach(const std::vector<Fan*>& list);
 
   ChipFinder chipOf;

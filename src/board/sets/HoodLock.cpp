@@ -3,12 +3,12 @@
 namespace panelglow {
 
 bool HoodLock::Load() {
-  presenceChip = ReadChipName("detect.hoodlock.chip", "ich", chipOf);
   presence = ReadLineNumber("detect.hoodlock.gpio");
+  presenceChip = ReadChipName("detect.hoodlock.chip", "ich", chipOf, presence.isSet);
   reversed = ReadYesNo("detect.hoodlock.reversedlogic", false);
-  chip = ReadChipName("test.hoodlock.chip", presenceChip, chipOf);
   lockLine = ReadLineNumber("test.hoodlock.gpio.lock");
   unlockLine = ReadLineNumber("test.hoodlock.gpio.unlock");
+  chip = ReadChipName("test.hoodlock.chip", presenceChip, chipOf, lockLine.isSet && unlockLine.isSet);
   check = !SaysNo("test.hoodlock.check");
   isPresent = false;
   return true;

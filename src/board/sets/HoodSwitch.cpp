@@ -13,21 +13,28 @@ const std::string kTest = "test.hoodswitch";
 }  // namespace
 
 bool HoodSwitch::Load() {
-  line = {.chip = ReadChipName(kDetect + ".chip", "ich", chipOf),
+  line = {.chip = {},
           .gpio = ReadLineNumber(kDetect + ".gpio"),
           .bit = CDMUtil::Trim(ReadIniValue(kDetect + ".gpio.bit", "")),
           .clearBit = CDMUtil::Trim(ReadIniValue(kDetect + ".gpio.clearbit", "")),
           .reversed = ReadYesNo(kDetect + ".reversedlogic", false)};
   const Setting offset = IniReader::Instance().ReadIniSetting(kDetect + ".gpio.offset", "");
   line.useOffset = !offset.text.empty() && !line.bit.empty();
+  if (offset.text.empty() != line.bit.empty()) {
+    const bool hasOffset = !offset.text.empty();
+    TellOf(hasOffset ? offset : IniReader::Instance().ReadIniSetting(kDetect + ".gpio.bit", ""),
+           "it counts only with \"" + kDetect + (hasOffset ? ".gpio.bit\"" : ".gpio.offset\""));
+  }
   line.offset = line.useOffset ? WideNumberIn(CDMUtil::Trim(offset.text), offset) : 0;
-  latch = {.chip = ReadChipName(kTest + ".chip", line.chip, chipOf),
+  line.chip = ReadChipName(kDetect + ".chip", "ich", chipOf, line.useOffset || line.gpio.isSet);
+  latch = {.chip = {},
            .isConfigBit = !ReadIniValue(kTest + ".ldn", "").empty(),
            .ldn = ReadIniByte(kTest + ".ldn", 0),
            .reg = ReadIniByte(kTest + ".reg", 0),
            .bit = ReadIniInt(kTest + ".bit", 0),
            .gpio = ReadLineNumber(kTest + ".gpio"),
            .reversed = ReadYesNo(kTest + ".reversedlogic", false)};
+  latch.chip = ReadChipName(kTest + ".chip", line.chip, chipOf, latch.isConfigBit || latch.gpio.isSet);
   return true;
 }
 

@@ -1,12 +1,13 @@
 #include "board/sets/LegacySettings.h"
 
 #include <algorithm>
-#include <limits>
 #include <string>
+#include <utility>
 
 #include "board/base/SelectedSystem.h"
 #include "board/base/Setting.h"
 #include "board/parts/NumberedText.h"
+#include "board/sets/ReadSettings.h"
 #include "harness/base/CDMUtil.h"
 #include "platform/Host.h"
 
@@ -38,6 +39,26 @@ constexpr std::array<DeviceRow, kLegacyDevices> kDevices{{
 constexpr int kStabilization_s = 5;
 constexpr int kProbeRate_s = 30;
 
+// The number that a value begins with, as in "-1 ; none"; the whole value when there is none. People are told of what
+// stands behind it, unless that is a remark.
+std::string LeadingNumber(const Setting& setting) {
+  const std::string text = CDMUtil::Trim(setting.text);
+  const std::size_t sign = text.find_first_of("+-") == 0 ? 1 : 0;
+  const bool isHex = text.compare(sign, 2, "0x") == 0 || text.compare(sign, 2, "0X") == 0;
+  const std::size_t digits = sign + (isHex ? 2 : 0);
+  const std::size_t end =
+      std::min(text.find_first_not_of(isHex ? "0123456789abcdefABCDEF" : "0123456789", digits), text.size());
+  if (end == digits) {
+    return text;
+  }
+  const std::string number = text.substr(0, end);
+  const std::string rest = CDMUtil::Trim(text.substr(end));
+  if (!rest.empty() && rest.front() != ';') {
+    TellOf(setting, "\"" + text + "\" counts as " + number);
+  }
+  return number;
+}
+
 // The keys of one section, without a layer above or below.
 class FlatKeys {
  public:
@@ -55,8 +76,9 @@ class FlatKeys {
     if (setting.text.empty()) {
       return defaultValue;
     }
-    const int number = CDMUtil::ToInt(setting.text);
-    CheckNumber(setting.text, 32, static_cast<std::uint32_t>(number), setting);
+    const std::string token = LeadingNumber(setting);
+    const int number = CDMUtil::ToInt(token);
+    CheckNumber(token, kIntBits, static_cast<std::uint32_t>(number), setting);
     return number;
   }
 
@@ -71,7 +93,8 @@ class FlatKeys {
 
   [[nodiscard]] std::uint16_t Word(const std::string& key) const {
     const Setting setting = Text(key);
-    return setting.text.empty() ? std::uint16_t{0} : static_cast<std::uint16_t>(NumberIn(setting.text, 16, setting));
+    return setting.text.empty() ? std::uint16_t{0}
+                                : static_cast<std::uint16_t>(NumberIn(LeadingNumber(setting), 16, setting));
   }
 
  private:
@@ -134,19 +157,25 @@ const char* TitleOf(LegacyDevice device) { return kDevices[static_cast<std::size
 
 LegacySettings LegacySettings::Load() {
   const FlatKeys keys;
-  const std::int64_t wait_s = keys.Number("FansTimeToStabilize", kStabilization_s);
-  constexpr std::int64_t kLongest = std::numeric_limits<std::uint32_t>::max();
-  LegacySettings settings{
-      .powerIoBase = keys.Word("PowerIOBaseAddr"),
-      .monitorIndexPort = keys.Word("SuperIOBaseAddr"),
-      .monitorDataPort = keys.Word("SuperIOBaseData"),
-      .stabilizationWait_ms = static_cast<std::uint32_t>(std::clamp<std::int64_t>(wait_s * 1000, 0, kLongest)),
-      .fans = ReadFans(keys),
-      .probe = {.rate_s = keys.Number("TempProbeRate", kProbeRate_s),
-                .consecutiveHigh = keys.Number("TempConsecutiveHigh", 1),
-                .consecutiveLow = keys.Number("TempConsecutiveLow", 1),
-                .retriesOnInvalid = keys.Number("TempRetriesOnInvalid", 1)},
-      .zones = ReadZones(keys)};
+  LegacySettings settings{.powerIoBase = keys.Word("PowerIOBaseAddr"),
+                          .monitorIndexPort = keys.Word("SuperIOBaseAddr"),
+                          .monitorDataPort = keys.Word("SuperIOBaseData"),
+                          .stabilizationWait_ms = MillisecondsIn(keys.Number("FansTimeToStabilize", kStabilization_s),
+                                                                 keys.Text("FansTimeToStabilize")),
+                          .fans = ReadFans(keys),
+                          .probe = {.rate_s = keys.Number("TempProbeRate", kProbeRate_s),
+                                    .consecutiveHigh = keys.Number("TempConsecutiveHigh", 1),
+                                    .consecutiveLow = keys.Number("TempConsecutiveLow", 1),
+                                    .retriesOnInvalid = keys.Number("TempRetriesOnInvalid", 1)},
+                          .zones = ReadZones(keys)};
+  if (!settings.fans.empty() || !settings.zones.empty()) {
+    for (const auto& [key, port] : {std::pair{"SuperIOBaseAddr", settings.monitorIndexPort},
+                                    std::pair{"SuperIOBaseData", settings.monitorDataPort}}) {
+      if (port == 0) {
+        TellOf(keys.Text(key), "there is no port, and so nothing is read of the fans and temperatures");
+      }
+    }
+  }
   for (std::size_t i = 0; i < kLegacyDevices; ++i) {
     settings.lines[i] = keys.Number(kDevices[i].key, kNoLine);
   }

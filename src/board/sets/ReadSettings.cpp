@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <array>
 #include <ctime>
+#include <limits>
 
 #include "board/base/IniReader.h"
 #include "harness/base/CDMUtil.h"
+#include "harness/base/Notices.h"
 #include "platform/Host.h"
 
 namespace panelglow {
@@ -50,12 +52,15 @@ bool ReadYesNo(const std::string& key, bool otherwise) {
 
 bool SaysNo(const std::string& key) { return !ReadYesNo(key, true); }
 
-std::string ReadChipName(const std::string& key, const std::string& defaultName, const ChipFinder& chipOf) {
+bool IsThere(const Chip& chip) { return chip.GetName() != kPlainChip && chip.GetName() != kNoChip; }
+
+std::string ReadChipName(const std::string& key, const std::string& defaultName, const ChipFinder& chipOf,
+                         bool isNeeded) {
   const Setting setting = Read(key, defaultName);
-  if (!setting.text.empty() && setting.text != kNoChip) {
-    const std::string& found = chipOf(setting.text).GetName();
-    if (found == kPlainChip || found == kNoChip) {
-      TellOf(setting, "the board has no chip \"" + setting.text + "\"");
+  if (!setting.text.empty() && setting.text != kNoChip && !IsThere(chipOf(setting.text))) {
+    TellOf(setting, "the board has no chip \"" + setting.text + "\"");
+    if (setting.place.empty() && isNeeded) {
+      Notices::Tell("The board has no chip \"" + setting.text + "\", which counts without the key \"" + key + "\".");
     }
   }
   return setting.text;
@@ -70,6 +75,15 @@ int ReadPercent(const std::string& key, int defaultValue) {
   return limited;
 }
 
+std::uint32_t MillisecondsIn(std::int64_t seconds, const Setting& setting) {
+  constexpr std::int64_t kLongest_s = std::numeric_limits<std::uint32_t>::max() / 1000;
+  const std::int64_t limited = std::clamp<std::int64_t>(seconds, 0, kLongest_s);
+  if (limited != seconds) {
+    TellOf(setting, std::to_string(seconds) + " seconds are no wait and count as " + std::to_string(limited));
+  }
+  return static_cast<std::uint32_t>(limited * 1000);
+}
+
 LineSetting ReadLineNumber(const std::string& key) {
   const Setting setting = Read(key);
   const std::string text = CDMUtil::Trim(setting.text);
@@ -80,8 +94,8 @@ LineSetting ReadLineNumber(const std::string& key) {
     return {.line = text == "caseopen" ? kCaseOpenLine : kIntruderLine, .isSet = true, .isSpecial = true};
   }
   const int line = CDMUtil::ToInt(text);
-  CheckNumber(text, 32, static_cast<std::uint32_t>(line), setting);
-  return {.line = line, .isSet = true};
+  CheckNumber(text, kIntBits, static_cast<std::uint32_t>(line), setting);
+  return {.line = line, .isSet = line != LineSetting::kNone};
 }
 
 std::vector<int> NumbersIn(const Setting& list) {
@@ -90,7 +104,7 @@ std::vector<int> NumbersIn(const Setting& list) {
   std::vector<int> numbers;
   for (const std::string& token : tokens) {
     numbers.push_back(CDMUtil::ToInt(token));
-    CheckNumber(token, 32, static_cast<std::uint32_t>(numbers.back()), list);
+    CheckNumber(token, kIntBits, static_cast<std::uint32_t>(numbers.back()), list);
   }
   return numbers;
 }

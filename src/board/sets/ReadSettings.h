@@ -19,18 +19,26 @@ bool ReadYesNo(const std::string& key, bool otherwise);
 /// Whether a key that switches something off says "no".
 bool SaysNo(const std::string& key);
 
-/// A chip's name; people are told when the board has no such chip.
-std::string ReadChipName(const std::string& key, const std::string& defaultName, const ChipFinder& chipOf);
+/// Whether a chip is one that the board has: neither the plain chip nor "none".
+bool IsThere(const Chip& chip);
+
+/// A chip's name; people are told when the board has no such chip, of the default one only when it `isNeeded`.
+std::string ReadChipName(const std::string& key, const std::string& defaultName, const ChipFinder& chipOf,
+                         bool isNeeded = false);
 
 /// A duty of 0 to 100 percent; people are told of a number beyond them, which counts as the nearest.
 int ReadPercent(const std::string& key, int defaultValue);
+
+/// A wait that is given in seconds, in milliseconds; people are told of one that is none and counts as 0, or too
+/// long.
+std::uint32_t MillisecondsIn(std::int64_t seconds, const Setting& setting);
 
 /// A line of a chip.
 struct LineSetting {
   static constexpr int kNone = -1;
 
   int line = kNone;
-  bool isSet = false;      // the key has a value
+  bool isSet = false;      // the key has a value, which is not kNone
   bool isSpecial = false;  // ... which is a word: "caseopen" or "intruder"
 };
 LineSetting ReadLineNumber(const std::string& key);

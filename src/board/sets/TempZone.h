@@ -38,8 +38,11 @@ struct TempZone {
   bool skipped = false;
   int consecutiveHigh = 0;
   int consecutiveLow = 0;
+  bool isHighCounted = false;  // the last reading is in the count
+  bool isLowCounted = false;
   int invalidReadings = 0;
-  int lastReading = kNoLimit;  // kNoLimit: nothing was read yet
+  int lastReading = kNoLimit;    // kNoLimit: nothing was read yet
+  int lastHighLimit = kNoLimit;  // by which a reading was judged last; before it what the files give in degrees
   int maxReading = kNoLimit;
   int minReading = kNoLimit;
   std::vector<int> coreReadings;  // of the last reading

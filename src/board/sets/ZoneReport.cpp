@@ -45,7 +45,7 @@ std::string ZoneStatus(const TempZone& zone, const ProbeSettings& probe) {
   return zone.consecutiveLow > 0 && zone.consecutiveLow >= probe.consecutiveLow ? "UnderTempErr" : "NoErr";
 }
 
-void WriteZoneLog(const LineSink& write, ZoneSet& zones) {
+void WriteZoneLog(const LineSink& write, const ZoneSet& zones) {
   const ProbeSettings& probe = zones.Probe();
   const auto number = [&](const char* label, int value) { write(label + std::to_string(value)); };
   write(std::string(kStars, '*'));
@@ -56,7 +56,7 @@ void WriteZoneLog(const LineSink& write, ZoneSet& zones) {
     write("ZoneName=" + zone.name);
     number("MinReading=", zone.minReading);
     number("MaxReading=", zone.maxReading);
-    number("Threshold=", zones.GetHigh(i));
+    number("Threshold=", zone.lastHighLimit);
     number("ProbeRate=", probe.rate_s);
     number("ConsecutiveHighReadings=", probe.consecutiveHigh);
     number("ConsecutiveLowReadings=", probe.consecutiveLow);
@@ -68,7 +68,7 @@ void WriteZoneLog(const LineSink& write, ZoneSet& zones) {
   write(std::string(kStars, '*'));
 }
 
-void WriteZoneResults(XmlObject& parent, ZoneSet& zones) {
+void WriteZoneResults(XmlObject& parent, const ZoneSet& zones) {
   XmlObject results;
   results.name = "tempcautiontestresults";
   for (int i = 1; i <= zones.Count(); ++i) {
@@ -80,7 +80,7 @@ void WriteZoneResults(XmlObject& parent, ZoneSet& zones) {
     element.name = "zone";
     element.SetAttribute("name", zone.name);
     element.SetAttribute("number", i);
-    element.SetAttribute("threshold", zones.GetHigh(i));
+    element.SetAttribute("threshold", zone.lastHighLimit);
     element.SetAttribute("TJMax", zone.tjMax);
     element.value = IsReading(zone.lastReading) ? std::to_string(zone.lastReading) : kInvalid;
     for (std::size_t core = 0; core < zone.coreReadings.size(); ++core) {

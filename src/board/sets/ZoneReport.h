@@ -13,9 +13,10 @@ class XmlObject;
 /// One word for the state of a zone, as "NoErr" or "OverTempErr".
 std::string ZoneStatus(const TempZone& zone, const ProbeSettings& probe);
 
-void WriteZoneLog(const LineSink& write, ZoneSet& zones);
+/// Nothing is read for it: the limits are those of the last checks.
+void WriteZoneLog(const LineSink& write, const ZoneSet& zones);
 
-/// Appends an element "tempcautiontestresults" to `parent`.
-void WriteZoneResults(XmlObject& parent, ZoneSet& zones);
+/// Appends an element "tempcautiontestresults" to `parent`; of the limits as the log.
+void WriteZoneResults(XmlObject& parent, const ZoneSet& zones);
 
 }  // namespace panelglow

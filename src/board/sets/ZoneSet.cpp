@@ -11,6 +11,7 @@
 #include "board/sets/ReadSettings.h"
 #include "harness/base/CDMUtil.h"
 #include "harness/base/CDMout.h"
+#include "harness/base/Notices.h"
 
 namespace panelglow {
 
@@ -27,6 +28,8 @@ constexpr const char* kAllCards = "allcards";  // in place of an index
 constexpr int kAtLow = 1;
 constexpr int kAtHigh = 3;
 
+constexpr int kLastRegister = 0xFFFF;  // of a hardware monitor, with its bank
+
 void Log(const std::string& text) { CDMout::LogMessage(LogOptions::Debug, kNote, text); }
 
 // Limits come from files: sums of them stay numbers.
@@ -42,18 +45,43 @@ void Extend(int& max, int& min, int value) {
   min = isFirst ? value : std::min(min, value);
 }
 
-// One limit of a zone and its cores, each kNoLimit when there is none: whether one applied, and the checks in a row
+// The limit of a zone that the files give in degrees.
+int PlainHigh(const TempZone& zone) { return zone.thresholdFix == kNoLimit ? zone.thresholdHigh : zone.thresholdFix; }
+
+bool HasReading(const TempZone& zone) {
+  return zone.lastReading != kNoLimit && zone.lastReading < kFirstInvalidReading;
+}
+
+// The bit of a register byte, by its number as text.
+std::string ReadBit(const std::string& key) {
+  constexpr int kLastBit = 7;
+  const Setting setting = IniReader::Instance().ReadIniSetting(key, "");
+  std::string bit = CDMUtil::Trim(setting.text);
+  if (!bit.empty()) {
+    const int number = CDMUtil::ToInt(bit);
+    CheckNumber(bit, kIntBits, static_cast<std::uint32_t>(number), setting);
+    if (number < 0 || number > kLastBit) {
+      TellOf(setting, "a byte has no bit " + bit + "; it is never set");
+    }
+  }
+  return bit;
+}
+
+// One limit of a zone and its cores, each kNoLimit when there is none: whether one applied, and the readings in a row
 // that were beyond one of them.
 template <class Beyond>
 bool Judge(Beyond beyond, const TempZone& zone, int limit, int hottestOrColdest, int coreLimit, int& inARow,
-           bool& isBeyond) {
+           bool& isCounted, bool& isBeyond) {
   const bool applies = limit != kNoLimit;
   const bool appliesToCores = coreLimit != kNoLimit && !zone.coreReadings.empty();
   if (!applies && !appliesToCores) {
     return false;
   }
   isBeyond = (applies && beyond(zone.lastReading, limit)) || (appliesToCores && beyond(hottestOrColdest, coreLimit));
-  inARow = isBeyond ? inARow + 1 : 0;
+  if (!isCounted) {
+    inARow = isBeyond ? inARow + 1 : 0;
+    isCounted = true;
+  }
   return true;
 }
 
@@ -82,11 +110,21 @@ TempZone ZoneSet::ReadZone(const std::string& prefix) const {
   zone.coreTjmaxDelta = limit("cpu.core.threshold.tjmax.delta");
   zone.coreLow = limit("cpu.core.threshold.low");
   zone.prochot = ReadYesNo(prefix + "prochot", zone.prochot);
-  zone.prochotChip = ReadIniValue(prefix + "prochot.chip", "");
+  zone.prochotChip = ReadChipName(prefix + "prochot.chip", "", chipOf);
   zone.prochotOffset = ReadIniInt(prefix + "prochot.offset", zone.prochotOffset);
-  zone.prochotLowBit = CDMUtil::Trim(ReadIniValue(prefix + "prochot.threshold.low.bit", ""));
-  zone.prochotHighBit = CDMUtil::Trim(ReadIniValue(prefix + "prochot.threshold.high.bit", ""));
+  if (zone.prochotOffset < 0 || zone.prochotOffset > kLastRegister) {
+    const Setting offset = IniReader::Instance().ReadIniSetting(prefix + "prochot.offset", "");
+    TellOf(offset, "there is no register " + offset.text + ", and nothing is read of the processor's throttling");
+  }
+  zone.prochotLowBit = ReadBit(prefix + "prochot.threshold.low.bit");
+  zone.prochotHighBit = ReadBit(prefix + "prochot.threshold.high.bit");
   return zone;
+}
+
+// A zone's own one, or the board's.
+std::string ZoneSet::ReadZoneChip(const std::string& prefix) const {
+  const std::string own = ReadChipName(prefix + "chip", presetChip, chipOf);
+  return own.empty() ? ReadChipName("test.tempcaution.chip", "sio", chipOf, true) : own;
 }
 
 bool ZoneSet::Load() {
@@ -94,7 +132,6 @@ bool ZoneSet::Load() {
   probe.consecutiveHigh = ReadIniInt("test.tempcaution.consecutivehigh", ProbeSettings{}.consecutiveHigh);
   probe.consecutiveLow = ReadIniInt("test.tempcaution.consecutivelow", ProbeSettings{}.consecutiveLow);
   probe.retriesOnInvalid = ReadIniInt("test.tempcaution.retriesoninvalidtemp", ProbeSettings{}.retriesOnInvalid);
-  const std::string usualChip = presetChip.empty() ? ReadIniValue("test.tempcaution.chip", "sio") : presetChip;
   std::vector<TempZone> list;
   for (int n = 1;; ++n) {
     const std::string prefix = "test.tempcaution.zone." + CDMUtil::ToString(n) + ".";
@@ -105,72 +142,83 @@ bool ZoneSet::Load() {
     TempZone zone = ReadZone(prefix);
     zone.number = n;
     zone.name = name;
-    zone.chip = ReadChipName(prefix + "chip", usualChip, chipOf);
+    zone.chip = ReadZoneChip(prefix);
     AddZone(std::move(zone), prefix, list);
   }
   Take(std::move(list), probe);
   return true;
 }
 
-// Of graphics cards that stand for one key each gets its number behind the name, and the limits that the files have
-// for its kind where the zone has none.
+// Of graphics cards that stand for one key each gets its number behind the name.
 void ZoneSet::AddZone(TempZone zone, const std::string& prefix, std::vector<TempZone>& list) const {
   if (zone.prochot && zone.prochotLowBit.empty() && zone.prochotHighBit.empty()) {
     Log(zone.name + " : Low or High bit values are missing for Prochot in INI file");
   }
   if (zone.chip != kGraphics || CDMUtil::Trim(ReadIniValue(prefix + "index", "")) != kAllCards) {
     zone.index = ReadIniInt(prefix + "index", zone.index);
-    LimitByTjMax(zone);
+    LimitByChip(zone, prefix);
     list.push_back(std::move(zone));
     return;
   }
-  Chip& graphics = chipOf(zone.chip);
-  const int cards = graphics.CountCards();
+  const int cards = chipOf(zone.chip).CountCards();
   for (int card = 0; card < cards; ++card) {
     TempZone one = zone;
     one.index = card;
     one.name += " " + CDMUtil::ToString(card + 1);
-    LimitByTjMax(one);
-    if (one.thresholdHigh == kNoLimit) {
-      graphics.ReadThreshold(card, one.thresholdHigh);
-    }
-    if (one.thresholdLow == kNoLimit) {
-      graphics.ReadLowLimitTemperature(card, one.thresholdLow);
-    }
+    LimitByChip(one, prefix);
     list.push_back(std::move(one));
   }
 }
 
-void ZoneSet::LimitByTjMax(TempZone& zone) const {
-  const auto limit = [&](int delta, const char* sign, int& threshold) {
+// By what the processor allows itself; a graphics card by the limits that the files have for its kind, where the zone
+// has none.
+void ZoneSet::LimitByChip(TempZone& zone, const std::string& prefix) const {
+  Chip& chip = chipOf(zone.chip);
+  const auto limit = [&](const char* key, int delta, const char* sign, int& threshold) {
     if (delta == kNoLimit) {
       return;
     }
     Log(zone.name + " : Delta value from ini  " + sign + " " + CDMUtil::ToString(delta));
-    if (!chipOf(zone.chip).ReadThreshold(zone.index, zone.tjMax)) {
+    if (!chip.ReadThreshold(zone.index, zone.tjMax)) {
+      Notices::Tell("The zone \"" + zone.name + "\" has no limit by \"" + prefix + key + "\": what the chip \"" +
+                    zone.chip + "\" allows at most is not known.");
       return;
     }
     threshold = Sum(zone.tjMax, -std::int64_t{delta});
     Log(zone.name + " : TjMax value using MSR " + sign + " " + CDMUtil::ToString(zone.tjMax));
     Log(zone.name + " : Max threshold value (TjMax - Delta) " + sign + " " + CDMUtil::ToString(threshold));
   };
-  limit(zone.tjmaxDelta, "=", zone.thresholdHigh);
-  limit(zone.coreTjmaxDelta, ":", zone.coreHigh);
+  limit("threshold.tjmax.delta", zone.tjmaxDelta, "=", zone.thresholdHigh);
+  limit("cpu.core.threshold.tjmax.delta", zone.coreTjmaxDelta, ":", zone.coreHigh);
+  if (zone.chip != kGraphics) {
+    return;
+  }
+  if (zone.thresholdHigh == kNoLimit && zone.thresholdDelta == kNoLimit) {
+    chip.ReadThreshold(zone.index, zone.thresholdHigh);
+  }
+  if (zone.thresholdLow == kNoLimit) {
+    chip.ReadLowLimitTemperature(zone.index, zone.thresholdLow);
+  }
 }
 
 void ZoneSet::Take(std::vector<TempZone> list, const ProbeSettings& settings) {
   zones = std::move(list);
+  groups.clear();
+  for (TempZone& zone : zones) {
+    zone.lastHighLimit = PlainHigh(zone);
+  }
   probe = settings;
   startTime = TimeStamp();
 }
 
 bool ZoneSet::LoadGroups() {
   constexpr const char* kBad = "Missing or invalid Zone Group information";
-  groups.clear();
+  std::vector<ZoneGroup> found;
   for (int n = 1;; ++n) {
     const std::string prefix = "test.tempzones.group." + CDMUtil::ToString(n);
     ZoneGroup group{ReadIniValue(prefix + ".name", ""), {}};
     if (group.name.empty()) {
+      groups = std::move(found);
       return true;
     }
     for (const int number : NumbersIn(IniReader::Instance().ReadIniSetting(prefix + ".zones", ""))) {
@@ -187,7 +235,7 @@ bool ZoneSet::LoadGroups() {
     if (group.zones.empty()) {
       throw mblib_exception(kBad);
     }
-    groups.push_back(std::move(group));
+    found.push_back(std::move(group));
   }
 }
 
@@ -217,11 +265,8 @@ int ZoneSet::GetHigh(int zone) {
   if (found == nullptr) {
     return kNoLimit;
   }
-  if (found->thresholdFix != kNoLimit) {
-    return found->thresholdFix;
-  }
-  if (found->thresholdHigh != kNoLimit || found->thresholdDelta == kNoLimit) {
-    return found->thresholdHigh;
+  if (const int plain = PlainHigh(*found); plain != kNoLimit || found->thresholdDelta == kNoLimit) {
+    return plain;
   }
   Chip& chip = chipOf(found->chip);
   int threshold = 0;
@@ -269,7 +314,6 @@ int ZoneSet::Read(int zone) {
 }
 
 int ZoneSet::ReadProchot(int zone) {
-  constexpr int kLastRegister = 0xFFFF;
   const TempZone* found = Find(zone);
   if (found == nullptr || found->prochotOffset < 0 || found->prochotOffset > kLastRegister) {
     return 0;
@@ -294,7 +338,9 @@ bool ZoneSet::Measure(int zone, int& value) {
   if (found == nullptr) {
     return false;
   }
-  value = found->lastReading = Read(zone);
+  found->lastReading = kChipReadFailed;  // ... it stays, when the chip throws
+  value = found->lastReading = steps.read ? steps.read(zone) : Read(zone);
+  found->isHighCounted = found->isLowCounted = false;
   if (value >= kFirstInvalidReading) {
     found->minReading = found->maxReading = value;
     ++found->invalidReadings;
@@ -311,16 +357,19 @@ bool ZoneSet::Measure(int zone, int& value) {
 
 bool ZoneSet::JudgeHigh(int zone, bool& high) {
   TempZone* found = At(zone);
-  return found != nullptr && found->lastReading < kFirstInvalidReading && found->lastReading != kNoLimit &&
-         Judge([](int value, int limit) { return value > limit; }, *found, GetHigh(zone), found->coreMax,
-               found->coreHigh, found->consecutiveHigh, high);
+  if (found == nullptr || !HasReading(*found)) {
+    return false;
+  }
+  found->lastHighLimit = steps.high ? steps.high(zone) : GetHigh(zone);
+  return Judge([](int value, int limit) { return value > limit; }, *found, found->lastHighLimit, found->coreMax,
+               found->coreHigh, found->consecutiveHigh, found->isHighCounted, high);
 }
 
 bool ZoneSet::JudgeLow(int zone, bool& low) {
   TempZone* found = At(zone);
-  return found != nullptr && found->lastReading < kFirstInvalidReading && found->lastReading != kNoLimit &&
-         Judge([](int value, int limit) { return value < limit; }, *found, GetLow(zone), found->coreMin,
-               found->coreLow, found->consecutiveLow, low);
+  return found != nullptr && HasReading(*found) &&
+         Judge([](int value, int limit) { return value < limit; }, *found, steps.low ? steps.low(zone) : GetLow(zone),
+               found->coreMin, found->coreLow, found->consecutiveLow, found->isLowCounted, low);
 }
 
 bool ZoneSet::Check(int zone, ZoneCheck& check) {
@@ -332,7 +381,7 @@ bool ZoneSet::Check(int zone, ZoneCheck& check) {
   bool applied = false;
   if (Measure(zone, check.value)) {
     if (found->prochot) {
-      check.prochotStatus = ReadProchot(zone);
+      check.prochotStatus = steps.prochot ? steps.prochot(zone) : ReadProchot(zone);
       found->prochotStatus = check.prochotStatus == 0 ? found->prochotStatus : check.prochotStatus;
     }
     const bool hasHigh = JudgeHigh(zone, check.high);

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -21,24 +22,32 @@ struct ProbeSettings {
   int retriesOnInvalid = 1;  // readings that may be none
 };
 
+/// The steps of a check, for a board class that does one in a way of its own. An empty one is the set's.
+struct ZoneSteps {
+  std::function<int(int zone)> read;
+  std::function<int(int zone)> prochot;
+  std::function<int(int zone)> high;
+  std::function<int(int zone)> low;
+};
+
 /// Zones are named by their number, from 1 in the order of the list; a number without a zone is false, or a reading
 /// or limit that is none, and touches nothing.
 class ZoneSet {
  public:
-  explicit ZoneSet(ChipFinder finder) : chipOf(std::move(finder)) {}
+  explicit ZoneSet(ChipFinder finder, ZoneSteps ways = {}) : chipOf(std::move(finder)), steps(std::move(ways)) {}
 
   /// The chip of zones that name none, in place of the files' own word for it.
   void PresetChip(std::string name) { presetChip = std::move(name); }
 
-  /// Reads zones and probe settings from the files, in place of those before. Throws what the chips throw of whose
-  /// thresholds limits are made.
+  /// Reads zones and probe settings from the files, in place of those before; their groups go. Throws what the chips
+  /// throw of whose thresholds limits are made.
   bool Load();
 
-  /// Puts zones there that come from elsewhere.
+  /// Puts zones there that come from elsewhere; the groups go.
   void Take(std::vector<TempZone> list, const ProbeSettings& settings);
 
   /// Reads the groups; the zones are loaded first. Throws mblib_exception for one that is empty or names a zone that
-  /// there is not.
+  /// there is not, and the groups stay as they were.
   bool LoadGroups();
 
   [[nodiscard]] const std::vector<TempZone>& List() const { return zones; }
@@ -64,8 +73,8 @@ class ZoneSet {
   /// counted as such.
   bool Check(int zone, ZoneCheck& check);
 
-  // The parts of a check: the reading (false when it is none), and what its last reading is by the one limit and by
-  // the other (false when there is no such limit).
+  // The parts of a check: the reading (false when it is none), and what the last reading is by the one limit and by
+  // the other (false when there is no such limit). However often a reading is judged, it counts once.
   bool Measure(int zone, int& value);
   bool JudgeHigh(int zone, bool& high);
   bool JudgeLow(int zone, bool& low);
@@ -80,10 +89,12 @@ class ZoneSet {
  private:
   [[nodiscard]] TempZone* At(int zone);
   [[nodiscard]] TempZone ReadZone(const std::string& prefix) const;
+  [[nodiscard]] std::string ReadZoneChip(const std::string& prefix) const;
   void AddZone(TempZone zone, const std::string& prefix, std::vector<TempZone>& list) const;
-  void LimitByTjMax(TempZone& zone) const;
+  void LimitByChip(TempZone& zone, const std::string& prefix) const;
 
   ChipFinder chipOf;
+  ZoneSteps steps;
   std::string presetChip;  // empty: the files say it
   std::vector<TempZone> zones;
   std::vector<ZoneGroup> groups;

@@ -5,7 +5,11 @@ namespace panelglow::boardtool {
 
 bool IsSimulated() { return false; }
 
-std::string PanelNow() { return {}; }
+const char* ProgramName() { return "panelglow-board"; }
+
+std::size_t PanelMark() { return 0; }
+
+std::string PanelMoves(std::size_t /*mark*/) { return {}; }
 
 void LetMachineNotice() {}
 

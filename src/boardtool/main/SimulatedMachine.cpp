@@ -1,4 +1,5 @@
 #include <cstdlib>
+#include <set>
 
 #include "boardtool/Installation.h"
 #include "boardtool/Machine.h"
@@ -8,15 +9,23 @@ namespace panelglow::boardtool {
 
 bool IsSimulated() { return true; }
 
+const char* ProgramName() { return "panelglow-board-sim"; }
+
 void LetMachineNotice() { platform::sim::CurrentSimulation().Time().SleepFor(1); }
 
-std::string PanelNow() {
+std::size_t PanelMark() { return platform::sim::CurrentSimulation().Panel().TimeLine().size(); }
+
+std::string PanelMoves(std::size_t mark) {
   const platform::sim::FrontPanel& panel = platform::sim::CurrentSimulation().Panel();
-  std::string lit;
-  for (std::size_t i = 0; i < panel.Leds().size(); ++i) {
-    lit += panel.IsLit(i) ? (lit.empty() ? "" : ", ") + panel.Leds()[i].name : "";
+  std::set<std::size_t> moved;
+  for (std::size_t i = mark; i < panel.TimeLine().size(); ++i) {
+    moved.insert(panel.TimeLine()[i].led);
   }
-  return "the panel shows " + (lit.empty() ? "nothing" : lit) + " lit";
+  std::string names;
+  for (const std::size_t led : moved) {
+    names += (names.empty() ? "" : ", ") + panel.Leds()[led].name;
+  }
+  return moved.empty() ? "nothing moves on the panel" : "on the panel moves " + names;
 }
 
 void UseMachine(const MachineOptions& options) {

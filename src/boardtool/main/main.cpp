@@ -30,7 +30,7 @@ constexpr int kWrongCall = 2;
 constexpr int kCouldNotRun = 3;
 
 int Complain(int code, const char* problem) {
-  std::fprintf(stderr, "panelglow-board: %s\n", problem);
+  std::fprintf(stderr, "%s: %s\n", ProgramName(), problem);
   return code;
 }
 
@@ -85,6 +85,15 @@ int OnMachine(const Between& between, const std::function<int()>& verb) {
   return verb();
 }
 
+// The verb that a trace is played to belongs to the call, too.
+class ReplayFormatter : public CLI::Formatter {
+ public:
+  std::string make_usage(const CLI::App* app, std::string name) const override {
+    std::string usage = CLI::Formatter::make_usage(app, std::move(name));
+    return usage.insert(usage.find_last_not_of('\n') + 1, " VERB [OPTIONS OF THE VERB]");
+  }
+};
+
 class Program {
  public:
   Program() {
@@ -116,13 +125,28 @@ class Program {
     if (!run_) {
       throw WrongCall("name the verb that the trace is played to, behind its file");
     }
+    RefuseWithReplay();
     UseMachine(between_.machine);
+    try_.isReplayed = !between_.replayFile.empty();
     const int code = OnMachine(between_, run_);
     RequireOutput(platform::TheHost().console);
     return code;
   }
 
  private:
+  // A trace is the machine, and all that can be recorded of it.
+  void RefuseWithReplay() const {
+    if (between_.replayFile.empty()) {
+      return;
+    }
+    if (!between_.traceFile.empty()) {
+      throw WrongCall("a trace that is played is not recorded again: leave --trace out");
+    }
+    if (!between_.machine.file.empty() || between_.machine.realTime) {
+      throw WrongCall("the trace answers in place of a machine: leave --machine and --real-time out");
+    }
+  }
+
   std::string Verbs() {
     std::string names;
     for (const CLI::App* const verb : app_.get_subcommands({})) {
@@ -151,9 +175,10 @@ class Program {
   }
 
   void AddBlink() {
-    CLI::App& verb = *app_.add_subcommand("blink", "Blinks one LED of this machine until a key is pressed");
+    CLI::App& verb = *app_.add_subcommand("blink", "Blinks one LED of this machine until Enter is pressed");
     verb.add_option("led", blink_.led, "One of " + BoardLedNames())->required();
-    verb.add_option("--seconds", blink_.seconds, "Blink so long, and look for no key")->check(CLI::Range(1, 86400));
+    verb.add_option("--seconds", blink_.seconds, "Blink so long, and do not wait for Enter")
+        ->check(CLI::Range(1, 86400));
     AddFolder(verb, blink_.folder);
     verb.callback([this] {
       run_ = [this] {
@@ -175,9 +200,11 @@ class Program {
                             int (*read)(const ReadOptions&, const Person&)) {
       CLI::App& verb = *app_.add_subcommand(name, what);
       AddFolder(verb, read_.folder);
-      verb.add_flag("--json", read_.json, "For programs");
-      verb.add_flag("--watch", read_.watch, "Again and again until a key is pressed");
-      verb.add_option("--rounds", read_.rounds, "So many readings while watching")->check(CLI::Range(1, 1000000));
+      verb.add_flag("--json", read_.json, "For programs; with --watch JSON Lines: each reading is one line");
+      CLI::Option* const watch = verb.add_flag("--watch", read_.watch, "Again and again until Enter is pressed");
+      verb.add_option("--rounds", read_.rounds, "So many readings while watching")
+          ->check(CLI::Range(1, 1000000))
+          ->needs(watch);
       if (hasLog) {
         verb.add_option("--log", read_.logFile, "Write the test's log there, and its XML results beside it");
       }
@@ -197,9 +224,9 @@ class Program {
     CLI::App& verb =
         *app_.add_subcommand("try", "Finds the lamps of a board that nothing knows: one bit or line after the other");
     verb.add_option("--chip", try_.chip, "g_iospace, g_memoryspace, g_ite or g_it8702")->required();
-    verb.add_option("--at", try_.at, "Port or address of the register, as 0xA20");
-    CLI::Option* const bits = verb.add_option("--bits", try_.range, "Bits of the register (default: 0-7)");
-    verb.add_option("--lines", try_.range, "Lines of the chip, as 20-27")->excludes(bits);
+    verb.add_option("--at", try_.at, "Port or address of the register of g_iospace or g_memoryspace, as 0xA20");
+    CLI::Option* const bits = verb.add_option("--bits", try_.bits, "Bits of the register (default: 0-7)");
+    verb.add_option("--lines", try_.lines, "Lines of g_ite or g_it8702, as 20-27")->excludes(bits);
     verb.add_option("--board", try_.systemId, "System id for the sections (default: the machine's)");
     AddFolder(verb, try_.folder);
     verb.callback([this] {
@@ -214,10 +241,11 @@ class Program {
     CLI::App& verb = *app_.add_subcommand("replay", "Runs another verb on a recorded trace in place of the machine");
     verb.add_option("file", between_.replayFile, "The trace")->required();
     verb.require_subcommand(0, 1);
+    verb.formatter(std::make_shared<ReplayFormatter>());
     verb.footer("The verb with its options stands behind the file: replay trace.txt blink power-green --seconds 5");
   }
 
-  CLI::App app_{"What the board library makes of an installation's files and of a machine.", "panelglow-board"};
+  CLI::App app_{"What the board library makes of an installation's files and of a machine.", ProgramName()};
   Between between_;
   ExplainOptions explain_;
   CheckOptions check_;

@@ -91,6 +91,19 @@ void WriteReport(Simulation& simulation, const std::string& path) {
 
 }  // namespace
 
+namespace {
+
+// The last thing that a run does. What follows it in the process writes no requests.
+void CloseTrace(std::FILE* file) {
+  CurrentSimulation().Trace().WriteTo(nullptr);
+  const bool isWhole = std::ferror(file) == 0;
+  if (std::fclose(file) != 0 || !isWhole) {
+    GiveUp("the trace file " + Setting(kTraceVariable) + " did not take everything");
+  }
+}
+
+}  // namespace
+
 std::unique_ptr<Simulation> MakeSimulationFromEnvironment() {
   SimulationOptions options;
   options.realFiles = true;
@@ -112,11 +125,12 @@ std::unique_ptr<Simulation> MakeSimulationFromEnvironment() {
     description.driver.present = false;
     if (!machineFile.empty()) {
       std::ifstream file(machineFile, std::ios::binary);
-      std::ostringstream text;
-      text << file.rdbuf();
-      if (!file) {
+      file.peek();
+      if (file.fail()) {  // also a folder, which opens
         GiveUp("the machine's file " + machineFile + " cannot be read");
       }
+      std::ostringstream text;
+      text << file.rdbuf();
       description = ParseMachine(text.str(), machineFile);
     }
     auto simulation = std::make_unique<Simulation>(std::move(description), options);
@@ -133,7 +147,10 @@ std::unique_ptr<Simulation> MakeSimulationFromEnvironment() {
       if (file == nullptr) {
         GiveUp("the trace file " + trace + " cannot be written");
       }
-      simulation->Trace().WriteTo(file);  // closed by the end of the process
+      simulation->Trace().WriteTo(file);
+      static std::FILE* written = nullptr;
+      written = file;
+      std::atexit([] { CloseTrace(written); });
     }
     if (const std::string report = Setting(kReportVariable); !report.empty()) {
       simulation->Time().OnStuck([raw = simulation.get(), report](const std::string&) { WriteReport(*raw, report); });

@@ -68,23 +68,33 @@ class DashController::LowPin {
   bool isDriven = false;
 };
 
-bool DashController::LineFollows(const std::function<int()>& readLine, DashWatcher& watcher) const {
+std::optional<bool> DashController::LineFollows(const std::function<int()>& readLine, DashWatcher& watcher) const {
+  bool isRead = true;
   const auto sees = [&](bool high) {
     platform::TheHost().clock.Sleep(kPinSettle_ms);
-    const bool follows = readLine() == LineState(high);
+    const int state = readLine();
+    isRead = isRead && state != kNoSuchLineState;
+    const bool follows = state == LineState(high);
     watcher.See(high, follows);
     return follows;
   };
   if (!Change(0, kOutputEnabled, watcher)) {
-    return false;
+    return std::nullopt;
   }
   LowPin pin(*this, watcher);
   bool followsLow = false;
   {
     const ConfigMode low(pin);
-    followsLow = pin.IsDriven() && sees(false);
+    if (!pin.IsDriven()) {
+      return std::nullopt;
+    }
+    followsLow = sees(false);
   }
-  return pin.IsDriven() && sees(true) && followsLow;
+  if (!pin.IsDriven()) {
+    return std::nullopt;
+  }
+  const bool followsHigh = sees(true);
+  return isRead ? std::optional(followsLow && followsHigh) : std::nullopt;
 }
 
 bool DashController::Change(std::uint32_t clear, std::uint32_t set, DashWatcher& watcher) const {

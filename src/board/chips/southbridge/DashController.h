@@ -39,8 +39,9 @@ class DashController {
   [[nodiscard]] std::uint64_t Base() const { return base; }
 
   /// Drives the pin low and then high, and looks 10 ms behind each whether the line follows: true when it does both
-  /// times. The pin ends high, whatever was seen, once it could be driven at all.
-  [[nodiscard]] bool LineFollows(const std::function<int()>& readLine, DashWatcher& watcher) const;
+  /// times. Nothing when the controller's memory cannot be reached or the line not be read. The pin ends high,
+  /// whatever was seen, once it could be driven at all.
+  [[nodiscard]] std::optional<bool> LineFollows(const std::function<int()>& readLine, DashWatcher& watcher) const;
 
  private:
   class LowPin;

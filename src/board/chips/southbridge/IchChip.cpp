@@ -221,13 +221,15 @@ bool IchChip::RestorePowerLedState() {
 
 // ---- others
 
-bool IchChip::DetectDashCable(int line, const std::string& idList) {
+int IchChip::ReadDashCable(int line, const std::string& idList) {
   if (!HasLine(line)) {
-    return false;
+    return kNoSuchLine;
   }
   DashWatcher nobody;
   const std::optional<DashController> controller = DashController::Find(devio, idList);
-  return controller && controller->LineFollows([&] { return ReadLine(line); }, nobody);
+  const std::optional<bool> follows =
+      controller ? controller->LineFollows([&] { return ReadLine(line); }, nobody) : std::nullopt;
+  return follows ? LineState(*follows) : kNoSuchLine;
 }
 
 }  // namespace panelglow

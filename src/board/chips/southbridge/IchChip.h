@@ -43,7 +43,7 @@ class IchChip : public Chip {
 
   /// Drives an output pin of a network controller low and high, and looks whether the line follows. `idList`: its
   /// vendor, device, subsystem vendor and subsystem device as numbers, separated by blanks. The pin ends high.
-  bool DetectDashCable(int line, const std::string& idList) override;
+  int ReadDashCable(int line, const std::string& idList) override;
 
  protected:
   /// `base`: first port of the power management block.
