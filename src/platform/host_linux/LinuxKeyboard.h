@@ -5,10 +5,12 @@
 // The lock state itself is not touched: nothing is typed in other letters.
 #pragma once
 
-#include <atomic>
+#include <map>
+#include <mutex>
 #include <string>
 
 #include "platform/Keyboard.h"
+#include "platform/posix/Descriptor.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -21,8 +23,13 @@ class LinuxKeyboard : public Keyboard {
   void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) override;
 
  private:
+  /// Opens what has come since the last press. The kernel's error number of the last refusal, or 0.
+  int OpenNewDevices();
+
   std::string folder_;
-  std::atomic<bool> isTold_{false};
+  std::mutex guard_;
+  std::map<std::string, posix::Descriptor> devices_;  // by path; kept, as closing one takes tens of milliseconds
+  bool isTold_ = false;
 };
 
 }  // namespace panelglow::platform::host_linux
