@@ -1,5 +1,6 @@
 #include "boardtool/Blink.h"
 
+#include <algorithm>
 #include <set>
 
 #include "boardtool/BoardOnMachine.h"
@@ -53,11 +54,13 @@ class KeptLed {
 
 // Waits in short looks; false when the blinking is to end.
 bool WaitPhase(const Person& person, bool forKey, std::uint32_t wait_ms) {
-  for (std::uint32_t waited_ms = 0; waited_ms < wait_ms; waited_ms += kLook_ms) {
+  platform::Clock& clock = platform::TheHost().clock;
+  const std::uint32_t begin = clock.TickCount();
+  for (std::uint32_t waited_ms = 0; waited_ms < wait_ms; waited_ms = clock.TickCount() - begin) {
     if (StopRequest::IsMade() || (forKey && person.hasPressedKey())) {
       return false;
     }
-    platform::TheHost().clock.Sleep(kLook_ms);
+    clock.Sleep(std::min(kLook_ms, wait_ms - waited_ms));
   }
   return true;
 }

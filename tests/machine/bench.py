@@ -161,6 +161,8 @@ class Bench:
                 dialog = [place for place in self.screen.windows() if place[1] > 500][0]
                 quiet = time.time()
             choice = self._blinking(buttons, quiet)
+            if choice is not None and not self.pressed:
+                self.screen.picture(os.path.join(self.folder, "dialog.png"))
             if choice is not None:
                 if wrong == len(self.pressed):
                     choice = (choice + 1) % len(buttons)
@@ -172,11 +174,32 @@ class Bench:
                 quiet = time.time()
             time.sleep(0.05)
 
+    def open_dialog(self, patience=60):
+        """Answers the prompt ahead of a test. True when the dialog is there."""
+        end = time.time() + patience
+        while time.time() < end and self.machine.qemu.poll() is None:
+            places = self.screen.windows()
+            if any(place[1] > 500 for place in places):
+                return True
+            if places:
+                self.screen.do("key", "Return")
+            time.sleep(0.3)
+        return False
+
+    def await_change(self, light, since, patience=30):
+        """True when a judge has seen this light change."""
+        end = time.time() + patience
+        while time.time() < end:
+            if any(at > since for at, _, _ in self.changes(light)):
+                return True
+            time.sleep(0.1)
+        return False
+
     def _blinking(self, buttons, quiet):
         now = time.time()
-        recent = [name for at, name, _ in self.changes() if at > max(quiet, now - 4)]
+        recent = [name for at, name, _ in self.changes() if at > max(quiet, now - 5)]
         for number, (_, lights) in enumerate(buttons):
-            if any(recent.count(light) >= 3 for light in lights):
+            if any(recent.count(light) >= 5 for light in lights):
                 return number
         if now - quiet > 6 and not recent:
             return next(number for number, (_, lights) in enumerate(buttons) if not lights)

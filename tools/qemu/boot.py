@@ -23,6 +23,7 @@ mkdir /layer/above /layer/work
 mount -t overlay -o lowerdir=/host,upperdir=/layer/above,workdir=/layer/work files /root
 for own in tmp run var/tmp; do mount -t tmpfs own /root/$own; chmod 1777 /root/$own; done
 mkdir -p /root/out
+mount -t securityfs security /sys/kernel/security
 for folder in proc sys dev out; do mount --move /$folder /root/$folder; done
 mkdir -p /root/dev/pts /root/dev/shm
 mount -t devpts devpts /root/dev/pts
@@ -43,6 +44,11 @@ DISK_MODULES = {"ide": ["ata_piix", "sd_mod"], "ahci": ["ahci", "sd_mod"], "nvme
                 "virtio-scsi": ["virtio_scsi", "sd_mod"], "megasas": ["megaraid_sas", "sd_mod"]}
 NETWORK_MODULES = {"e1000": ["e1000"], "e1000e": ["e1000e"], "virtio-net-pci": ["virtio_net"]}
 DISK_SIZE = 16 << 20
+
+def read_bytes(path):
+    with open(path, "rb") as f:
+        return f.read()
+
 
 def fetch_kernel(folder):
     """Downloads the kernel package that Debian's "linux-image-amd64" stands for and unpacks it below `folder`, unless
@@ -78,7 +84,7 @@ def unpacked_kernel(image, release):
     machine needs 1 s once. Falls back on the packed one."""
     kept = os.path.join(tempfile.gettempdir(), "panelglow-kernel-%s-%d" % (release, os.stat(image).st_mtime))
     if not os.path.exists(kept):
-        data = open(image, "rb").read()
+        data = read_bytes(image)
         start = data.find(b"\xfd7zXZ\x00")
         if start < 0:
             return image
@@ -99,7 +105,8 @@ def module_order(tree, wanted):
         for name in names:
             if name.endswith(".ko"):
                 where[name[:-3].replace("-", "_")] = os.path.join(path, name)
-    builtin = {os.path.basename(line.strip())[:-3].replace("-", "_") for line in open(tree + "/modules.builtin")}
+    with open(tree + "/modules.builtin") as f:
+        builtin = {os.path.basename(line.strip())[:-3].replace("-", "_") for line in f}
     order = []
 
     def add(name):
@@ -108,7 +115,7 @@ def module_order(tree, wanted):
             return
         if name not in where:
             sys.exit("tools/machine: the kernel has no module " + name)
-        needs = re.search(rb"\0depends=([^\0]*)\0", open(where[name], "rb").read())
+        needs = re.search(rb"\0depends=([^\0]*)\0", read_bytes(where[name]))
         for need in needs.group(1).decode().split(",") if needs else []:
             if need:
                 add(need)
@@ -133,10 +140,10 @@ def archive(files):
 def first_files(busybox, modules, options, see):
     folders = ["bin", "dev", "proc", "sys", "modules", "host", "layer", "out", "root"]
     files = {name: (0o40755, b"") for name in folders}
-    files["bin/busybox"] = (0o100755, open(busybox, "rb").read())
+    files["bin/busybox"] = (0o100755, read_bytes(busybox))
     files["init"] = (0o100755, INIT.encode())
     for path in modules:
-        files["modules/" + os.path.basename(path)] = (0o100644, open(path, "rb").read())
+        files["modules/" + os.path.basename(path)] = (0o100644, read_bytes(path))
     names = [os.path.basename(p) for p in modules]
     files["modules/order"] = (0o100644, "".join(
         n + " " + options.get(n[:-3].replace("-", "_"), "") + "\n" for n in names).encode())

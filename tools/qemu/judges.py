@@ -57,7 +57,8 @@ class Monitor:
 
     def __init__(self, path, timeline):
         self.lock, self.timeline = threading.Lock(), timeline
-        self.stream = connect(path).makefile("rw", encoding="utf-8")
+        self.socket = connect(path)
+        self.stream = self.socket.makefile("rw", encoding="utf-8")
         self.stream.readline()
         self("qmp_capabilities")
 
@@ -78,6 +79,10 @@ class Monitor:
                     return answer["return"]
                 else:
                     raise RuntimeError(answer["error"]["desc"])
+
+    def close(self):
+        self.stream.close()
+        self.socket.close()
 
     def human(self, line):
         return self("human-monitor-command", **{"command-line": line})

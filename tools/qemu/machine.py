@@ -77,6 +77,12 @@ class VirtualMachine:
             self.qemu.kill()
             self.qemu.wait()
         self.over.set()
+        if self.qemu:
+            self.qemu.stdout.close()
+            self.qemu.stderr.close()
+        if self.monitor:
+            self.monitor.close()
+        self.timeline.live.close()
         shutil.rmtree(self.work, ignore_errors=True)
 
     # ---- before

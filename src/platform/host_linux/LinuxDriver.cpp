@@ -8,6 +8,7 @@
 #include <array>
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <vector>
@@ -47,6 +48,19 @@ std::string Lockdown() {
   return begin == std::string::npos || end == std::string::npos ? "" : line.substr(begin + 1, end - begin - 1);
 }
 
+// Whether this thread holds CAP_SYS_RAWIO, by the mask that the kernel prints.
+bool HasRawAccess() {
+  constexpr std::string_view kField = "CapEff:";
+  constexpr unsigned kRawIo = 17;
+  std::ifstream file("/proc/thread-self/status");
+  for (std::string line; std::getline(file, line);) {
+    if (line.rfind(kField, 0) == 0) {
+      return (std::strtoull(line.c_str() + kField.size(), nullptr, 16) >> kRawIo & 1U) != 0;
+    }
+  }
+  return false;
+}
+
 std::string WhatToDo(int error) {
   const std::string lockdown = Lockdown();
   if (!lockdown.empty() && lockdown != "none") {
@@ -54,6 +68,10 @@ std::string WhatToDo(int error) {
   }
   if (error == ENOSYS || error == ENOENT) {
     return "this kernel has no such door: it needs one with I/O port access and /dev/mem";
+  }
+  if (HasRawAccess()) {
+    return "the right is there, so the kernel itself forbids it: it may be locked down (secure boot), which "
+           "/sys/kernel/security/lockdown would tell";
   }
   return ::geteuid() == 0 ? "it needs the capability CAP_SYS_RAWIO, which a container does not have"
                           : "start it as root, or give it CAP_SYS_RAWIO and the right to /dev/mem";

@@ -1,0 +1,176 @@
+"""Whole runs of the shipped programs on a virtual PC. The judges are its devices: tests look at what those saw, and at the
+program's lines and exit code; never into the program."""
+import json
+import os
+import subprocess
+import time
+import unittest
+
+from bench import PROGRAMS, Bench, in_background
+
+E001 = ["--smbios", "type=2,product=E001-board", "--registers", "--trace", "memory_region_ops_write=pc-testdev"]
+TEST = "panelglow-diags -subtest=CustomLEDTest -LEDTimeout=20 "
+PORT_BUTTONS = [("PowerGreen", ["ioporte0.0"]), ("PowerRed", ["ioporte0.1"]), ("NoLED", [])]
+PHASE_S, LOCK_KEY_PHASE_S, TOLERANCE_S = 0.5, 0.2, 0.003
+
+
+def run_counts(text):
+    """Exit codes that a script printed as "rc=N"."""
+    return [int(line[3:]) for line in text.split("\n") if line.startswith("rc=")]
+
+
+class Runs(unittest.TestCase):
+    def assert_phase(self, bench, light, expected, tolerance=TOLERANCE_S):
+        phase = bench.median_phase(light)
+        self.assertIsNotNone(phase, light + " was not seen to blink")
+        self.assertLessEqual(abs(phase - expected), tolerance, "%s: %.4f s" % (light, phase))
+
+    def assert_no_crash(self, bench):
+        self.assertNotRegex(bench.text("console"), r"segfault|trap invalid opcode|general protection")
+
+    def test_every_door(self):
+        options = E001 + ["--timeout", "200", "--keyboard-leds", "--network", "virtio-net-pci", "--disk", "ahci",
+                          "--disk", "nvme", "--modules", "evdev,vivid:n_devs=1:node_types=1", "--console",
+                          "VIDIOC_STREAMO"]
+        buttons = [("NumLock", ["num"]), ("CapsLock", ["caps"]), ("ScrollLock", ["scroll"]), *PORT_BUTTONS,
+                   ("DriveRed", ["ioporte2.3"]), ("HardDrive", ["judge0", "judge1"]), ("Network", ["net"]),
+                   ("Webcam", ["camera"])]
+        script = TEST + "-SectionID=Bench; echo rc=$?; busybox ip route"
+        with Bench("every-door", options, script) as bench:
+            bench.operate(buttons)
+            bench.finish()
+            self.assertEqual(run_counts(bench.text()), [0], bench.text()[-2000:])
+            self.assertEqual({name for name, _ in buttons}, set(bench.pressed))
+            self.assertEqual(bench.pressed.count("HardDrive"), 2)  # one for each controller
+            for light in ("ioporte0.0", "ioporte0.1", "ioporte2.3"):
+                self.assert_phase(bench, light, PHASE_S)
+                self.assertEqual(bench.last(light), 0)
+            for light in ("num", "caps", "scroll"):
+                self.assert_phase(bench, light, LOCK_KEY_PHASE_S)
+                self.assertEqual(bench.last(light), 0)
+            self.assertIsNotNone(bench.median_phase("camera"))
+            self.assertEqual((bench.last("net"), bench.last("camera")), (1, 0))
+            self.assertIn("10.77.0.0/16 via 10.9.8.1", bench.text())
+            contents = [seen["content"] for _, judge, seen in bench.machine.timeline.notes if "content" in seen]
+            self.assertEqual(contents, ["unchanged", "unchanged"])
+            self.assert_no_crash(bench)
+
+    def test_device_memory_and_an_ide_disk_in_use(self):
+        options = ["--machine", "pc", "--smbios", "type=2,product=E002-board", "--registers", "--trace",
+                   "memory_region_ops_write=pc-testdev", "--disk", "ide", "--modules", "ext4,crc32c_generic"]
+        buttons = [("PowerGreen", ["iomem400.6"]), ("PowerRed", ["iomem404.6"]), ("NoLED", []),
+                   ("ChargeWhite", ["iomem408.6"]), ("ChargeAmber", ["iomem40c.6"]), ("HardDrive", ["judge0"])]
+        script = "mkfs.ext4 -q -F /dev/sda && mkdir /tmp/used && mount /dev/sda /tmp/used\n" + TEST
+        with Bench("memory", options, script + "-SectionID=Memory; echo rc=$?; umount /tmp/used") as bench:
+            bench.operate(buttons)
+            bench.finish()
+            self.assertEqual(run_counts(bench.text()), [0], bench.text()[-2000:] + bench.text("stderr"))
+            for light in ("iomem400.6", "iomem404.6", "iomem408.6", "iomem40c.6"):
+                self.assert_phase(bench, light, PHASE_S)
+                self.assertEqual(bench.last(light), 0)
+            self.assertIn("/dev/sda is in use (mounted at /tmp/used)", bench.text("stderr"))
+            begin = min(at for at, light, _ in bench.changes() if light == "judge0")
+            writes = [seen["writes"] for at, judge, seen in bench.machine.timeline.notes
+                      if judge == "disk" and at > begin + 0.2 and "writes" in seen]
+            self.assertLess(sum(writes), 40, "a disk in use is read, not written")  # the filesystem's own are few
+
+    def test_the_codec(self):
+        options = ["--smbios", "type=2,product=E003-board", "--device-log", "verb 0x715", "--qemu",
+                   "-device ich9-intel-hda,addr=1b,debug=3 -device hda-duplex,debug=3"]
+        with Bench("codec", options, TEST + "-SectionID=Codec; echo rc=$?") as bench:
+            bench.operate([("Speaker", ["pin0"]), ("Microphone", ["pin3"]), ("NoLED", [])])
+            bench.finish()
+            self.assertEqual(run_counts(bench.text()), [0], bench.text()[-1500:] + bench.text("stderr"))
+            self.assertTrue(bench.changes())
+
+    def test_a_wrong_answer_a_signal_and_a_lost_display_leave_the_registers_as_they_were(self):
+        # The first run answers wrong, the second is ended by a signal, the third loses its display.
+        script = "".join(
+            "%s %s-SectionID=Ports >/out/run%d; echo rc=$?\n" % (prefix, TEST, number)
+            for number, prefix in enumerate(["", "timeout -s TERM 9", ""]))
+        with Bench("ends", E001, script) as bench:
+            bench.operate(PORT_BUTTONS, wrong=0)
+            self.assertTrue(bench.open_dialog())
+            self.assertTrue(bench.await_change("ioporte0.0", time.time()) or bench.changes())
+            while os.path.exists(os.path.join(bench.folder, "run2")) is False and bench.machine.qemu.poll() is None:
+                time.sleep(0.2)
+            self.assertTrue(bench.open_dialog())
+            time.sleep(6)  # at least one LED in its turn
+            bench.screen.kill()
+            bench.finish()
+            codes = run_counts(bench.text())
+            self.assertEqual(len(codes), 3, bench.text() + bench.text("stderr"))
+            self.assertTrue(all(codes), codes)
+            self.assertRegex(bench.text("run0"), r"TestFailed 7710(17|20|19)")
+            self.assertIn("EndOfTest", bench.text("run1"))
+            self.assertIn("TestFailed 990640", bench.text("run2"))
+            for light in ("ioporte0.0", "ioporte0.1"):
+                self.assertEqual(bench.last(light) or 0, 0)
+            self.assertGreater(len(bench.changes()), 6)
+            self.assert_no_crash(bench)
+
+    def test_what_is_gone_in_the_middle(self):
+        # A disk, an adapter and a camera go while they are used; nobody presses anything any more.
+        options = E001 + ["--network", "virtio-net-pci", "--disk", "virtio-scsi", "--modules",
+                          "evdev,vivid:n_devs=1:node_types=1", "--timeout", "150"]
+        script = """
+        for gone in '/sys/bus/platform/drivers/vivid/unbind vivid.0' \\
+                    "$(readlink -f /sys/class/net/bench-lan/device/driver)/unbind \\
+                     $(basename $(readlink -f /sys/class/net/bench-lan/device))"; do
+          set -- $gone; (sleep 12; echo $2 > $1) &
+        done
+        timeout -s KILL 100 panelglow-diags -subtest=CustomLEDTest -LEDTimeout=10 -SectionID=Bench; echo rc=$?"""
+        with Bench("gone", options, script) as bench:
+            self.assertTrue(bench.open_dialog())
+            time.sleep(4)
+            in_background(lambda: bench.machine.monitor("device_del", id="d0"))
+            bench.finish()
+            self.assertEqual(run_counts(bench.text()), [1], bench.text()[-1500:] + bench.text("stderr"))
+            for light in ("ioporte0.0", "ioporte0.1", "ioporte2.3"):
+                self.assertEqual(bench.last(light) or 0, 0)
+            self.assertRegex(bench.text("console") + bench.text("stderr"), "")
+            self.assert_no_crash(bench)
+
+    def test_the_integrators_program(self):
+        script = """
+        panelglow-board report --json > /out/report.json; echo rc=$?
+        panelglow-board detect > /out/detect; echo rc=$?
+        panelglow-board blink power-green --seconds 4; echo rc=$?
+        panelglow-board blink power-green --seconds 2 --trace /tmp/blink.trace; echo rc=$?; cp /tmp/blink.trace /out
+        panelglow-board blink power-red --seconds 3 & panelglow-board blink power-red --seconds 3; echo rc=$?; wait
+        timeout --preserve-status -s TERM 4 panelglow-diags -subtest=LEDStatusIndicator -BlinkSpeed=250; echo rc=$?"""
+        with Bench("integrator", E001 + ["--disk", "ahci"], script, display=False) as bench:
+            bench.finish()
+            self.assertEqual(run_counts(bench.text()), [0] * 6, bench.text() + bench.text("stderr"))
+            self.assert_phase(bench, "ioporte0.0", PHASE_S)
+            for light in ("ioporte0.0", "ioporte0.1"):
+                self.assertEqual(bench.last(light), 0)
+            report = json.loads(bench.text("report.json"))
+            self.assertIn("E001", json.dumps(report))
+            replay = subprocess.run([os.path.join(PROGRAMS, "panelglow-board"), "replay",
+                                     os.path.join(bench.folder, "blink.trace"), "blink", "power-green", "--seconds",
+                                     "2"], cwd=os.path.join(os.path.dirname(PROGRAMS), "..", "..", "installation"),
+                                    capture_output=True, text=True, timeout=60)
+            self.assertEqual(replay.returncode, 0, replay.stdout + replay.stderr)
+
+    def test_what_the_kernel_refuses(self):
+        script = """
+        panelglow-diags -subtest=LEDStatusIndicator -BlinkTime=1; echo rc=$?
+        {test}-SectionID=Ports; echo rc=$?
+        panelglow-diags -version=true; echo rc=$?""".format(test=TEST)
+        cases = [("lockdown", ["--append", "lockdown=integrity"], "", "the kernel is locked down"),
+                 ("nobody", [], "chmod -R a+rwX /tmp/bench; exec setpriv --reuid 1000 --regid 1000 --clear-groups "
+                  "/bin/sh -c '", "start it as root")]
+        for name, options, prefix, sentence in cases:
+            with self.subTest(name), Bench(name, E001 + options, prefix + script + ("'" if prefix else ""),
+                                           display=False) as bench:
+                bench.finish()
+                codes = run_counts(bench.text())
+                self.assertEqual(codes[1:], [1, 0], bench.text() + bench.text("stderr"))
+                self.assertIn("TestFailed 020472", bench.text())
+                self.assertIn(sentence, bench.text("stderr"))
+                self.assertEqual(bench.changes(), [])
+
+
+if __name__ == "__main__":
+    unittest.main()
