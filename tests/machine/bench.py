@@ -16,8 +16,8 @@ from qemu import machine  # noqa: E402
 OUT = os.path.join(ROOT, "build", "machine", "runs")
 PROGRAMS = os.path.join(ROOT, "build", "release", "bin")
 
-# The set-up of a bench, in the guest: the installation with this machine's files, the adapter with its address, the
-# camera's driver telling of its stream.
+# The set-up of a bench, in the guest: the installation with this machine's files, the adapter with its address, the power
+# lamp green at port 0xE0 as the firmware of a real one would leave it, the camera's driver telling of its stream.
 SET_UP = """
 mkdir /tmp/bench; cp -r {root}/installation/. {root}/machines/qemu/*.ini {root}/machines/qemu/*.xml /tmp/bench
 cd /tmp/bench; export PATH={programs}:$PATH
@@ -27,6 +27,7 @@ for link in /sys/class/net/eth*; do
   busybox ifconfig bench-lan 10.9.8.7 netmask 255.255.255.0
   busybox ip route add 10.77.0.0/16 via 10.9.8.1
 done
+printf '\\001' | dd of=/dev/port bs=1 seek=224 conv=notrunc 2>/dev/null
 [ -e /sys/class/video4linux/video0 ] && echo 1 > /sys/class/video4linux/video0/dev_debug && busybox dmesg -n 8
 """
 

@@ -9,8 +9,10 @@ import unittest
 from bench import PROGRAMS, Bench, in_background
 
 E001 = ["--smbios", "type=2,product=E001-board", "--registers", "--trace", "memory_region_ops_write=pc-testdev"]
-TEST = "panelglow-diags -subtest=CustomLEDTest -LEDTimeout=20 "
+TEST = "panelglow-diags -subtest=CustomLEDTest -LEDTimeout=20 -Retries=0 "
 PORT_BUTTONS = [("PowerGreen", ["ioporte0.0"]), ("PowerRed", ["ioporte0.1"]), ("NoLED", [])]
+# What the port lamps are when nothing blinks: power green, red and drive dark.
+AT_REST = {"ioporte0.0": 1, "ioporte0.1": 0, "ioporte2.3": 0}
 PHASE_S, LOCK_KEY_PHASE_S, TOLERANCE_S = 0.5, 0.2, 0.003
 
 
@@ -24,6 +26,10 @@ class Runs(unittest.TestCase):
         phase = bench.median_phase(light)
         self.assertIsNotNone(phase, light + " was not seen to blink")
         self.assertLessEqual(abs(phase - expected), tolerance, "%s: %.4f s" % (light, phase))
+
+    def assert_at_rest(self, bench):
+        for light, state in AT_REST.items():
+            self.assertEqual(bench.last(light) or 0, state, light)
 
     def assert_no_crash(self, bench):
         self.assertNotRegex(bench.text("console"), r"segfault|trap invalid opcode|general protection")
@@ -42,9 +48,9 @@ class Runs(unittest.TestCase):
             self.assertEqual(run_counts(bench.text()), [0], bench.text()[-2000:])
             self.assertEqual({name for name, _ in buttons}, set(bench.pressed))
             self.assertEqual(bench.pressed.count("HardDrive"), 2)  # one for each controller
-            for light in ("ioporte0.0", "ioporte0.1", "ioporte2.3"):
+            for light in AT_REST:
                 self.assert_phase(bench, light, PHASE_S)
-                self.assertEqual(bench.last(light), 0)
+            self.assert_at_rest(bench)
             for light in ("num", "caps", "scroll"):
                 self.assert_phase(bench, light, LOCK_KEY_PHASE_S)
                 self.assertEqual(bench.last(light), 0)
@@ -65,9 +71,10 @@ class Runs(unittest.TestCase):
             bench.operate(buttons)
             bench.finish()
             self.assertEqual(run_counts(bench.text()), [0], bench.text()[-2000:] + bench.text("stderr"))
-            for light in ("iomem400.6", "iomem404.6", "iomem408.6", "iomem40c.6"):
+            # As chip.ini says of this chip: after a test the power LED is white, the others are dark.
+            for light, after in (("iomem400.6", 1), ("iomem404.6", 0), ("iomem408.6", 0), ("iomem40c.6", 0)):
                 self.assert_phase(bench, light, PHASE_S)
-                self.assertEqual(bench.last(light), 0)
+                self.assertEqual(bench.last(light), after, light)
             self.assertIn("/dev/sda is in use (mounted at /tmp/used)", bench.text("stderr"))
             begin = min(at for at, light, _ in bench.changes() if light == "judge0")
             writes = [seen["writes"] for at, judge, seen in bench.machine.timeline.notes
@@ -104,8 +111,7 @@ class Runs(unittest.TestCase):
             self.assertRegex(bench.text("run0"), r"TestFailed 7710(17|20|19)")
             self.assertIn("EndOfTest", bench.text("run1"))
             self.assertIn("TestFailed 990640", bench.text("run2"))
-            for light in ("ioporte0.0", "ioporte0.1"):
-                self.assertEqual(bench.last(light) or 0, 0)
+            self.assert_at_rest(bench)
             self.assertGreater(len(bench.changes()), 6)
             self.assert_no_crash(bench)
 
@@ -119,16 +125,15 @@ class Runs(unittest.TestCase):
                      $(basename $(readlink -f /sys/class/net/bench-lan/device))"; do
           set -- $gone; (sleep 12; echo $2 > $1) &
         done
-        timeout -s KILL 100 panelglow-diags -subtest=CustomLEDTest -LEDTimeout=10 -SectionID=Bench; echo rc=$?"""
+        timeout -s KILL 120 {test}-LEDTimeout=8 -SectionID=Bench; echo rc=$?""".format(test=TEST)
         with Bench("gone", options, script) as bench:
             self.assertTrue(bench.open_dialog())
             time.sleep(4)
             in_background(lambda: bench.machine.monitor("device_del", id="d0"))
             bench.finish()
             self.assertEqual(run_counts(bench.text()), [1], bench.text()[-1500:] + bench.text("stderr"))
-            for light in ("ioporte0.0", "ioporte0.1", "ioporte2.3"):
-                self.assertEqual(bench.last(light) or 0, 0)
-            self.assertRegex(bench.text("console") + bench.text("stderr"), "")
+            self.assert_at_rest(bench)
+            self.assertGreater(len(bench.changes("judge0")) + len(bench.changes("net")), 0)
             self.assert_no_crash(bench)
 
     def test_the_integrators_program(self):
@@ -138,13 +143,12 @@ class Runs(unittest.TestCase):
         panelglow-board blink power-green --seconds 4; echo rc=$?
         panelglow-board blink power-green --seconds 2 --trace /tmp/blink.trace; echo rc=$?; cp /tmp/blink.trace /out
         panelglow-board blink power-red --seconds 3 & panelglow-board blink power-red --seconds 3; echo rc=$?; wait
-        timeout --preserve-status -s TERM 4 panelglow-diags -subtest=LEDStatusIndicator -BlinkSpeed=250; echo rc=$?"""
+        timeout --preserve-status -s TERM 4 panelglow-diags -subtest=LEDStatusIndicator -BlinkSpeed=500; echo rc=$?"""
         with Bench("integrator", E001 + ["--disk", "ahci"], script, display=False) as bench:
             bench.finish()
             self.assertEqual(run_counts(bench.text()), [0] * 6, bench.text() + bench.text("stderr"))
             self.assert_phase(bench, "ioporte0.0", PHASE_S)
-            for light in ("ioporte0.0", "ioporte0.1"):
-                self.assertEqual(bench.last(light), 0)
+            self.assert_at_rest(bench)
             report = json.loads(bench.text("report.json"))
             self.assertIn("E001", json.dumps(report))
             replay = subprocess.run([os.path.join(PROGRAMS, "panelglow-board"), "replay",
@@ -169,7 +173,8 @@ class Runs(unittest.TestCase):
                 self.assertEqual(codes[1:], [1, 0], bench.text() + bench.text("stderr"))
                 self.assertIn("TestFailed 020472", bench.text())
                 self.assertIn(sentence, bench.text("stderr"))
-                self.assertEqual(bench.changes(), [])
+                self.assertEqual(bench.changes("ioporte0.1"), [])
+                self.assertLessEqual(len(bench.changes("ioporte0.0")), 1)  # the bench's own
 
 
 if __name__ == "__main__":
