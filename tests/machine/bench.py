@@ -135,10 +135,10 @@ class Bench:
         return values[-1] if values else None
 
     def median_phase(self, light):
-        """Seconds between two changes of a light, as the middle one of all that are shorter than two."""
-        times = [at for at, _, _ in self.changes(light)]
-        phases = [b - a for a, b in zip(times, times[1:]) if b - a < 2]
-        return statistics.median(phases) if len(phases) >= 3 else None
+        """Seconds that a light is on, as the middle one of all times that are shorter than two seconds."""
+        changes = self.changes(light)
+        phases = [b - a for (a, _, lit), (b, _, _) in zip(changes, changes[1:]) if lit and 0.01 < b - a < 2]
+        return statistics.median(phases) if len(phases) >= 2 else None
 
     def operate(self, buttons, wrong=None, upto=None, patience=150):
         """Presses the button of each light that blinks, until the dialog is gone or `upto` were pressed. `wrong`: the
@@ -151,9 +151,8 @@ class Bench:
                 gone_since = gone_since or time.time()
                 if dialog and time.time() - gone_since > 2:
                     return
-                if not dialog and self.screen.windows():
-                    self.screen.do("key", "Return")  # the prompt ahead of the test
-                    time.sleep(0.5)
+                if not dialog:
+                    self._answer_prompt()
                 time.sleep(0.1)
                 continue
             gone_since = None
@@ -182,10 +181,18 @@ class Bench:
             places = self.screen.windows()
             if any(place[1] > 500 for place in places):
                 return True
-            if places:
-                self.screen.do("key", "Return")
-            time.sleep(0.3)
+            self._answer_prompt()
+            time.sleep(0.1)
         return False
+
+    def _answer_prompt(self):
+        """Confirms what is shown, once: a second key would fall into the dialog that comes after it."""
+        shown = self.screen.windows()
+        if shown:
+            self.screen.do("key", "Return")
+            end = time.time() + 4
+            while self.screen.windows() == shown and time.time() < end:
+                time.sleep(0.1)
 
     def await_change(self, light, since, patience=30):
         """True when a judge has seen this light change."""

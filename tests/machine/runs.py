@@ -13,7 +13,8 @@ TEST = "panelglow-diags -subtest=CustomLEDTest -LEDTimeout=20 -Retries=0 "
 PORT_BUTTONS = [("PowerGreen", ["ioporte0.0"]), ("PowerRed", ["ioporte0.1"]), ("NoLED", [])]
 # What the port lamps are when nothing blinks: power green, red and drive dark.
 AT_REST = {"ioporte0.0": 1, "ioporte0.1": 0, "ioporte2.3": 0}
-PHASE_S, LOCK_KEY_PHASE_S, TOLERANCE_S = 0.5, 0.2, 0.003
+# How long a light is on; the class of the port chip rests 30 ms behind each write.
+PHASE_S, PORT_PHASE_S, LOCK_KEY_PHASE_S, TOLERANCE_S = 0.5, 0.53, 0.2, 0.003
 
 
 def run_counts(text):
@@ -49,7 +50,7 @@ class Runs(unittest.TestCase):
             self.assertEqual({name for name, _ in buttons}, set(bench.pressed))
             self.assertEqual(bench.pressed.count("HardDrive"), 2)  # one for each controller
             for light in AT_REST:
-                self.assert_phase(bench, light, PHASE_S)
+                self.assert_phase(bench, light, PORT_PHASE_S)
             self.assert_at_rest(bench)
             for light in ("num", "caps", "scroll"):
                 self.assert_phase(bench, light, LOCK_KEY_PHASE_S)
@@ -125,7 +126,7 @@ class Runs(unittest.TestCase):
                      $(basename $(readlink -f /sys/class/net/bench-lan/device))"; do
           set -- $gone; (sleep 12; echo $2 > $1) &
         done
-        timeout -s KILL 120 {test}-LEDTimeout=8 -SectionID=Bench; echo rc=$?""".format(test=TEST)
+        timeout -s KILL 120 panelglow-diags -subtest=CustomLEDTest -LEDTimeout=8 -Retries=0 -SectionID=Bench; echo rc=$?"""
         with Bench("gone", options, script) as bench:
             self.assertTrue(bench.open_dialog())
             time.sleep(4)
@@ -147,7 +148,7 @@ class Runs(unittest.TestCase):
         with Bench("integrator", E001 + ["--disk", "ahci"], script, display=False) as bench:
             bench.finish()
             self.assertEqual(run_counts(bench.text()), [0] * 6, bench.text() + bench.text("stderr"))
-            self.assert_phase(bench, "ioporte0.0", PHASE_S)
+            self.assert_phase(bench, "ioporte0.0", PORT_PHASE_S)
             self.assert_at_rest(bench)
             report = json.loads(bench.text("report.json"))
             self.assertIn("E001", json.dumps(report))
