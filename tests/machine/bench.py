@@ -4,7 +4,6 @@ import os
 import statistics
 import subprocess
 import sys
-import threading
 import time
 
 sys.dont_write_bytecode = True
@@ -79,8 +78,8 @@ class Screen:
         return found
 
     def picture(self, path):
-        subprocess.run("xwd -root -silent -display %s | convert xwd:- %s" % (self.name, path), shell=True,
-                       stderr=subprocess.DEVNULL)
+        """A picture for people; nothing depends on it."""
+        subprocess.run(["import", "-display", self.name, "-window", "root", path], stderr=subprocess.DEVNULL)
 
     def kill(self):
         self.server.kill()
@@ -88,8 +87,8 @@ class Screen:
 
 
 class Bench:
-    """One run. `section` is shown in the dialog; `buttons` are its buttons in order, each with its lights ("" is
-    nothing blinks)."""
+    """One virtual PC that runs one script. Buttons are pairs of a name and its lights, in the dialog's order; one without
+    lights is for "nothing blinks"."""
 
     def __init__(self, name, options, script, display=True):
         self.screen = Screen() if display else None
@@ -185,6 +184,11 @@ class Bench:
             time.sleep(0.1)
         return False
 
+    def await_no_window(self, patience=60):
+        end = time.time() + patience
+        while self.screen.windows() and time.time() < end:
+            time.sleep(0.2)
+
     def _answer_prompt(self):
         """Confirms what is shown, once: a second key would fall into the dialog that comes after it."""
         shown = self.screen.windows()
@@ -216,9 +220,3 @@ class Bench:
     def _press(self, dialog, choice):
         self.screen.do("mousemove", dialog[2] + 126 + 201 * (choice % 3), dialog[3] + 168 + 46 * (choice // 3), "click",
                        1)
-
-
-def in_background(function, *arguments):
-    thread = threading.Thread(target=function, args=arguments, daemon=True)
-    thread.start()
-    return thread
