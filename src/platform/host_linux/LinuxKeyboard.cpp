@@ -14,7 +14,6 @@
 
 #include "platform/host_linux/CurrentThread.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -81,11 +80,12 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
     isDone = isDone || error == 0;
     refusal = error == 0 || error == ENODEV ? refusal : error;
   }
-  if (!isDone && !isTold_.exchange(true)) {
-    posix::TellPeople(refusal == ENODEV
-                          ? "No keyboard of this machine has lock-key LEDs that the kernel knows, so they stay dark."
-                          : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
-                                "): start the program as root, or as a member of the group \"input\".");
+  if (!isDone) {
+    teller_.Tell(refusal == ENODEV
+                     ? "No keyboard of this machine has lock-key LEDs that the kernel knows, so they stay dark."
+                     : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
+                           "), so they stay dark: start the program as root, or as a member of the group "
+                           "\"input\".");
   }
 }
 

@@ -5,10 +5,10 @@
 // The lock state itself is not touched: nothing is typed in other letters.
 #pragma once
 
-#include <atomic>
 #include <string>
 
 #include "platform/Keyboard.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -22,7 +22,7 @@ class LinuxKeyboard : public Keyboard {
 
  private:
   std::string folder_;
-  std::atomic<bool> isTold_{false};
+  posix::OnceTeller teller_;
 };
 
 }  // namespace panelglow::platform::host_linux
