@@ -84,8 +84,10 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
     teller_.Tell(refusal == ENODEV
                      ? "No keyboard of this machine has lock-key LEDs that the kernel knows, so they stay dark."
                      : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
-                           "), so they stay dark: start the program as root, or as a member of the group "
-                           "\"input\".");
+                           "), so they stay dark" +
+                           (refusal == EACCES || refusal == EPERM
+                                ? ": start the program as root, or as a member of the group \"input\"."
+                                : "."));
   }
 }
 
