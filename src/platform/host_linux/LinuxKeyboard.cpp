@@ -10,10 +10,11 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
+#include <iterator>
+#include <utility>
 #include <vector>
 
 #include "platform/host_linux/CurrentThread.h"
-#include "platform/posix/Descriptor.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -41,19 +42,16 @@ std::vector<std::string> EventDevices(const std::string& folder) {
   return paths;
 }
 
-// 0 when the device's LED is the other way round now; ENODEV when it has none.
-int ToggleOn(const std::string& path, std::uint16_t led) {
-  const posix::Descriptor device(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
-  if (!device) {
-    return errno;
-  }
+// 0 when the device's LED is the other way round now, or the device has none; ENODEV when it has gone.
+int Toggle(const posix::Descriptor& device, std::uint16_t led, bool& isDone) {
   LedBits owned{};
   LedBits lit{};
-  if (::ioctl(device.Get(), EVIOCGBIT(EV_LED, sizeof owned), owned.data()) < 0 || !HasBit(owned, led)) {
-    return ENODEV;
-  }
-  if (::ioctl(device.Get(), EVIOCGLED(sizeof lit), lit.data()) < 0) {
+  if (::ioctl(device.Get(), EVIOCGBIT(EV_LED, sizeof owned), owned.data()) < 0 ||
+      ::ioctl(device.Get(), EVIOCGLED(sizeof lit), lit.data()) < 0) {
     return errno;
+  }
+  if (!HasBit(owned, led)) {
+    return 0;
   }
   std::array<input_event, 2> events{};
   events[0].type = EV_LED;
@@ -61,7 +59,11 @@ int ToggleOn(const std::string& path, std::uint16_t led) {
   events[0].value = HasBit(lit, led) ? 0 : 1;
   events[1].type = EV_SYN;
   events[1].code = SYN_REPORT;
-  return ::write(device.Get(), events.data(), sizeof events) == static_cast<ssize_t>(sizeof events) ? 0 : errno;
+  if (::write(device.Get(), events.data(), sizeof events) != static_cast<ssize_t>(sizeof events)) {
+    return errno;
+  }
+  isDone = true;
+  return 0;
 }
 
 }  // namespace
@@ -73,22 +75,39 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
   if (found == kLockLeds.end() || (flags & kKeyUp) != 0) {
     return;
   }
+  const std::lock_guard<std::mutex> lock(guard_);
+  const int refusal = OpenNewDevices();
   bool isDone = false;
-  int refusal = ENODEV;
-  for (const std::string& path : EventDevices(folder_)) {
-    const int error = ToggleOn(path, found->led);
-    isDone = isDone || error == 0;
-    refusal = error == 0 || error == ENODEV ? refusal : error;
+  for (auto device = devices_.begin(); device != devices_.end();) {
+    const bool isThere = Toggle(device->second, found->led, isDone) == 0;
+    device =
+        isThere ? std::next(device) : devices_.erase(device);  // one that came anew is opened with the next press
   }
   if (!isDone) {
-    teller_.Tell(refusal == ENODEV
-                     ? "No keyboard of this machine has lock-key LEDs that the kernel knows, so they stay dark."
-                     : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
-                           "), so they stay dark" +
-                           (refusal == EACCES || refusal == EPERM
-                                ? ": start the program as root, or as a member of the group \"input\"."
-                                : "."));
+    teller_.Tell(refusal == 0 ? "No keyboard of this machine has a LED for this lock key that the kernel knows (" +
+                                    folder_ + "; on a text-only system, load the module evdev), so it stays dark."
+                              : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
+                                    "), so they stay dark" +
+                                    (refusal == EACCES || refusal == EPERM
+                                         ? ": start the program as root, or as a member of the group \"input\"."
+                                         : "."));
   }
+}
+
+int LinuxKeyboard::OpenNewDevices() {
+  int refusal = 0;
+  for (const std::string& path : EventDevices(folder_)) {
+    if (devices_.count(path) != 0) {
+      continue;
+    }
+    posix::Descriptor device(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
+    if (device) {
+      devices_.emplace(path, std::move(device));
+    } else {
+      refusal = errno;
+    }
+  }
+  return refusal;
 }
 
 }  // namespace panelglow::platform::host_linux

@@ -5,9 +5,12 @@
 // The lock state itself is not touched: nothing is typed in other letters.
 #pragma once
 
+#include <map>
+#include <mutex>
 #include <string>
 
 #include "platform/Keyboard.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
@@ -21,7 +24,12 @@ class LinuxKeyboard : public Keyboard {
   void Event(std::uint8_t virtualKey, std::uint8_t scanCode, std::uint32_t flags) override;
 
  private:
+  /// Opens what has come since the last press. The kernel's error number of the last refusal, or 0.
+  int OpenNewDevices();
+
   std::string folder_;
+  std::mutex guard_;
+  std::map<std::string, posix::Descriptor> devices_;  // by path; kept, as closing one takes tens of milliseconds
   posix::OnceTeller teller_;
 };
 
