@@ -13,7 +13,6 @@
 
 #include "platform/host_linux/CurrentThread.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -70,7 +69,7 @@ bool IsCamera(const posix::Descriptor& device) {
 
 class Graph : public CaptureGraph {
  public:
-  explicit Graph(std::string folder) : folder_(std::move(folder)) {}
+  Graph(std::string folder, posix::OnceTeller& teller) : folder_(std::move(folder)), teller_(teller) {}
   ~Graph() override { SwitchOff(); }
   Graph(const Graph&) = delete;
   Graph& operator=(const Graph&) = delete;
@@ -139,8 +138,11 @@ class Graph : public CaptureGraph {
     CurrentThread::CheckEndRequest();
     posix::Descriptor device(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
     if (!device) {
-      posix::TellPeople("The camera " + path + " cannot be opened (" + std::strerror(errno) +
-                        "): start the program as root, or as a member of the group \"video\".");
+      const int error = errno;
+      teller_.Tell("The camera " + path + " cannot be opened (" + std::strerror(error) + "), so its LED stays dark" +
+                   (error == EACCES || error == EPERM
+                        ? ": start the program as root, or as a member of the group \"video\"."
+                        : "."));
       return false;
     }
     if (!IsCamera(device)) {
@@ -175,18 +177,16 @@ class Graph : public CaptureGraph {
     if (error == 0) {
       return kSuccess;
     }
-    if (!std::exchange(isTold_, true)) {
-      posix::TellPeople("The camera " + path_ + " does not capture (" + std::strerror(error) + ")" +
-                        (error == EBUSY ? ": another program has it; close that one." : ", so its LED stays dark."));
-    }
+    teller_.Tell("The camera " + path_ + " does not capture (" + std::strerror(error) + "), so its LED stays dark" +
+                 (error == EBUSY ? ": another program has it; close that one." : "."));
     return Failed(error);
   }
 
   std::string folder_;
+  posix::OnceTeller& teller_;  // the cameras', which outlive every run
   std::string path_;
   posix::Descriptor device_;
   bool isOn_ = false;
-  bool isTold_ = false;
 };
 
 class Devices : public CaptureDevices {
@@ -212,6 +212,6 @@ std::unique_ptr<CaptureDevices> Graph::OpenVideoInputs() {
 
 }  // namespace
 
-std::unique_ptr<CaptureGraph> LinuxCameras::NewGraph() { return std::make_unique<Graph>(folder_); }
+std::unique_ptr<CaptureGraph> LinuxCameras::NewGraph() { return std::make_unique<Graph>(folder_, teller_); }
 
 }  // namespace panelglow::platform::host_linux

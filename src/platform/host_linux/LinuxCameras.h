@@ -5,6 +5,7 @@
 #include <string>
 
 #include "platform/Cameras.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -16,6 +17,7 @@ class LinuxCameras : public Cameras {
 
  private:
   std::string folder_;
+  posix::OnceTeller teller_;
 };
 
 }  // namespace panelglow::platform::host_linux

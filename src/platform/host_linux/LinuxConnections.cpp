@@ -11,7 +11,6 @@
 
 #include "platform/host_linux/CurrentThread.h"
 #include "platform/host_linux/RouteSocket.h"
-#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -38,7 +37,7 @@ struct Adapter {
 
 class Link : public Connection {
  public:
-  explicit Link(Adapter adapter) : adapter_(std::move(adapter)) {}
+  Link(Adapter adapter, posix::OnceTeller& teller) : adapter_(std::move(adapter)), teller_(teller) {}
 
   // What was up is up however the worker ends.
   ~Link() override {
@@ -96,31 +95,33 @@ class Link : public Connection {
   }
 
   bool Told(int error) {
-    if (error != 0 && !std::exchange(isTold_, true)) {
-      posix::TellPeople("The adapter " + adapter_.name + " cannot be switched (" + std::strerror(error) + ")" +
-                        (error == EPERM ? ": start the program as root, or give it CAP_NET_ADMIN." : "."));
+    if (error != 0) {
+      teller_.Tell("The adapter " + adapter_.name + " cannot be switched (" + std::strerror(error) +
+                   "), so its LED does not blink" +
+                   (error == EPERM ? ": start the program as root, or give it CAP_NET_ADMIN." : "."));
     }
     return error == 0;
   }
 
   Adapter adapter_;
+  posix::OnceTeller& teller_;  // the connections', which outlive every run
   RouteSocket socket_;
   std::vector<RouteSocket::Message> lost_;
   bool hadLink_ = false;
   bool isDown_ = false;  // by us
-  bool isTold_ = false;
 };
 
 class Walk : public ConnectionList {
  public:
-  explicit Walk(std::vector<Adapter> adapters) : adapters_(std::move(adapters)) {}
+  Walk(std::vector<Adapter> adapters, posix::OnceTeller& teller) : adapters_(std::move(adapters)), teller_(teller) {}
   std::unique_ptr<Connection> Next() override {
     CurrentThread::CheckEndRequest();
-    return next_ < adapters_.size() ? std::make_unique<Link>(adapters_[next_++]) : nullptr;
+    return next_ < adapters_.size() ? std::make_unique<Link>(adapters_[next_++], teller_) : nullptr;
   }
 
  private:
   std::vector<Adapter> adapters_;
+  posix::OnceTeller& teller_;
   std::size_t next_ = 0;
 };
 
@@ -145,7 +146,7 @@ std::unique_ptr<ConnectionList> LinuxConnections::Enumerate() {
     }
   }
   std::sort(adapters.begin(), adapters.end(), [](const Adapter& a, const Adapter& b) { return a.index < b.index; });
-  return std::make_unique<Walk>(std::move(adapters));
+  return std::make_unique<Walk>(std::move(adapters), teller_);
 }
 
 }  // namespace panelglow::platform::host_linux

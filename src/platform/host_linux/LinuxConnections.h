@@ -4,6 +4,7 @@
 #include <string>
 
 #include "platform/Connections.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -17,6 +18,7 @@ class LinuxConnections : public Connections {
 
  private:
   std::string folder_;
+  posix::OnceTeller teller_;
 };
 
 }  // namespace panelglow::platform::host_linux

@@ -15,6 +15,8 @@
 
 #include "platform/DriverRecords.h"
 #include "platform/host_linux/CurrentThread.h"
+#include "platform/host_linux/KernelFiles.h"
+#include "platform/host_linux/MemoryMap.h"
 #include "platform/host_linux/PortAccess.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/TellPeople.h"
@@ -193,8 +195,13 @@ class LinuxDriver::Device : public DriverDevice {
     const auto reg = static_cast<std::uint16_t>(NumberAt(in, driver::kPciRegister, 2));
     bool isDone = false;
     if (isWrite) {
-      isDone =
+      const int error =
           owner_.pci_.Write(location, reg, width, static_cast<std::uint32_t>(NumberAt(in, driver::kPciValue, 4)));
+      isDone = error == 0;
+      if (error == EPERM || error == EACCES) {
+        owner_.teller_.Tell("PCI configuration registers cannot be written (" + std::string(std::strerror(error)) +
+                            "): " + WhatToDo(error) + ".");
+      }
     } else if (const auto value = owner_.pci_.Read(location, reg, width)) {
       PutNumber(out, driver::kPciValue, 4, *value);
       isDone = true;
@@ -234,21 +241,22 @@ class LinuxDriver::Device : public DriverDevice {
     const std::size_t field = isWide ? 8 : 4;
     const std::uint64_t address = NumberAt(in, 0, field);
     int error = 0;
-    const std::uint64_t mapped = owner_.memory_.Map(address, NumberAt(in, field, field), error);
+    const std::uint64_t length = NumberAt(in, field, field);
+    const std::uint64_t mapped = owner_.memory_.Map(address, length, isWide ? Reach::kAll : Reach::kNarrow, error);
     constexpr std::uint64_t kNarrow = 0xFFFFFFFF;
     if (error == 0 && !isWide && mapped > kNarrow) {
       owner_.memory_.Unmap(mapped);
       error = ENOMEM;  // no place for it in the narrow record
     }
+    owner_.TellOfMemory(address, length, error);
     if (error != 0) {
-      owner_.TellOfMemory(address, error);
       return HomeErrorOf(error);
     }
     PutNumber(out, 2 * field, field, mapped);
     return 0;
   }
 
-  static std::uint32_t Msr(std::span<const std::byte> in, std::span<std::byte> out) {
+  std::uint32_t Msr(std::span<const std::byte> in, std::span<std::byte> out) const {
     if (!HasSizes(in, out, driver::kMsrSize)) {
       return kErrorInvalidParameter;
     }
@@ -256,7 +264,11 @@ class LinuxDriver::Device : public DriverDevice {
     const std::string path = "/dev/cpu/" + std::to_string(core < 0 ? 0 : core) + "/msr";
     const posix::Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
     if (!file) {
-      return HomeErrorOf(errno);
+      const int error = errno;
+      owner_.teller_.Tell(
+          "The processor's own registers cannot be read (/dev/cpu/*/msr: " + std::string(std::strerror(error)) +
+          "): " + (error == ENOENT ? "load the kernel module \"msr\"." : WhatToDo(error) + "."));
+      return HomeErrorOf(error);
     }
     std::uint64_t value = 0;
     if (::pread(file.Get(), &value, sizeof value, static_cast<off_t>(NumberAt(in, driver::kMsrIndex, 4))) !=
@@ -274,7 +286,7 @@ class LinuxDriver::Device : public DriverDevice {
     const std::uint64_t address = NumberAt(in, 0, 2) * 16 + NumberAt(in, 2, 2);
     const unsigned width = code == driver::kReadFirmwareWord ? 2 : 1;
     int error = 0;
-    const std::uint64_t mapped = owner_.memory_.Map(address, width, error);
+    const std::uint64_t mapped = owner_.memory_.Map(address, width, Reach::kAll, error);
     if (error != 0) {
       return HomeErrorOf(error);
     }
@@ -299,17 +311,32 @@ std::unique_ptr<DriverDevice> LinuxDriver::Open(std::string_view linkName, std::
   return std::make_unique<Device>(*this);
 }
 
-void LinuxDriver::TellOfMemory(std::uint64_t address, int error) {
-  std::array<char, 32> text{};
-  std::snprintf(text.data(), text.size(), "0x%llX", static_cast<unsigned long long>(address));
-  const std::lock_guard<std::mutex> lock(guard_);
-  if (toldOf_.find(std::string(text.data()) + ";") != std::string::npos) {
+void LinuxDriver::TellOfMemory(std::uint64_t address, std::uint64_t length, int error) {
+  constexpr std::uint64_t kPage = 4096;
+  constexpr std::size_t kList_bytes = std::size_t{1} << 20U;
+  const bool isRefused = error == EPERM || error == EACCES || error == EAGAIN;
+  if (error != 0 && !isRefused) {
+    return;  // what is wrong with the request is the caller's
+  }
+  {
+    const std::lock_guard<std::mutex> lock(guard_);
+    if (!toldPages_.insert(address / kPage).second) {
+      return;
+    }
+  }
+  if (!isRefused) {
+    const std::string remark = RemarkOn(
+        MemoryMap(ReadKernelBytes("/proc/iomem", kList_bytes).value_or("")).OwnerOf(address, length), address);
+    if (!remark.empty()) {
+      posix::TellPeople(remark);
+    }
     return;
   }
-  toldOf_ += std::string(text.data()) + ";";
-  posix::TellPeople("the kernel refuses the memory at " + std::string(text.data()) + " (" + std::strerror(error) +
-                    "): it is RAM, or a kernel driver has it; unbind that driver, or start the kernel with "
-                    "iomem=relaxed. Nothing was written there.");
+  std::array<char, 32> text{};
+  std::snprintf(text.data(), text.size(), "0x%llX", static_cast<unsigned long long>(address));
+  posix::TellPeople("The kernel refuses the memory at " + std::string(text.data()) + " (" + std::strerror(error) +
+                    "), and nothing was written there: it is RAM, or a kernel driver has it; unbind that driver, or "
+                    "start the kernel with iomem=relaxed.");
 }
 
 // ---- service manager
@@ -340,13 +367,9 @@ std::uint32_t LinuxDriver::Start(ServiceHandle service) {
   if (ports == 0 && memory == 0) {
     return 0;
   }
-  const std::lock_guard<std::mutex> lock(guard_);
-  if (!std::exchange(isTold_, true)) {
-    const int error = ports != 0 ? ports : memory;
-    posix::TellPeople("there is no way to the hardware (" + std::string(ports != 0 ? "I/O ports: " : "/dev/mem: ") +
-                      std::strerror(error) + "): " + WhatToDo(error) +
-                      ". Without the hardware, try panelglow-diags-sim.");
-  }
+  const int error = ports != 0 ? ports : memory;
+  teller_.Tell("There is no way to the hardware (" + std::string(ports != 0 ? "I/O ports: " : "/dev/mem: ") +
+               std::strerror(error) + "): " + WhatToDo(error) + ". Without the hardware, try panelglow-diags-sim.");
   return kErrorAccessDenied;
 }
 

@@ -7,12 +7,13 @@
 
 #include <memory>
 #include <mutex>
-#include <string>
+#include <set>
 
 #include "platform/DriverDevice.h"
 #include "platform/ServiceManager.h"
 #include "platform/host_linux/PciConfiguration.h"
 #include "platform/host_linux/PhysicalMemory.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -34,14 +35,15 @@ class LinuxDriver : public DriverDevices, public ServiceManager {
  private:
   class Device;
 
-  /// One sentence about a refused range of memory, each range once.
-  void TellOfMemory(std::uint64_t address, int error);
+  /// At most one sentence about each page that was asked for: refused, or with an owner that answers nothing. `error`
+  /// is what came of the request.
+  void TellOfMemory(std::uint64_t address, std::uint64_t length, int error);
 
   PhysicalMemory memory_;
   PciConfiguration pci_;
   std::mutex guard_;
-  bool isTold_ = false;
-  std::string toldOf_;  // refused ranges
+  std::set<std::uint64_t> toldPages_;  // by number
+  posix::OnceTeller teller_;
 };
 
 /// The error number of the program's home system for one of this kernel.

@@ -15,7 +15,6 @@
 #include <vector>
 
 #include "platform/host_linux/CurrentThread.h"
-#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -84,12 +83,14 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
     device =
         isThere ? std::next(device) : devices_.erase(device);  // one that came anew is opened with the next press
   }
-  if (!isDone && !std::exchange(isTold_, true)) {
-    posix::TellPeople(refusal == 0
-                          ? "No keyboard of this machine has a LED for this lock key that the kernel knows (" +
-                                folder_ + "; on a text-only system, load the module evdev), so it stays dark."
-                          : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
-                                "): start the program as root, or as a member of the group \"input\".");
+  if (!isDone) {
+    teller_.Tell(refusal == 0 ? "No keyboard of this machine has a LED for this lock key that the kernel knows (" +
+                                    folder_ + "; on a text-only system, load the module evdev), so it stays dark."
+                              : "The lock-key LEDs cannot be reached (" + folder_ + ": " + std::strerror(refusal) +
+                                    "), so they stay dark" +
+                                    (refusal == EACCES || refusal == EPERM
+                                         ? ": start the program as root, or as a member of the group \"input\"."
+                                         : "."));
   }
 }
 

@@ -11,6 +11,7 @@
 
 #include "platform/Keyboard.h"
 #include "platform/posix/Descriptor.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -29,7 +30,7 @@ class LinuxKeyboard : public Keyboard {
   std::string folder_;
   std::mutex guard_;
   std::map<std::string, posix::Descriptor> devices_;  // by path; kept, as closing one takes tens of milliseconds
-  bool isTold_ = false;
+  posix::OnceTeller teller_;
 };
 
 }  // namespace panelglow::platform::host_linux

@@ -2,14 +2,17 @@
 //
 // A disk that somebody uses (a mounted partition, swap, a volume on it) is opened for reading only: reading lights
 // its LED, and writing back what was read could undo what another program wrote in between. The kernel tells the two
-// apart by an exclusive opening, which also keeps others off while a disk is rewritten.
+// apart by an exclusive opening, which also keeps others off while a disk is rewritten. It would keep us off as well:
+// a phase that begins while a slow disk still serves the one before has the same opening.
 #pragma once
 
+#include <map>
+#include <memory>
 #include <mutex>
-#include <set>
 #include <string>
 
 #include "platform/RawDisks.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -19,11 +22,16 @@ class LinuxRawDisks : public RawDisks {
   std::unique_ptr<DiskBlock> Allocate(std::size_t size_bytes) override;
 
  private:
-  /// Each sentence once, though every phase of a blink opens the disk anew.
-  void TellOnce(const std::string& sentence);
+  struct OpenDisk;
+  class Disk;
 
+  /// The disk as it is open by us already, or opened now; null with a word to people.
+  std::shared_ptr<const OpenDisk> Find(const std::string& path);
+
+  // Every phase of a blink opens the disk anew.
+  posix::OnceTeller teller_;
   std::mutex guard_;
-  std::set<std::string> told_;
+  std::map<std::string, std::weak_ptr<const OpenDisk>> open_;
 };
 
 }  // namespace panelglow::platform::host_linux

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <cstdio>
 #include <filesystem>
 #include <system_error>
@@ -23,12 +24,12 @@ std::string PciConfiguration::FileOf(std::uint16_t location) const {
 std::vector<std::uint16_t> PciConfiguration::Functions() const {
   std::vector<std::uint16_t> functions;
   std::error_code none;
-  for (const auto& entry : std::filesystem::directory_iterator(folder_, none)) {
+  for (std::filesystem::directory_iterator it(folder_, none), end; !none && it != end; it.increment(none)) {
     unsigned domain = 0;
     unsigned bus = 0;
     unsigned device = 0;
     unsigned function = 0;
-    if (std::sscanf(entry.path().filename().c_str(), "%x:%x:%x.%x", &domain, &bus, &device, &function) == 4 &&
+    if (std::sscanf(it->path().filename().c_str(), "%x:%x:%x.%x", &domain, &bus, &device, &function) == 4 &&
         domain == 0 && bus <= 0xFF && device <= 0x1F && function <= 7) {
       functions.push_back(static_cast<std::uint16_t>(bus << 8U | device << 3U | function));
     }
@@ -50,13 +51,17 @@ std::optional<std::uint32_t> PciConfiguration::Read(std::uint16_t location, std:
   return value;
 }
 
-bool PciConfiguration::Write(std::uint16_t location, std::uint16_t reg, unsigned width, std::uint32_t value) const {
+int PciConfiguration::Write(std::uint16_t location, std::uint16_t reg, unsigned width, std::uint32_t value) const {
   const posix::Descriptor file(::open(FileOf(location).c_str(), O_WRONLY | O_CLOEXEC));
+  if (!file) {
+    return errno;
+  }
   std::array<std::uint8_t, 4> bytes{};
   for (unsigned i = 0; i < width; ++i) {
     bytes[i] = static_cast<std::uint8_t>(value >> (8 * i));
   }
-  return file.Get() >= 0 && ::pwrite(file.Get(), bytes.data(), width, reg) == static_cast<ssize_t>(width);
+  const ssize_t count = ::pwrite(file.Get(), bytes.data(), width, reg);
+  return count == static_cast<ssize_t>(width) ? 0 : count < 0 ? errno : ENXIO;
 }
 
 }  // namespace panelglow::platform::host_linux

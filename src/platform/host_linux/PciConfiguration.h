@@ -20,8 +20,8 @@ class PciConfiguration {
   /// only the first 64 bytes are there. `width` is 1, 2 or 4 bytes.
   [[nodiscard]] std::optional<std::uint32_t> Read(std::uint16_t location, std::uint16_t reg, unsigned width) const;
 
-  /// False likewise.
-  [[nodiscard]] bool Write(std::uint16_t location, std::uint16_t reg, unsigned width, std::uint32_t value) const;
+  /// 0, or the kernel's error number; ENXIO for a register behind the end.
+  [[nodiscard]] int Write(std::uint16_t location, std::uint16_t reg, unsigned width, std::uint32_t value) const;
 
  private:
   [[nodiscard]] std::string FileOf(std::uint16_t location) const;

@@ -13,6 +13,12 @@ namespace {
 
 constexpr std::uint64_t kLargestMapping = std::uint64_t{1} << 20U;
 
+#ifdef MAP_32BIT
+constexpr int kLowPlace = MAP_32BIT;
+#else
+constexpr int kLowPlace = 0;
+#endif
+
 }  // namespace
 
 PhysicalMemory::~PhysicalMemory() {
@@ -32,11 +38,9 @@ int PhysicalMemory::Open() {
   return file_ < 0 ? errno : 0;
 }
 
-std::uint64_t PhysicalMemory::Map(std::uint64_t address, std::uint64_t length, int& error) {
-  error = Open();
-  if (error == 0 && (length == 0 || length > kLargestMapping || address + length < address)) {
-    error = EINVAL;
-  }
+std::uint64_t PhysicalMemory::Map(std::uint64_t address, std::uint64_t length, Reach reach, int& error) {
+  const bool isPossible = length != 0 && length <= kLargestMapping && address + length >= address;
+  error = isPossible ? Open() : EINVAL;
   if (error != 0) {
     return 0;
   }
@@ -44,12 +48,14 @@ std::uint64_t PhysicalMemory::Map(std::uint64_t address, std::uint64_t length, i
   const std::uint64_t first = address & ~(page - 1);
   const std::uint64_t size = (address + length - first + page - 1) & ~(page - 1);
   const std::lock_guard<std::mutex> lock(guard_);
-  Mapping& mapping = mappings_[{first, size}];
+  Mapping& mapping = mappings_[{first, size, reach}];
   if (mapping.begin == 0) {
-    void* const begin = ::mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED, file_, static_cast<off_t>(first));
+    void* const begin =
+        ::mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED | (reach == Reach::kNarrow ? kLowPlace : 0), file_,
+               static_cast<off_t>(first));
     if (begin == MAP_FAILED) {
       error = errno;
-      mappings_.erase({first, size});
+      mappings_.erase({first, size, reach});
       return 0;
     }
     mapping = {reinterpret_cast<std::uint64_t>(begin), size, 0};

@@ -6,8 +6,12 @@
 #include <cstdint>
 #include <map>
 #include <mutex>
+#include <tuple>
 
 namespace panelglow::platform::host_linux {
+
+/// Where in the process a mapping may be: anywhere, or where 32 bits reach.
+enum class Reach { kAll, kNarrow };
 
 class PhysicalMemory {
  public:
@@ -20,8 +24,8 @@ class PhysicalMemory {
   int Open();
 
   /// The address in this process, the same one for the same pages; 0 with the kernel's error number: RAM and ranges
-  /// that a kernel driver has are refused.
-  std::uint64_t Map(std::uint64_t address, std::uint64_t length, int& error);
+  /// that a kernel driver has are refused. EINVAL is for lengths of 0 and above 1 MiB, whoever asks.
+  std::uint64_t Map(std::uint64_t address, std::uint64_t length, Reach reach, int& error);
 
   /// Gives a mapping back when nobody has it any more; false for an address that is none.
   bool Unmap(std::uint64_t mapped);
@@ -35,7 +39,7 @@ class PhysicalMemory {
 
   std::mutex guard_;
   int file_ = -1;
-  std::map<std::pair<std::uint64_t, std::uint64_t>, Mapping> mappings_;  // by first page and length
+  std::map<std::tuple<std::uint64_t, std::uint64_t, Reach>, Mapping> mappings_;  // by first page and length
 };
 
 }  // namespace panelglow::platform::host_linux

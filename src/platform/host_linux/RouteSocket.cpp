@@ -81,6 +81,15 @@ bool IsRouteToKeep(std::span<const std::byte> message, unsigned interfaceIndex) 
          (body->rtm_flags & RTM_F_CLONED) == 0 && NumberAttribute(message, sizeof(rtmsg), RTA_OIF) == interfaceIndex;
 }
 
+// A route is told with the state of its link, and with that it would be refused.
+void ForgetState(std::span<std::byte> message) {
+  auto body = BodyOf<rtmsg>(message);
+  if (body) {
+    body->rtm_flags &= RTNH_F_ONLINK;
+    std::memcpy(message.data() + sizeof(nlmsghdr), &*body, sizeof *body);
+  }
+}
+
 }  // namespace
 
 RouteSocket::RouteSocket() : socket_(::socket(AF_NETLINK, SOCK_RAW | SOCK_CLOEXEC, NETLINK_ROUTE)) {
@@ -151,10 +160,13 @@ std::vector<RouteSocket::Message> RouteSocket::Dump(std::uint16_t type, std::uin
       if (header.nlmsg_len < sizeof header || header.nlmsg_len > rest.size()) {
         break;
       }
-      if (header.nlmsg_seq == sequence_ && (header.nlmsg_type == NLMSG_DONE || header.nlmsg_type == NLMSG_ERROR)) {
+      const bool isAnswer = header.nlmsg_seq == sequence_;  // and no late one to a question that was given up
+      if (isAnswer && (header.nlmsg_type == NLMSG_DONE || header.nlmsg_type == NLMSG_ERROR)) {
         return messages;
       }
-      messages.emplace_back(rest.begin(), rest.begin() + header.nlmsg_len);
+      if (isAnswer) {
+        messages.emplace_back(rest.begin(), rest.begin() + header.nlmsg_len);
+      }
       rest = rest.subspan(std::min(Aligned(header.nlmsg_len), rest.size()));
     }
   }
@@ -170,6 +182,7 @@ std::vector<RouteSocket::Message> RouteSocket::WhatGoesWithTheLink(unsigned inte
   for (const std::uint8_t family : {std::uint8_t{AF_INET}, std::uint8_t{AF_INET6}}) {
     for (Message& message : Dump(RTM_GETROUTE, family)) {
       if (IsRouteToKeep(message, interfaceIndex)) {
+        ForgetState(message);
         kept.push_back(std::move(message));
       }
     }
@@ -182,9 +195,14 @@ std::vector<RouteSocket::Message> RouteSocket::WhatGoesWithTheLink(unsigned inte
   return kept;
 }
 
-void RouteSocket::Restore(const std::vector<Message>& messages) {
-  for (Message message : messages) {
-    Ask(message);  // EEXIST: somebody who looks after the network was faster
+// A route by way of a neighbour can only be set when there is one to that neighbour, which may stand behind it.
+void RouteSocket::Restore(std::vector<Message> messages) {
+  for (std::size_t before = messages.size() + 1; !messages.empty() && messages.size() < before;) {
+    before = messages.size();
+    std::erase_if(messages, [&](Message& message) {
+      const int error = Ask(message);
+      return error == 0 || error == EEXIST;  // somebody who looks after the network was faster
+    });
   }
 }
 

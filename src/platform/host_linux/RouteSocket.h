@@ -25,7 +25,7 @@ class RouteSocket {
   std::vector<Message> WhatGoesWithTheLink(unsigned interfaceIndex);
 
   /// Sends messages of that list again, addresses before routes; what is there already stays.
-  void Restore(const std::vector<Message>& messages);
+  void Restore(std::vector<Message> messages);
 
  private:
   int Ask(Message& message);

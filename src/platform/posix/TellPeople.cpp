@@ -13,4 +13,11 @@ void TellPeople(std::string_view sentence) {
   [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, line.data(), line.size());
 }
 
+void OnceTeller::Tell(const std::string& sentence) {
+  const std::lock_guard<std::mutex> lock(guard_);
+  if (told_.insert(sentence).second) {
+    TellPeople(sentence);
+  }
+}
+
 }  // namespace panelglow::platform::posix
