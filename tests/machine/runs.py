@@ -15,7 +15,9 @@ PORT_BUTTONS = [("PowerGreen", ["ioporte0.0"]), ("PowerRed", ["ioporte0.1"]), ("
 # What the port lamps are when nothing blinks: power green, red and drive dark.
 AT_REST = {"ioporte0.0": 1, "ioporte0.1": 0, "ioporte2.3": 0}
 # How long a light is on; the class of the port chip rests 30 ms behind each write.
-PHASE_S, PORT_PHASE_S, LOCK_KEY_PHASE_S, TOLERANCE_S = 0.5, 0.53, 0.2, 0.003
+PHASE_S, PORT_PHASE_S, LOCK_KEY_PHASE_S = 0.5, 0.53, 0.2
+# An idle machine keeps within 3 ms of them; one whose two cores are shared needs more room.
+TOLERANCE_S = 0.010
 
 
 def run_counts(text):
@@ -155,7 +157,7 @@ class Runs(unittest.TestCase):
         with Bench("integrator", E001 + ["--disk", "ahci"], script, display=False) as bench:
             bench.finish()
             self.assertEqual(run_counts(bench.text()), [0] * 6, bench.text() + bench.text("stderr"))
-            self.assert_phase(bench, "ioporte0.0", PORT_PHASE_S, 0.010)
+            self.assert_phase(bench, "ioporte0.0", PORT_PHASE_S)
             self.assert_at_rest(bench)
             report = json.loads(bench.text("report.json"))
             self.assertIn("E001", json.dumps(report))
