@@ -77,10 +77,6 @@ class Screen:
                 found.append(tuple(int(place[key]) for key in ("WIDTH", "HEIGHT", "X", "Y")))
         return found
 
-    def picture(self, path):
-        """A picture for people; nothing depends on it."""
-        subprocess.run(["import", "-display", self.name, "-window", "root", path], stderr=subprocess.DEVNULL)
-
     def kill(self):
         self.server.kill()
         self.server.wait()
@@ -160,8 +156,6 @@ class Bench:
                 dialog = [place for place in self.screen.windows() if place[1] > 500][0]
                 quiet = time.time()
             choice = self._blinking(buttons, quiet)
-            if choice is not None and not self.pressed:
-                self.screen.picture(os.path.join(self.folder, "dialog.png"))
             if choice is not None:
                 if wrong == len(self.pressed):
                     choice = (choice + 1) % len(buttons)
