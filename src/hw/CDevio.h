@@ -33,7 +33,8 @@ class CDevio {
   /// The image path is "system32\drivers\" with the service's name and ".sys".
   CDevio(const std::string& service, const std::string& display, const std::string& deviceLink);
 
-  /// Nothing is loaded before LoadOnce: for an object that exists before anybody knows whether the hardware is needed.
+  /// Nothing is loaded before LoadOnce: for an object that exists before anybody knows whether the hardware is
+  /// needed.
   struct LoadLater {};
   explicit CDevio(LoadLater later);
 
