@@ -10,6 +10,7 @@
 #include "hw/PciDeviceList.h"
 #include "hw/WMIDiscovery.h"
 #include "ledtests/DriveSelection.h"
+#include "platform/DeviceIds.h"
 #include "platform/sim/DeviceInventory.h"
 #include "platform/sim/Simulation.h"
 #include "storage/MSUtils.h"
@@ -43,7 +44,7 @@ sim::MachineDescription MachineOf(unsigned functions) {
     disk.name = Text("d%u", i);
     disk.controller = controller.name;
     disk.instanceId = Text("IDE\\DISK%u\\0", i);
-    disk.interfacePath = sim::DiskInterfacePath(disk.instanceId);
+    disk.interfacePath = panelglow::platform::DiskInterfacePath(disk.instanceId);
     disk.path = Text("\\\\.\\PHYSICALDRIVE%u", i);
     machine.pci.push_back(std::move(function));
     machine.controllers.push_back(std::move(controller));

@@ -236,7 +236,7 @@ class Bench {
     std::ostringstream text;
     if (IsFile(machine)) {
       const std::string file = TextOf(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / machine);
-      return AsOurs(file, SystemIdIn(file)) + "\n[driver]\nolder_set = true\n";
+      return AsOurs(file, SystemIdIn(file));
     }
     text << machine << (machine.find("touchpad") == std::string::npos ? "touchpad = true\n" : "")
          << std::ifstream(fs::path(PANELGLOW_SOURCE_DIR) / "tests/ledtests/bench.toml").rdbuf();

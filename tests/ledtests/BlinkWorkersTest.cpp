@@ -188,7 +188,7 @@ TEST(BlinkWorkers, EndedAtAnyMomentLeaveThePanelAsFoundAndNoLockBehind) {
     for (const sim::LedChange& change : bench.sim.Panel().TimeLine()) {
       add(change.time);
     }
-    ASSERT_GE(moments.size(), 8U) << c.function;
+    ASSERT_GE(moments.size(), 8U) << c.function << " on " << c.machine;
     for (const sim::Microseconds moment : moments) {
       const platform::ThreadHandle worker = bench.StartWorker(c.function);
       bench.sim.Time().SleepFor(moment);
