@@ -11,6 +11,7 @@
 namespace panelglow::boardtool {
 
 bool IsSimulated() { return false; }
+const char* ProgramName() { return "bench_boardtool"; }
 std::string PanelNow() { return {}; }
 
 namespace {

@@ -18,6 +18,7 @@
 #include "harness/CmdLineParser.h"
 #include "ledtests/BlinkWorkers.h"
 #include "ledtests/CustomLEDTest.h"
+#include "platform/AbsentDevices.h"
 #include "platform/host_linux/LinuxHost.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/sim/FirmwareTable.h"
@@ -278,27 +279,28 @@ Host& TheHost() {
   static auto* const machine = new host_linux::LinuxHost;
   static auto* const standIns = new StandIns;
   static auto* const firmware = new Firmware;
+  static auto* const absent = new AbsentDevices;
   static Host* const host = new Host{.cameras = *standIns,
                                      .clock = machine->clock,
                                      .connections = *standIns,
                                      .console = machine->console,
                                      .cpu = machine->cpu,
                                      .desktop = machine->desktop,
-                                     .deviceTree = machine->devices,
+                                     .deviceTree = *absent,
                                      .drivers = machine->driver,
                                      .environment = machine->environment,
                                      .files = machine->files,
                                      .images = machine->images,
-                                     .keyboard = machine->inputs,
+                                     .keyboard = machine->keyboard,
                                      .management = *firmware,
-                                     .modules = machine->devices,
+                                     .modules = *absent,
                                      .mutexes = machine->mutexes,
                                      .profiles = machine->profiles,
                                      .rawDisks = *standIns,
-                                     .registry = machine->devices,
+                                     .registry = *absent,
                                      .services = machine->driver,
                                      .threads = machine->threads,
-                                     .touchpad = machine->inputs,
+                                     .touchpad = machine->touchpad,
                                      .xmlDocuments = machine->xmlDocuments};
   return *host;
 }
