@@ -54,7 +54,8 @@ class Link : public Connection {
     if (!fs::exists(adapter_.folder, none)) {
       return std::nullopt;
     }
-    const bool hasRadio = fs::exists(adapter_.folder / "phy80211", none) || fs::exists(adapter_.folder / "wireless");
+    const bool hasRadio =
+        fs::exists(adapter_.folder / "phy80211", none) || fs::exists(adapter_.folder / "wireless", none);
     const std::string driver = fs::read_symlink(adapter_.folder / "device/driver", none).filename().string();
     return adapter_.name + (driver.empty() ? "" : " " + driver) + (hasRadio ? " Wireless" : "");
   }
