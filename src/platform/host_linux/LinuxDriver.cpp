@@ -79,6 +79,12 @@ std::string WhatToDo(int error) {
                           : "start it as root, or give it CAP_SYS_RAWIO and the right to /dev/mem";
 }
 
+// Device memory by the number that a mapping request has answered with.
+template <class Number>
+volatile Number* At(std::uint64_t mapped) {
+  return reinterpret_cast<volatile Number*>(mapped);  // NOLINT(performance-no-int-to-ptr): the records hold numbers
+}
+
 bool HasSizes(std::span<const std::byte> in, std::span<const std::byte> out, std::size_t size) {
   return in.size() == size && out.size() == size;
 }
@@ -148,16 +154,15 @@ class LinuxDriver::Device : public DriverDevice {
 
   std::uint32_t ReadMapped(std::uint64_t mapped, std::size_t width) override {
     CurrentThread::CheckEndRequest();
-    return width == 4 ? *reinterpret_cast<const volatile std::uint32_t*>(mapped)
-                      : *reinterpret_cast<const volatile std::uint8_t*>(mapped);
+    return width == 4 ? *At<std::uint32_t>(mapped) : *At<std::uint8_t>(mapped);
   }
 
   void WriteMapped(std::uint64_t mapped, std::size_t width, std::uint32_t value) override {
     CurrentThread::CheckEndRequest();
     if (width == 4) {
-      *reinterpret_cast<volatile std::uint32_t*>(mapped) = value;
+      *At<std::uint32_t>(mapped) = value;
     } else {
-      *reinterpret_cast<volatile std::uint8_t*>(mapped) = static_cast<std::uint8_t>(value);
+      *At<std::uint8_t>(mapped) = static_cast<std::uint8_t>(value);
     }
   }
 
@@ -292,7 +297,7 @@ class LinuxDriver::Device : public DriverDevice {
     }
     std::uint64_t value = 0;
     for (unsigned i = 0; i < width; ++i) {
-      value |= std::uint64_t{*reinterpret_cast<const volatile std::uint8_t*>(mapped + i)} << (8 * i);
+      value |= std::uint64_t{*At<std::uint8_t>(mapped + i)} << (8 * i);
     }
     PutNumber(out, 0, 2, value);
     owner_.memory_.Unmap(mapped);

@@ -112,9 +112,10 @@ PciInventory::PciInventory(const KernelFolders& folders) {
 }
 
 std::optional<std::size_t> PciInventory::OwnerOf(const std::string& realPath) const {
-  const std::vector<std::string> names = PathNames(realPath);
-  for (auto name = names.rbegin(); name != names.rend(); ++name) {
-    if (const auto found = places_.find(*name); found != places_.end()) {
+  std::vector<std::string> names = PathNames(realPath);
+  std::reverse(names.begin(), names.end());  // the nearest function is the owner
+  for (const std::string& name : names) {
+    if (const auto found = places_.find(name); found != places_.end()) {
       return found->second;
     }
   }

@@ -23,7 +23,7 @@ constexpr int kLowPlace = 0;
 
 PhysicalMemory::~PhysicalMemory() {
   for (const auto& [pages, mapping] : mappings_) {
-    ::munmap(reinterpret_cast<void*>(mapping.begin), mapping.length);
+    ::munmap(mapping.begin, mapping.length);
   }
   if (file_ >= 0) {
     ::close(file_);
@@ -49,7 +49,7 @@ std::uint64_t PhysicalMemory::Map(std::uint64_t address, std::uint64_t length, R
   const std::uint64_t size = (address + length - first + page - 1) & ~(page - 1);
   const std::lock_guard<std::mutex> lock(guard_);
   Mapping& mapping = mappings_[{first, size, reach}];
-  if (mapping.begin == 0) {
+  if (mapping.begin == nullptr) {
     void* const begin =
         ::mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED | (reach == Reach::kNarrow ? kLowPlace : 0), file_,
                static_cast<off_t>(first));
@@ -58,22 +58,22 @@ std::uint64_t PhysicalMemory::Map(std::uint64_t address, std::uint64_t length, R
       mappings_.erase({first, size, reach});
       return 0;
     }
-    mapping = {reinterpret_cast<std::uint64_t>(begin), size, 0};
+    mapping = {begin, size, 0};
   }
   ++mapping.users;
-  return mapping.begin + (address - first);
+  return mapping.Begin() + (address - first);
 }
 
 bool PhysicalMemory::Unmap(std::uint64_t mapped) {
   const std::lock_guard<std::mutex> lock(guard_);
   const auto found = std::find_if(mappings_.begin(), mappings_.end(), [&](const auto& entry) {
-    return mapped >= entry.second.begin && mapped < entry.second.begin + entry.second.length;
+    return mapped >= entry.second.Begin() && mapped < entry.second.Begin() + entry.second.length;
   });
   if (found == mappings_.end()) {
     return false;
   }
   if (--found->second.users == 0) {
-    ::munmap(reinterpret_cast<void*>(found->second.begin), found->second.length);
+    ::munmap(found->second.begin, found->second.length);
     mappings_.erase(found);
   }
   return true;

@@ -32,7 +32,9 @@ class PhysicalMemory {
 
  private:
   struct Mapping {
-    std::uint64_t begin = 0;  // of the pages, in the process
+    void* begin = nullptr;  // of the pages, in the process; owned
+
+    [[nodiscard]] std::uint64_t Begin() const { return reinterpret_cast<std::uint64_t>(begin); }
     std::size_t length = 0;
     unsigned users = 0;
   };
