@@ -4,20 +4,23 @@ import os
 import statistics
 import subprocess
 import sys
+import tempfile
 import time
 
 sys.dont_write_bytecode = True
 ROOT = os.path.dirname(os.path.dirname(os.path.dirname(os.path.realpath(__file__))))
 sys.path.insert(0, os.path.join(ROOT, "tools"))
 
-from qemu import machine  # noqa: E402
+from qemu import machine, picture  # noqa: E402
 
 OUT = os.path.join(ROOT, "build", "machine", "runs")
 PROGRAMS = os.path.join(ROOT, "build", "release", "bin")
 
-# The set-up of a bench, in the guest: the installation with this machine's files, the adapter with its address, the power
-# lamp green at port 0xE0 as the firmware of a real one would leave it, the camera's driver telling of its stream.
+# The set-up of a bench, in the guest: a word for waiting, the installation with this machine's files, the adapter with
+# its address, the power lamp green at port 0xE0 as the firmware of a real one would leave it, the camera's driver
+# telling of its stream.
 SET_UP = """
+given() {{ while [ ! -e /out/$1 ]; do sleep 0.2; done; }}
 mkdir /tmp/bench; cp -r {root}/installation/. {root}/machines/qemu/*.ini {root}/machines/qemu/*.xml /tmp/bench
 cd /tmp/bench; export PATH={programs}:$PATH
 for link in /sys/class/net/eth*; do
@@ -57,8 +60,10 @@ class Screen:
 
     def __init__(self):
         read, write = os.pipe()
+        self.memory = tempfile.TemporaryDirectory()
         self.server = subprocess.Popen(["Xvfb", "-displayfd", str(write), "-screen", "0", "1280x1024x24", "-nolisten",
-                                        "tcp"], pass_fds=[write], stderr=subprocess.DEVNULL)
+                                        "tcp", "-fbdir", self.memory.name], pass_fds=[write],
+                                       stderr=subprocess.DEVNULL)
         os.close(write)
         with os.fdopen(read) as number:
             self.name = ":" + number.readline().strip()
@@ -77,9 +82,13 @@ class Screen:
                 found.append(tuple(int(place[key]) for key in ("WIDTH", "HEIGHT", "X", "Y")))
         return found
 
+    def save(self, path):
+        picture.save(self.memory.name, path)
+
     def kill(self):
         self.server.kill()
         self.server.wait()
+        self.memory.cleanup()
 
 
 class Bench:
@@ -124,10 +133,14 @@ class Bench:
                 state[name] = value
         return found
 
-    def last(self, light):
-        values = [value for at, judge, seen in self.machine.timeline.notes
+    def last(self, light, before=float("inf")):
+        values = [value for at, judge, seen in self.machine.timeline.notes if at < before
                   for name, value in lights_of(judge, seen).items() if name == light]
         return values[-1] if values else None
+
+    def contents(self):
+        """Of each disk whether it was found as it was given."""
+        return [seen["content"] for _, _, seen in self.machine.timeline.notes if "content" in seen]
 
     def median_phase(self, light):
         """Seconds that a light is on, as the middle one of all times that are shorter than two seconds."""
@@ -135,19 +148,19 @@ class Bench:
         phases = [b - a for (a, _, lit), (b, _, _) in zip(changes, changes[1:]) if lit and 0.01 < b - a < 2]
         return statistics.median(phases) if len(phases) >= 2 else None
 
-    def operate(self, buttons, wrong=None, upto=None, patience=150):
-        """Presses the button of each light that blinks, until the dialog is gone or `upto` were pressed. `wrong`: the
-        number of the press that goes to the next button instead."""
+    def operate(self, buttons, wrong=None, until=None, before_press=None, patience=150):
+        """Presses the button of each light that blinks, until the dialog is gone or `until` holds. `wrong`: the
+        number of the press that goes to the next button instead. `before_press` is called with the button's name."""
         dialog, quiet, gone_since = None, time.time(), None
         end = time.time() + patience
-        while time.time() < end and self.machine.qemu.poll() is None:
-            tall = [place for place in self.screen.windows() if place[1] > 500]
-            if not tall:
+        while time.time() < end and self.machine.qemu.poll() is None and not (until and until()):
+            shown = self.screen.windows()
+            if not any(place[1] > 500 for place in shown):
                 gone_since = gone_since or time.time()
-                if dialog and time.time() - gone_since > 2:
+                if dialog and not until and time.time() - gone_since > 2:
                     return
                 if not dialog:
-                    self._answer_prompt()
+                    self._answer_prompt(shown)
                 time.sleep(0.1)
                 continue
             gone_since = None
@@ -157,53 +170,67 @@ class Bench:
                 quiet = time.time()
             choice = self._blinking(buttons, quiet)
             if choice is not None:
+                self.screen.save(os.path.join(self.folder, "press-%d.png" % len(self.pressed)))
                 if wrong == len(self.pressed):
                     choice = (choice + 1) % len(buttons)
+                if before_press:
+                    before_press(buttons[choice][0])
                 self._press(dialog, choice)
                 self.pressed.append(buttons[choice][0])
-                if len(self.pressed) == upto:
-                    return
+                self.machine.timeline.add("operator", pressed=self.pressed[-1])
                 time.sleep(1.5)
                 quiet = time.time()
             time.sleep(0.05)
 
-    def open_dialog(self, patience=60):
-        """Answers the prompt ahead of a test. True when the dialog is there."""
+    def wait_until(self, condition, patience=60):
+        """Whether it held within the time, as long as the machine ran."""
         end = time.time() + patience
-        while time.time() < end and self.machine.qemu.poll() is None:
-            places = self.screen.windows()
-            if any(place[1] > 500 for place in places):
-                return True
-            self._answer_prompt()
+        while not condition():
+            if time.time() > end or self.machine.qemu.poll() is not None:
+                return False
             time.sleep(0.1)
-        return False
+        return True
 
-    def await_no_window(self, patience=60):
-        end = time.time() + patience
-        while self.screen.windows() and time.time() < end:
-            time.sleep(0.2)
+    def open_dialog(self):
+        """Answers the prompt ahead of a test. True when the dialog is there."""
 
-    def _answer_prompt(self):
+        def is_there():
+            shown = self.screen.windows()
+            if any(place[1] > 500 for place in shown):
+                return True
+            self._answer_prompt(shown)
+            return False
+
+        return self.wait_until(is_there)
+
+    def await_no_window(self):
+        self.wait_until(lambda: not self.screen.windows())
+
+    def _answer_prompt(self, shown):
         """Confirms what is shown, once: a second key would fall into the dialog that comes after it."""
-        shown = self.screen.windows()
         if shown:
             self.screen.do("key", "Return")
-            end = time.time() + 4
+            end = time.time() + 8
             while self.screen.windows() == shown and time.time() < end:
                 time.sleep(0.1)
 
-    def await_change(self, light, since, patience=30):
+    def await_change(self, light, since):
         """True when a judge has seen this light change."""
-        end = time.time() + patience
-        while time.time() < end:
-            if any(at > since for at, _, _ in self.changes(light)):
-                return True
-            time.sleep(0.1)
-        return False
+        return self.wait_until(lambda: any(at > since for at, _, _ in self.changes(light)), patience=30)
+
+    def made(self, name):
+        """When the script made this file; None when it has not."""
+        path = os.path.join(self.folder, name)
+        return os.path.getmtime(path) if os.path.exists(path) else None
+
+    def give(self, name):
+        """Makes a file that the script waits for."""
+        with open(os.path.join(self.folder, name), "w"):
+            pass
 
     def _blinking(self, buttons, quiet):
         now = time.time()
-        recent = [name for at, name, _ in self.changes() if at > max(quiet, now - 5)]
+        recent = [name for at, name, _ in self.changes() if at > max(quiet, now - 12)]  # a link may need three seconds
         for number, (_, lights) in enumerate(buttons):
             if any(recent.count(light) >= 5 for light in lights):
                 return number

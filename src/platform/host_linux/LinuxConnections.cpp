@@ -6,6 +6,8 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
+#include <iterator>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -30,6 +32,7 @@ unsigned NumberIn(const fs::path& file) {
 }
 
 struct Adapter {
+  bool isUp = false;
   unsigned index = 0;
   std::string name;
   fs::path folder;
@@ -39,10 +42,12 @@ class Link : public Connection {
  public:
   Link(Adapter adapter, posix::OnceTeller& teller) : adapter_(std::move(adapter)), teller_(teller) {}
 
-  // What was up is up however the worker ends.
+  // It is as it was found, however the worker ends.
   ~Link() override {
     if (isDown_) {
       Raise();
+    } else if (isRaised_) {
+      socket_.SetUp(adapter_.index, false);
     }
   }
   Link(const Link&) = delete;
@@ -62,9 +67,17 @@ class Link : public Connection {
 
   bool Disconnect() override {
     CurrentThread::CheckEndRequest();
+    if (!adapter_.isUp) {
+      isRaised_ = false;
+      return Told(socket_.SetUp(adapter_.index, false));
+    }
     if (!isDown_) {
       hadLink_ = NumberIn(adapter_.folder / "carrier") == 1;
-      lost_ = socket_.WhatGoesWithTheLink(adapter_.index);
+      auto lost = socket_.WhatGoesWithTheLink(adapter_.index);
+      if (!lost) {
+        return Told(EIO);  // what cannot be put back is not taken away
+      }
+      lost_.insert(lost_.end(), std::make_move_iterator(lost->begin()), std::make_move_iterator(lost->end()));
     }
     const int error = socket_.SetUp(adapter_.index, false);
     isDown_ = isDown_ || error == 0;
@@ -74,7 +87,9 @@ class Link : public Connection {
   bool Connect() override {
     CurrentThread::CheckEndRequest();
     if (!isDown_) {
-      return Told(socket_.SetUp(adapter_.index, true));
+      const int error = socket_.SetUp(adapter_.index, true);
+      isRaised_ = !adapter_.isUp && error == 0;
+      return Told(error);
     }
     const int error = Raise();
     const auto end = std::chrono::steady_clock::now() + kLinkPatience;
@@ -90,7 +105,12 @@ class Link : public Connection {
     const int error = socket_.SetUp(adapter_.index, true);
     if (error == 0) {
       isDown_ = false;
-      socket_.Restore(lost_);
+      lost_ = socket_.Restore(std::move(lost_));
+      if (!lost_.empty()) {
+        teller_.Tell("The adapter " + adapter_.name +
+                     " is up again, but the kernel did not take back all of its "
+                     "routes, addresses and neighbours: look with \"ip route\" and \"ip address\".");
+      }
     }
     return error;
   }
@@ -109,7 +129,8 @@ class Link : public Connection {
   RouteSocket socket_;
   std::vector<RouteSocket::Message> lost_;
   bool hadLink_ = false;
-  bool isDown_ = false;  // by us
+  bool isDown_ = false;    // by us
+  bool isRaised_ = false;  // by us, though it was found switched off
 };
 
 class Walk : public ConnectionList {
@@ -126,7 +147,6 @@ class Walk : public ConnectionList {
   std::size_t next_ = 0;
 };
 
-// An adapter that is up: what its owner has switched off is no connection.
 bool IsUp(const fs::path& folder) {
   constexpr unsigned kUp = 1;
   std::ifstream in(folder / "flags");
@@ -142,11 +162,14 @@ std::unique_ptr<ConnectionList> LinuxConnections::Enumerate() {
   std::error_code none;
   for (fs::directory_iterator it(folder_, none), end; !none && it != end; it.increment(none)) {
     std::error_code missing;
-    if (fs::exists(it->path() / "device", missing) && IsUp(it->path())) {
-      adapters.push_back({NumberIn(it->path() / "ifindex"), it->path().filename().string(), it->path()});
+    if (fs::exists(it->path() / "device", missing)) {
+      adapters.push_back(
+          {IsUp(it->path()), NumberIn(it->path() / "ifindex"), it->path().filename().string(), it->path()});
     }
   }
-  std::sort(adapters.begin(), adapters.end(), [](const Adapter& a, const Adapter& b) { return a.index < b.index; });
+  // The last one is taken where none has the name that is looked for: rather one that is up.
+  std::sort(adapters.begin(), adapters.end(),
+            [](const Adapter& a, const Adapter& b) { return std::tie(a.isUp, a.index) < std::tie(b.isUp, b.index); });
   return std::make_unique<Walk>(std::move(adapters), teller_);
 }
 

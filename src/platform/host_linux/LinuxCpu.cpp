@@ -15,6 +15,17 @@ namespace {
 
 constexpr unsigned kMaskBits = 64;
 
+// The processors of this thread when it was last asked for them: those that a mask has no bits for go back with it.
+thread_local cpu_set_t lastSet{};
+
+std::uint64_t MaskOf(const cpu_set_t& set) {
+  std::uint64_t mask = 0;
+  for (unsigned cpu = 0; cpu < kMaskBits; ++cpu) {
+    mask |= CPU_ISSET(cpu, &set) ? std::uint64_t{1} << cpu : 0;
+  }
+  return mask;
+}
+
 }  // namespace
 
 // A leaf that the processor does not have gives zeros, not the contents of another one.
@@ -42,14 +53,14 @@ std::uint64_t LinuxCpu::Affinity() {
   if (::sched_getaffinity(0, sizeof set, &set) != 0) {
     return 0;
   }
-  std::uint64_t mask = 0;
-  for (unsigned cpu = 0; cpu < kMaskBits; ++cpu) {
-    mask |= CPU_ISSET(cpu, &set) ? std::uint64_t{1} << cpu : 0;
-  }
-  return mask;
+  lastSet = set;
+  return MaskOf(set);
 }
 
 bool LinuxCpu::SetAffinity(std::uint64_t mask) {
+  if (mask == MaskOf(lastSet)) {
+    return ::sched_setaffinity(0, sizeof lastSet, &lastSet) == 0;
+  }
   cpu_set_t set;
   CPU_ZERO(&set);
   for (unsigned cpu = 0; cpu < kMaskBits; ++cpu) {

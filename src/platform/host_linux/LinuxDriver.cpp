@@ -16,7 +16,6 @@
 #include "platform/DriverRecords.h"
 #include "platform/host_linux/CurrentThread.h"
 #include "platform/host_linux/KernelFiles.h"
-#include "platform/host_linux/MemoryMap.h"
 #include "platform/host_linux/PortAccess.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/TellPeople.h"
@@ -39,6 +38,8 @@ constexpr std::uint8_t kPciNotFound = 0x86;
 constexpr std::uint32_t kVersion = 100;  // 1.0, in the older form
 
 constexpr std::uint16_t kClassAndRevision = 0x08;
+constexpr std::uint64_t kPage = 4096;
+constexpr unsigned kFreePciRegisters = 64;  // bytes that the kernel shows to everybody
 
 // The kernel's lockdown, in its own word; empty where it does not tell.
 std::string Lockdown() {
@@ -72,8 +73,12 @@ std::string WhatToDo(int error) {
     return "this kernel has no such door: it needs one with I/O port access and /dev/mem";
   }
   if (HasRawAccess()) {
-    return "the right is there, so the kernel itself forbids it: it may be locked down (secure boot), which "
-           "/sys/kernel/security/lockdown would tell";
+    return error == EACCES
+               ? "CAP_SYS_RAWIO is there, but the file's mode or a security policy is in the way: let this "
+                 "user read and write the file"
+               : "the right is there, so the kernel itself forbids it: it may be locked down (secure boot), "
+                 "which /sys/kernel/security/lockdown would tell, or a container's list of devices leaves "
+                 "it out";
   }
   return ::geteuid() == 0 ? "it needs the capability CAP_SYS_RAWIO, which a container does not have"
                           : "start it as root, or give it CAP_SYS_RAWIO and the right to /dev/mem";
@@ -167,7 +172,7 @@ class LinuxDriver::Device : public DriverDevice {
   }
 
  private:
-  static std::uint32_t Port(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
+  std::uint32_t Port(std::uint32_t code, std::span<const std::byte> in, std::span<std::byte> out) {
     constexpr std::array<unsigned, 3> kWidths{1, 2, 4};
     const bool isWrite = code >= driver::kOutportByte;
     if (in.size() != driver::kPortSize || (!isWrite && out.size() != 4)) {
@@ -178,7 +183,7 @@ class LinuxDriver::Device : public DriverDevice {
     if (NumberAt(in, driver::kPortWidth, 4) != width) {
       return kErrorInvalidParameter;
     }
-    if (const int error = PortAccess::Allow(); error != 0) {
+    if (const int error = owner_.Refusal().error; error != 0) {
       return HomeErrorOf(error);
     }
     if (isWrite) {
@@ -200,8 +205,9 @@ class LinuxDriver::Device : public DriverDevice {
     const auto reg = static_cast<std::uint16_t>(NumberAt(in, driver::kPciRegister, 2));
     bool isDone = false;
     if (isWrite) {
-      const int error =
-          owner_.pci_.Write(location, reg, width, static_cast<std::uint32_t>(NumberAt(in, driver::kPciValue, 4)));
+      const int refusal = owner_.Refusal().error;
+      const auto value = static_cast<std::uint32_t>(NumberAt(in, driver::kPciValue, 4));
+      const int error = refusal != 0 ? refusal : owner_.pci_.Write(location, reg, width, value);
       isDone = error == 0;
       if (error == EPERM || error == EACCES) {
         owner_.teller_.Tell("PCI configuration registers cannot be written (" + std::string(std::strerror(error)) +
@@ -210,6 +216,9 @@ class LinuxDriver::Device : public DriverDevice {
     } else if (const auto value = owner_.pci_.Read(location, reg, width)) {
       PutNumber(out, driver::kPciValue, 4, *value);
       isDone = true;
+    } else if (reg + width > kFreePciRegisters && owner_.pci_.Read(location, 0, 1)) {
+      owner_.teller_.Tell(
+          "PCI configuration registers above 63 cannot be read: it needs CAP_SYS_ADMIN, as root has.");
     }
     PutNumber(out, driver::kPciStatus, 1, isDone ? 0 : kPciNotFound);
     return 0;
@@ -247,13 +256,19 @@ class LinuxDriver::Device : public DriverDevice {
     const std::uint64_t address = NumberAt(in, 0, field);
     int error = 0;
     const std::uint64_t length = NumberAt(in, field, field);
-    const std::uint64_t mapped = owner_.memory_.Map(address, length, isWide ? Reach::kAll : Reach::kNarrow, error);
+    const MemoryOwner owner = owner_.OwnerOf(address, length);
+    std::uint64_t mapped = 0;
+    if (owner == MemoryOwner::kRam) {
+      error = EPERM;  // the kernel would let us write the first megabyte's, which it uses
+    } else {
+      mapped = owner_.memory_.Map(address, length, isWide ? Reach::kAll : Reach::kNarrow, error);
+    }
     constexpr std::uint64_t kNarrow = 0xFFFFFFFF;
     if (error == 0 && !isWide && mapped > kNarrow) {
       owner_.memory_.Unmap(mapped);
       error = ENOMEM;  // no place for it in the narrow record
     }
-    owner_.TellOfMemory(address, length, error);
+    owner_.TellOfMemory(address, owner, error);
     if (error != 0) {
       return HomeErrorOf(error);
     }
@@ -293,6 +308,7 @@ class LinuxDriver::Device : public DriverDevice {
     int error = 0;
     const std::uint64_t mapped = owner_.memory_.Map(address, width, Reach::kAll, error);
     if (error != 0) {
+      owner_.TellOfMemory(address, MemoryOwner::kUnknown, error);
       return HomeErrorOf(error);
     }
     std::uint64_t value = 0;
@@ -316,9 +332,28 @@ std::unique_ptr<DriverDevice> LinuxDriver::Open(std::string_view linkName, std::
   return std::make_unique<Device>(*this);
 }
 
-void LinuxDriver::TellOfMemory(std::uint64_t address, std::uint64_t length, int error) {
-  constexpr std::uint64_t kPage = 4096;
+LinuxDriver::Refused LinuxDriver::Refusal() {
+  if (const int error = PortAccess::Allow(); error != 0) {
+    return {"I/O ports", error};
+  }
+  return {"/dev/mem", memory_.Open()};
+}
+
+MemoryOwner LinuxDriver::OwnerOf(std::uint64_t address, std::uint64_t length) {
+  constexpr std::uint64_t kConventionalEnd = 0xA0000;  // RAM on every PC
   constexpr std::size_t kList_bytes = std::size_t{1} << 20U;
+  if (length != 0 && address < kConventionalEnd) {
+    return MemoryOwner::kRam;
+  }
+  const std::lock_guard<std::mutex> lock(guard_);
+  const auto [known, isNew] = owners_.try_emplace(address / kPage, MemoryOwner::kUnknown);
+  if (isNew) {
+    known->second = MemoryMap(ReadKernelBytes("/proc/iomem", kList_bytes).value_or("")).OwnerOf(address, length);
+  }
+  return known->second;
+}
+
+void LinuxDriver::TellOfMemory(std::uint64_t address, MemoryOwner owner, int error) {
   const bool isRefused = error == EPERM || error == EACCES || error == EAGAIN;
   if (error != 0 && !isRefused) {
     return;  // what is wrong with the request is the caller's
@@ -329,9 +364,7 @@ void LinuxDriver::TellOfMemory(std::uint64_t address, std::uint64_t length, int 
       return;
     }
   }
-  if (!isRefused) {
-    const std::string remark = RemarkOn(
-        MemoryMap(ReadKernelBytes("/proc/iomem", kList_bytes).value_or("")).OwnerOf(address, length), address);
+  if (const std::string remark = RemarkOn(owner, address); !remark.empty() || !isRefused) {
     if (!remark.empty()) {
       posix::TellPeople(remark);
     }
@@ -340,8 +373,8 @@ void LinuxDriver::TellOfMemory(std::uint64_t address, std::uint64_t length, int 
   std::array<char, 32> text{};
   std::snprintf(text.data(), text.size(), "0x%llX", static_cast<unsigned long long>(address));
   posix::TellPeople("The kernel refuses the memory at " + std::string(text.data()) + " (" + std::strerror(error) +
-                    "), and nothing was written there: it is RAM, or a kernel driver has it; unbind that driver, or "
-                    "start the kernel with iomem=relaxed.");
+                    "), and nothing was written there: a kernel driver has it; unbind that driver, or start the "
+                    "kernel with iomem=relaxed.");
 }
 
 // ---- service manager
@@ -367,14 +400,12 @@ std::uint32_t LinuxDriver::Start(ServiceHandle service) {
   if (service != kService) {
     return kErrorInvalidHandle;
   }
-  const int ports = PortAccess::Allow();
-  const int memory = memory_.Open();
-  if (ports == 0 && memory == 0) {
+  const auto [door, error] = Refusal();
+  if (error == 0) {
     return 0;
   }
-  const int error = ports != 0 ? ports : memory;
-  teller_.Tell("There is no way to the hardware (" + std::string(ports != 0 ? "I/O ports: " : "/dev/mem: ") +
-               std::strerror(error) + "): " + WhatToDo(error) + ". Without the hardware, try panelglow-diags-sim.");
+  teller_.Tell("There is no way to the hardware (" + std::string(door) + ": " + std::strerror(error) +
+               "): " + WhatToDo(error) + ". Without the hardware, try panelglow-diags-sim.");
   return kErrorAccessDenied;
 }
 

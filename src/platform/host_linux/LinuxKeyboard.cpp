@@ -11,6 +11,7 @@
 #include <cstring>
 #include <filesystem>
 #include <iterator>
+#include <optional>
 #include <utility>
 #include <vector>
 
@@ -42,28 +43,30 @@ std::vector<std::string> EventDevices(const std::string& folder) {
   return paths;
 }
 
-// 0 when the device's LED is the other way round now, or the device has none; ENODEV when it has gone.
-int Toggle(const posix::Descriptor& device, std::uint16_t led, bool& isDone) {
+// Whether the device's LED is lit; nothing when it has none, an error number when it has gone.
+struct LedState {
+  int error = 0;
+  std::optional<bool> isLit;
+};
+
+LedState StateOf(const posix::Descriptor& device, std::uint16_t led) {
   LedBits owned{};
   LedBits lit{};
   if (::ioctl(device.Get(), EVIOCGBIT(EV_LED, sizeof owned), owned.data()) < 0 ||
       ::ioctl(device.Get(), EVIOCGLED(sizeof lit), lit.data()) < 0) {
-    return errno;
+    return {errno, {}};
   }
-  if (!HasBit(owned, led)) {
-    return 0;
-  }
+  return {0, HasBit(owned, led) ? std::optional(HasBit(lit, led)) : std::nullopt};
+}
+
+int Light(const posix::Descriptor& device, std::uint16_t led, bool isLit) {
   std::array<input_event, 2> events{};
   events[0].type = EV_LED;
   events[0].code = led;
-  events[0].value = HasBit(lit, led) ? 0 : 1;
+  events[0].value = isLit ? 1 : 0;
   events[1].type = EV_SYN;
   events[1].code = SYN_REPORT;
-  if (::write(device.Get(), events.data(), sizeof events) != static_cast<ssize_t>(sizeof events)) {
-    return errno;
-  }
-  isDone = true;
-  return 0;
+  return ::write(device.Get(), events.data(), sizeof events) == static_cast<ssize_t>(sizeof events) ? 0 : errno;
 }
 
 }  // namespace
@@ -77,11 +80,14 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
   }
   const std::lock_guard<std::mutex> lock(guard_);
   const int refusal = OpenNewDevices();
+  const bool isBack = !flipped_.insert(found->led).second;
+  if (isBack) {
+    flipped_.erase(found->led);
+  }
   bool isDone = false;
-  for (auto device = devices_.begin(); device != devices_.end();) {
-    const bool isThere = Toggle(device->second, found->led, isDone) == 0;
-    device =
-        isThere ? std::next(device) : devices_.erase(device);  // one that came anew is opened with the next press
+  for (auto entry = devices_.begin(); entry != devices_.end();) {
+    const bool isThere = Press(entry->second, found->led, isBack, isDone) == 0;
+    entry = isThere ? std::next(entry) : devices_.erase(entry);  // one that came anew is opened with the next press
   }
   if (!isDone) {
     teller_.Tell(refusal == 0 ? "No keyboard of this machine has a LED for this lock key that the kernel knows (" +
@@ -94,6 +100,25 @@ void LinuxKeyboard::Event(std::uint8_t virtualKey, std::uint8_t /*scanCode*/, st
   }
 }
 
+int LinuxKeyboard::Press(Device& device, std::uint16_t led, bool isBack, bool& isDone) {
+  const LedState state = StateOf(device.file, led);
+  if (!state.isLit) {
+    return state.error;
+  }
+  isDone = true;
+  if (!isBack) {
+    device.asFound[led] = *state.isLit;
+    return Light(device.file, led, !*state.isLit);
+  }
+  const auto found = device.asFound.find(led);
+  if (found == device.asFound.end()) {
+    return 0;  // it came after the press that is undone
+  }
+  const bool wasLit = found->second;
+  device.asFound.erase(found);
+  return Light(device.file, led, wasLit);
+}
+
 int LinuxKeyboard::OpenNewDevices() {
   int refusal = 0;
   for (const std::string& path : EventDevices(folder_)) {
@@ -102,7 +127,7 @@ int LinuxKeyboard::OpenNewDevices() {
     }
     posix::Descriptor device(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
     if (device) {
-      devices_.emplace(path, std::move(device));
+      devices_.emplace(path, Device{std::move(device), {}});
     } else {
       refusal = errno;
     }

@@ -34,9 +34,12 @@ Rows Controllers(const KernelFolders& folders, ControllerKind kind) {
     if (ControllerKindOf(pci.Functions()[place].identity) != kind) {
       continue;
     }
-    ManagementRow& row = rows.emplace_back(RowOfFunction(pci.Functions()[place]));
     const std::string driver = ControllerDriver(ports, pci, place);
-    if (kind == ControllerKind::kScsi && !driver.empty()) {  // the other class has no such property
+    if (kind == ControllerKind::kScsi && driver.empty()) {
+      continue;  // nobody drives it, and an empty name would be found to be another controller's
+    }
+    ManagementRow& row = rows.emplace_back(RowOfFunction(pci.Functions()[place]));
+    if (kind == ControllerKind::kScsi) {  // the other class has no such property
       SetText(row, u"DriverName", driver);
     }
   }

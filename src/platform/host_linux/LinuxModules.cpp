@@ -105,7 +105,15 @@ std::unique_ptr<GraphicsLibrary> LinuxModules::LoadGraphics(std::string_view /*f
   if (isMonitored) {
     return std::make_unique<MonitoredCards>(std::move(cards));
   }
-  return interface == GraphicsInterface::kNvApi && !cards.empty() ? LoadNvidiaLibrary(nvidiaLibrary_) : nullptr;
+  auto library =
+      interface == GraphicsInterface::kNvApi && !cards.empty() ? LoadNvidiaLibrary(nvidiaLibrary_) : nullptr;
+  if (!library && !cards.empty()) {
+    teller_.Tell("The driver of a graphics card shows no temperature (hwmon): " +
+                 (interface == GraphicsInterface::kAdl
+                      ? std::string("load the kernel's driver of the card.")
+                      : "load the kernel's driver of the card, or install " + nvidiaLibrary_ + " of NVIDIA's."));
+  }
+  return library;
 }
 
 }  // namespace panelglow::platform::host_linux

@@ -6,6 +6,7 @@
 
 #include "platform/Modules.h"
 #include "platform/host_linux/KernelFiles.h"
+#include "platform/posix/TellPeople.h"
 
 namespace panelglow::platform::host_linux {
 
@@ -24,6 +25,7 @@ class LinuxModules : public Modules {
  private:
   const KernelFolders folders_;
   const std::string nvidiaLibrary_;
+  posix::OnceTeller teller_;
 };
 
 }  // namespace panelglow::platform::host_linux

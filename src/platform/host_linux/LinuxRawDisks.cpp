@@ -80,6 +80,7 @@ std::string MountedAt(const std::string& disk) {
 struct LinuxRawDisks::OpenDisk {
   posix::Descriptor file;
   bool isWritable = false;
+  std::uint64_t node = 0;
 };
 
 class LinuxRawDisks::Disk : public RawDisk {
@@ -126,12 +127,13 @@ class LinuxRawDisks::Disk : public RawDisk {
   off_t position_ = 0;
 };
 
-std::shared_ptr<const LinuxRawDisks::OpenDisk> LinuxRawDisks::Find(const std::string& path) {
+std::shared_ptr<const LinuxRawDisks::OpenDisk> LinuxRawDisks::Find(const std::string& path, std::uint64_t node) {
   const std::lock_guard<std::mutex> lock(guard_);
   std::weak_ptr<const OpenDisk>& known = open_[path];
-  if (auto open = known.lock()) {
+  if (auto open = known.lock(); open && open->node == node) {
     return open;
   }
+  last_ = nullptr;
   constexpr int kUnbuffered = O_DIRECT | O_CLOEXEC;
   posix::Descriptor file(::open(path.c_str(), O_RDWR | O_EXCL | kUnbuffered));
   const int refusal = file ? 0 : errno;
@@ -154,8 +156,9 @@ std::shared_ptr<const LinuxRawDisks::OpenDisk> LinuxRawDisks::Find(const std::st
                                    : " is in use (mounted at " + places + ")") +
                  ": its LED is lit by reading alone, nothing is written to it.");
   }
-  auto open = std::make_shared<const OpenDisk>(OpenDisk{std::move(file), refusal == 0});
+  auto open = std::make_shared<const OpenDisk>(OpenDisk{std::move(file), refusal == 0, node});
   known = open;
+  last_ = open;
   return open;
 }
 
@@ -166,7 +169,7 @@ std::unique_ptr<RawDisk> LinuxRawDisks::Open(std::string_view name) {
   if (path.empty() || ::stat(path.c_str(), &status) != 0 || !S_ISBLK(status.st_mode)) {
     return nullptr;
   }
-  std::shared_ptr<const OpenDisk> open = Find(path);
+  std::shared_ptr<const OpenDisk> open = Find(path, status.st_ino);
   return open ? std::make_unique<Disk>(std::move(open), path, teller_) : nullptr;
 }
 

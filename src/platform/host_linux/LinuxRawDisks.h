@@ -3,9 +3,11 @@
 // A disk that somebody uses (a mounted partition, swap, a volume on it) is opened for reading only: reading lights
 // its LED, and writing back what was read could undo what another program wrote in between. The kernel tells the two
 // apart by an exclusive opening, which also keeps others off while a disk is rewritten. It would keep us off as well:
-// a phase that begins while a slow disk still serves the one before has the same opening.
+// a phase that begins while a slow disk still serves the one before has the same opening. The last one is kept beyond
+// its phase: after each closing, the system looks at the disk anew, and its LED would flicker in the dark phase.
 #pragma once
 
+#include <cstdint>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -25,13 +27,15 @@ class LinuxRawDisks : public RawDisks {
   struct OpenDisk;
   class Disk;
 
-  /// The disk as it is open by us already, or opened now; null with a word to people.
-  std::shared_ptr<const OpenDisk> Find(const std::string& path);
+  /// The disk as it is open by us already, or opened now; null with a word to people. `node` tells its device file
+  /// from a later one of that name.
+  std::shared_ptr<const OpenDisk> Find(const std::string& path, std::uint64_t node);
 
   // Every phase of a blink opens the disk anew.
   posix::OnceTeller teller_;
   std::mutex guard_;
   std::map<std::string, std::weak_ptr<const OpenDisk>> open_;
+  std::shared_ptr<const OpenDisk> last_;
 };
 
 }  // namespace panelglow::platform::host_linux

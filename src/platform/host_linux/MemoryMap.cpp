@@ -81,7 +81,7 @@ std::string RemarkOn(MemoryOwner owner, std::uint64_t address) {
   const std::string where = text.data();
   return owner == MemoryOwner::kRam
              ? "The memory at " + where +
-                   " is RAM and no device, and may read as zeros: check the address in the "
+                   " is RAM and no device, and nothing was read or written there: check the address in the "
                    "board's files."
              : "Nothing answers at the memory address " + where +
                    " as far as the kernel knows: if its LED stays dark, check the address in the board's files.";

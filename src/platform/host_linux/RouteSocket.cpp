@@ -1,6 +1,7 @@
 #include "platform/host_linux/RouteSocket.h"
 
 #include <linux/if_addr.h>
+#include <linux/neighbour.h>
 #include <linux/netlink.h>
 #include <linux/rtnetlink.h>
 #include <net/if.h>
@@ -10,7 +11,6 @@
 #include <array>
 #include <cerrno>
 #include <cstring>
-#include <optional>
 
 namespace panelglow::platform::host_linux {
 
@@ -72,13 +72,18 @@ std::optional<std::uint32_t> NumberAttribute(std::span<const std::byte> message,
 
 bool IsAddressToKeep(std::span<const std::byte> message, unsigned interfaceIndex) {
   const auto body = BodyOf<ifaddrmsg>(message);
-  return body && body->ifa_index == interfaceIndex && body->ifa_scope == RT_SCOPE_UNIVERSE;
+  return body && body->ifa_index == interfaceIndex;
+}
+
+bool IsNeighbourToKeep(std::span<const std::byte> message, unsigned interfaceIndex) {
+  const auto body = BodyOf<ndmsg>(message);
+  return body && body->ndm_ifindex == static_cast<int>(interfaceIndex) && (body->ndm_state & NUD_PERMANENT) != 0;
 }
 
 bool IsRouteToKeep(std::span<const std::byte> message, unsigned interfaceIndex) {
   const auto body = BodyOf<rtmsg>(message);
-  return body && body->rtm_type == RTN_UNICAST && body->rtm_protocol != RTPROT_KERNEL &&
-         (body->rtm_flags & RTM_F_CLONED) == 0 && NumberAttribute(message, sizeof(rtmsg), RTA_OIF) == interfaceIndex;
+  return body && body->rtm_protocol != RTPROT_KERNEL && (body->rtm_flags & RTM_F_CLONED) == 0 &&
+         NumberAttribute(message, sizeof(rtmsg), RTA_OIF) == interfaceIndex;
 }
 
 // A route is told with the state of its link, and with that it would be refused.
@@ -137,13 +142,13 @@ int RouteSocket::SetUp(unsigned interfaceIndex, bool isUp) {
   return Ask(message);
 }
 
-std::vector<RouteSocket::Message> RouteSocket::Dump(std::uint16_t type, std::uint8_t family) {
+std::optional<std::vector<RouteSocket::Message>> RouteSocket::Dump(std::uint16_t type, std::uint8_t family) {
   rtgenmsg body{};
   body.rtgen_family = family;
   Message request = MessageOf(type, NLM_F_REQUEST | NLM_F_DUMP, body);
   std::vector<Message> messages;
   if (Ask(request) != 0) {
-    return messages;
+    return std::nullopt;
   }
   std::vector<std::byte> answer(kLargestAnswer);
   for (;;) {
@@ -152,7 +157,7 @@ std::vector<RouteSocket::Message> RouteSocket::Dump(std::uint16_t type, std::uin
       continue;
     }
     if (count <= 0) {
-      return messages;
+      return std::nullopt;
     }
     std::span<const std::byte> rest(answer.data(), static_cast<std::size_t>(count));
     while (rest.size() >= sizeof(nlmsghdr)) {
@@ -172,17 +177,28 @@ std::vector<RouteSocket::Message> RouteSocket::Dump(std::uint16_t type, std::uin
   }
 }
 
-std::vector<RouteSocket::Message> RouteSocket::WhatGoesWithTheLink(unsigned interfaceIndex) {
+std::optional<std::vector<RouteSocket::Message>> RouteSocket::WhatGoesWithTheLink(unsigned interfaceIndex) {
+  struct Table {
+    std::uint16_t request;
+    std::uint8_t family;
+    bool (*isToKeep)(std::span<const std::byte> message, unsigned interfaceIndex);
+  };
+  constexpr std::array<Table, 5> kTables{{{RTM_GETADDR, AF_INET6, IsAddressToKeep},
+                                          {RTM_GETNEIGH, AF_INET, IsNeighbourToKeep},
+                                          {RTM_GETNEIGH, AF_INET6, IsNeighbourToKeep},
+                                          {RTM_GETROUTE, AF_INET, IsRouteToKeep},
+                                          {RTM_GETROUTE, AF_INET6, IsRouteToKeep}}};
   std::vector<Message> kept;
-  for (Message& message : Dump(RTM_GETADDR, AF_INET6)) {
-    if (IsAddressToKeep(message, interfaceIndex)) {
-      kept.push_back(std::move(message));
+  for (const Table& table : kTables) {
+    auto messages = Dump(table.request, table.family);
+    if (!messages) {
+      return std::nullopt;
     }
-  }
-  for (const std::uint8_t family : {std::uint8_t{AF_INET}, std::uint8_t{AF_INET6}}) {
-    for (Message& message : Dump(RTM_GETROUTE, family)) {
-      if (IsRouteToKeep(message, interfaceIndex)) {
-        ForgetState(message);
+    for (Message& message : *messages) {
+      if (table.isToKeep(message, interfaceIndex)) {
+        if (table.request == RTM_GETROUTE) {
+          ForgetState(message);
+        }
         kept.push_back(std::move(message));
       }
     }
@@ -196,7 +212,7 @@ std::vector<RouteSocket::Message> RouteSocket::WhatGoesWithTheLink(unsigned inte
 }
 
 // A route by way of a neighbour can only be set when there is one to that neighbour, which may stand behind it.
-void RouteSocket::Restore(std::vector<Message> messages) {
+std::vector<RouteSocket::Message> RouteSocket::Restore(std::vector<Message> messages) {
   for (std::size_t before = messages.size() + 1; !messages.empty() && messages.size() < before;) {
     before = messages.size();
     std::erase_if(messages, [&](Message& message) {
@@ -204,6 +220,7 @@ void RouteSocket::Restore(std::vector<Message> messages) {
       return error == 0 || error == EEXIST;  // somebody who looks after the network was faster
     });
   }
+  return messages;
 }
 
 }  // namespace panelglow::platform::host_linux

@@ -125,8 +125,12 @@ std::string InstanceOf(const std::string& name, const PciInventory& pci, std::op
 bool IsDiskType(const std::string& device) {
   constexpr std::uint64_t kDirectAccess = 0;
   constexpr std::uint64_t kReducedBlock = 14;
+  const std::string word = ReadKernelText(device + "/type");
+  if (word.empty() || word == "SD" || word == "MMC") {
+    return true;  // of no bus with types, or a memory card
+  }
   const auto type = ReadKernelNumber(device + "/type", std::numeric_limits<std::uint64_t>::max());
-  return !type || *type == kDirectAccess || *type == kReducedBlock;
+  return type && (*type == kDirectAccess || *type == kReducedBlock);  // and no flash memory of the firmware ("nor")
 }
 
 // A disk that several controllers reach hangs on none of them in the kernel's tree; it is given to the first.

@@ -14,7 +14,7 @@ void* LoadSymbol(const std::string& module, const char* symbol, std::string& err
   }
   const std::string folder = executable.substr(0, executable.find_last_of('/') + 1);
   void* library = nullptr;
-  for (const char* place : {"../lib/", ""}) {
+  for (const char* place : {"../lib/", "../lib/panelglow-diags/", ""}) {
     // The whole path is given, so that nothing but our own folders is searched.
     library = ::dlopen((folder + place + "lib" + module + ".so").c_str(), RTLD_NOW | RTLD_LOCAL);
     if (library != nullptr) {

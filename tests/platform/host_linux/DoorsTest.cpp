@@ -44,7 +44,6 @@ TEST(LinuxDriver, RefusesRequestsThatItCannotRead) {
   };
   const std::vector<Row> rows{
       {"version", driver::kGetVersion, 0, 4, {}, 0},
-      {"no room for the version", driver::kGetVersion, 0, 2, {}, 87},
       {"unknown code", 0x222900, 12, 12, {}, 1},
       {"short port request", driver::kInportByte, 8, 4, {{4, 1}}, 87},
       {"short port answer", driver::kInportByte, 12, 2, {{4, 1}}, 87},
@@ -55,6 +54,7 @@ TEST(LinuxDriver, RefusesRequestsThatItCannotRead) {
       {"map answer of another word size", driver::kMapPhysicalMemory, 40, 20, {}, 87},
       {"nothing to map", driver::kMapPhysicalMemory, 20, 20, {{0, 0xFED10000}}, 87},
       {"2 GiB to map", driver::kMapPhysicalMemory, 40, 40, {{0, 0xFED10000}, {8, 0x80000000}}, 87},
+      {"the kernel's own RAM", driver::kMapPhysicalMemory, 40, 40, {{0, 0x50100}, {8, 4}}, 5},
       {"mapping over the end", driver::kMapPhysicalMemory, 40, 40, {{0, 0xFFFFFFFF}, {4, 0xFFFFFFFF}, {8, 2}}, 87},
       {"unmap of what is none", driver::kUnmapPhysicalMemory, 20, 20, {{8, 0x1000}}, 87},
       {"short register request", driver::kReadMsr, 4, 8, {}, 87},
@@ -72,7 +72,9 @@ TEST(LinuxDriver, RefusesRequestsThatItCannotRead) {
     for (const auto& [offset, value] : row.fields) {
       driver::PutNumber(in, offset, 4, value);
     }
-    EXPECT_EQ(ToldBy([&] { error = device->Control(row.code, in, out); }), "") << row.what;
+    const std::string told = ToldBy([&] { error = device->Control(row.code, in, out); });
+    EXPECT_EQ(told.find("0x50100 is RAM") != std::string::npos, row.error == 5) << row.what << told;
+    EXPECT_EQ(told.empty(), row.error != 5) << row.what;
     EXPECT_EQ(error, row.error) << row.what;
   }
 }
@@ -209,7 +211,7 @@ TEST(LinuxRawDisks, OpenNothingThatIsNoBlockDevice) {
 TEST(LinuxRawDisks, GiveBlocksThatUnbufferedRequestsTake) {
   LinuxRawDisks disks;
   std::vector<std::unique_ptr<DiskBlock>> blocks;
-  for (const std::size_t size : {512U, 4096U, 512U, 0x8000U}) {
+  for (const std::size_t size : {512U, 4096U, 0x8000U}) {
     blocks.push_back(disks.Allocate(size));
     ASSERT_EQ(blocks.back()->Bytes().size(), size);
     EXPECT_EQ(reinterpret_cast<std::uintptr_t>(blocks.back()->Bytes().data()) % 4096, 0U);
@@ -265,25 +267,42 @@ int CutAndPutBack(const KernelTree& tree, bool hasCarrier) {
     return kNoNetwork;
   }
   std::ofstream("/proc/self/uid_map") << map;
-  const std::string setUp = "(ip link add lan0 type veth peer name lan1 && ip link set lan0 up && ip link set lan1 " +
-                            std::string(hasCarrier ? "up" : "down") +
-                            " && ip address add 192.0.2.2/24 dev lan0 && ip address add 2001:db8::2/64 dev lan0 nodad"
-                            " && ip route add 198.51.100.1/32 dev lan0 && ip route add default via 198.51.100.1"
-                            " && ip -6 route add 2001:db8:1::/48 via 2001:db8::1 && echo done) 2>/dev/null";
+  const std::string setUp =
+      "(ip link add lan0 type veth peer name lan1 && ip link set lan0 up && ip link set lan1 " +
+      std::string(hasCarrier ? "up" : "down") +
+      " && ip address add 192.0.2.2/24 dev lan0 && ip address add 2001:db8::2/64 dev lan0 nodad"
+      " && ip route add 198.51.100.1/32 dev lan0 && ip route add default via 198.51.100.1"
+      " && ip -6 route add 2001:db8:1::/48 via 2001:db8::1 && ip address add fe80::1/64 dev lan0 nodad"
+      " && ip neighbour add 192.0.2.9 lladdr 02:00:00:00:00:09 dev lan0"
+      " && ip link add lan2 type veth peer name lan3 && echo done) 2>/dev/null";
   if (OutputOf(setUp.c_str()) != "done\n") {
     return kNoNetwork;
   }
   constexpr const char* kShow =
-      "(ip route show; ip -6 route show | grep -v fe80; ip -o -6 address show dev lan0 scope global)"
-      " | sed 's/ linkdown//; s/ tentative//' | sort";
+      "(ip route show; ip -6 route show | grep -v fe80; ip -o -6 address show dev lan0; ip neighbour show nud "
+      "permanent)"
+      " | sed 's/ linkdown//; s/ tentative//; s/ valid_lft.*//' | sort";
   const std::string before = OutputOf(kShow);
   tree.Put("net/lan0/ifindex", std::to_string(::if_nametoindex("lan0")));
   tree.Put("net/lan0/flags", "0x1003");
   tree.Put("net/lan0/carrier", hasCarrier ? "1" : "0");
   tree.Put("net/lan0/device/driver", "");
+  tree.Put("net/lan2/ifindex", std::to_string(::if_nametoindex("lan2")));
+  tree.Put("net/lan2/flags", "0x1002");
+  tree.Put("net/lan2/device/driver", "");
   LinuxConnections connections(tree.At("net"));
-  auto adapter = connections.Enumerate()->Next();
-  if (adapter == nullptr || !adapter->Disconnect() || OutputOf(kShow) == before) {
+  const auto walk = connections.Enumerate();
+  // One that is off comes first, and is off again afterwards.
+  if (auto off = walk->Next(); off == nullptr || off->DeviceName() != "lan2" || !off->Connect() ||
+                               OutputOf("ip -o link show lan2 up").empty() || !off->Disconnect() || !off->Connect()) {
+    return 3;
+  }
+  if (!OutputOf("ip -o link show lan2 up").empty()) {
+    return 4;
+  }
+  auto adapter = walk->Next();
+  if (adapter == nullptr || !adapter->Disconnect() || OutputOf(kShow) == before || !adapter->Connect() ||
+      !adapter->Disconnect()) {
     return 1;
   }
   adapter.reset();

@@ -233,6 +233,9 @@ TEST_F(SysfsTest, OnlyDisksThatPeopleKnowAreListedAndSharedOnesHaveAController) 
   const std::string optical = "0000:00:1f.2/ata7/host6/target6:0:0/6:0:0:0";
   tree.AddDisk(optical, "/block/sr0", "", "DVD");
   tree.Put(KernelTree::kBridge + optical + "/type", "5\n");
+  const std::string flash = "0000:00:1f.2/spi_master/spi0/spi0.0/mtd/mtd0";
+  tree.AddDisk(flash, "/block/mtdblock0", "", "");
+  tree.Put(KernelTree::kBridge + flash + "/type", "nor\n");
   tree.AddDisk("0000:00:1f.2/usb1/1-1/host9/target9:0:0/9:0:0:0", "/block/sdc", "Maker", "Stick");
   const std::vector<std::string> onNvme = ChildrenOf(kNvme);
   ASSERT_EQ(onNvme.size(), 2U);
