@@ -12,8 +12,9 @@ namespace panelglow {
 class XmlAttribute final : public Persistent {
  public:
   XmlAttribute() = default;
-  XmlAttribute(std::string_view attributeName, std::string_view attributeValue)
-      : name(attributeName), value(attributeValue) {}
+  /// `blocks`: see XmlText.
+  XmlAttribute(std::string_view attributeName, std::string_view attributeValue, XmlBlocks* blocks = nullptr)
+      : name(attributeName, blocks), value(attributeValue, blocks) {}
 
   void ReadAndWrite(ptstream& stream, Direction direction, unsigned int version) override;
   void CopyFrom(const Persistent* other) override;

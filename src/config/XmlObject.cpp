@@ -78,7 +78,7 @@ auto FindIn(Attributes& attributes, std::string_view name) {
                       [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, name); });
 }
 
-XmlAttribute* SetIn(std::vector<XmlAttribute>& attributes, std::string_view name, std::string_view value) {
+XmlAttribute* SetIn(XmlList<XmlAttribute>& attributes, std::string_view name, std::string_view value) {
   const std::string_view stored = XmlCharactersOf(value);
   const auto found = FindIn(attributes, name);
   if (found != attributes.end()) {
@@ -108,17 +108,6 @@ XmlObject& XmlObject::operator=(const XmlObject& other) {
   return *this;
 }
 
-XmlObject::XmlObject(XmlObject&& other) noexcept
-    : Persistent(std::move(other)),
-      name(std::move(other.name)),
-      value(std::move(other.value)),
-      depth(other.depth),
-      attributes(std::move(other.attributes)),
-      children(std::move(other.children)),
-      prolog(std::move(other.prolog)) {
-  LinkChildren();
-}
-
 XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
   if (this != &other) {
     name = std::move(other.name);
@@ -126,7 +115,7 @@ XmlObject& XmlObject::operator=(XmlObject&& other) noexcept {
     attributes = std::move(other.attributes);
     prolog = std::move(other.prolog);
     // `other` may be a descendant of this object: take its children before the old ones go.
-    std::vector<XmlObject> taken = std::move(other.children);
+    XmlList<XmlObject> taken = std::move(other.children);
     const bool sameDepth = depth == other.depth;
     children = std::move(taken);
     if (sameDepth) {
@@ -172,13 +161,6 @@ void XmlObject::CopyContent(const XmlObject& other) {
     copy.parent = this;
     copy.depth = depth + 1;
     copy.CopyContent(child);
-  }
-}
-
-// After a move the children stay where they are; only their way up has changed.
-void XmlObject::LinkChildren() {
-  for (XmlObject& child : children) {
-    child.parent = this;
   }
 }
 
@@ -351,7 +333,7 @@ XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, double newValu
 }
 
 void XmlObject::RemoveAttribute(std::string_view attribute) {
-  std::erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+  erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
 }
 
 const XmlObject::Prolog& XmlObject::GetProlog() const {
@@ -381,8 +363,8 @@ XmlAttribute* XmlObject::SetDeclaration(std::string_view attribute, const std::s
 }
 
 void XmlObject::RemoveDeclaration(std::string_view attribute) {
-  std::erase_if(GetProlog().declaration,
-                [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+  erase_if(GetProlog().declaration,
+           [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
 }
 
 // ---- children
@@ -403,7 +385,7 @@ XmlObject* XmlObject::AddChild(XmlObject&& child) {
 }
 
 void XmlObject::RemoveChildren(std::string_view childName) {
-  std::erase_if(children, [&](const XmlObject& child) { return child.name == childName; });
+  erase_if(children, [&](const XmlObject& child) { return child.name == childName; });
   Relink();
 }
 

@@ -10,10 +10,12 @@
 #include <string>
 #include <string_view>
 #include <type_traits>
+#include <utility>
 #include <vector>
 
 #include "config/Persistent.h"
 #include "config/XmlAttribute.h"
+#include "config/XmlList.h"
 #include "config/XmlText.h"
 
 namespace panelglow {
@@ -35,7 +37,16 @@ class XmlObject final : public Persistent {
   // keeps its place in its tree.
   XmlObject(const XmlObject& other);
   XmlObject& operator=(const XmlObject& other);
-  XmlObject(XmlObject&& other) noexcept;
+  XmlObject(XmlObject&& other) noexcept
+      : Persistent(std::move(other)),
+        name(std::move(other.name)),
+        value(std::move(other.value)),
+        depth(other.depth),
+        attributes(std::move(other.attributes)),
+        children(std::move(other.children)),
+        prolog(std::move(other.prolog)) {
+    LinkChildren();
+  }
   XmlObject& operator=(XmlObject&& other) noexcept;
   ~XmlObject() override = default;
 
@@ -139,18 +150,18 @@ class XmlObject final : public Persistent {
 
   // ---- what stands before the tag; nearly no element has any of it
   struct Prolog {
-    std::vector<XmlAttribute> declaration;  // of an <?xml ... ?> line
+    XmlList<XmlAttribute> declaration;      // of an <?xml ... ?> line
     std::vector<std::string> instructions;  // other <? ... ?> texts with their delimiters
   };
   [[nodiscard]] const Prolog& GetProlog() const;
   [[nodiscard]] Prolog& GetProlog();
 
-  XmlText name;                          // the tag; empty for a wrapper without a tag
-  XmlText value;                         // the element's text, decoded
-  XmlObject* parent = nullptr;           // not owned
-  int depth = 0;                         // 0 for a root
-  std::vector<XmlAttribute> attributes;  // in document order
-  std::vector<XmlObject> children;
+  XmlText name;                      // the tag; empty for a wrapper without a tag
+  XmlText value;                     // the element's text, decoded
+  XmlObject* parent = nullptr;       // not owned
+  int depth = 0;                     // 0 for a root
+  XmlList<XmlAttribute> attributes;  // in document order
+  XmlList<XmlObject> children;
 
  private:
   friend class XmlParser;
@@ -158,7 +169,13 @@ class XmlObject final : public Persistent {
   void WriteTo(optstream& out);
   void ReadFrom(iptstream& in);
   void CopyContent(const XmlObject& other);
-  void LinkChildren();
+
+  // After a move the children stay where they are; only their way up has changed.
+  void LinkChildren() noexcept {
+    for (XmlObject& child : children) {
+      child.parent = this;
+    }
+  }
   void Relink();
   void Write(std::string& out, bool compact) const;
   [[nodiscard]] bool PassesPair(std::string_view key, std::string_view wanted) const;

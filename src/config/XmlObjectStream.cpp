@@ -14,7 +14,7 @@ namespace {
 [[maybe_unused]] const bool kIsRegistered = RegisterClass<XmlObject>("XmlObject");
 
 template <class Item>
-void WriteItems(optstream& out, std::vector<Item>& items) {
+void WriteItems(optstream& out, XmlList<Item>& items) {
   out.WriteUnsigned(static_cast<std::uint32_t>(items.size()));
   for (Item& item : items) {
     out.WriteValue(item);
@@ -27,13 +27,13 @@ constexpr std::size_t kFirstRoom = 64;
 // Reads `count` items behind those of the list. Where the list outgrows its room the stream is told where each of
 // them has gone: it may refer to them later.
 template <class Item, class Prepare>
-void ReadItems(iptstream& in, std::uint32_t count, std::vector<Item>& items, Prepare prepare) {
+void ReadItems(iptstream& in, std::uint32_t count, XmlList<Item>& items, Prepare prepare) {
   const std::size_t before = items.size();
   items.reserve(before + std::min<std::size_t>(count, kFirstRoom));
   std::vector<std::uint32_t> numbers;
   for (std::uint32_t i = 0; i < count; ++i) {
     if (items.size() == items.capacity()) {
-      std::vector<Item> larger;
+      XmlList<Item> larger;
       larger.reserve(std::min<std::size_t>(before + count, 2 * items.size()));
       for (std::size_t place = 0; place < items.size(); ++place) {
         larger.push_back(std::move(items[place]));

@@ -3,13 +3,15 @@
 #pragma once
 
 #include <cstddef>
-#include <cstdint>
 #include <list>
 #include <string>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
 
+#include "config/XmlBlocks.h"
+#include "config/XmlCharacters.h"
+#include "config/XmlEntities.h"
 #include "config/XmlObject.h"
 
 namespace panelglow {
@@ -33,7 +35,7 @@ class XmlParser {
   struct Attribute {
     std::string_view name;
     std::string_view value;  // raw, or without its comments in `cleaned_`
-    bool encoded = false;    // the value is to be decoded and cut
+    bool encoded = false;    // there is an "&" in the value
   };
 
   // An element whose end has not been found yet. On the stack it is followed by its complete children.
@@ -46,58 +48,78 @@ class XmlParser {
   bool Parse(bool keep);
   void OpenElement();
   void CloseElement();
+  void TakeChildren();
   bool FindTag();
-  bool TakeInstruction();
+  void TakeInstruction();
+  bool ParseContent();
+  void TakeText(std::string_view run, bool hasComments, int commentDepth);
+
+  // Start tags: XmlStartTag.cpp.
   bool ParseStartTag();
   void ParseName();
   void ParseAttribute();
-  void SkipBlanks();
-  void AddAttribute(const Attribute& attribute);
+  void AddAttribute(std::string_view name, std::string_view value, bool encoded);
   Attribute* FindRepeated(std::string_view name);
+  Attribute* FindAmongMany(std::string_view name);
   void StoreAttributes();
-  bool ParseContent();
-  void TakeText(std::string_view run, bool hasComments, int commentDepth);
-  void TakeChildren();
-  bool SkipComment();
+
+  // Moves over white space and comments.
+  void SkipBlanks() {
+    do {
+      here_ = FindXmlClass(here_, kStopsBlanks);
+    } while (SkipComment());
+  }
+
+  // Moves behind a comment that begins here. True when there was a mark.
+  bool SkipComment() {
+    const bool isMark = AtCommentMark();
+    if (isMark) {
+      PassComment();
+    }
+    return isMark;
+  }
+  void PassComment();
 
   // True when `word` stands here. The NUL behind the text differs from every word.
   template <std::size_t Size>
   [[nodiscard]] bool At(const char (&word)[Size]) const {
-    const char* here = text_.data() + position_;
     for (std::size_t i = 0; i + 1 < Size; ++i) {
-      if (here[i] != word[i]) {
+      if (here_[i] != word[i]) {
         return false;
       }
     }
     return true;
   }
-  [[nodiscard]] bool AtEnd() const { return position_ >= text_.size(); }
+  static constexpr char kCommentStart[] = "<!--";
+  static constexpr char kCommentEnd[] = "-->";
+  [[nodiscard]] bool AtCommentMark() const { return At(kCommentStart) || At(kCommentEnd); }
+  [[nodiscard]] bool AtEnd() const { return *here_ == '\0'; }
+  [[nodiscard]] bool AtTagEnd() const { return *here_ == '>' || AtEnd(); }
+  static std::string WithoutComments(std::string_view raw, int commentDepth);
 
-  // The character here; NUL at the end of the text.
-  [[nodiscard]] char Here() const { return *(text_.data() + position_); }
-
-  // Moves to the next character of one of the classes `stops`, which has NUL among them.
-  void RunTo(std::uint8_t stops);
+  // Null for the tree of a small text: the heap will do, and a whole block would be too much.
+  [[nodiscard]] XmlBlocks* IfLarge(XmlBlocks& blocks) { return isLarge_ ? &blocks : nullptr; }
   [[nodiscard]] XmlObject& Innermost() { return stack_[open_.back().place]; }
   [[nodiscard]] std::string Place() const;
   [[noreturn]] void Fail(const std::string& message);
 
-  std::string_view text_;  // a NUL stands behind it
+  const char* here_;   // the character that is being looked at
+  const char* begin_;  // of the top-level element being read
   bool lenient_;
+  bool isLarge_;
   bool keep_ = true;
-  std::size_t position_ = 0;
-  std::size_t begin_ = 0;           // of the top-level element being read
+  XmlEntityDecoder entities_;
+
+  // Lists of children stand apart from the rest. So both kinds of blocks hold their pieces in about the order in
+  // which a tree is gone over, and the processor fetches them ahead; with one kind for all, destroying takes three
+  // times as long.
+  XmlBlocks childBlocks_;
+  XmlBlocks otherBlocks_;
   std::vector<Open> open_;          // outermost first
-  std::vector<XmlObject> stack_;    // the open elements, each with its complete children behind it
+  XmlList<XmlObject> stack_;        // the open elements, each with its complete children behind it
   std::vector<Attribute> tag_;      // attributes of the tag being read
   std::list<std::string> cleaned_;  // values of it that held comments
   std::unordered_map<std::string, std::size_t> manyNames_;  // lowered names of a tag with many attributes
 };
-
-/// Replaces the known entities by their characters, from left to right; any other "&" stays.
-std::string DecodeXmlEntities(std::string_view text);
-
-/// White space in the parser's sense.
-constexpr bool IsXmlSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; }
 
 }  // namespace panelglow

@@ -73,6 +73,7 @@ TEST(XmlObject, ReadsWhatItKnowsAndDropsTheRest) {
       {"<a <!-- -->>x</a>", "<a>x</a>"},
       {"<a>x-->y</a>", "<a>xy</a>"},
       {"<a b='x-->y'/>", "<a b=\"xy\"/>"},
+      {"<a b='x<!--hidden-->y-->z-->'/>", "<a b=\"xyz\"/>"},
       {"<a>1 - 2 -- 3</a>", "<a>1 - 2 -- 3</a>"},
       {"<a/><!-- never closed", "<a/>"},
   };
