@@ -56,6 +56,7 @@ inline constexpr std::uint32_t kQuit = 0x0012;
 inline constexpr std::uint32_t kGetMinMaxInfo = 0x0024;
 inline constexpr std::uint32_t kSetFont = 0x0030;
 inline constexpr std::uint32_t kSyncPaint = 0x0088;
+inline constexpr std::uint32_t kSelectAll = 0x00B1;  // 177, of an entry field
 inline constexpr std::uint32_t kKeyDown = 0x0100;
 inline constexpr std::uint32_t kKeyUp = 0x0101;
 inline constexpr std::uint32_t kChar = 0x0102;
@@ -81,9 +82,11 @@ inline constexpr std::uint32_t kAppCommand = 0x0319;
 inline constexpr std::uint32_t kGetDefaultId = 0x0400;  // which button Enter presses; see kHasDefaultId
 }  // namespace message
 
-/// Bits in the `lParam` of the messages of keys.
+/// Bits in the `lParam` of the messages of keys. The last two are our own; the home system leaves them free.
 namespace key_data {
 inline constexpr std::intptr_t kWasDown = 0x40000000;  // of a key going down and its character: it is held
+inline constexpr std::intptr_t kShift = 0x02000000;    // the Shift key is down
+inline constexpr std::intptr_t kNoKey = 0x04000000;    // of a character: it is part of a text that came in whole
 }  // namespace key_data
 
 /// What happened to a device, in the `wParam` of kDeviceChange.

@@ -7,7 +7,7 @@
 #include <thread>
 
 #include "platform/host_linux/ChildProcess.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 
 // Behind the test framework's headers, whose names its macros would replace.
 #include "display/VirtualDisplay.h"

@@ -4,9 +4,14 @@
 
 #include <chrono>
 #include <cstdlib>
+#include <functional>
+#include <string>
+#include <thread>
+#include <tuple>
 
 #include "platform/host_linux/ChildProcess.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
+#include "prompts/TextWindow.h"
 
 // Behind the test framework's headers, whose names its macros would replace.
 #include <X11/Xatom.h>
@@ -65,6 +70,33 @@ class ScreenTest : public ::testing::Test {
       XGetInputFocus(display_.Connection(), &focused, &revert);
     }
     return focused != window;
+  }
+
+  // Another program has put a text into the clipboard, and gives it to the first who asks. False when nobody does.
+  [[nodiscard]] bool GiveClipboardTo(const std::function<void()>& ask, const std::string& text) const {
+    ::Display* display = display_.Connection();
+    const ::Window owner = XCreateSimpleWindow(display, DefaultRootWindow(display), 0, 0, 1, 1, 0, 0, 0);
+    XSetSelectionOwner(display, XInternAtom(display, "CLIPBOARD", False), owner, CurrentTime);
+    XSync(display, False);
+    ask();
+    XEvent event{};
+    const auto end = std::chrono::steady_clock::now() + kLimit;
+    while (XCheckTypedWindowEvent(display, owner, SelectionRequest, &event) == 0) {
+      if (std::chrono::steady_clock::now() > end) {
+        return false;
+      }
+      std::this_thread::sleep_for(10ms);  // the other process reads its keys in its own time
+    }
+    const XSelectionRequestEvent request = event.xselectionrequest;
+    XChangeProperty(display, request.requestor, request.property, request.target, 8, PropModeReplace,
+                    reinterpret_cast<const unsigned char*>(text.data()), static_cast<int>(text.size()));
+    XEvent answer{};
+    answer.xselection = {
+        SelectionNotify,  0,           False, display, request.requestor, request.selection, request.target,
+        request.property, request.time};
+    XSendEvent(display, request.requestor, False, 0, &answer);
+    XSync(display, False);
+    return true;
   }
 
   VirtualDisplay display_;
@@ -126,6 +158,32 @@ TEST_F(ScreenTest, AClickTakesTheKeyboardBackForAnyPrompt) {
   ASSERT_TRUE(AwaitLossOfKeyboard(other));  // or nobody ends the child
   display_.Do("key Return");
   EXPECT_EQ(child.Wait(), prompt_result::kOk);
+}
+
+TEST_F(ScreenTest, AnEntryFieldTakesKeysWithShiftLongCharactersAndTheClipboard) {
+  const std::tuple<const char*, const char*, const char*> kCases[] = {
+      {"key a b c shift+Home", "", "x"},                // keys, clipboard, line with an x typed at its end
+      {"key a b c Delete Left shift+Left", "", "axc"},  // Delete behind the end neither takes nor types
+      {"key a U1F600 BackSpace", "", "ax"},             // one character of two units
+      {"key a ctrl+v", "PASTED\nand a second line", "aPASTEDx"},
+  };
+  for (const auto& [keys, clipboard, line] : kCases) {
+    SCOPED_TRACE(keys);
+    ChildProcess child([expected = std::string(line)](int) {
+      std::string entered;
+      ShowTextWindow(u"text", u"title", entered, 20'000);
+      return entered == expected ? 0 : 1;
+    });
+    ASSERT_TRUE(AwaitPrompt());
+    const auto type = [&, keys = keys] { display_.Do(keys); };
+    if (*clipboard == '\0') {
+      type();
+    } else {
+      EXPECT_TRUE(GiveClipboardTo(type, clipboard));
+    }
+    display_.Do("key x Return");
+    EXPECT_EQ(child.Wait(), 0);
+  }
 }
 
 TEST_F(ScreenTest, AWindowIsNamedByItsTitle) {

@@ -318,9 +318,7 @@ void TakeAll(const fs::path& folder, const std::string& locale) {
   sim::SimulationOptions options;
   options.realFiles = true;
   {
-    // The program's driver object is made before there is a machine, and has come to the older names by then.
-    const std::string machineText =
-        "driver = {older_set = true}\n" + ReadFile(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / "desktop.toml");
+    const std::string machineText = ReadFile(fs::path(PANELGLOW_SOURCE_DIR) / "machines" / "desktop.toml");
     sim::Simulation machine(machineText, options);
     Studio studio(folder, machine);
     studio.TakeDialog(arguments, sim::ParseMachine(machineText, "desktop.toml").name);

@@ -1,16 +1,17 @@
-// The keyboard rules of a dialog.
+#include "platform/desktop/DialogKeys.h"
+
 #include <algorithm>
+#include <vector>
 
 #include "platform/desktop/Keys.h"
-#include "platform/desktop/WindowRecords.h"
 
 namespace panelglow::platform::desktop {
 
 namespace {
 
-// Commands that a dialog gets for Enter without a default button, and for Escape.
-constexpr std::uintptr_t kOkCommand = 1;
-constexpr std::uintptr_t kCancelCommand = 2;
+bool IsUsable(const Window& window) { return window.enabled && window.visible; }
+bool IsTabStop(const Window& window) { return (window.style & style::kTabStop) != 0 && IsUsable(window); }
+bool IsUsableButton(const Window& window) { return window.kind == WindowKind::kButton && IsUsable(window); }
 
 char16_t UpperLetter(char16_t c) { return c >= u'a' && c <= u'z' ? static_cast<char16_t>(c - 32) : c; }
 
@@ -28,121 +29,91 @@ char16_t MnemonicOf(std::u16string_view caption) {
   return 0;
 }
 
+// The next child in the order of creation, after the last one the first, that is `wanted`. From a window that is no
+// child the walk begins outside.
+template <class Wanted>
+WindowHandle Walk(const WindowTree& tree, WindowHandle dialog, WindowHandle from, bool backwards, Wanted wanted) {
+  std::vector<WindowHandle> children = tree.Find(dialog)->children;
+  if (backwards) {
+    std::reverse(children.begin(), children.end());
+  }
+  const auto current = std::find(children.begin(), children.end(), from);
+  if (current != children.end()) {
+    std::rotate(children.begin(), current + 1, children.end());
+  }
+  const auto next =
+      std::find_if(children.begin(), children.end(), [&](WindowHandle child) { return wanted(*tree.Find(child)); });
+  return next == children.end() ? 0 : *next;
+}
+
+WindowHandle ButtonWithMnemonic(const WindowTree& tree, WindowHandle dialog, char16_t letter) {
+  return Walk(tree, dialog, 0, false, [&](const Window& window) {
+    return letter != 0 && IsUsableButton(window) && MnemonicOf(TextOf(window)) == UpperLetter(letter);
+  });
+}
+
+std::optional<DialogAction> ActionOfKey(const WindowTree& tree, WindowHandle dialog, WindowHandle focus,
+                                        const Message& message) {
+  const Window* focused = tree.Find(focus);
+  const bool onButton = focused != nullptr && focused->kind == WindowKind::kButton;
+  DialogAction action;
+  switch (message.wParam) {
+    case key::kTab:
+      action.focus = Walk(tree, dialog, focus, (message.lParam & key_data::kShift) != 0, IsTabStop);
+      return action;
+    case key::kLeft:
+    case key::kUp:
+    case key::kRight:
+    case key::kDown: {
+      const bool backwards = message.wParam == key::kLeft || message.wParam == key::kUp;
+      if (!onButton) {
+        return std::nullopt;
+      }
+      if (focused->parent == dialog) {
+        action.focus = Walk(tree, dialog, focus, backwards, IsUsableButton);
+      }
+      return action;
+    }
+    case key::kEnter:
+      action.press = onButton && tree.IsDescendant(dialog, focus) ? focus : 0;
+      action.pressDefault = action.press == 0;
+      return action;
+    case key::kEscape:
+      action.command = kCancelCommand;
+      return action;
+    default:
+      return std::nullopt;
+  }
+}
+
 }  // namespace
 
-void WindowSystem::FocusNext(WindowHandle dialog, bool backwards) {
-  std::vector<WindowHandle> stops;
-  for (const WindowHandle child : Find(dialog)->children) {
-    const Window* window = Find(child);
-    if ((window->style & style::kTabStop) != 0 && window->enabled && window->visible) {
-      stops.push_back(child);
-    }
-  }
-  if (stops.empty()) {
-    return;
-  }
-  const auto current = std::find(stops.begin(), stops.end(), OwnQueue().focus);
-  std::size_t next = backwards ? stops.size() - 1 : 0;
-  if (current != stops.end()) {
-    const auto at = static_cast<std::size_t>(current - stops.begin());
-    next = (at + (backwards ? stops.size() - 1 : 1)) % stops.size();
-  }
-  SetFocus(stops[next]);
-}
-
-void WindowSystem::FocusInGroup(WindowHandle dialog, bool backwards) {
-  const std::vector<WindowHandle>& children = Find(dialog)->children;
-  const auto current = std::find(children.begin(), children.end(), OwnQueue().focus);
-  if (current == children.end()) {
-    return;
-  }
-  const auto count = children.size();
-  auto at = static_cast<std::size_t>(current - children.begin());
-  for (std::size_t step = 0; step < count; ++step) {
-    at = (at + (backwards ? count - 1 : 1)) % count;
-    const Window* window = Find(children[at]);
-    if (window->kind == WindowKind::kButton && window->enabled && window->visible) {
-      SetFocus(window->handle);
-      return;
-    }
-  }
-}
-
-WindowHandle WindowSystem::DefaultButton(WindowHandle dialog) const {
-  for (const WindowHandle child : Find(dialog)->children) {
-    const Window* window = Find(child);
-    if (window->kind == WindowKind::kButton && (window->style & 0xFU) == style::kDefaultPushButton) {
-      return child;
-    }
-  }
-  return 0;
-}
-
-bool WindowSystem::PressMnemonic(WindowHandle dialog, char16_t letter) {
-  for (const WindowHandle child : std::vector<WindowHandle>(Find(dialog)->children)) {
-    const Window* window = Find(child);
-    if (window->kind == WindowKind::kButton && window->enabled && window->visible &&
-        MnemonicOf(window->text) == UpperLetter(letter) && letter != 0) {
-      SetFocus(child);
-      PressButton(child);
-      return true;
-    }
-  }
-  return false;
-}
-
-bool WindowSystem::IsDialogMessage(WindowHandle dialog, const Message& message) {
-  if (Find(dialog) == nullptr || !IsDescendant(dialog, message.window)) {
-    return false;
-  }
+std::optional<DialogAction> ActionOf(const WindowTree& tree, WindowHandle dialog, WindowHandle focus,
+                                     const Message& message) {
   if (message.id == message::kKeyDown) {
-    const WindowHandle focus = OwnQueue().focus;
-    const Window* focused = Find(focus);
-    switch (message.wParam) {
-      case key::kTab:
-      case key::kShiftTab:
-        FocusNext(dialog, message.wParam == key::kShiftTab);
-        return true;
-      case key::kLeft:
-      case key::kUp:
-      case key::kRight:
-      case key::kDown:
-        if (focused != nullptr && focused->kind == WindowKind::kButton) {
-          FocusInGroup(dialog, message.wParam == key::kLeft || message.wParam == key::kUp);
-          return true;
-        }
-        break;
-      case key::kEnter:
-        if (focused != nullptr && focused->kind == WindowKind::kButton && IsDescendant(dialog, focus)) {
-          PressButton(focus);
-        } else {
-          const std::intptr_t answer = Send({dialog, message::kGetDefaultId, 0, 0});
-          const WindowHandle button = FindControl(dialog, static_cast<int>(answer & 0xFFFF));
-          if ((answer & ~std::intptr_t{0xFFFF}) == kHasDefaultId && button != 0) {
-            PressButton(button);
-          } else {
-            Send({dialog, message::kCommand, kOkCommand, 0});
-          }
-        }
-        return true;
-      case key::kEscape:
-        Send({dialog, message::kCommand, kCancelCommand, 0});
-        return true;
-      default:
-        break;
-    }
+    return ActionOfKey(tree, dialog, focus, message);
   }
-  // A letter alone does where nothing is typed. One that is held presses once.
-  const Window* typedInto = Find(message.window);
-  const bool mayPress =
-      message.id == message::kSysChar || (message.id == message::kChar && typedInto->kind != WindowKind::kEdit);
-  if (mayPress && (message.lParam & key_data::kWasDown) == 0 &&
-      PressMnemonic(dialog, static_cast<char16_t>(message.wParam))) {
-    return true;
+  // A letter alone presses a button where nothing is typed. One that is held presses once, and what no key typed
+  // never does.
+  const bool isTyped = message.id == message::kSysChar ||
+                       (message.id == message::kChar && tree.Find(message.window)->kind != WindowKind::kEdit);
+  if (!isTyped || (message.lParam & (key_data::kWasDown | key_data::kNoKey)) != 0) {
+    return std::nullopt;
   }
-  Translate(message);
-  Dispatch(message);
-  return true;
+  const WindowHandle button = ButtonWithMnemonic(tree, dialog, static_cast<char16_t>(message.wParam));
+  if (button == 0) {
+    return std::nullopt;
+  }
+  DialogAction action;
+  action.focus = button;
+  action.press = button;
+  return action;
+}
+
+WindowHandle DefaultButton(const WindowTree& tree, WindowHandle dialog) {
+  return Walk(tree, dialog, 0, false, [](const Window& window) {
+    return window.kind == WindowKind::kButton && (window.style & 0xFU) == style::kDefaultPushButton;
+  });
 }
 
 }  // namespace panelglow::platform::desktop

@@ -17,6 +17,5 @@ inline constexpr std::uint32_t kUp = 0x26;
 inline constexpr std::uint32_t kRight = 0x27;
 inline constexpr std::uint32_t kDown = 0x28;
 inline constexpr std::uint32_t kDelete = 0x2E;
-inline constexpr std::uint32_t kShiftTab = 0x0109;  // our own: Tab with the Shift key
 
 }  // namespace panelglow::platform::desktop::key

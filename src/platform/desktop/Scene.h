@@ -1,4 +1,4 @@
-// A picture of the windows as plain data: what a screen has to draw. Made by WindowSystem, drawn by the drawing
+// A picture of the windows as plain data: what a screen has to draw. Made by SceneBuilder, drawn by the drawing
 // module into a file or onto a display.
 #pragma once
 
@@ -66,9 +66,11 @@ struct SceneWindow {
   Font font;
   bool enabled = true;
   bool focused = false;
-  bool heavyFrame = false;  // of a button: the one that Enter presses
-  std::size_t caret = 0;    // of an entry field: before which character it stands
-  bool topmost = false;     // of a top-level window
+  bool heavyFrame = false;         // of a button: the one that Enter presses
+  std::size_t caret = 0;           // of an entry field: before which character it stands
+  std::size_t selectionBegin = 0;  // of an entry field; the same twice when nothing is selected
+  std::size_t selectionEnd = 0;
+  bool topmost = false;  // of a top-level window
   bool pressed = false;
   bool vertical = false;  // scroll bar
   ScrollState scroll;

@@ -10,16 +10,31 @@
 namespace panelglow::platform::desktop {
 
 struct ScreenEvent {
-  enum class Kind { kMouseDown, kMouseUp, kMouseMove, kKeyDown, kKeyUp, kForegroundLost };
+  enum class Kind { kMouseDown, kMouseUp, kMouseMove, kKeyDown, kKeyUp, kText, kForegroundLost };
   Kind kind = Kind::kKeyDown;
   int x = 0;  // screen pixels
   int y = 0;
   std::uint32_t virtualKey = 0;  // see Keys.h
   char16_t character = 0;        // what the key types, 0 for none
   bool alt = false;
+  bool shift = false;
   bool repeat = false;   // the key was down already: it is held
+  std::u16string text;   // of kText: no key typed it, but an input method or the clipboard gave it whole
   std::u16string title;  // of another program's window that has the keyboard now or covers ours; empty if unknown
 };
+
+inline bool IsMouse(const ScreenEvent& event) {
+  using Kind = ScreenEvent::Kind;
+  return event.kind == Kind::kMouseDown || event.kind == Kind::kMouseUp || event.kind == Kind::kMouseMove;
+}
+
+inline ScreenEvent MouseEvent(ScreenEvent::Kind kind, int x, int y) {
+  ScreenEvent event;
+  event.kind = kind;
+  event.x = x;
+  event.y = y;
+  return event;
+}
 
 class Screen {
  public:

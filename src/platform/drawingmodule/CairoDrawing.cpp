@@ -19,6 +19,7 @@ constexpr long long kMostImagePixels = 1 << 26;  // 64 million: 256 MB of memory
 constexpr Color kButtonColor = 0x00E8E8E8;
 constexpr Color kPressedColor = 0x00D0D0D0;
 constexpr Color kWhite = 0x00FFFFFF;
+constexpr Color kSelection = 0x00D77800;
 constexpr Color kFaintText = 0x00808080;
 
 void SetColor(cairo_t* cr, Color color) {
@@ -135,6 +136,14 @@ void DrawStaticText(cairo_t* cr, const SceneWindow& window, const std::string& l
   pango_cairo_show_layout(cr, layout.get());
 }
 
+// Where a character of an entry field's line begins, in pixels from the line's beginning.
+int PlaceInLine(PangoLayout* layout, const std::u16string& text, std::size_t character) {
+  const std::size_t before = Utf8FromWide(std::u16string_view(text).substr(0, character)).size();
+  PangoRectangle place{};
+  pango_layout_get_cursor_pos(layout, static_cast<int>(before), &place, nullptr);
+  return PANGO_PIXELS(place.x);
+}
+
 // An entry field: one line that is moved so that the caret can be seen.
 void DrawEdit(cairo_t* cr, const SceneWindow& window, const std::string& language) {
   constexpr int kMargin = 4;  // pixels, left and right
@@ -144,10 +153,7 @@ void DrawEdit(cairo_t* cr, const SceneWindow& window, const std::string& languag
   pango_layout_set_single_paragraph_mode(layout.get(), TRUE);
   int height = 0;
   pango_layout_get_pixel_size(layout.get(), nullptr, &height);
-  PangoRectangle caret{};
-  const std::size_t before = Utf8FromWide(std::u16string_view(window.text).substr(0, window.caret)).size();
-  pango_layout_get_cursor_pos(layout.get(), static_cast<int>(before), &caret, nullptr);
-  const int caretX = PANGO_PIXELS(caret.x);
+  const int caretX = PlaceInLine(layout.get(), window.text, window.caret);
   const int x = window.client.left + kMargin - std::max(0, caretX - (window.client.Width() - 2 * kMargin));
   const double y = window.client.top + (window.client.Height() - height) / 2.0;
   cairo_save(cr);
@@ -156,6 +162,19 @@ void DrawEdit(cairo_t* cr, const SceneWindow& window, const std::string& languag
   cairo_move_to(cr, x, y);
   SetColor(cr, TextColor(window, kWhite));
   pango_cairo_show_layout(cr, layout.get());
+  if (window.focused && window.selectionBegin != window.selectionEnd) {
+    const int begin = x + PlaceInLine(layout.get(), window.text, window.selectionBegin);
+    const int end = x + PlaceInLine(layout.get(), window.text, window.selectionEnd);
+    const Rectangle selected{begin, static_cast<int>(y), end, static_cast<int>(y) + height};
+    cairo_save(cr);
+    cairo_rectangle(cr, selected.left, selected.top, selected.Width(), selected.Height());
+    cairo_clip(cr);
+    FillRectangle(cr, selected, kSelection);
+    cairo_move_to(cr, x, y);
+    SetColor(cr, kWhite);
+    pango_cairo_show_layout(cr, layout.get());
+    cairo_restore(cr);
+  }
   if (window.focused) {
     FillRectangle(cr, {x + caretX + 1, static_cast<int>(y), x + caretX + 2, static_cast<int>(y) + height}, 0);
   }

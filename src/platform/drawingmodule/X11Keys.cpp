@@ -19,7 +19,7 @@ struct KeyRow {
 // Keys that stand for something else than the character they type.
 constexpr std::array<KeyRow, 14> kKeys{{{XK_BackSpace, key::kBackspace},
                                         {XK_Tab, key::kTab},
-                                        {XK_ISO_Left_Tab, key::kShiftTab},
+                                        {XK_ISO_Left_Tab, key::kTab},
                                         {XK_Return, key::kEnter},
                                         {XK_KP_Enter, key::kEnter},
                                         {XK_Escape, key::kEscape},
@@ -46,23 +46,6 @@ std::uint32_t VirtualKeyOf(KeySym symbol) {
   // those of its characters belong to other keys.
   const bool isOwnCode = (symbol >= XK_A && symbol <= XK_Z) || (symbol >= XK_0 && symbol <= XK_9);
   return isOwnCode ? static_cast<std::uint32_t>(symbol) : 0;
-}
-
-char16_t FirstCharacter(const char* text, int length) {
-  if (length <= 0) {
-    return 0;
-  }
-  const auto byte = [&](int i) { return static_cast<unsigned>(static_cast<unsigned char>(text[i])); };
-  if (byte(0) < 0x80) {
-    return static_cast<char16_t>(byte(0));
-  }
-  if ((byte(0) & 0xE0U) == 0xC0 && length >= 2) {
-    return static_cast<char16_t>((byte(0) & 0x1FU) << 6U | (byte(1) & 0x3FU));
-  }
-  if ((byte(0) & 0xF0U) == 0xE0 && length >= 3) {
-    return static_cast<char16_t>((byte(0) & 0x0FU) << 12U | (byte(1) & 0x3FU) << 6U | (byte(2) & 0x3FU));
-  }
-  return 0;
 }
 
 }  // namespace panelglow::platform::desktop

@@ -1,19 +1,16 @@
 #include "platform/drawingmodule/X11Screen.h"
 
-#include <X11/XKBlib.h>
 #include <X11/Xatom.h>
 #include <X11/Xutil.h>
 #include <X11/cursorfont.h>
 
 #include <algorithm>
-#include <array>
 #include <cmath>
 #include <cstdlib>
 #include <utility>
 
 #include "platform/Text.h"
 #include "platform/desktop/Damage.h"
-#include "platform/drawingmodule/X11Keys.h"
 #include "platform/drawingmodule/X11Picture.h"
 
 namespace panelglow::platform::desktop {
@@ -47,25 +44,20 @@ X11Screen::X11Screen(::Display* display)
     : display_(display),
       nameProperty_(XInternAtom(display, "_NET_WM_NAME", False)),
       utf8_(XInternAtom(display, "UTF8_STRING", False)),
-      cursor_(XCreateFontCursor(display, XC_left_ptr)) {
+      cursor_(XCreateFontCursor(display, XC_left_ptr)),
+      keyboard_(display),
+      clipboard_(display) {
   XSetErrorHandler(OnError);
   XSetIOErrorHandler(OnIoError);
   XSetIOErrorExitHandler(display_, OnGone, this);
-  XkbSetDetectableAutoRepeat(display_, True, nullptr);  // a key that is held is pressed again, not released
-  XSetLocaleModifiers("");
-  inputMethod_ = XOpenIM(display_, nullptr, nullptr, nullptr);
+  keyboard_.Open();
 }
 
 X11Screen::~X11Screen() {
   if (!alive_) {
     return;  // giving up what the display held would be requests to it
   }
-  if (inputContext_ != nullptr) {
-    XDestroyIC(inputContext_);
-  }
-  if (inputMethod_ != nullptr) {
-    XCloseIM(inputMethod_);
-  }
+  keyboard_.Close();
   XFreeCursor(display_, cursor_);
   XCloseDisplay(display_);
 }
@@ -129,9 +121,7 @@ void X11Screen::RemoveAllBut(const std::vector<WindowHandle>& windows) {
       ++shown;
       continue;
     }
-    if (inputContext_ != nullptr && inputWindow_ == shown->second.window) {
-      XDestroyIC(std::exchange(inputContext_, nullptr));
-    }
+    keyboard_.Forget(shown->second.window);
     XDestroyWindow(display_, shown->second.window);
     shown = windows_.erase(shown);
   }
@@ -154,14 +144,7 @@ void X11Screen::BringForward(const Scene& scene) {
   }
   FocusOn(front->second.window);
   isCovered_ = false;
-  if (inputMethod_ != nullptr) {
-    if (inputContext_ != nullptr) {
-      XDestroyIC(inputContext_);
-    }
-    inputWindow_ = front->second.window;
-    inputContext_ = XCreateIC(inputMethod_, XNInputStyle, XIMPreeditNothing | XIMStatusNothing, XNClientWindow,
-                              inputWindow_, XNFocusWindow, inputWindow_, nullptr);
-  }
+  keyboard_.Serve(front->second.window);
 }
 
 void X11Screen::FocusOn(::Window window) {
@@ -299,13 +282,19 @@ void X11Screen::TakeEvent(XEvent& event, std::vector<ScreenEvent>& events) {
       }
       [[fallthrough]];
     case KeyPress:
-      TakeKey(event, events);
+      TakeKey(event.xkey, events);
       break;
-    case KeymapNotify:  // follows each focus: keys that were pressed or released elsewhere
-      for (std::size_t code = 0; code < keysDown_.size(); ++code) {
-        const auto byte = static_cast<unsigned>(static_cast<unsigned char>(event.xkeymap.key_vector[code / 8]));
-        keysDown_.set(code, (byte >> code % 8 & 1U) != 0);
+    case SelectionNotify: {
+      ScreenEvent pasted;
+      pasted.kind = ScreenEvent::Kind::kText;
+      pasted.text = clipboard_.TextOf(event.xselection);
+      if (!pasted.text.empty()) {
+        events.push_back(std::move(pasted));
       }
+      break;
+    }
+    case KeymapNotify:  // follows each focus: keys that were pressed or released elsewhere
+      keyboard_.NoteKeysDown(event.xkeymap);
       break;
     case FocusIn:
     case FocusOut: {
@@ -404,38 +393,11 @@ bool X11Screen::IsRepeated(const XEvent& release) const {
   return next.type == KeyPress && next.xkey.keycode == release.xkey.keycode && next.xkey.time == release.xkey.time;
 }
 
-void X11Screen::TakeKey(XEvent& event, std::vector<ScreenEvent>& events) {
-  std::array<char, 32> text{};
-  KeySym symbol = NoSymbol;
-  int length = 0;
-  if (event.type == KeyPress && inputContext_ != nullptr) {
-    Status status = 0;
-    length =
-        Xutf8LookupString(inputContext_, &event.xkey, text.data(), static_cast<int>(text.size()), &symbol, &status);
-    if (status == XBufferOverflow) {
-      return;
-    }
-  } else {
-    length = XLookupString(&event.xkey, text.data(), static_cast<int>(text.size()), &symbol, nullptr);
-  }
-  ScreenEvent taken;
-  taken.virtualKey = VirtualKeyOf(symbol);
-  taken.character = FirstCharacter(text.data(), length);
-  taken.alt = (event.xkey.state & Mod1Mask) != 0;
-  // A text that an input method made has no key.
-  const std::size_t code = event.xkey.keycode;
-  const bool hasKey = code > 0 && code < keysDown_.size();
-  if (event.type == KeyRelease) {
-    taken.kind = ScreenEvent::Kind::kKeyUp;
-    taken.character = 0;
-  } else {
-    taken.repeat = hasKey && keysDown_.test(code);
-  }
-  if (hasKey) {
-    keysDown_.set(code, event.type == KeyPress);
-  }
-  if (taken.virtualKey != 0 || taken.character != 0) {
-    events.push_back(std::move(taken));
+void X11Screen::TakeKey(XKeyEvent& event, std::vector<ScreenEvent>& events) {
+  if (AsksForClipboard(event)) {
+    clipboard_.Ask(event.window, event.time);
+  } else if (std::optional<ScreenEvent> taken = keyboard_.Take(event)) {
+    events.push_back(std::move(*taken));
   }
 }
 

@@ -4,7 +4,6 @@
 
 #include <X11/Xlib.h>
 
-#include <bitset>
 #include <map>
 #include <memory>
 #include <string>
@@ -12,6 +11,8 @@
 
 #include "platform/desktop/Screen.h"
 #include "platform/drawingmodule/CairoDrawing.h"
+#include "platform/drawingmodule/X11Clipboard.h"
+#include "platform/drawingmodule/X11Keyboard.h"
 
 namespace panelglow::platform::desktop {
 
@@ -50,7 +51,7 @@ class X11Screen : public Screen {
   void Draw(const Scene& scene, const std::map<WindowHandle, Rectangle>& damage);
   void TakeEvent(XEvent& event, std::vector<ScreenEvent>& events);
   [[nodiscard]] bool IsRepeated(const XEvent& release) const;
-  void TakeKey(XEvent& event, std::vector<ScreenEvent>& events);
+  void TakeKey(XKeyEvent& event, std::vector<ScreenEvent>& events);
   void NoteLoss(std::vector<ScreenEvent>& events);
   [[nodiscard]] bool IsUnderOwnWindow() const;
   [[nodiscard]] std::u16string TitleOf(::Window window) const;
@@ -62,9 +63,8 @@ class X11Screen : public Screen {
   Atom nameProperty_;
   Atom utf8_;
   Cursor cursor_;
-  ::XIM inputMethod_ = nullptr;
-  ::XIC inputContext_ = nullptr;
-  ::Window inputWindow_ = 0;
+  X11Keyboard keyboard_;
+  X11Clipboard clipboard_;
   bool alive_ = true;
   std::map<WindowHandle, ShownWindow> windows_;
   std::vector<WindowHandle> order_;
@@ -74,7 +74,6 @@ class X11Screen : public Screen {
   bool hasFocus_ = false;        // the foreground window has the keyboard
   bool isCovered_ = false;       // a window of another program lies on it
   bool isLost_ = false;          // one of the two was told
-  std::bitset<256> keysDown_;    // by key code
   Scene shown_;
   CairoDrawing drawing_;
 };

@@ -59,8 +59,10 @@ struct Simulation::Parts {
         chips(devices.Parts()),
         panel(description.leds,
               [this](const std::string& device, const std::string& pin) {
-                const Device* found = buses.Find(device);
-                return found == nullptr ? std::optional<bool>() : found->Signal(pin);
+                // Asked at every access to the hardware: each lamp's part is looked for once.
+                const auto [part, isNew] = partsOfLamps.try_emplace(&device, nullptr);
+                part->second = isNew ? buses.Find(device) : part->second;
+                return part->second == nullptr ? std::optional<bool>() : part->second->Signal(pin);
               }),
         cpu(description),
         driver(description.driver, cpu, buses, scheduler, trace, [this] { LookAtPanel(); }),
@@ -188,6 +190,7 @@ struct Simulation::Parts {
   std::vector<Device*> chips;           // those that may act by themselves
   std::optional<Microseconds> awaited;  // the chips' next event, when one is ahead
   DriverTrace trace;
+  std::map<const std::string*, const Device*> partsOfLamps;  // by the name in the lamp, where it stands
   FrontPanel panel;
   SimCpu cpu;
   SimDriver driver;

@@ -26,9 +26,20 @@ Device* Buses::Find(const std::string& name) const {
   return nullptr;
 }
 
+void Buses::Remove(const std::string& name) {
+  for (Attached& attached : devices_) {
+    attached.isRemoved = attached.isRemoved || attached.name == name;
+  }
+}
+
+bool Buses::IsRemoved(const std::string& name) const {
+  return std::any_of(devices_.begin(), devices_.end(),
+                     [&](const Attached& attached) { return attached.isRemoved && attached.name == name; });
+}
+
 const Buses::Attached* Buses::AtPort(std::uint16_t port) const {
   for (const Attached& attached : devices_) {
-    if (removed_.count(attached.name) == 0 && AnyContains(attached.device->PortRanges(), port)) {
+    if (!attached.isRemoved && AnyContains(attached.device->PortRanges(), port)) {
       return &attached;
     }
   }
@@ -67,7 +78,7 @@ void Buses::WritePort(std::uint16_t port, unsigned width, std::uint32_t value) {
 
 std::uint8_t Buses::ReadMemory(std::uint64_t address) {
   if (const Attached* attached = AtMemory(address)) {
-    return removed_.count(attached->name) != 0 ? std::uint8_t{0xFF} : attached->device->ReadMemory(address);
+    return attached->isRemoved ? std::uint8_t{0xFF} : attached->device->ReadMemory(address);
   }
   const auto page = ram_.find(address / kPage);
   return page == ram_.end() ? std::uint8_t{0} : page->second[address % kPage];
@@ -75,7 +86,7 @@ std::uint8_t Buses::ReadMemory(std::uint64_t address) {
 
 void Buses::WriteMemory(std::uint64_t address, std::uint8_t value) {
   if (const Attached* attached = AtMemory(address)) {
-    if (removed_.count(attached->name) == 0 && !IsIgnored(attached->name, address)) {
+    if (!attached->isRemoved && !IsIgnored(attached->name, address)) {
       attached->device->WriteMemory(address, value);
     }
     return;
@@ -84,8 +95,13 @@ void Buses::WriteMemory(std::uint64_t address, std::uint8_t value) {
 }
 
 void Buses::LoadMemory(std::uint64_t address, std::span<const std::uint8_t> bytes) {
-  for (std::size_t i = 0; i < bytes.size(); ++i) {
-    WriteMemory(address + i, bytes[i]);
+  while (!bytes.empty()) {
+    const std::uint64_t offset = address % kPage;
+    const std::size_t length = std::min<std::size_t>(bytes.size(), kPage - offset);
+    std::copy_n(bytes.begin(), length,
+                ram_.try_emplace(address / kPage).first->second.begin() + static_cast<std::ptrdiff_t>(offset));
+    address += length;
+    bytes = bytes.subspan(length);
   }
 }
 

@@ -26,13 +26,13 @@ class Buses {
   [[nodiscard]] Device* Find(const std::string& name) const;
 
   /// A device taken off the buses: it answers no access, its pins stay where they are.
-  void Remove(const std::string& name) { removed_.insert(name); }
-  [[nodiscard]] bool IsRemoved(const std::string& name) const { return removed_.count(name) != 0; }
+  void Remove(const std::string& name);
+  [[nodiscard]] bool IsRemoved(const std::string& name) const;
 
   /// Writes to this port or memory address succeed and change nothing.
   void IgnoreWrites(const std::string& device, std::uint64_t address) { ignored_.insert({device, address}); }
   [[nodiscard]] bool IsIgnored(const std::string& device, std::uint64_t address) const {
-    return ignored_.count({device, address}) != 0;
+    return !ignored_.empty() && ignored_.count({device, address}) != 0;
   }
 
   /// `width` is 1, 2 or 4 bytes; where nothing answers a read gives ones.
@@ -42,6 +42,8 @@ class Buses {
   /// Addresses without a device are RAM.
   std::uint8_t ReadMemory(std::uint64_t address);
   void WriteMemory(std::uint64_t address, std::uint8_t value);
+
+  /// Puts bytes into RAM, also where a device hides it.
   void LoadMemory(std::uint64_t address, std::span<const std::uint8_t> bytes);
 
   [[nodiscard]] const PciFunction* FindPci(std::uint16_t location) const;
@@ -56,6 +58,7 @@ class Buses {
   struct Attached {
     std::string name;
     std::unique_ptr<Device> device;
+    bool isRemoved = false;
   };
   [[nodiscard]] const Attached* AtPort(std::uint16_t port) const;
   [[nodiscard]] const Attached* AtMemory(std::uint64_t address) const;
@@ -63,7 +66,6 @@ class Buses {
   static constexpr std::uint64_t kPage = 4096;
 
   std::vector<Attached> devices_;
-  std::set<std::string> removed_;
   std::set<std::pair<std::string, std::uint64_t>> ignored_;
   std::vector<PciFunction> functions_;
   std::map<std::uint64_t, std::array<std::uint8_t, kPage>> ram_;  // by page number
