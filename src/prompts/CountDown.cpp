@@ -1,7 +1,7 @@
 #include "prompts/CountDown.h"
 
 #include <algorithm>
-#include <cstdlib>
+#include <optional>
 
 #include "harness/base/CDMUtil.h"
 #include "prompts/PromptParts.h"
@@ -13,77 +13,42 @@ using platform::WindowHandle;
 
 namespace {
 
-constexpr int kAboveBottom = 22;  // pixels from the window's lower edge to the number's upper one
-constexpr int kGap = 6;           // pixels to what stands beside the number
 constexpr int kOneLine = 10'000;  // pixels: no line is broken
-
-bool Overlap(const Rectangle& a, const Rectangle& b) {
-  return a.left < b.right && b.left < a.right && a.top < b.bottom && b.top < a.bottom;
-}
 
 }  // namespace
 
-void CountDown::Arrange(WindowHandle window, const std::vector<WindowHandle>& buttons,
-                        std::optional<std::uint32_t> seconds) {
+CountDown::Step CountDown::Tick() {
+  if (!IsRunning()) {
+    return Step::kNothing;
+  }
+  ++elapsedTicks_;
+  if (elapsedTicks_ > timeoutTicks_) {
+    timeoutTicks_ = 0;
+    return Step::kOver;
+  }
+  return elapsedTicks_ % (1000 / kTick_ms) == 0 ? Step::kSecond : Step::kNothing;
+}
+
+void CountDown::Arrange(WindowHandle window, const std::vector<WindowHandle>& buttons) {
   controls_.clear();
-  coversCaption_ = false;
-  text_ = seconds ? CDMUtil::ToWString(CDMUtil::ToString(*seconds)) : wstring();
-  if (!seconds) {
+  if (!IsRunning()) {
     return;
   }
-  const Rectangle client = desktop_.ClientRectangle(window);
-  const Rectangle size = desktop_.MeasureText(text_, kOneLine, kPromptFont);
-  place_ = PlaceAt(client.Width() / 5, client.Height() - kAboveBottom, size.Width(), size.Height());
-  std::vector<Rectangle> inRow;  // the buttons beside the number, from left to right
-  WindowHandle under = 0;        // the first of those that it stands on
+  text_ = CDMUtil::ToWString(CDMUtil::ToString((timeoutTicks_ - elapsedTicks_) * kTick_ms / 1000));
+  const auto sizeOf = [&](const wstring& text) { return desktop_.MeasureText(text, kOneLine, kPromptFont); };
+  std::vector<ButtonOutline> outlines;
+  outlines.reserve(buttons.size());
   for (const WindowHandle button : buttons) {
-    const Rectangle area = desktop_.WindowRectangle(button);
-    if (Overlap(area, {0, place_.top, client.Width(), place_.bottom})) {
-      inRow.push_back(area);
-      under = under == 0 && Overlap(area, place_) ? button : under;
-    }
+    outlines.push_back({desktop_.WindowRectangle(button), sizeOf(desktop_.WindowText(button)).Width()});
   }
-  if (under != 0) {
-    MoveAside(inRow, client.Width());
-    const bool isFree =
-        std::none_of(inRow.begin(), inRow.end(), [&](const Rectangle& area) { return Overlap(area, place_); });
-    if (!isFree) {
-      MoveOnto(under);
-    }
-  }
+  const Rectangle client = desktop_.ClientRectangle(window);
+  const Rectangle number = sizeOf(text_);
+  place_ = PlaceOfCountDown({client.Width(), client.Height()}, {number.Width(), number.Height()}, outlines);
   for (const WindowHandle child : desktop_.Children(window)) {
-    if (desktop_.IsWindowVisible(child) && Overlap(desktop_.WindowRectangle(child), place_)) {
+    if (desktop_.IsWindowVisible(child) && Overlap(desktop_.WindowRectangle(child), place_.place)) {
       controls_.push_back(child);
     }
   }
-}
-
-// To the nearest gap of a row of buttons that is wide enough; stays where it is when there is none.
-void CountDown::MoveAside(const std::vector<Rectangle>& buttons, int clientWidth) {
-  const int wanted = place_.left;
-  const int width = place_.Width();
-  std::optional<int> nearest;
-  int gapBegin = 0;
-  for (std::size_t i = 0; i <= buttons.size(); ++i) {
-    const int gapEnd = i < buttons.size() ? buttons[i].left : clientWidth;
-    if (gapEnd - gapBegin >= width + 2 * kGap) {
-      const int left = std::clamp(wanted, gapBegin + kGap, gapEnd - kGap - width);
-      nearest = nearest && std::abs(*nearest - wanted) <= std::abs(left - wanted) ? nearest : left;
-    }
-    gapBegin = i < buttons.size() ? buttons[i].right : clientWidth;
-  }
-  place_ = PlaceAt(nearest.value_or(wanted), place_.top, width, place_.Height());
-}
-
-// Beside the button's caption, or over its end where that leaves no room.
-void CountDown::MoveOnto(WindowHandle button) {
-  const Rectangle area = desktop_.WindowRectangle(button);
-  const Rectangle caption = desktop_.MeasureText(desktop_.WindowText(button), kOneLine, kPromptFont);
-  const int captionEnd = (area.left + area.right + caption.Width()) / 2;
-  const int last = area.right - kGap - place_.Width();
-  const int left = std::min(std::max(place_.left, captionEnd + kGap), last);
-  coversCaption_ = left < captionEnd;
-  place_ = PlaceAt(left, place_.top, place_.Width(), place_.Height());
 }
 
 bool CountDown::IsOn(WindowHandle control) const {
@@ -91,8 +56,8 @@ bool CountDown::IsOn(WindowHandle control) const {
 }
 
 void CountDown::Paint(platform::Canvas& canvas, WindowHandle surface) const {
-  int x = place_.left;
-  int y = place_.top;
+  int x = place_.place.left;
+  int y = place_.place.top;
   if (IsOn(surface)) {
     const Rectangle area = desktop_.WindowRectangle(surface);
     const int frame = (area.Width() - desktop_.ClientRectangle(surface).Width()) / 2;
@@ -100,7 +65,7 @@ void CountDown::Paint(platform::Canvas& canvas, WindowHandle surface) const {
     y -= area.top + frame;
   }
   canvas.DrawText(x, y, text_, kPromptFont, 0,
-                  coversCaption_ ? std::optional<platform::Color>(ground_) : std::nullopt);
+                  place_.coversCaption ? std::optional<platform::Color>(ground_) : std::nullopt);
 }
 
 }  // namespace panelglow

@@ -1,41 +1,46 @@
-// The seconds that are left, painted on a prompt. The number has a fixed place in the window; where a button lies
-// there it moves aside, and where a text lies there it is painted on the text.
+// The time limit of a prompt: counts ticks, and paints the seconds that are left. The number is painted on the window
+// and on the controls that lie where it stands.
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <vector>
 
 #include "platform/Desktop.h"
+#include "prompts/PromptLayout.h"
 
 namespace panelglow {
 
 class CountDown {
  public:
-  /// `ground` is the colour behind the number where it must cover a caption.
-  CountDown(platform::Desktop& desktop, platform::Color ground) : desktop_(desktop), ground_(ground) {}
+  static constexpr std::uint32_t kTick_ms = 10;
 
-  /// Finds the number's place in the window as it is now; `seconds` is empty when nothing is counted. `buttons` are
-  /// those of the window.
-  void Arrange(platform::WindowHandle window, const std::vector<platform::WindowHandle>& buttons,
-               std::optional<std::uint32_t> seconds);
+  /// 0 seconds: nothing is counted. `ground` is the colour behind the number where it must cover a caption.
+  CountDown(platform::Desktop& desktop, platform::Color ground, unsigned int seconds)
+      : desktop_(desktop), ground_(ground), timeoutTicks_(seconds * 1000 / kTick_ms) {}
+
+  enum class Step { kNothing, kSecond, kOver };
+
+  /// What one more tick brings. Nothing is counted any more once it is over.
+  Step Tick();
+
+  /// Finds the number's place in the window as it is now. `buttons` are those of the window.
+  void Arrange(platform::WindowHandle window, const std::vector<platform::WindowHandle>& buttons);
 
   /// The controls that lie where the number stands, and are to paint their part of it.
   [[nodiscard]] const std::vector<platform::WindowHandle>& Controls() const { return controls_; }
   [[nodiscard]] bool IsOn(platform::WindowHandle control) const;
+  [[nodiscard]] bool IsRunning() const { return timeoutTicks_ != 0; }
 
   /// Paints the number, or the part of it that lies there, on the window or one of Controls().
   void Paint(platform::Canvas& canvas, platform::WindowHandle surface) const;
 
  private:
-  void MoveAside(const std::vector<platform::Rectangle>& buttons, int clientWidth);
-  void MoveOnto(platform::WindowHandle button);
-
   platform::Desktop& desktop_;
   platform::Color ground_;
-  wstring text_;               // empty: nothing is counted
-  platform::Rectangle place_;  // client pixels of the window
-  bool coversCaption_ = false;
+  std::uint32_t timeoutTicks_;
+  std::uint32_t elapsedTicks_ = 0;
+  wstring text_;
+  CountDownPlace place_;  // client pixels of the window
   std::vector<platform::WindowHandle> controls_;
 };
 

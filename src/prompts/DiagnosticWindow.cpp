@@ -1,15 +1,13 @@
 #include "prompts/DiagnosticWindow.h"
 
-#include <utility>
-
-#include "prompts/PromptWindow.h"
+#include "prompts/ConfigurablePrompt.h"
 
 namespace panelglow {
 
 namespace {
 
-int Show(const DiagnosticConfiguration& configuration, PromptWindow::Request request) {
-  return PromptWindow({"MessageWindowClassName", configuration.GetBackgroundBrush(), true}, std::move(request)).Run();
+int Show(const DiagnosticConfiguration& configuration, const PromptRequest& request) {
+  return ConfigurablePrompt(configuration.GetBackgroundBrush(), request).Run();
 }
 
 }  // namespace
@@ -25,9 +23,9 @@ int DiagnosticWindow::TextForm(const wstring& text, const wstring& title, unsign
 
 int DiagnosticWindow::MarkedForm(const wstring& text, const wstring& title, unsigned int style,
                                  const wstring& greenMark, const wstring& redMark) {
-  PromptWindow::Request request{text, title, style};
+  PromptRequest request{text, title, style};
   request.marks = {greenMark, redMark};
-  return Show(configuration, std::move(request));
+  return Show(configuration, request);
 }
 
 }  // namespace panelglow

@@ -25,7 +25,21 @@ constexpr std::array<Caption, 8> kCaptions{{{0, u""},
                                             {20013, u"&Retry"},
                                             {20014, u"&Yes"}}};
 
+// By style.
+constexpr std::array<ButtonSet, 6> kButtonSets{{
+    {{prompt_result::kOk, 0, 0}, 1, prompt_result::kOk},
+    {{prompt_result::kOk, prompt_result::kCancel, 0}, 2, prompt_result::kOk},
+    {{prompt_result::kAbort, prompt_result::kRetry, prompt_result::kIgnore}, 3, prompt_result::kIgnore},
+    {{prompt_result::kYes, prompt_result::kNo, prompt_result::kCancel}, 3, prompt_result::kYes},
+    {{prompt_result::kYes, prompt_result::kNo, 0}, 2, prompt_result::kYes},
+    {{prompt_result::kRetry, prompt_result::kCancel, 0}, 2, prompt_result::kRetry},
+}};
+
 }  // namespace
+
+const ButtonSet& ButtonSetOf(unsigned int promptStyle) {
+  return kButtonSets[promptStyle < kButtonSets.size() ? promptStyle : 0];
+}
 
 wstring PromptCaption(int result) {
   const Caption& caption = kCaptions[static_cast<std::size_t>(result)];
@@ -64,6 +78,10 @@ platform::WindowHandle CreateControl(platform::Desktop& desktop, platform::Windo
   }
   desktop.SetFont(control, kPromptFont);
   return control;
+}
+
+void MoveControl(platform::Desktop& desktop, platform::WindowHandle control, const platform::Rectangle& place) {
+  desktop.MoveWindow(control, place.left, place.top, place.Width(), place.Height());
 }
 
 }  // namespace panelglow

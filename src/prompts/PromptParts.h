@@ -1,10 +1,13 @@
-// What the windows of this folder have in common: font, captions, titles, classes and controls.
+// What the windows of this folder have in common: font, button sets, captions, titles, classes and controls.
 #pragma once
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
 #include "platform/Desktop.h"
+#include "prompts/PromptLayout.h"
 #include "prompts/PromptState.h"
 
 namespace panelglow {
@@ -16,9 +19,15 @@ inline constexpr std::uint32_t kShowInPlace =
     platform::position::kNoSize | platform::position::kNoMove | platform::position::kShowWindow;  // 0x43
 inline constexpr int kFirstButtonId = 1000;  // a button's id is this and its result
 
-// The window of every form without an image, in pixels.
-inline constexpr int kFormWidth = 540;
-inline constexpr int kFormHeight = 290;
+/// The buttons of a prompt by its style, in their order, and the default one.
+struct ButtonSet {
+  std::array<int, 3> results;
+  std::size_t count;
+  int defaultResult;
+};
+
+/// A style that is not known has OK alone.
+const ButtonSet& ButtonSetOf(unsigned int promptStyle);
 
 /// The caption of a result's button, in the operator's language.
 wstring PromptCaption(int result);
@@ -53,9 +62,7 @@ struct ControlRequest {
 platform::WindowHandle CreateControl(platform::Desktop& desktop, platform::WindowHandle parent,
                                      const ControlRequest& request);
 
-/// A rectangle by its left top corner and its size.
-constexpr platform::Rectangle PlaceAt(int left, int top, int width, int height) {
-  return {left, top, left + width, top + height};
-}
+/// Gives a control another place in its parent.
+void MoveControl(platform::Desktop& desktop, platform::WindowHandle control, const platform::Rectangle& place);
 
 }  // namespace panelglow

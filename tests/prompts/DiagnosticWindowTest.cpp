@@ -3,7 +3,7 @@
 
 #include "prompts/Desk.h"
 #include "prompts/DiagnosticWindow.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 
 namespace panelglow::prompttest {
 namespace {

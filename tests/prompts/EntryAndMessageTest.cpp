@@ -4,7 +4,7 @@
 #include "prompts/Desk.h"
 #include "prompts/DiagnosticWindow.h"
 #include "prompts/MessageWindow.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 #include "prompts/TextWindow.h"
 
 namespace panelglow::prompttest {

@@ -9,7 +9,7 @@
 #include "prompts/Desk.h"
 #include "prompts/DiagnosticWindow.h"
 #include "prompts/MessageWindow.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 #include "prompts/TextWindow.h"
 
 namespace panelglow::prompttest {
@@ -223,6 +223,42 @@ TEST(Pixels, ALongLineShowsItsEndInTheField) {
     EXPECT_EQ(photo.Count(In(20, 216, 500, 30), kFace), 500 * 30);   // nor below
   });
   desk.ClickAt(500, 1005);
+  std::string entered;
+  ShowTextWindow(u"text", u"title", entered, 5000);
+}
+
+TEST(Pixels, WhatIsSelectedIsSeenWhileTheFieldHasTheKeyboard) {
+  constexpr platform::Color kSelection = 0x00D77800;
+  Desk desk;
+  const auto look = [&](bool first, bool second) {
+    const Photo photo(desk);
+    EXPECT_EQ(photo.Count(In(124, 195, 12, 15), kSelection) > 50, first);
+    EXPECT_EQ(photo.Count(In(160, 195, 20, 15), kSelection) > 50, second);
+    EXPECT_EQ(photo.Count(In(250, 195, 165, 15), kSelection), 0);  // behind the line
+  };
+  const auto press = [&](std::uint32_t key, bool shift) {
+    platform::desktop::ScreenEvent event;
+    event.virtualKey = key;
+    event.shift = shift;
+    desk.windows.Take(event);
+  };
+  desk.At(100, [&] {
+    for (const char16_t letter : std::u16string_view(u"nnnnnnnn")) {
+      desk.windows.Key('N', letter, false);
+    }
+  });
+  desk.At(200, [&] { look(false, false); });
+  desk.At(250, [&] { press(0x24, true); });  // all, up to the line's beginning
+  desk.At(300, [&] { look(true, true); });
+  desk.At(350, [&] {
+    press(0x24, false);
+    press(0x27, true);
+    press(0x27, true);
+  });
+  desk.At(400, [&] { look(true, false); });
+  desk.At(450, [&] { press(0x09, false); });  // to the button
+  desk.At(500, [&] { look(false, false); });
+  desk.ClickAt(600, 1005);
   std::string entered;
   ShowTextWindow(u"text", u"title", entered, 5000);
 }

@@ -4,7 +4,7 @@
 #include <map>
 
 #include "prompts/Desk.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 
 namespace panelglow::prompttest {
 namespace {
