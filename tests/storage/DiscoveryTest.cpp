@@ -195,36 +195,12 @@ class NotedManagement : public platform::Management {
   Texts& notes_;
 };
 
-class NotedRegistry : public platform::Registry {
- public:
-  NotedRegistry(platform::Registry& own, Texts& notes) : own_(own), notes_(notes) {}
-  std::unique_ptr<platform::RegistryKey> OpenMachineKey(std::string_view path) override {
-    auto key = own_.OpenMachineKey(path);
-    notes_.push_back(std::string(key ? "open " : "no ") + std::string(path));
-    return key ? std::make_unique<Key>(std::move(key), notes_) : nullptr;
-  }
-
- private:
-  struct Key : platform::RegistryKey {
-    Key(std::unique_ptr<platform::RegistryKey> key, Texts& allNotes) : own(std::move(key)), notes(allNotes) {}
-    std::uint32_t Read(std::string_view value, std::span<char> room, std::size_t& size) override {
-      notes.push_back("read " + std::string(value) + " into " + std::to_string(room.size()));
-      return own->Read(value, room, size);
-    }
-    std::unique_ptr<platform::RegistryKey> own;
-    Texts& notes;
-  };
-  platform::Registry& own_;
-  Texts& notes_;
-};
-
-// Every question to the management service and to the registry that a discovery and the look-up of a drive put.
+// Every question to the management service that a discovery and the look-up of a drive put.
 Texts Asked(const std::string& description, const std::string& ini, const std::string& disk) {
   Machine machine(description, ini);
   Texts asked;
   NotedManagement management(machine.sim.TheMachine().management, asked);
-  NotedRegistry registry(machine.sim.TheMachine().registry, asked);
-  machine.Use({.management = &management, .registry = &registry});
+  machine.Use({.management = &management});
   Discover("msctrl.ini");
   MSUtils::GetDriveHandleStrUsingDevInstId(disk);
   return asked;
@@ -238,15 +214,13 @@ TEST(Discovery, AsksTheseQuestionsInThisOrder) {
   const std::string lists =
       "[SATA CONTROLLERS]\n0x8086,0x2922,0x5678,0x1234,wind,a\n[SAS CONTROLLERS]\n0x1000,0x72,0x1000,0x3020,scsi,b\n"
       "[NON VOLATILE STORAGE CONTROLLERS]\n1,2,x,scsi,y\n0x15,0x5344,SD32G,wmi,c\n";
-  const std::string port = "open HARDWARE\\DEVICEMAP\\Scsi\\Scsi Port ";
   const std::string drive = R"(SELECT * FROM Win32_DiskDrive where PNPDeviceID='IDE\\DISK\\5&1')";
   EXPECT_THAT(
       Asked(ide + card + sas, lists, R"(IDE\DISK\5&1)"),
       ElementsAre(
           "connect ROOT\\CIMV2", "SELECT * FROM Win32_IDEController",
           R"(ASSOCIATORS OF {Win32_PnPEntity.DeviceID="PCI\\VEN_8086&DEV_2922&SUBSYS_12345678&REV_02\\3&11583659&0&FA"} WHERE ResultClass=Win32_SystemDriver)",
-          port + "0", "read Driver into 32", "read Driver into 41", port + "1", "read Driver into 32",
-          "SELECT * FROM Win32_SCSIController", port + "0", "read Driver into 32", "read Driver into 41", drive));
+          "SELECT * FROM Win32_SCSIController", drive));
   // A card that comes first has the list of its kind loaded, which asks for each line of the interface "wmi".
   EXPECT_THAT(Asked(card, lists, R"(IDE\DISK\5&1)"),
               ElementsAre("connect ROOT\\CIMV2", "SELECT * FROM Win32_IDEController",

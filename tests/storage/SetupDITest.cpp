@@ -60,45 +60,6 @@ TEST_F(SetupDITest, WalksTheChildrenOfANode) {
   EXPECT_FALSE(SetupDI().GetParent(child));
 }
 
-TEST_F(SetupDITest, FindsTheInterfacePathOfADeviceAndThenStandsForIt) {
-  tree_.Add(0, {.id = "X\\CD"});
-  const auto disk = tree_.Add(0, {.id = "X\\DISK", .diskPath = R"(\\?\x#disk)"});
-  SetupDI object("X\\CD");
-  const auto before = object.GetDevNode();
-  EXPECT_EQ(object.GetInterfaceDevicePath("X\\CD", "{class}"), "");
-  EXPECT_EQ(object.GetDevNode(), before);
-  EXPECT_EQ(object.GetInterfaceDevicePath("X\\DISK", "{class}"), R"(\\?\x#disk)");
-  EXPECT_EQ(object.GetDevNode(), disk);
-  EXPECT_THAT(tree_.calls, ElementsAre("open X\\CD 18 {class}", "open X\\DISK 18 {class}"));
-  tree_.refuses = true;
-  EXPECT_EQ(object.GetInterfaceDevicePath("X\\DISK", "{class}"), "");
-}
-
-TEST_F(SetupDITest, WalksListsOfDevicesAndOfInterfaces) {
-  tree_.Add(0, {.id = "PCI\\1", .diskPath = "first"});
-  const auto last = tree_.Add(0, {.id = "PCI\\2", .diskPath = "second"});
-  SetupDI list;
-  EXPECT_FALSE(list.NextDevice() || list.NextInterface());
-  EXPECT_EQ(list.GetInterfaceDevicePath(), "");
-  EXPECT_TRUE(list.OpenDeviceList("PCI", 6, ""));
-  EXPECT_TRUE(list.NextDevice() && list.NextDevice());
-  EXPECT_FALSE(list.NextDevice());
-  EXPECT_EQ(list.GetDevNode(), last);
-  EXPECT_TRUE(list.OpenDeviceList("", 18, "{class}"));
-  EXPECT_TRUE(list.NextInterface());
-  EXPECT_EQ(list.GetInterfaceDevicePath(), "first");
-  EXPECT_TRUE(list.NextInterface());
-  EXPECT_EQ(list.GetInterfaceDevicePath(), "second");
-  EXPECT_FALSE(list.NextInterface());
-  EXPECT_EQ(list.GetInterfaceDevicePath(), "second");  // found last
-  EXPECT_TRUE(list.OpenDeviceList("PCI", 6, ""));      // begins anew
-  EXPECT_TRUE(list.NextDevice());
-  EXPECT_EQ(list.GetDevNode(), last - 1);
-  EXPECT_THAT(tree_.calls, ElementsAre("open PCI 6 ", "open  18 {class}", "open PCI 6 "));
-  tree_.refuses = true;
-  EXPECT_FALSE(list.OpenDeviceList("PCI", 6, ""));
-}
-
 TEST_F(SetupDITest, ReadsPropertiesIntoTheRoomThatThereIs) {
   auto device = Function("ids");
   device.properties[17] = {4, {1, 2, 3, 4}};

@@ -50,7 +50,7 @@ void Machine::Use(const StandIns& standIns) {
                      .mutexes = own.mutexes,
                      .profiles = standIns.profiles != nullptr ? *standIns.profiles : own.profiles,
                      .rawDisks = own.rawDisks,
-                     .registry = standIns.registry != nullptr ? *standIns.registry : own.registry,
+                     .registry = own.registry,
                      .services = own.services,
                      .threads = own.threads,
                      .touchpad = own.touchpad,

@@ -18,7 +18,6 @@ struct StandIns {
   platform::DeviceTree* tree = nullptr;
   platform::Management* management = nullptr;
   platform::ProfileFiles* profiles = nullptr;
-  platform::Registry* registry = nullptr;
 };
 
 /// A simulated machine with its files in memory, and nothing known of the one before. While it exists it is

@@ -130,7 +130,7 @@ TEST(SystemBoardTool, CheckSpeaksToProgramsAndStandsWhatIsHostile) {
                                                          {"chip.ini", bytes},
                                                          {"buttondefinition.xml", bytes},
                                                          {"msctrl.ini", bytes},
-                                                         {"chip.ini", std::string(std::size_t{100} << 20U, '[')},
+                                                         {"chip.ini", std::string(std::size_t{16} << 20U, '[')},
                                                          {"chip.ini", "[a]\nbase=b\n[b]\nbase=a\n"}};
   for (const auto& [name, text] : hostile) {
     const Installation broken;

@@ -30,6 +30,7 @@ TEST(SystemController, ItsExitCodesTellAWrongCallFromABrokenRun) {
       {{"--machine", machine, "--operator", "nobody"}, 2, "there is no operator \"nobody\" (perfect"},
       {{"--machine", machine, "--fault", "caps-lock"}, 2, "must have the form LED=KIND"},
       {{"--machine", machine, "--fault", "caps-lock=wet"}, 2, "there is no fault \"wet\" (dead"},
+      {{"--machine", machine, "--fault", "caps-lock=swapped:none"}, 2, "none"},
       {{"--machine", machine, "--seed", "many"}, 2, "--seed"},
       {{"--machine", machine, "--seed=-1"}, 2, "--seed"},
       {{"--machine", "."}, 3, "the machine's file . cannot be read"},

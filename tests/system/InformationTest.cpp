@@ -11,14 +11,32 @@ namespace {
 using ::testing::EndsWith;
 using ::testing::StartsWith;
 
-// The program's path stands in the texts as it was called.
-std::string Expected(const std::string& name) {
-  const std::string program = (std::filesystem::path(PANELGLOW_BINARY_DIR) / "panelglow-diags").string();
-  std::string text = Golden("information/" + name + ".golden");
-  constexpr std::string_view kPlaceholder = "@PROGRAM@";
-  for (std::size_t at = text.find(kPlaceholder); at != std::string::npos; at = text.find(kPlaceholder, at)) {
-    text.replace(at, kPlaceholder.size(), program);
+void ReplaceAll(std::string& text, const std::string& from, const std::string& to) {
+  for (std::size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {
+    text.replace(at, from.size(), to);
   }
+}
+
+// The lines from the one that begins with `first` to the one that begins with `behind`.
+std::string Between(const std::string& text, const std::string& first, const std::string& behind) {
+  const std::size_t begin = text.find("\n" + first) + 1;
+  return text.substr(begin, text.find("\n" + behind, begin) - begin);
+}
+
+// The program's path stands in the texts as it was called; and in that of the whole program the catalogue, two blanks
+// further in, and the dictionary of each subtest, as that subtest alone has them. The options that every usage has
+// stand in that of the whole program.
+std::string Expected(const std::string& name) {
+  std::string text = Golden("information/" + name + ".golden");
+  for (const std::string subtest : {"CustomLEDTest", "LEDStatusIndicator", "LEDTest"}) {
+    const std::string own = Golden("information/" + subtest + ".golden");
+    std::string catalogue = "\n" + Between(own, "    <ARGUMENT", "</TEST>");
+    ReplaceAll(catalogue, "\n", "\n  ");
+    ReplaceAll(text, "\n@CATALOG " + subtest + "@", catalogue);
+    ReplaceAll(text, "@DICTIONARY " + subtest + "@", Between(own, subtest + "/Name", "\nTMB CDM"));
+  }
+  ReplaceAll(text, "@OPTIONS@", Between(Golden("information/diagnostic.golden"), "-version=", "\n"));
+  ReplaceAll(text, "@PROGRAM@", (std::filesystem::path(PANELGLOW_BINARY_DIR) / "panelglow-diags").string());
   return text;
 }
 

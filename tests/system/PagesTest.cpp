@@ -7,7 +7,6 @@
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <sstream>
 
 #include "system/SystemRun.h"
@@ -21,13 +20,6 @@ using ::testing::IsEmpty;
 namespace fs = std::filesystem;
 
 const fs::path kTop = PANELGLOW_SOURCE_DIR;
-
-std::string TextOf(const fs::path& path) {
-  std::ifstream file(path, std::ios::binary);
-  std::ostringstream text;
-  text << file.rdbuf();
-  return text.str();
-}
 
 struct Block {
   std::string page;

@@ -18,13 +18,6 @@ namespace {
 const fs::path kSource = PANELGLOW_SOURCE_DIR;
 const fs::path kPrograms = PANELGLOW_BINARY_DIR;
 
-std::string TextOf(const fs::path& path) {
-  std::ifstream file(path, std::ios::binary);
-  std::ostringstream text;
-  text << file.rdbuf();
-  return text.str();
-}
-
 // For the shell, whatever the text holds.
 std::string Quoted(const std::string& text) {
   std::string quoted = "'";
@@ -68,6 +61,13 @@ void ReadReport(const fs::path& path, Outcome& outcome) {
 }
 
 }  // namespace
+
+std::string TextOf(const fs::path& path) {
+  std::ifstream file(path, std::ios::binary);
+  std::ostringstream text;
+  text << file.rdbuf();
+  return text.str();
+}
 
 Installation::Installation() {
   std::string pattern = (fs::temp_directory_path() / "panelglow-test-XXXXXX").string();

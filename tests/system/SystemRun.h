@@ -9,6 +9,9 @@
 
 namespace panelglow::systemtest {
 
+/// The bytes of a file; empty when there is none.
+std::string TextOf(const std::filesystem::path& path);
+
 /// A copy of the installation in a temporary folder, gone with the object.
 class Installation {
  public:

@@ -41,8 +41,6 @@ class Bench {
 
   void Out(std::uint16_t port, std::uint8_t value) { Port(0x220010, port, value); }
   std::uint8_t In(std::uint16_t port) { return static_cast<std::uint8_t>(Port(0x220004, port, 0)); }
-  void OutDword(std::uint16_t port, std::uint32_t value) { Port(0x220018, port, value, 4); }
-  std::uint32_t InDword(std::uint16_t port) { return Port(0x22000C, port, 0, 4); }
   void Run(const std::vector<Write>& writes, Microseconds pause_us = 0) {
     for (const auto& [port, value] : writes) {
       Out(port, value);
@@ -83,8 +81,8 @@ class Bench {
   Simulation machine;
 
  private:
-  std::uint32_t Port(std::uint32_t code, std::uint16_t port, std::uint32_t value, std::uint32_t width = 1) {
-    const std::uint32_t request[3] = {port, width, value};
+  std::uint32_t Port(std::uint32_t code, std::uint16_t port, std::uint32_t value) {
+    const std::uint32_t request[3] = {port, 1, value};
     std::uint32_t answer = 0;
     device_->Control(code, std::as_bytes(std::span(request)), std::as_writable_bytes(std::span(&answer, 1)));
     return answer;

@@ -6,7 +6,6 @@
 namespace panelglow::platform::sim {
 namespace {
 
-using ::testing::Optional;
 using Bytes = std::vector<std::uint8_t>;
 
 ManagementValue ArrayOf(const Bytes& bytes) { return {ManagementArray(bytes.begin(), bytes.end())}; }
@@ -90,51 +89,6 @@ TEST(FirmwareCall, SwitchesTheRadiosAndTheirLampForAProperCallAlone) {
     EXPECT_EQ(isGood, c.goesDark || c.what == std::string("the other radio"));
     EXPECT_TRUE(BytesOf(result, u"Data").empty() || !isGood);
   }
-}
-
-TEST(FirmwareCall, ReadsTheRecordsOfRadiosFansAndTemperatures) {
-  Bench bench(MachineText("casl-notebook.toml"));
-  const Bytes radios = BytesOf(Caller{}.In(bench.machine), u"Data");
-  ASSERT_EQ(radios.size(), 128U);
-  EXPECT_EQ(radios[0], 2);
-  EXPECT_EQ(radios[6] & 1, 1);
-  EXPECT_EQ(radios[18] & 1, 0);
-  const auto thermal = [&](const Bytes& input, std::int32_t command) {
-    Bytes data = BytesOf(Caller{.command = command, .type = 0x28, .input = input}.In(bench.machine), u"Data");
-    data.resize(3);
-    return data;
-  };
-  EXPECT_EQ(thermal({3, 0, 0, 0}, 1), (Bytes{1, 24, 0}));
-  EXPECT_EQ(thermal({1, 0, 0, 0}, 1), (Bytes{2, 41, 38}));
-  Bytes duties(128);
-  duties[0] = 0x23;
-  duties[1] = 1;
-  duties[2] = 0xFE;
-  thermal(duties, 2);
-  EXPECT_EQ(thermal({0x23, 0, 0, 0}, 1), (Bytes{1, 0xFE, 0}));
-}
-
-TEST(FirmwareCall, FailsAsItsFileSays) {
-  const auto faulty = [](const char* fault) {
-    Bench bench(MachineText("casl-notebook.toml", "[firmware_call]", "fault = \"" + std::string(fault) + "\""));
-    return Caller{}.In(bench.machine);
-  };
-  EXPECT_NE(BytesOf(faulty("wrong-signature"), u"Sign"), kGood);
-  const ManagementCallResult shortened = faulty("short-data");
-  EXPECT_EQ(BytesOf(shortened, u"Sign"), kGood);
-  EXPECT_EQ(BytesOf(shortened, u"Data").size(), 1U);
-  EXPECT_EQ(faulty("get-method").failedAt, ManagementCallStep::kGetMethod);
-  EXPECT_EQ(faulty("execute").failedAt, ManagementCallStep::kExecute);
-  EXPECT_EQ(faulty("query-output").failedAt, ManagementCallStep::kQueryOutput);
-}
-
-TEST(FirmwareCall, AMachineWithoutItHasNoSuchClass) {
-  Bench bench(MachineText("codec-notebook.toml"));
-  ManagementError error;
-  const auto services = bench.machine.TheMachine().management.Connect("root\\wmi", error);
-  EXPECT_FALSE(services->Query(u"SELECT * FROM tmbBIntM"));
-  EXPECT_EQ(services->Call({u"tmbBIntM", u"", u"tmbBIOSInt0", u"tmbBDataIn", {}}).failedAt,
-            ManagementCallStep::kGetMethod);
 }
 
 }  // namespace
