@@ -15,6 +15,7 @@
 #include <vector>
 
 #include "controller/ChildProcess.h"
+#include "controller/Options.h"
 #include "controller/PanelView.h"
 #include "controller/ProtocolFollower.h"
 #include "controller/RunReport.h"
@@ -30,19 +31,6 @@ constexpr int kFailed = 1;
 constexpr int kWrongCall = 2;
 constexpr int kRunImpossible = 3;
 constexpr std::size_t kStripColumns = 64;
-
-struct Options {
-  std::string machine;
-  std::string person;
-  std::uint64_t seed = 1;
-  std::vector<std::string> faults;
-  bool realTime = false;
-  bool window = false;
-  bool raw = false;
-  std::string screenshots;
-  std::string trace;
-  std::vector<std::string> arguments;  // of the program
-};
 
 int Complain(int code, const std::string& problem) {
   std::cerr << "panelglow-sim: " << problem << "\n";
@@ -269,32 +257,8 @@ int Run(const Options& options) {
 
 int RunCommandLine(int argc, char** argv) {
   Options options;
-  CLI::App app{
-      "Runs panelglow-diags on a simulated machine with a simulated operator, follows it as a controller does, and "
-      "shows "
-      "the front panel's time line and the verdict. Run it in the folder of an installation.\n"
-      "Exits with the program's code (0 passed, 1 failed, also when the output could not be written); 2: a wrong "
-      "call; 3: a run that could not be made."};
-  app.name("panelglow-sim");
-  app.add_option("--machine", options.machine, "the machine's file, as machines/notebook.toml")->required();
-  app.add_option("--operator", options.person,
-                 "who sits there: " + sim::Operator::PolicyNames() +
-                     " (some take a number: wrong:2, slow:10); perfect, or with --window nobody but you");
-  app.add_option("--seed", options.seed, "another seed is another order of LEDs and events")
-      ->capture_default_str()
-      ->check(CLI::NonNegativeNumber);
-  app.add_option("--fault", options.faults,
-                 "LED=KIND, repeatable; kinds: " + sim::LedFaultNames() + " (swapped:OTHER, shorted:OTHER)")
-      ->allow_extra_args(false);
-  app.add_flag("--real-time", options.realTime, "follow the wall clock instead of jumping through time");
-  app.add_flag("--window", options.window,
-               "show windows and front panel on the display, in real time, and take the test yourself");
-  app.add_option("--screenshots", options.screenshots, "save a picture of the screen at each press in this folder");
-  app.add_option("--trace", options.trace, "write every driver request to this file");
-  app.add_flag("--raw", options.raw, "pass the program's lines through unchanged, and nothing else");
-  app.add_option("ARGS", options.arguments, "parameters of the program, behind --: -subtest=CustomLEDTest ...");
-  app.positionals_at_end();
-  app.footer("\nOperators:\n" + sim::Operator::PolicyHelp() + "\nFaults of a LED:\n" + sim::LedFaultHelp());
+  CLI::App app;
+  AddOptions(app, options);
   try {
     app.parse(argc, argv);
   } catch (const CLI::ParseError& error) {
