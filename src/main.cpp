@@ -1,4 +1,5 @@
 // Starts the program: builds the manager and the subtests, and runs what the command line asks for.
+#include "Version.h"
 #include "harness/DiagnosticManager.h"
 #include "ledtests/CustomLEDTest.h"
 #include "ledtests/LEDStatusIndicator.h"
@@ -7,12 +8,6 @@
 namespace {
 
 constexpr const char* kName = "Panelglow-diags";
-constexpr const char* kVersion =
-    "4.10.0, timestamp: Sep 25 2013 13:10:03 1212\n"
-    "   (cdm: 4.15.0)\n"
-    "   (mb : 4.15.0)\n"
-    "   (ms : 4.15.0)";
-
 }  // namespace
 
 // No guard stands around this: building the manager and the subtests throws nothing short of memory running out, and

@@ -97,7 +97,7 @@ bool Orchard::DetectNicDashCable(int line, bool& present) {
   std::optional<DashController> controller;
   std::uint16_t location = 0;
   if (devio.FindPciDeviceByName(DashController::kNetworkClass, kNicName, 0, location)) {
-    Log(std::string("----[") + kNicName + "] NIC PCI address = " + Hex(location, 4));
+    Log("----[" + std::string(kNicName) + "] NIC PCI address = " + Hex(location, 4));
     controller = DashController::At(devio, location);
   }
   if (!controller) {

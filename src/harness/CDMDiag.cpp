@@ -13,7 +13,7 @@
 #include "prompts/DiagnosticConfiguration.h"
 #include "prompts/DiagnosticWindow.h"
 #include "prompts/MessageWindow.h"
-#include "prompts/PromptWindow.h"
+#include "prompts/PlainPrompt.h"
 #include "prompts/TextWindow.h"
 
 namespace panelglow {

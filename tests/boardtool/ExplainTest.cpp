@@ -1,27 +1,12 @@
-// What "explain" says of a board, and that the simulated machines see just that.
+// What "explain" says of a board.
 #include <gtest/gtest.h>
 
-#include <filesystem>
-#include <fstream>
-#include <sstream>
-
-#include "board/MotherBoard.h"
-#include "board/base/BoardDevio.h"
 #include "boardtool/Explain.h"
 #include "boardtool/Rehearsal.h"
 #include "platform/sim/Simulation.h"
 
 namespace panelglow::boardtool {
 namespace {
-
-const std::filesystem::path kTop = PANELGLOW_SOURCE_DIR;
-
-std::string TextOf(const std::filesystem::path& path) {
-  std::ifstream file(path, std::ios::binary);
-  std::ostringstream text;
-  text << file.rdbuf();
-  return text.str();
-}
 
 const BoardFiles kNames = BoardFilesIn(".");
 
@@ -74,86 +59,6 @@ TEST(Explain, SaysWhyThereIsNoBoardOrNoLamp) {
                       "\"test.powerled.chip\") has nothing for it; without a value in [g_iospace]: powerled."),
             std::string::npos)
       << dark;
-}
-
-// ---- against simulated silicon
-
-// Writes as "port 0x0A20 <- 31", in order.
-std::string WritesOf(const std::vector<platform::sim::DriverRequest>& requests) {
-  std::string text;
-  for (const platform::sim::DriverRequest& request : requests) {
-    if (request.code == platform::sim::DriverRequest::kMappedWrite) {
-      HardwareAccess access;
-      access.kind = HardwareAccess::Kind::kMemoryWrite;
-      access.width = 1;
-      std::istringstream words(platform::sim::Describe(request));
-      std::string word;
-      for (int i = 0; i < 6; ++i) {
-        words >> word;  // simulated, time, us, thread, number, memory
-      }
-      words >> word;
-      access.address = std::stoull(word, nullptr, 16);
-      words >> word >> word;
-      text += PlaceOf(access) + " <- " + std::to_string(std::stoul(word, nullptr, 16)) + "\n";
-    } else if (const auto access = DecodeRequest(request.code, request.in, {}); access && IsWrite(access->kind)) {
-      text += PlaceOf(*access) + " <- " + std::to_string(access->value) + "\n";
-    }
-  }
-  return text;
-}
-
-// The plan's writes on hardware that held what the machine wrote where the plan keeps bits.
-std::string WritesOf(const PlannedStep& step, const std::string& seen) {
-  std::istringstream lines(seen);
-  std::string text;
-  for (const PlannedAccess& access : step.accesses) {
-    std::string line;
-    if (IsWrite(access.access.kind)) {
-      std::getline(lines, line);
-      const std::size_t at = line.rfind(' ');
-      const std::uint64_t there = at == std::string::npos ? 0 : std::stoull(line.substr(at));
-      text += PlaceOf(access.access) + " <- " + std::to_string(access.set | (there & access.kept)) + "\n";
-    }
-  }
-  return text;
-}
-
-TEST(Explain, IsWhatTheSimulatedMachinesSee) {
-  std::vector<IniOutline> files;
-  for (const std::string& name : {kNames.detectPath, kNames.testPath, kNames.chipPath}) {
-    files.emplace_back(name, TextOf(kTop / "installation" / name));
-  }
-  std::size_t steps = 0;
-  // Machines whose boards look for no base address and ask no mailbox, whose answers nobody can imagine.
-  for (const char* const name : {"desktop", "notebook", "ec-notebook", "ec16-notebook", "old-ec"}) {
-    platform::sim::Simulation machine(TextOf(kTop / "machines" / (std::string(name) + ".toml")));
-    for (const IniOutline& file : files) {
-      machine.DiskFiles().Put(file.path, file.bytes);
-    }
-    const std::string id = machine.Description().firmware.boardProduct.substr(0, 4);
-    RehearsalWish wish;
-    wish.withSources = false;
-    const BoardPlan plan = Rehearse(files, kNames, id, platform::TheHost(), wish);
-    BoardDevio().LoadDriver();
-    machine.Trace().Keep();
-    for (const LedPlan& led : plan.leds) {
-      if (!led.IsLit() || led.blinksByItself) {
-        continue;
-      }
-      const auto board =
-          MotherBoard::Instantiate(kNames.detectPath, kNames.testPath, kNames.chipPath, "platform", id);
-      const std::pair<const char*, BoardOperation> operations[] = {
-          {"save", led.led->save}, {"on", led.led->on}, {"off", led.led->off}, {"restore", led.led->restore}};
-      for (const auto& [step, operation] : operations) {
-        machine.Trace().Clear();
-        EXPECT_EQ(((*board).*operation)(), led.Find(step)->answer) << name << " " << led.led->id << " " << step;
-        const std::string seen = WritesOf(machine.Trace().Requests());
-        EXPECT_EQ(WritesOf(*led.Find(step), seen), seen) << name << " " << led.led->id << " " << step;
-        steps += seen.empty() ? 0 : 1;
-      }
-    }
-  }
-  EXPECT_GT(steps, 20U);
 }
 
 }  // namespace

@@ -114,39 +114,53 @@ TEST(CDevio, SendsEachRequestByteByByte) {
   }
 }
 
-TEST(CDevio, AnswersWithNothingWithoutADriver) {
-  MachineDescription description = Machine(true);
-  description.driver.present = false;
-  Simulation machine(description, {});
-  CDevio d;
-  machine.Trace().Keep();
-  std::uint8_t byte = 1;
-  std::uint16_t word = 1;
-  std::uint16_t location = 1;
-  std::uint32_t dword = 1;
-  std::uint64_t wide = 1;
-  std::vector<std::byte> buffer(4, std::byte{7});
-  CDevio::MappingRecord mapping{1, 2, 3, 4, 5};
-  const std::vector<int> statuses{
-      d.ReadPciConfigByte(0, 0, byte),    d.ReadPciConfigWord(0, 0, word), d.ReadPciConfigDword(0, 0, dword),
-      d.WritePciConfigByte(0, 0, 0),      d.WritePciConfigWord(0, 0, 0),   d.WritePciConfigDword(0, 0, 0),
-      d.FindPciDevice(0, 0, 0, location), d.FindPciClass(0, 0, location),  d.ReadPciBar(0, 0x10, wide)};
-  EXPECT_THAT(statuses, testing::Each(0x81));
-  EXPECT_EQ(byte + word + location + dword + wide, 0U);
-  EXPECT_EQ(d.InportByte(0) + d.InportWord(0) + d.InportDword(0), 0U);
-  EXPECT_FALSE(d.OutportByte(0, 0) || d.OutportWord(0, 0));
-  d.OutportDword(0, 0);
-  EXPECT_FALSE(d.FindPciDeviceByIds(0, 0, 0, 0, 0, location));
-  EXPECT_EQ(d.ReadPhysicalMemory(0, 4, buffer) + d.ReadPhysicalMemory64(0, 0, 4, buffer), 0U);
-  EXPECT_EQ(d.WritePhysicalMemory(0, 4, buffer) + d.WritePhysicalMemory64(0, 0, 4, buffer), 0U);
-  EXPECT_EQ(buffer, std::vector<std::byte>(4, std::byte{7}));
-  EXPECT_EQ(d.MapPhysicalMemory(0, 4, &mapping), 0U);
-  EXPECT_FALSE(d.UnmapPhysicalMemory(mapping));
-  EXPECT_EQ(mapping[4], 5U);
-  EXPECT_EQ(d.ReadMsr(wide), 6U);  // an invalid handle
-  EXPECT_EQ(d.ReadFirmwareByte(0xF000, 0) + d.ReadFirmwareWord(0xF000, 0), 0);
-  EXPECT_EQ(d.GetLoadState(), CDevio::LoadState::kNoBinary);
-  EXPECT_TRUE(machine.Trace().Requests().empty());
+// Without a driver, and with one that reports a failure, whatever stands in the record that it gives back.
+TEST(CDevio, AnswersWithNothingWhereNothingIsDone) {
+  MachineDescription absent = Machine(true);
+  absent.driver.present = false;
+  MachineDescription failing = Machine(true);
+  failing.driver.refused = {0x220004, 0x220008, 0x22000C, 0x220010, 0x220014, 0x22003C, 0x220040,
+                            0x220044, 0x220048, 0x220058, 0x2200A8, 0x2200C8, 0x222498};
+  failing.driver.registers = {{0x199, 7}};
+  MachineDescription failing32 = failing;
+  failing32.is64Bit = false;
+  for (const MachineDescription& description : {absent, failing, failing32}) {
+    Simulation machine(description, {});
+    CDevio d;
+    machine.Trace().Keep();
+    std::uint8_t byte = 1;
+    std::uint16_t word = 1;
+    std::uint16_t location = 1;
+    std::uint16_t ofClass = 1;
+    std::uint32_t dword = 1;
+    std::uint64_t msr = 0x199;
+    std::vector<std::byte> buffer(4, std::byte{7});
+    CDevio::MappingRecord mapping{1, 2, 3, 4, 5};
+    const std::vector<int> statuses{d.ReadPciConfigByte(kSerial, 0, byte), d.ReadPciConfigWord(kSerial, 0, word),
+                                    d.ReadPciConfigDword(kSerial, 0, dword),
+                                    d.FindPciDevice(0x8086, 0x1C02, 0, location),
+                                    d.FindPciClass(0x060100, 1, ofClass)};
+    EXPECT_EQ(byte + word + dword + location + ofClass, 0U);
+    EXPECT_EQ(d.InportByte(0x80) + d.InportWord(0x80) + d.InportDword(0x80), 0U);
+    EXPECT_FALSE(d.OutportByte(0x80, 0) || d.OutportWord(0x80, 0));
+    EXPECT_EQ(d.ReadPhysicalMemory(0x1000, 4, buffer) + d.ReadPhysicalMemory64(0x1000, 0, 4, buffer), 0U);
+    EXPECT_EQ(d.WritePhysicalMemory(0x1000, 4, buffer) + d.WritePhysicalMemory64(0x1000, 0, 4, buffer), 0U);
+    EXPECT_EQ(buffer, std::vector<std::byte>(4, std::byte{7}));
+    EXPECT_EQ(d.MapPhysicalMemory(0x1000, 4, &mapping), 0U);
+    EXPECT_FALSE(d.UnmapPhysicalMemory(mapping));
+    EXPECT_THAT(mapping, ElementsAre(1U, 2U, 3U, 4U, 5U));
+    EXPECT_EQ(d.ReadMsr(msr), description.driver.present ? 31U : 6U);  // refused, or an invalid handle
+    EXPECT_EQ(msr, 0x199U);
+    if (!description.driver.present) {
+      EXPECT_THAT(statuses, testing::Each(0x81));
+      EXPECT_EQ(d.WritePciConfigByte(0, 0, 0) & d.WritePciConfigWord(0, 0, 0) & d.WritePciConfigDword(0, 0, 0), 0x81);
+      EXPECT_EQ(d.ReadPciBar(0, 0x10, msr), 0x81);
+      EXPECT_FALSE(d.FindPciDeviceByIds(0, 0, 0, 0, 0, location));
+      EXPECT_EQ(d.ReadFirmwareByte(0xF000, 0) + d.ReadFirmwareWord(0xF000, 0), 0);
+      EXPECT_EQ(d.GetLoadState(), CDevio::LoadState::kNoBinary);
+      EXPECT_TRUE(machine.Trace().Requests().empty());
+    }
+  }
 }
 
 // ---- PCI
@@ -269,43 +283,6 @@ TEST_F(CDevioTest, ReadsTheFirmwareSegmentAndGivesTheErrorOfARefusedRegister) {
   EXPECT_EQ(value, 0x199U);
   EXPECT_EQ(devio_.ReadFirmwareWord(0xF000, 1), 'S' | 'M' << 8);
   EXPECT_EQ(devio_.ReadFirmwareByte(0xF000, 3), '_');
-}
-
-// A driver that is there and reports a failure, whatever stands in the record that it gives back.
-TEST(CDevio, TakesNothingFromARequestThatFailed) {
-  MachineDescription description = Machine(true);
-  description.driver.refused = {0x220004, 0x220008, 0x22000C, 0x220010, 0x220014, 0x22003C, 0x220040,
-                                0x220044, 0x220048, 0x220058, 0x2200A8, 0x2200C8, 0x222498};
-  description.driver.registers = {{0x199, 7}};
-  for (const bool is64Bit : {true, false}) {
-    description.is64Bit = is64Bit;
-    Simulation machine(description, {});
-    CDevio d;
-    std::uint8_t byte = 1;
-    std::uint16_t word = 1;
-    std::uint16_t location = 1;
-    std::uint32_t dword = 1;
-    std::uint64_t msr = 0x199;
-    std::vector<std::byte> buffer(4, std::byte{7});
-    CDevio::MappingRecord mapping{1, 2, 3, 4, 5};
-    EXPECT_EQ(d.InportByte(0x80) + d.InportWord(0x80) + d.InportDword(0x80), 0U);
-    EXPECT_FALSE(d.OutportByte(0x80, 0) || d.OutportWord(0x80, 0));
-    d.ReadPciConfigByte(kSerial, 0, byte);
-    d.ReadPciConfigWord(kSerial, 0, word);
-    d.ReadPciConfigDword(kSerial, 0, dword);
-    EXPECT_EQ(byte + word + dword, 0U);
-    d.FindPciDevice(0x8086, 0x1C02, 0, location);
-    EXPECT_EQ(location, 0);
-    d.FindPciClass(0x060100, 1, location);
-    EXPECT_EQ(location, 0);
-    EXPECT_EQ(d.ReadPhysicalMemory(0x1000, 4, buffer) + d.WritePhysicalMemory(0x1000, 4, buffer), 0U);
-    EXPECT_EQ(buffer, std::vector<std::byte>(4, std::byte{7}));
-    EXPECT_EQ(d.MapPhysicalMemory(0x1000, 4, &mapping), 0U);
-    EXPECT_FALSE(d.UnmapPhysicalMemory(mapping));
-    EXPECT_THAT(mapping, ElementsAre(1U, 2U, 3U, 4U, 5U));
-    EXPECT_EQ(d.ReadMsr(msr), 31U);
-    EXPECT_EQ(msr, 0x199U);
-  }
 }
 
 TEST(CDevio, ReadsAModelSpecificRegisterOf64Bits) {

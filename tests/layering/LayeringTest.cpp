@@ -74,9 +74,9 @@ std::string FolderOf(const std::string& path) {
 }
 
 bool MayUseSystem(const std::string& folder) {
-  static const std::set<std::string> kOutside = {"platform/host_linux",    "platform/sim",       "platform/posix",
-                                                 "platform/drawingmodule", "platform/xmlmodule", "controller",
-                                                 "boardtool/main"};
+  static const std::set<std::string> kOutside = {
+      "platform/host_linux", "platform/sim", "platform/posix", "platform/drawingmodule",
+      "platform/xmlmodule",  "controller",   "boardtool/main", "pages"};
   return kOutside.count(folder) != 0;
 }
 

@@ -1,4 +1,4 @@
-// Whole runs inside the process: how the button files are read, and which prompts are shown.
+// Whole runs inside the process: how the button files are read.
 #include <gmock/gmock.h>
 
 #include <algorithm>
@@ -132,25 +132,6 @@ TEST(ButtonFiles, AreCheckedInTurnAndAlsoWhereNoCopyCanBeWritten) {
   EXPECT_THAT(bench.RunProgram(), Contains("UpdatePercentage 5"));
   bench.sim.DiskFiles().FillDisk();
   EXPECT_THAT(bench.RunProgram(), Contains("UpdatePercentage 5"));
-}
-
-TEST(Run, ChoosesThePromptsFamilyAnewForEachPrompt) {
-  Bench bench("", "silent");
-  Write("ui.xml", R"(<UI><Section ID="Bench"><Button ID="NumLock"/></Section></UI>)");
-  bench.sim.DiskFiles().Put(".\\diagconf.ini", "[WindowSettings]\nBackgroundColor=255\n");
-  std::vector<platform::Color> colors;
-  const auto look = [&] {
-    const auto scene = bench.windows.MakeScene();
-    colors.push_back(scene.windows.empty() ? 0 : scene.windows[0].background);
-  };
-  bench.After(500, look);  // the begin prompt
-  bench.After(5000, [&] { bench.sim.DiskFiles().Hide("diagconf.ini"); });
-  bench.After(5000, look);    // the dialog
-  bench.After(13'000, look);  // the retry prompt
-  const std::vector<std::string> lines = bench.RunProgram();
-  EXPECT_THAT(colors, ElementsAre(255U, 0xC0C0C0U, platform::kButtonFaceColor));
-  EXPECT_THAT(lines, Contains("ReportFailure 770118"));
-  EXPECT_THAT(lines, Contains("TestFailed 771003 \"\""));
 }
 
 }  // namespace
