@@ -12,6 +12,7 @@
 #include "ledtests/CustomLEDTest.h"
 #include "ledtests/SuperDialog.h"
 #include "platform/Host.h"
+#include "prompts/PlainPrompt.h"
 #include "prompts/PromptWindow.h"
 
 // Behind the benchmark library, whose names its macros would replace.

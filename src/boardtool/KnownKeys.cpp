@@ -4,6 +4,7 @@
 #include <array>
 
 #include "board/ChipTable.h"
+#include "boardtool/Installation.h"
 
 namespace panelglow::boardtool {
 
@@ -50,7 +51,8 @@ bool IsGenericEc(std::string_view chip) { return chip == "g_ec" || chip == "g_ec
 
 }  // namespace
 
-KnownKeys::KnownKeys(const BoardFiles& names, platform::Host& machine) {
+KnownKeys::KnownKeys(platform::Host& machine) {
+  const BoardFiles names = BoardFilesIn(".");
   RehearsalWish wish;
   wish.withSources = false;
   wish.everything = true;
@@ -86,6 +88,11 @@ KnownKeys::KnownKeys(const BoardFiles& names, platform::Host& machine) {
   }
   chipPatterns_.insert(kBaseKey);
   chip_.emplace_back(kBaseKey);
+}
+
+const KnownKeys& KnownKeys::Once(platform::Host& machine) {
+  static const KnownKeys kKnown(machine);
+  return kKnown;
 }
 
 // Numbers in keys count things.

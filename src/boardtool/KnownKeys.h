@@ -12,8 +12,11 @@ namespace panelglow::boardtool {
 
 class KnownKeys {
  public:
-  /// Gathers them, which takes some hundredths of a second. `names` are those of the files that are looked into.
-  KnownKeys(const BoardFiles& names, platform::Host& machine);
+  /// Gathers them, which takes some hundredths of a second. The machine is only there for what classes ask of it.
+  explicit KnownKeys(platform::Host& machine);
+
+  /// Those of this process: they hang on no file, so that they are gathered once, for the first that asks.
+  [[nodiscard]] static const KnownKeys& Once(platform::Host& machine);
 
   /// A key in lower case, of the chip file or of the two others.
   [[nodiscard]] bool IsKnown(const std::string& key, bool isChipFile) const;

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <iterator>
-#include <optional>
 
 #include "boardtool/KnownKeys.h"
 #include "harness/base/CDMUtil.h"
@@ -104,7 +103,7 @@ class NameCheck {
   }
 
   // Gathered for the first key that the machines of the files did not look up.
-  const KnownKeys& Known() { return known_ ? *known_ : known_.emplace(names_, machine_); }
+  const KnownKeys& Known() { return KnownKeys::Once(machine_); }
 
   // Keys that nothing reads.
   void CheckKeys() {
@@ -170,7 +169,6 @@ class NameCheck {
   platform::Host& machine_;
   const Reached& reached_;
   Findings& findings_;
-  std::optional<KnownKeys> known_;
 };
 
 }  // namespace

@@ -36,7 +36,7 @@ class RawDisks {
   /// Opens an existing disk for reading and writing, shared with everybody, without buffering. Null on failure.
   virtual std::unique_ptr<RawDisk> Open(std::string_view path) = 0;
 
-  /// Null when there is no memory.
+  /// Zeroes. Null when there is no memory.
   virtual std::unique_ptr<DiskBlock> Allocate(std::size_t size_bytes) = 0;
 };
 

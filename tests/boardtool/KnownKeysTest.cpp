@@ -68,7 +68,7 @@ PageKeys KeysOfThePage() {
 
 TEST(KnownKeys, StandAllOnThePageAndTheirsAreAllRead) {
   platform::sim::Simulation machine("");
-  const KnownKeys known(BoardFilesIn("."), platform::TheHost());
+  const KnownKeys known(platform::TheHost());
   const PageKeys page = KeysOfThePage();
   for (const bool isChipFile : {false, true}) {
     const std::set<std::string>& told = isChipFile ? page.chip : page.board;

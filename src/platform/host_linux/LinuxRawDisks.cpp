@@ -28,11 +28,13 @@ class AlignedBlock : public DiskBlock {
  public:
   explicit AlignedBlock(std::size_t size)
       : bytes_(static_cast<std::byte*>(::operator new (size, std::align_val_t{kAlignment}, std::nothrow))),
-        size_(size) {}
+        size_(bytes_ == nullptr ? 0 : size) {
+    std::fill_n(bytes_, size_, std::byte{});
+  }
   ~AlignedBlock() override { ::operator delete (bytes_, std::align_val_t{kAlignment}); }
   AlignedBlock(const AlignedBlock&) = delete;
   AlignedBlock& operator=(const AlignedBlock&) = delete;
-  std::span<std::byte> Bytes() override { return {bytes_, bytes_ == nullptr ? 0 : size_}; }
+  std::span<std::byte> Bytes() override { return {bytes_, size_}; }
   [[nodiscard]] bool IsThere() const { return bytes_ != nullptr; }
 
  private:

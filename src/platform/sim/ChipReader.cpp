@@ -11,7 +11,7 @@ namespace panelglow::platform::sim {
 
 namespace {
 
-std::set<std::string> NameSet(Section& section, std::string_view key) {
+LampNames NameSet(Section& section, std::string_view key) {
   const std::vector<std::string> names = section.Names(key);
   return {names.begin(), names.end()};
 }

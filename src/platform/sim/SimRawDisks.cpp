@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <cstring>
 #include <new>
 #include <optional>
 
@@ -21,7 +22,9 @@ constexpr Microseconds kRetries_us = 2'000'000;  // what a drive that barely rea
 class PageBlock : public DiskBlock {
  public:
   explicit PageBlock(std::size_t size_bytes)
-      : size_bytes_(size_bytes), memory_(::operator new (size_bytes, std::align_val_t{kPageBytes})) {}
+      : size_bytes_(size_bytes), memory_(::operator new (size_bytes, std::align_val_t{kPageBytes})) {
+    std::memset(memory_, 0, size_bytes);
+  }
   ~PageBlock() override { ::operator delete (memory_, std::align_val_t{kPageBytes}); }
   PageBlock(const PageBlock&) = delete;
   PageBlock& operator=(const PageBlock&) = delete;
@@ -82,8 +85,8 @@ class SimRawDisks::Handle : public RawDisk {
   }
 
   std::size_t Write(std::span<const std::byte> bytes) override {
-    const bool wasRead = !lastRead_.empty() && lastPosition_ == position_ &&
-                         std::equal(bytes.begin(), bytes.end(), lastRead_.begin(), lastRead_.end());
+    const bool wasRead = !lastRead_.empty() && lastPosition_ == position_ && lastRead_.size() == bytes.size() &&
+                         std::memcmp(bytes.data(), lastRead_.data(), bytes.size()) == 0;
     lastRead_.clear();
     const std::uint64_t position = position_;
     if (!wasRead || !LiesInTestBlock(position, bytes.size())) {

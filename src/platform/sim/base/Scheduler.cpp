@@ -199,7 +199,8 @@ void Scheduler::HandOver(Thread& self) {
 Scheduler::Thread* Scheduler::Choose() {
   for (;;) {
     Microseconds earliest = std::numeric_limits<Microseconds>::max();
-    std::vector<Thread*> candidates;
+    std::vector<Thread*>& candidates = candidates_;
+    candidates.clear();
     for (const auto& [id, thread] : threads_) {
       Microseconds due = 0;
       if (thread->state == State::kReady) {

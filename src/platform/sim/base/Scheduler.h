@@ -125,6 +125,7 @@ class Scheduler {
   std::chrono::steady_clock::time_point realStart_;
   std::mt19937_64 random_;
   std::map<ThreadId, std::unique_ptr<Thread>> threads_;
+  std::vector<Thread*> candidates_;                            // of the choice at hand; kept for its memory
   std::multimap<Microseconds, std::function<void()>> events_;  // equal times in order of arrival
   ThreadId nextThread_ = 1;
   std::function<void(ThreadId)> onThreadEnd_;

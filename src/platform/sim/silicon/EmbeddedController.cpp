@@ -11,7 +11,7 @@ constexpr std::uint8_t kOutputFull = 0x01;
 constexpr std::uint8_t kInputFull = 0x02;
 constexpr std::uint8_t kLastWasCommand = 0x08;
 
-std::string Joined(const std::set<std::string>& names) {
+std::string Joined(const LampNames& names) {
   std::string text;
   for (const std::string& name : names) {
     text += " " + name;
@@ -175,11 +175,10 @@ std::optional<bool> EmbeddedController::Signal(std::string_view pin) const {
       return ((memory_.at(lamp.address) >> lamp.bit) & 1U) != 0;
     }
   }
-  const std::string name(pin);
-  if (lamps_.count(name) == 0) {
+  if (!lamps_.contains(pin)) {
     return std::nullopt;
   }
-  return (held_ ? shown_ : setup_.automatic).count(name) != 0;
+  return (held_ ? shown_ : setup_.automatic).contains(pin);
 }
 
 std::string EmbeddedController::State() const {

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <optional>
 #include <set>
@@ -13,6 +14,9 @@
 #include "platform/sim/silicon/Device.h"
 
 namespace panelglow::platform::sim {
+
+/// Found without making a string: they are looked for at every access to the hardware.
+using LampNames = std::set<std::string, std::less<>>;
 
 /// What a command with these data bytes does to the lamps. A command that no row fits does nothing.
 struct EcLedCommand {
@@ -27,7 +31,7 @@ struct EcLedCommand {
   std::uint8_t code = 0;
   std::vector<std::uint8_t> data;  // all rows of one code have the same number
   Effect effect = Effect::kStage;
-  std::set<std::string> lamps;
+  LampNames lamps;
 };
 
 /// A lamp on a bit of the controller's memory.
@@ -55,7 +59,7 @@ struct EmbeddedControllerSetup {
   std::optional<std::uint8_t> pwmCommand;  // data: the fan's register, in pwmRegisterBytes, and the duty
   std::uint8_t pwmRegisterBytes = 1;
   std::map<std::uint16_t, std::uint8_t> memory;
-  std::set<std::string> automatic;  // lamps that the firmware lights while it has them
+  LampNames automatic;  // lamps that the firmware lights while it has them
   std::vector<EcLedCommand> commands;
   std::vector<EcMemoryLamp> memoryLamps;
   Fault fault = Fault::kNone;
@@ -109,7 +113,7 @@ class EmbeddedController : public Device {
 
   EmbeddedControllerSetup setup_;
   const Scheduler& time_;
-  std::set<std::string> lamps_;  // all there are
+  LampNames lamps_;  // all there are
 
   std::optional<Written> input_;
   std::optional<Answer> answer_;  // that the firmware still works on
@@ -121,8 +125,8 @@ class EmbeddedController : public Device {
 
   std::map<std::uint16_t, std::uint8_t> memory_;
   std::map<std::uint16_t, std::uint8_t> duties_;
-  std::set<std::string> staged_;
-  std::set<std::string> shown_;
+  LampNames staged_;
+  LampNames shown_;
   bool held_ = false;  // shown_ counts, not the firmware's own pattern
 };
 
