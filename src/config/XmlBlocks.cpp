@@ -14,6 +14,21 @@ constexpr std::align_val_t kAlignment{XmlBlocks::kBlockSize};
 
 }  // namespace
 
+constinit thread_local XmlBlocks::Left XmlBlocks::left_{nullptr, 0};
+
+struct XmlBlocks::LeftAtThreadEnd {
+  ~LeftAtThreadEnd() { TellLeft(nullptr); }
+};
+
+void XmlBlocks::TellLeft(Block* next) noexcept {
+  static thread_local const LeftAtThreadEnd kAtThreadEnd;
+  const auto [block, pieces] = left_;
+  left_ = {next, 0};
+  if (block != nullptr) {
+    Leave(block, pieces);
+  }
+}
+
 void XmlBlocks::OpenBlock() {
   CloseBlock();
   void* const memory = ::operator new(kBlockSize, kAlignment);

@@ -10,7 +10,8 @@ namespace panelglow {
 
 /// Hands out memory from large blocks, front to back. A block knows how many of its pieces are in use and goes with
 /// the last of them, whichever tree that has got into and whichever thread it ends on; until then all of the block
-/// stays. Taking belongs to one thread.
+/// stays. Taking belongs to one thread. A thread that gives pieces back counts by itself those of one block: that
+/// block is kept until the thread gives back a piece of another one, or ends.
 class XmlBlocks {
  public:
   static constexpr std::size_t kBlockSize = std::size_t{1} << 18U;
@@ -38,7 +39,11 @@ class XmlBlocks {
   static void GiveBack(void* piece) noexcept {
     // A block's address is a multiple of its size.
     const std::uintptr_t offset = reinterpret_cast<std::uintptr_t>(piece) & (kBlockSize - 1);
-    Leave(reinterpret_cast<Block*>(static_cast<char*>(piece) - offset), 1);
+    auto* const block = reinterpret_cast<Block*>(static_cast<char*>(piece) - offset);
+    if (block != left_.block) {
+      TellLeft(block);
+    }
+    ++left_.pieces;
   }
 
  private:
@@ -47,6 +52,14 @@ class XmlBlocks {
     std::atomic<std::int64_t> users;
   };
 
+  // Pieces of a block that this thread has given back and the block does not know of yet.
+  struct Left {
+    Block* block;
+    std::int64_t pieces;
+  };
+  struct LeftAtThreadEnd;
+
+  static void TellLeft(Block* next) noexcept;
   static void Leave(Block* block, std::int64_t users) noexcept {
     if (block->users.fetch_sub(users, std::memory_order_acq_rel) == users) {
       Free(block);
@@ -55,6 +68,8 @@ class XmlBlocks {
   static void Free(Block* block) noexcept;
   void OpenBlock();
   void CloseBlock() noexcept;
+
+  static constinit thread_local Left left_;
 
   char* next_ = nullptr;
   char* end_ = nullptr;     // of the block that pieces are taken from

@@ -39,45 +39,29 @@ Descriptor OpenRegular(const std::string& path, int flags) {
 }
 
 // The content from the beginning; nothing when it is too large or cannot be read.
+// By pieces that stay in the processor's cache: nothing is filled with zeroes first, and the file may grow or tell no
+// size meanwhile.
 std::optional<std::string> ReadAll(int fd) {
   struct stat status {};
   if (::fstat(fd, &status) != 0 || static_cast<std::size_t>(status.st_size) > Files::kLargestFile_bytes) {
     return std::nullopt;
   }
-  std::string content(static_cast<std::size_t>(status.st_size), '\0');
-  std::size_t length = 0;
+  std::string content;
+  content.reserve(static_cast<std::size_t>(status.st_size));
+  std::array<char, std::size_t{1} << 16U> piece;  // NOLINT(cppcoreguidelines-pro-type-member-init): read into
   for (;;) {
-    if (length == content.size()) {
-      // The file may have grown since, and some report no size at all.
-      std::array<char, 4096> more{};
-      const ssize_t got = ::read(fd, more.data(), more.size());
-      if (got < 0 && errno == EINTR) {
-        continue;
-      }
-      if (got <= 0) {
-        break;
-      }
-      content.append(more.data(), static_cast<std::size_t>(got));
-      length = content.size();
-      if (length > Files::kLargestFile_bytes) {
-        return std::nullopt;
-      }
-      continue;
-    }
-    const ssize_t got = ::read(fd, content.data() + length, content.size() - length);
-    if (got < 0 && errno == EINTR) {
-      continue;
-    }
-    if (got < 0) {
+    const ssize_t got = ::read(fd, piece.data(), piece.size());
+    if (got < 0 && errno != EINTR) {
       return std::nullopt;
     }
     if (got == 0) {
-      break;
+      return content;
     }
-    length += static_cast<std::size_t>(got);
+    content.append(piece.data(), got < 0 ? 0 : static_cast<std::size_t>(got));
+    if (content.size() > Files::kLargestFile_bytes) {
+      return std::nullopt;
+    }
   }
-  content.resize(length);
-  return content;
 }
 
 bool WriteAll(int fd, std::string_view bytes) {
