@@ -29,6 +29,7 @@ struct Panel {
   const char* section;
   std::vector<Lamp> lamps;
   const char* mayLeave = "";
+  bool hasStatus = true;  // false: no section for a board, which the subtest that blinks the power lamp needs
 };
 
 const std::vector<Panel>& Panels() {
@@ -45,7 +46,7 @@ const std::vector<Panel>& Panels() {
         {"charge-white", "770148", "771012"},
         {"charge-amber", "770149", "771015"},
         {"touchpad", "770146", "771025"}}},
-      {"unknown-board.toml", "Default", {kNum, kCaps, kScroll, kGreen}, "*"},
+      {"unknown-board.toml", "Default", {kNum, kCaps, kScroll, kGreen}, "port 044D", false},
       {"sio-ite.toml", "TwoColorPower", {kNum, kGreen, kRed}},
       {"sio-fintek.toml", "TwoColorPower", {kNum, kGreen, kRed}},
       {"sio-generic.toml", "TwoColorPower", {kNum, kGreen, kRed}},
@@ -57,6 +58,22 @@ const std::vector<Panel>& Panels() {
       {"casl-notebook.toml", "FirmwareNotebook", {kScroll, kWhite}, "radio 02"},
       {"drives-desktop.toml", "DrivesDesktop", {kNum, kGreen, {"network", "770146", "771018"}}},
       {"office-notebook.toml", "OfficeNotebook", {kNum, {"camera", "770147", "771024"}}},
+      {"sio-f71808.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-fin.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-it8721.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-ite-old.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-lpc47.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-nct5571.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-sch5327.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"sio-smsc5407.toml", "Default", {kNum, kGreen}},
+      {"sio-vt1211.toml", "Default", {kNum, kGreen}},
+      {"sio-win.toml", "Default", {kNum, kGreen}},
+      {"sio-wpcd376.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"bench-desktop.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"ich-desktop.toml", "TwoColorPower", {kNum, kGreen, kRed}},
+      {"orchard-desktop.toml", "TwoColorPower", {kNum, kGreen, kRed}, "", false},
+      {"saddle-desktop.toml", "Default", {kNum, kGreen}, "", false},
+      {"smbus-desktop.toml", "TwoColorPower", {kNum, kGreen, kRed}},
   };
   return kPanels;
 }
@@ -67,6 +84,7 @@ struct BusFault {
   const char* fault;
 };
 
+constexpr std::string_view kDiskLine = "[[disk]]";
 constexpr BusFault kBusFaults[] = {{"kind = \"embedded-controller\"", "stuck-ibf"},
                                    {"kind = \"embedded-controller\"", "stuck-obf"},
                                    {"kind = \"mailbox-controller\"", "stuck-busy"},
@@ -91,8 +109,24 @@ const Strings kFiles = {"chip.ini",
                         "nonui_panelglow-diags.msg",
                         "super.ico",
                         "spr_num.ico"};
-const Strings kLogs = {"", "<DiagnosticsData Version=\"4.15.0\">\n</DiagnosticsData>\n", "<DiagnosticsData",
-                       "no markup at all", std::string("\0\xFF\xFE", 3)};
+const Strings kLogs = {"",
+                       "<DiagnosticsData Version=\"4.15.0\">\n</DiagnosticsData>\n",
+                       "<DiagnosticsData Version=\"4.15.0\">\n  <Diagnostic name=\"another\">\n"
+                       "    <Subtest name=\"Fans\" duration=\"7\"/>\n  </Diagnostic>\n</DiagnosticsData>\n",
+                       "<DiagnosticsData",
+                       "no markup at all",
+                       std::string("\0\xFF\xFE", 3)};
+
+struct ControlFile {
+  const char* path;
+  const char* content;
+  bool stops;
+};
+constexpr ControlFile kControlFiles[] = {{"\\kill.ctl", "", true},
+                                         {".\\kill.ctl", "", true},
+                                         {"\\halcyon.ctl", "terminate", true},
+                                         {"\\halcyon.ctl", "pause", false},
+                                         {"\\halcyon.ctl", "terminate ", false}};
 constexpr const char* kLogFile = "log.xml";
 constexpr const char* kTimeOut = "770118";
 
@@ -136,9 +170,9 @@ void DrawSubtest(Dice& dice, const Panel& panel, Case& drawn) {
   if (number == 0) {
     drawn.arguments = {"-subtest=LEDStatusIndicator", "-BlinkTime=1",
                        "-BlinkSpeed=" + std::to_string(100 + dice.Number(900))};
-    drawn.mustPass = panel.mayLeave != std::string("*") &&
-                     std::any_of(panel.lamps.begin(), panel.lamps.end(),
-                                 [](const Lamp& lamp) { return lamp.kindCode == std::string(kGreen.kindCode); });
+    drawn.mustPass = panel.hasStatus && std::any_of(panel.lamps.begin(), panel.lamps.end(), [](const Lamp& lamp) {
+                       return lamp.kindCode == std::string(kGreen.kindCode);
+                     });
   } else if (number == 1) {
     drawn.arguments = {"-subtest=LEDTest", "-NumLock=true", "-CapsLock=true"};
     drawn.mustPass = true;
@@ -185,7 +219,7 @@ Case Draw(std::uint64_t seed, const std::vector<Part>& without, const Files& ins
     }
     return isDrawn && std::find(without.begin(), without.end(), part) == without.end();
   };
-  const auto spoil = [&] { drawn.mustPass = false, drawn.mustFailWith.clear(); };
+  const auto spoil = [&] { drawn.mustPass = false, drawn.mustReport.clear(), drawn.mustFail.clear(); };
   bool fails = false;
 
   Dice own(dice.Number(~std::uint64_t{0}));
@@ -195,13 +229,14 @@ Case Draw(std::uint64_t seed, const std::vector<Part>& without, const Files& ins
     fails = kind == "dead" || kind == "stuck" || kind == "wrong-color";
     drawn.mustPass = drawn.mustPass && kind == "inverted";
     if (fails) {
-      drawn.mustFailWith = {lamp.kindCode, lamp.buttonCode};
+      drawn.mustReport = {lamp.kindCode};
+      drawn.mustFail = lamp.buttonCode;
     }
     if (kind == "lying-write") {
       drawn.mayLeave = "*";  // what is not written cannot be put back
     }
     if (kind == "wrong-color") {
-      drawn.mustFailWith.emplace_back(kTimeOut);
+      drawn.mustReport.emplace_back(kTimeOut);
     }
   }
   own = Dice(dice.Number(~std::uint64_t{0}));
@@ -227,7 +262,9 @@ Case Draw(std::uint64_t seed, const std::vector<Part>& without, const Files& ins
     if (const std::size_t at = drawn.machine.find(fault.line); at != std::string::npos) {
       drawn.machine.insert(drawn.machine.find('\n', at), std::string("\nfault = \"") + fault.fault + "\"");
       spoil();
-      drawn.mayLeave = "*";  // what does not answer cannot be put back
+      if (fault.line != kDiskLine) {
+        drawn.mayLeave = "*";  // what does not answer cannot be put back
+      }
     }
   }
   own = Dice(dice.Number(~std::uint64_t{0}));
@@ -237,20 +274,27 @@ Case Draw(std::uint64_t seed, const std::vector<Part>& without, const Files& ins
       drawn.missing.push_back(name);
     } else {
       drawn.files[name] = Damaged(installation.at(name), own);
+      if (name == "chip.ini" || name == "mbdetect.ini" || name == "mbtest.ini") {
+        drawn.mayLeave = "*";  // they say what is saved
+      }
     }
     spoil();
-    drawn.mayLeave = "*";  // the files say what is saved
   }
   own = Dice(dice.Number(~std::uint64_t{0}));
   if (has(Part::kLog, 2)) {
     drawn.arguments.push_back(std::string("-DataCollectionFile=") + kLogFile);
     drawn.files[kLogFile] = own.From(kLogs);
-    drawn.endsInLog = !isStatus;  // which writes none
+    drawn.endsInLog = !isStatus;
+    drawn.leavesLog = isStatus;
   }
   own = Dice(dice.Number(~std::uint64_t{0}));
   if (has(Part::kStopFile, 10)) {
-    drawn.machine += Event(own.Number(60000), "write_file = '\\kill.ctl'");
-    spoil();
+    const ControlFile file = own.From(kControlFiles);
+    drawn.machine +=
+        Event(own.Number(60000), std::string("write_file = '") + file.path + "'\ncontent = '" + file.content + "'");
+    if (file.stops) {
+      spoil();
+    }
   }
   own = Dice(dice.Number(~std::uint64_t{0}));
   if (has(Part::kConsole, 10)) {
@@ -273,9 +317,6 @@ Case Draw(std::uint64_t seed, const std::vector<Part>& without, const Files& ins
   own = Dice(dice.Number(~std::uint64_t{0}));
   if (has(Part::kKill, 12)) {
     drawn.kill_us = own.Number(60'000'000);
-    spoil();
-    drawn.endsInLog = false;
-    drawn.mayLeave = "*";
   }
   return drawn;
 }

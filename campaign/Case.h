@@ -50,8 +50,10 @@ struct Case {
 
   // What such a run has to come to. Neither: whatever it comes to is right.
   bool mustPass = false;
-  std::vector<std::string> mustFailWith = {};  // codes of which the result lines hold one
-  bool endsInLog = false;                      // it adds an element to the log
+  std::vector<std::string> mustReport = {};  // codes of which ReportFailure has one
+  std::string mustFail = {};                 // the code of TestFailed
+  bool endsInLog = false;                    // it adds an element to the log
+  bool leavesLog = false;                    // it writes none
 
   std::vector<Part> drawn = {};  // what can be left out
 };

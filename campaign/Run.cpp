@@ -134,6 +134,18 @@ class OneRun {
       host.mutexes.WaitFor(host.mutexes.Create(kLocks[0]));
     } else if (sabotage_ == "half-log") {
       machine_.DiskFiles().Put(kLogFile, "<DiagnosticsData><Diag");
+    } else if (sabotage_ == "new-log") {
+      std::string log = machine_.DiskFiles().Read(kLogFile).value_or("");
+      if (const std::size_t old = log.find("<Diagnostic name=\"another\""); old != std::string::npos) {
+        constexpr std::string_view kEnd = "</Diagnostic>";
+        machine_.DiskFiles().Put(kLogFile, log.erase(old, log.find(kEnd, old) + kEnd.size() - old));
+      }
+    } else if (sabotage_ == "damaged-log") {
+      if (case_.files.count(kLogFile) != 0 && !IsWellFormed(seen_.logBefore)) {
+        machine_.DiskFiles().Put(kLogFile, "<DiagnosticsData/>");
+      }
+    } else if (sabotage_ == "narrowed") {
+      host.cpu.SetAffinity(1);
     } else if (sabotage_ == "no-log") {
       machine_.DiskFiles().Put(kLogFile, seen_.logBefore);
     } else if (sabotage_ == "deadlock") {
@@ -197,6 +209,9 @@ const std::vector<Sabotage>& AllSabotages() {
                                                    {"lock-left", "locks"},
                                                    {"half-log", "log"},
                                                    {"no-log", "log"},
+                                                   {"new-log", "log"},
+                                                   {"damaged-log", "log"},
+                                                   {"narrowed", "as before"},
                                                    {"ill-panel", "healthy panel"},
                                                    {"healed-panel", "ill panel"},
                                                    {"deadlock", "deadlock"},

@@ -177,7 +177,7 @@ int CheckCheckers(const Campaign& campaign) {
     bool isSeen = false;
     for (; !isSeen && seed <= kMostSeedsOfASabotage; ++seed) {
       const Case drawn = campaign.Drawn(seed);
-      const bool concerns = sabotage.checker != std::string("ill panel") || !drawn.mustFailWith.empty();
+      const bool concerns = sabotage.checker != std::string("ill panel") || !drawn.mustReport.empty();
       const bool isHealthy =
           sabotage.checker != std::string("healthy panel") || (drawn.mustPass && drawn.fault.empty());
       if (concerns && isHealthy) {

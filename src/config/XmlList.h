@@ -62,11 +62,11 @@ class XmlList {
   template <class... Arguments>
   Item& emplace_back(Arguments&&... arguments) {
     if (size_ < capacity()) {
-      return *new (items_ + size_++) Item(std::forward<Arguments>(arguments)...);
+      return Counted(new (end()) Item(std::forward<Arguments>(arguments)...));
     }
     Item item(std::forward<Arguments>(arguments)...);  // before the items move: it may be made from one of them
     reserve(std::max<std::size_t>(1, 2 * capacity()));
-    return *new (items_ + size_++) Item(std::move(item));
+    return Counted(new (end()) Item(std::move(item)));
   }
   void push_back(Item&& item) { emplace_back(std::move(item)); }
 
@@ -119,6 +119,12 @@ class XmlList {
  private:
   static constexpr std::uint32_t kInBlock = 0x80000000;
   static constexpr std::uint32_t kLargestCapacity = kInBlock - 1;
+
+  // Counts an item at the end only once it is there: making it may have thrown.
+  Item& Counted(Item* item) noexcept {
+    ++size_;
+    return *item;
+  }
 
   // To memory that holds nothing. Where they were is memory that holds nothing afterwards: what was moved from owns
   // nothing, so its destructor has nothing to do and is not called.

@@ -5,6 +5,8 @@
 #include <sstream>
 #include <stdexcept>
 
+#include "config/XmlEntities.h"
+
 namespace panelglow::pages {
 
 namespace {
@@ -14,6 +16,7 @@ using Attributes = std::map<std::string, std::string>;
 // Of one element of the catalogue, which stands on one line.
 Attributes AttributesOf(const std::string& line) {
   Attributes attributes;
+  XmlEntityDecoder entities;
   std::size_t at = line.find(' ', line.find('<'));
   while (at != std::string::npos) {
     const std::size_t equals = line.find("=\"", at);
@@ -21,7 +24,7 @@ Attributes AttributesOf(const std::string& line) {
     if (end == std::string::npos) {
       break;
     }
-    attributes[line.substr(at + 1, equals - at - 1)] = line.substr(equals + 2, end - equals - 2);
+    attributes[line.substr(at + 1, equals - at - 1)] = entities.Decode(line.substr(equals + 2, end - equals - 2));
     at = end + 1;
   }
   return attributes;

@@ -35,6 +35,9 @@ Option OptionOf(const CLI::Option& from) {
     option.value = from.get_name(true);
   }
   option.meaning = from.get_description();
+  if (!from.get_default_str().empty()) {
+    option.meaning += " (default: " + from.get_default_str() + ")";
+  }
   option.isRequired = from.get_required();
   return option;
 }

@@ -1,6 +1,8 @@
 #include "pages/Completion.h"
 
 #include <algorithm>
+#include <cctype>
+#include <iterator>
 #include <set>
 
 namespace panelglow::pages {
@@ -24,10 +26,33 @@ std::string Quoted(std::string_view text) {
   return quoted + "'";
 }
 
+// The first sentence. A full stop within a word, as in "chip.ini", ends none.
+std::string Brief(std::string_view text) {
+  text = text.substr(0, text.find_first_of(";\n"));
+  text = text.substr(0, text.find(". "));
+  return std::string(text.substr(0, text.size() - (text.ends_with('.') ? 1 : 0)));
+}
+
+// What the shell reads as `text`: whatever would mean something to it is behind a backslash.
+std::string Word(std::string_view text) {
+  std::string word;
+  for (const char c : text) {
+    const bool isPlain = std::isalnum(static_cast<unsigned char>(c)) != 0 || std::string_view("-_./").find(c) < 4;
+    word += isPlain ? std::string(1, c) : std::string("\\") + c;
+  }
+  return word;
+}
+
+std::string Words(const std::vector<std::string>& choices) {
+  std::vector<std::string> words;
+  std::transform(choices.begin(), choices.end(), std::back_inserter(words), Word);
+  return Joined(words, " ");
+}
+
 // As Quoted, of a text that stands between brackets or colons of zsh.
 std::string ZshText(std::string_view text) {
   std::string plain;
-  for (const char c : text.substr(0, text.find_first_of(".;\n"))) {
+  for (const char c : Brief(text)) {
     plain += c == '[' || c == ']' || c == ':' ? std::string("\\") + c : std::string(1, c);
   }
   return plain;
@@ -75,10 +100,16 @@ std::vector<std::string> VerbsOf(const Command& command) {
   return names;
 }
 
+// Bash reads them twice: as this list, and as a part of the line that is typed.
+std::string BashWords(std::vector<std::string> choices) {
+  std::transform(choices.begin(), choices.end(), choices.begin(), Word);
+  return Words(choices);
+}
+
 std::string BashValues(const Option& option) {
   switch (option.values) {
     case Values::kChoices:
-      return "COMPREPLY=($(compgen -W " + Quoted(Joined(option.choices, " ")) + " -- \"$word\"))";
+      return "COMPREPLY=($(compgen -W " + Quoted(BashWords(option.choices)) + " -- \"$word\"))";
     case Values::kFiles:
       return "compopt -o filenames 2>/dev/null; COMPREPLY=($(compgen -f -- \"$word\"))";
     case Values::kFolders:
@@ -103,7 +134,7 @@ std::string BashBranches(const Command& command) {
 std::string ZshAction(const Option& option) {
   switch (option.values) {
     case Values::kChoices:
-      return "(" + Joined(option.choices, " ") + ")";
+      return "(" + Words(option.choices) + ")";
     case Values::kFiles:
       return "_files";
     case Values::kFolders:
@@ -136,7 +167,7 @@ std::string ZshArguments(const Command& command, bool hasEqualsSigns) {
 std::string FishValues(const Option& option) {
   switch (option.values) {
     case Values::kChoices:
-      return " -x -a " + Quoted(Joined(option.choices, " "));
+      return " -x -a " + Quoted(Words(option.choices));
     case Values::kFiles:
       return " -r -F";
     case Values::kFolders:
@@ -157,8 +188,7 @@ std::string FishOptions(const Command& command, const std::string& program, cons
     for (const std::string& name : option.names) {
       out += name.compare(0, 2, "--") == 0 ? " -l " + name.substr(2) : " -s " + name.substr(1);
     }
-    out += (option.value.empty() ? "" : FishValues(option)) + " -d " +
-           Quoted(option.meaning.substr(0, option.meaning.find_first_of(".;\n"))) + "\n";
+    out += (option.value.empty() ? "" : FishValues(option)) + " -d " + Quoted(Brief(option.meaning)) + "\n";
   }
   return out;
 }
@@ -167,10 +197,15 @@ std::string FishOptions(const Command& command, const std::string& program, cons
 std::string FishWords(const Command& command, const std::string& condition) {
   std::string out;
   for (const Option& option : command.options) {
-    const std::string description =
-        " -d " + Quoted(option.meaning.substr(0, option.meaning.find_first_of(".;\n"))) + "\n";
+    const std::string& name = option.names.front();
+    const std::string begin = "complete -c NAME" + condition + " -a ";
+    const std::string description = " -d " + Quoted(Brief(option.meaning)) + "\n";
     for (const std::string& choice : option.choices.empty() ? std::vector<std::string>{""} : option.choices) {
-      out += "complete -c NAME" + condition + " -a " + Quoted(option.names.front() + "=" + choice) + description;
+      out += begin + Quoted(name + "=" + Word(choice)) + description;
+    }
+    if (option.values == Values::kFiles) {
+      out += "complete -c NAME -n " + Quoted("string match -q -- '" + name + "=*' (commandline -ct)") + " -a " +
+             Quoted(name + "=(__fish_complete_path (string replace -- '" + name + "=' '' (commandline -ct)))") + "\n";
     }
   }
   return out;

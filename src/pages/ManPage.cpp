@@ -34,7 +34,14 @@ std::string Paragraphs(std::string_view text) {
   std::string out;
   std::istringstream lines{std::string(text)};
   for (std::string line; std::getline(lines, line);) {
-    out += line.empty() ? ".PP\n" : Escaped(line) + "\n";
+    const std::size_t first = std::min(line.find_first_not_of(' '), line.size());
+    const std::size_t gap = line.find("  ", first);
+    if (first > 0 && gap != std::string::npos) {  // a row of a list: a name, blanks, its meaning
+      out += ".TP\n" + Escaped(line.substr(first, gap - first)) + "\n" +
+             Escaped(line.substr(line.find_first_not_of(' ', gap))) + "\n";
+    } else {
+      out += line.empty() ? ".PP\n" : Escaped(line) + "\n";
+    }
   }
   return out;
 }
@@ -126,14 +133,14 @@ std::string ManPageOf(const Command& command, const PageTexts& texts) {
   const std::string summary = command.summary.substr(0, command.summary.find_first_of(".:\n"));
   std::string page = Head(command.name, '1', summary, texts);
   page += ".SH SYNOPSIS\n.B " + Escaped(command.name) + "\n";
+  page += command.hasEqualsSigns  ? "\\fB\\-subtest\\fR=\\fIname\\fR [\\fB\\-name\\fR=\\fIvalue\\fR ...]\n"
+          : command.verbs.empty() ? "[\\fIoptions\\fR]\n"
+                                  : "\\fIverb\\fR [\\fIoptions\\fR]\n";
   for (const Option& option : command.options) {
     if (option.names.empty()) {
       page += "[\\fI" + Escaped(option.value) + "\\fR]\n";
     }
   }
-  page += command.hasEqualsSigns  ? "\\fB\\-subtest\\fR=\\fIname\\fR [\\fB\\-name\\fR=\\fIvalue\\fR ...]\n"
-          : command.verbs.empty() ? "[\\fIoptions\\fR]\n"
-                                  : "\\fIverb\\fR [\\fIoptions\\fR]\n";
   page += ".SH DESCRIPTION\n" + Paragraphs(command.summary + "\n\n" + texts.description);
   page += ".SH OPTIONS\n" + OptionsOf(command, command.hasEqualsSigns, false);
   if (!command.verbs.empty()) {

@@ -93,6 +93,25 @@ TEST(XmlList, GrowsByACopyOfOneOfItsOwnItems) {
   EXPECT_TRUE(list.empty());
 }
 
+TEST(XmlList, AnItemThatCouldNotBeMadeIsNotThere) {
+  struct Item {
+    explicit Item(int number) : text(std::to_string(number)) {
+      if (number < 0) {
+        throw std::length_error("no room");
+      }
+    }
+    std::string text;
+  };
+  XmlList<Item> list;
+  list.reserve(2);
+  list.emplace_back(1);
+  for (int i = 0; i < 2; ++i) {  // with room for it, and without
+    EXPECT_THROW(list.emplace_back(-1), std::length_error);
+    EXPECT_EQ(list.size(), 1U + static_cast<std::size_t>(i));
+    EXPECT_EQ(list.emplace_back(2).text, "2");
+  }
+}
+
 TEST(XmlBlocks, PiecesStandSideBySideAndKeepWhatIsInThem) {
   XmlBlocks blocks;
   std::vector<std::pair<unsigned char*, std::size_t>> pieces;

@@ -46,7 +46,9 @@ class SimCpu : public Cpu {
   /// The core that the program runs on: the first that it may.
   [[nodiscard]] std::size_t Core() const { return static_cast<std::size_t>(std::countr_zero(mask_)); }
 
-  [[nodiscard]] std::string State() const { return mask_ == all_ ? "" : "processor affinity is narrowed\n"; }
+  [[nodiscard]] std::string State() const {
+    return std::string("processor affinity = ") + (mask_ == all_ ? "all cores\n" : "narrowed\n");
+  }
 
  private:
   static constexpr std::size_t kMaskBits = 64;

@@ -292,7 +292,7 @@ Simulation::Simulation(MachineDescription description, const SimulationOptions& 
     });
   }
   p.LookAtPanel();
-  p.initialState = p.buses.State();
+  p.initialState = HardwareState();
   if (!options.operatorPolicy.empty()) {
     p.person = std::make_unique<Operator>(Seat(), p.description.leds, options.operatorPolicy);
   }
