@@ -23,7 +23,9 @@ std::string SegmentOf(std::string_view bytes) {
   std::string segment("_SM_\0\0", 6);
   segment.resize(0x20);
   segment.replace(6, 2, bytes.substr(0, 2));
-  segment.replace(22, 2, bytes.substr(2, 2));
+  segment[22] =
+      bytes[2];  // the table's length: no more than twice what an input holds, or most runs walk over zeroes
+  segment[23] = static_cast<char>(bytes[3] & 0x07);
   segment[24] = 0x20;  // physical address 0x000F0020
   segment[26] = 0x0F;
   segment.replace(28, 2, bytes.substr(4, 2));

@@ -333,7 +333,8 @@ XmlAttribute* XmlObject::SetAttribute(std::string_view attribute, double newValu
 }
 
 void XmlObject::RemoveAttribute(std::string_view attribute) {
-  erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, attribute); });
+  const std::string wanted(attribute);  // as above
+  erase_if(attributes, [&](const XmlAttribute& a) { return CDMUtil::EqualIgnoreCase(a.name, wanted); });
 }
 
 const XmlObject::Prolog& XmlObject::GetProlog() const {
@@ -385,7 +386,8 @@ XmlObject* XmlObject::AddChild(XmlObject&& child) {
 }
 
 void XmlObject::RemoveChildren(std::string_view childName) {
-  erase_if(children, [&](const XmlObject& child) { return child.name == childName; });
+  const std::string wanted(childName);  // it may be the name of one that goes
+  erase_if(children, [&](const XmlObject& child) { return child.name == wanted; });
   Relink();
 }
 

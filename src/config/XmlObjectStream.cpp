@@ -29,19 +29,27 @@ constexpr std::size_t kFirstRoom = 64;
 template <class Item, class Prepare>
 void ReadItems(iptstream& in, std::uint32_t count, XmlList<Item>& items, Prepare prepare) {
   const std::size_t before = items.size();
-  items.reserve(before + std::min<std::size_t>(count, kFirstRoom));
-  std::vector<std::uint32_t> numbers;
+  std::vector<std::uint32_t> numbers;  // of those that are read now
+  const auto makeRoom = [&](std::size_t room) {
+    XmlList<Item> larger;
+    larger.reserve(room);
+    for (std::size_t place = 0; place < items.size(); ++place) {
+      larger.push_back(std::move(items[place]));
+      if (place >= before) {
+        in.Moved(numbers[place - before], &items[place], &larger.back());
+      } else {
+        in.Moved(&items[place], &larger.back());  // of an earlier value, or not of this stream
+      }
+    }
+    items = std::move(larger);
+  };
+  const std::size_t wanted = before + std::min<std::size_t>(count, kFirstRoom);
+  if (wanted > items.capacity()) {
+    makeRoom(wanted);
+  }
   for (std::uint32_t i = 0; i < count; ++i) {
     if (items.size() == items.capacity()) {
-      XmlList<Item> larger;
-      larger.reserve(std::min<std::size_t>(before + count, 2 * items.size()));
-      for (std::size_t place = 0; place < items.size(); ++place) {
-        larger.push_back(std::move(items[place]));
-        if (place >= before) {
-          in.Moved(numbers[place - before], &items[place], &larger.back());
-        }
-      }
-      items = std::move(larger);
+      makeRoom(std::min<std::size_t>(before + count, 2 * items.size()));
     }
     Item& item = items.emplace_back();
     prepare(item);

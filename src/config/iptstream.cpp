@@ -129,6 +129,12 @@ void iptstream::PlaceAt(Object& target, std::uint32_t number) {
   if (!entry.complete) {
     Fail("Indexed object is still being read.");
   }
+  // A part is new when it is read into; what a caller hands in may have parts already that pointers of the stream go to.
+  if (depth == 0 && std::any_of(table.begin(), table.end(), [&](const indexed_pointer& known) {
+        return known.object == IdentityOf(target);
+      })) {
+    Fail("The object that is read into has been read from this stream before.");
+  }
   if (object->GetRealClassName() != target.GetRealClassName()) {
     Fail("Indexed object is of another class: " + object->GetRealClassName());
   }
@@ -306,6 +312,14 @@ std::unique_ptr<Object> iptstream::TakeOwned(const Object* object) {
 void iptstream::Moved(std::uint32_t number, const Persistent* from, Persistent* to) {
   if (EntryOf(number).object == from) {
     PutAt(number, to);
+  }
+}
+
+void iptstream::Moved(const Persistent* from, Persistent* to) {
+  for (std::uint32_t number = 0; number < table.size(); ++number) {
+    if (table[number].object == from) {
+      PutAt(number, to);
+    }
   }
 }
 

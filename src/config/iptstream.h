@@ -52,6 +52,9 @@ class iptstream final : public ptstream {
   /// For a class that keeps its parts in a list: the part that was read at `from` is at `to` now.
   void Moved(std::uint32_t number, const Persistent* from, Persistent* to);
 
+  /// The same for one whose number is not at hand, if the stream knows it at all: looks through all objects.
+  void Moved(const Persistent* from, Persistent* to);
+
  private:
   using Location = std::variant<Persistent**, PersistentByProxy**>;
 

@@ -63,7 +63,8 @@ bool LEDStatusIndicator::Run() {
     auto failure = std::make_unique<CDMException>(kNoBoard);
     failure->addMessage(LogOptions::DeviceErrors, static_cast<int>(kFreeText),
                         "This machine's board is not known: the file " + GetArgument("-INIFile", "") +
-                            " needs a section for it with the keys \"platform\" and \"chips\".");
+                            " needs a section for it with the keys \"platform\" and \"chips\"; one that has only a "
+                            "\"MotherboardClass\" serves the tests, and not the signal lamp.");
     throw failure.release();  // owned by whoever catches it
   }
   {

@@ -23,12 +23,12 @@ namespace {
 namespace fs = std::filesystem;
 using namespace panelglow::pages;
 
+constexpr const char* kFilesText =
+    "It reads its files (XML for the buttons, INI for boards and chips) in the current folder; a complete set is in ";
 constexpr const char* kDiagsTexts =
-    "It reads its files (XML for the buttons, INI for boards and chips) in the current folder; a complete set is in "
-    "/usr/share/panelglow-diags/installation, to be copied into a folder of one's own.\n\n"
+    "/installation, to be copied into a folder of one's own.\n\n"
     "A run writes its lines to standard output for a controller, and ends with EndOfTest. What people should know "
-    "goes "
-    "to standard error.";
+    "goes to standard error.";
 constexpr const char* kDiagsCodes = "0: passed, or a question was answered\n1: failed, or the call is wrong";
 constexpr const char* kBoardCodes =
     "0: done\n1: done, and something is wrong with what was looked at\n2: a wrong call\n3: it could not be done";
@@ -54,11 +54,13 @@ void WriteFile(const fs::path& path, const std::string& text) {
 void Write(const fs::path& folder, const Command& command, const PageTexts& texts) {
   WriteFile(folder / "man/man1" / (command.name + ".1"), ManPageOf(command, texts));
   WriteFile(folder / "bash-completion/completions" / command.name, BashCompletionOf(command));
-  WriteFile(folder / "zsh/vendor-completions" / ("_" + command.name), ZshCompletionOf(command));
+  WriteFile(folder / "zsh/site-functions" / ("_" + command.name), ZshCompletionOf(command));
   WriteFile(folder / "fish/vendor_completions.d" / (command.name + ".fish"), FishCompletionOf(command));
 }
 
-void WriteAll(const fs::path& catalog, const fs::path& usage, const fs::path& guide, const fs::path& folder) {
+// `data`: where installation and machines are going to be.
+void WriteAll(const fs::path& catalog, const fs::path& usage, const fs::path& guide, const std::string& data,
+              const fs::path& folder) {
   const std::string all = panelglow::kVersion;
   const std::string version = all.substr(0, all.find(','));
   for (const char* name : {"panelglow-diags", "panelglow-diags-sim"}) {
@@ -68,7 +70,7 @@ void WriteAll(const fs::path& catalog, const fs::path& usage, const fs::path& gu
             : "\n\nThis one has a simulated machine in place of a real one, and is started by "
               "panelglow-sim.";
     Write(folder, CommandOfCatalog(name, ReadFile(catalog), ReadFile(usage)),
-          {version, kDiagsTexts + simulated, kDiagsCodes,
+          {version, kFilesText + data + kDiagsTexts + simulated, kDiagsCodes,
            "panelglow-diags -subtest=CustomLEDTest -SectionID=Desktop\npanelglow-diags -help=true -subtest=LEDTest",
            "panelglow-sim(1), panelglow-board(1), panelglow-ini(5)"});
   }
@@ -89,9 +91,8 @@ void WriteAll(const fs::path& catalog, const fs::path& usage, const fs::path& gu
   panelglow::controller::AddOptions(app, options);
   Write(folder, CommandOf(app),
         {version, app.get_footer(), kSimCodes,
-         "cp -r /usr/share/panelglow-diags/installation ~/bench && cd ~/bench\n"
-         "panelglow-sim --machine /usr/share/panelglow-diags/machines/notebook.toml -- -subtest=CustomLEDTest "
-         "-SectionID=Notebook",
+         "cp -r " + data + "/installation ~/bench && cd ~/bench\npanelglow-sim --machine " + data +
+             "/machines/notebook.toml -- -subtest=CustomLEDTest -SectionID=Notebook",
          "panelglow-diags(1), panelglow-board-sim(1)"});
   WriteFile(folder / "man/man5/panelglow-ini.5",
             ManPageOfMarkdown("panelglow-ini", "the files that say which LEDs a board has and how they are driven",
@@ -101,12 +102,12 @@ void WriteAll(const fs::path& catalog, const fs::path& usage, const fs::path& gu
 }  // namespace
 
 int main(int argc, char** argv) {
-  constexpr int kArguments = 4;
+  constexpr int kArguments = 5;
   try {
     if (argc != kArguments + 1) {
-      throw std::runtime_error("panelglow-pages CATALOG USAGE GUIDE FOLDER");
+      throw std::runtime_error("panelglow-pages CATALOG USAGE GUIDE DATA FOLDER");
     }
-    WriteAll(argv[1], argv[2], argv[3], argv[4]);
+    WriteAll(argv[1], argv[2], argv[3], argv[4], argv[5]);
     return 0;
   } catch (const std::exception& problem) {
     std::fprintf(stderr, "panelglow-pages: %s\n", problem.what());

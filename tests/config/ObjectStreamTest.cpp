@@ -231,6 +231,28 @@ TEST(ObjectStream, APointerFollowsItsObjectToTheElementThatHoldsIt) {
   EXPECT_EQ(in.Take(child), nullptr);  // it belongs to its tree now
 }
 
+// What an element is read into twice has the parts of both; those of the first have moved.
+TEST(ObjectStream, APointerFollowsAPartOfAnElementThatIsReadIntoAgain) {
+  std::stringstream bytes;
+  XmlObject one("<a><c/></a>");
+  XmlObject two("<b><d/><e/><f/></b>");
+  optstream out(bytes);
+  out.WriteValue(one);
+  out.WriteValue(two);
+  out.WritePointer(one.GetObjectAt(0));
+  out.WriteValue(one);
+
+  XmlObject read;
+  iptstream in(bytes);
+  in.ReadValue(read);
+  in.ReadValue(read);
+  Persistent* part = nullptr;
+  in.ReadPointer(part);
+  ASSERT_EQ(read.children.size(), 4U);
+  EXPECT_EQ(part, read.GetObjectAt(0));
+  EXPECT_THROW(in.ReadValue(read), std::exception) << "the parts that the stream knows would go";
+}
+
 TEST(ObjectStream, CyclesAndSharedObjectsKeepTheirShape) {
   Node first(1);
   Node second(2);
