@@ -129,10 +129,10 @@ void iptstream::PlaceAt(Object& target, std::uint32_t number) {
   if (!entry.complete) {
     Fail("Indexed object is still being read.");
   }
-  // A part is new when it is read into; what a caller hands in may have parts already that pointers of the stream go to.
-  if (depth == 0 && std::any_of(table.begin(), table.end(), [&](const indexed_pointer& known) {
-        return known.object == IdentityOf(target);
-      })) {
+  // A part is new when it is read into; what a caller hands in may have parts already that pointers of the stream go
+  // to.
+  if (depth == 0 && std::any_of(table.begin(), table.end(),
+                                [&](const indexed_pointer& known) { return known.object == IdentityOf(target); })) {
     Fail("The object that is read into has been read from this stream before.");
   }
   if (object->GetRealClassName() != target.GetRealClassName()) {
