@@ -118,7 +118,7 @@ TEST(SystemBoardTool, CheckSpeaksToProgramsAndStandsWhatIsHostile) {
     deep += "<a>";
   }
   std::string wide;
-  for (int i = 0; i < 10000; ++i) {
+  for (int i = 0; i < 2000; ++i) {
     wide += "[" + std::to_string(i) + "]\nplatform=generic\nchips=g_iospace\n";
   }
   std::string bytes;
