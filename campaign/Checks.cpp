@@ -40,6 +40,12 @@ std::size_t Count(const std::string& text, const std::string& what) {
 }  // namespace
 
 bool IsWellFormed(const std::string& xml) {
+  for (std::size_t at = xml.find('&'); at != std::string::npos; at = xml.find('&', at + 1)) {
+    const std::size_t end = xml.find_first_not_of("#abcdefghijklmnopqrstuvwxyzABCDEF0123456789", at + 1);
+    if (end == std::string::npos || end == at + 1 || xml[end] != ';') {
+      return false;
+    }
+  }
   Strings open;
   std::size_t roots = 0;
   for (std::size_t at = xml.find('<'); at != std::string::npos; at = xml.find('<', at)) {
@@ -49,7 +55,7 @@ bool IsWellFormed(const std::string& xml) {
     }
     const std::string tag = xml.substr(at + 1, end - at - 1);
     at = end;
-    if (tag.empty()) {
+    if (tag.empty() || tag.find('<') != std::string::npos || std::count(tag.begin(), tag.end(), '"') % 2 != 0) {
       return false;
     }
     if (tag[0] == '?' || tag[0] == '!') {

@@ -159,14 +159,8 @@ class OneRun {
   void Look() {
     seen_.output = machine_.Output();
     seen_.log = machine_.DiskFiles().Read(kLogFile).value_or("");
-    std::istringstream before(machine_.InitialState());
-    std::istringstream after(machine_.SettledState());
-    std::string was;
-    std::string is;
-    while (std::getline(before, was) && std::getline(after, is)) {
-      if (was != is) {
-        seen_.changed.push_back(was + " -> " + is);
-      }
+    for (const auto& [before, after] : machine_.StateChanges()) {
+      seen_.changed.push_back(before + " -> " + after);
     }
     for (const char* lock : kLocks) {
       if (machine_.IsMutexOwned(lock)) {

@@ -73,14 +73,8 @@ void WriteReport(Simulation& simulation, const std::string& path) {
     }
   }
   file << "end " << simulation.Time().Now() << '\n';
-  std::istringstream before(simulation.InitialState());
-  std::istringstream after(simulation.SettledState());
-  std::string was;
-  std::string is;
-  while (std::getline(before, was) && std::getline(after, is)) {
-    if (was != is) {
-      file << "before " << was << "\nafter " << is << '\n';
-    }
+  for (const auto& [before, after] : simulation.StateChanges()) {
+    file << "before " << before << "\nafter " << after << '\n';
   }
   for (const char* mutex : {"_HalcyonPromptLock", "_HalcyonMotherBoardLib"}) {
     if (simulation.IsMutexOwned(mutex)) {

@@ -328,6 +328,20 @@ std::string Simulation::SettledState() {
   return HardwareState();
 }
 const std::string& Simulation::InitialState() const { return parts_->initialState; }
+std::vector<Simulation::StateChange> Simulation::StateChanges() {
+  std::istringstream before(InitialState());
+  std::istringstream after(SettledState());
+  std::vector<StateChange> changes;
+  while (before || after) {
+    StateChange line;
+    std::getline(before, line.before);
+    std::getline(after, line.after);
+    if (line.before != line.after) {
+      changes.push_back(std::move(line));
+    }
+  }
+  return changes;
+}
 bool Simulation::IsMutexOwned(std::string_view name) const { return parts_->mutexes.IsOwned(name); }
 
 void Simulation::Break(std::string_view led, std::string_view fault) {

@@ -85,6 +85,14 @@ class Simulation {
   /// The same at the very start of the machine.
   [[nodiscard]] const std::string& InitialState() const;
 
+  /// A line of the state as it was before the run and as it is now that the silicon has settled; where there is none
+  /// the text is empty.
+  struct StateChange {
+    std::string before;
+    std::string after;
+  };
+  [[nodiscard]] std::vector<StateChange> StateChanges();
+
   [[nodiscard]] bool IsMutexOwned(std::string_view name) const;
 
  private:
