@@ -109,10 +109,12 @@ const Strings kFiles = {"chip.ini",
                         "nonui_panelglow-diags.msg",
                         "super.ico",
                         "spr_num.ico"};
+constexpr const char* kEarlierRun =
+    "<DiagnosticsData Version=\"4.15.0\">\n  <Diagnostic name=\"another\">\n"
+    "    <Subtest name=\"Fans\" duration=\"7\"/>\n  </Diagnostic>\n</DiagnosticsData>\n";
 const Strings kLogs = {"",
                        "<DiagnosticsData Version=\"4.15.0\">\n</DiagnosticsData>\n",
-                       "<DiagnosticsData Version=\"4.15.0\">\n  <Diagnostic name=\"another\">\n"
-                       "    <Subtest name=\"Fans\" duration=\"7\"/>\n  </Diagnostic>\n</DiagnosticsData>\n",
+                       kEarlierRun,
                        "<DiagnosticsData",
                        "no markup at all",
                        std::string("\0\xFF\xFE", 3)};
