@@ -370,6 +370,4 @@ std::intptr_t SuperDialog::OnCommand(const platform::Message& received) {
   return desktop_.DefaultProcedure(received);
 }
 
-// The drive entries share a start command: the one whose turn it is was chosen just before it was sent.
-
 }  // namespace panelglow

@@ -25,6 +25,7 @@ bool IsLockKey(std::int32_t deviceId) {
 
 }  // namespace
 
+// The drive entries share a start command: the one whose turn it is was chosen just before it was sent.
 LEDStruct* SuperDialog::EntryFor(const LedKind& kind) {
   return kind.deviceId == kFirstHdGreen ? &test_.devices[static_cast<std::size_t>(test_.currentIndex)]
                                         : test_.FindDevice(kind.deviceId);

@@ -118,6 +118,10 @@ TEST(X11Keys, OnlyLettersAndDigitsHaveTheirCharacterAsCode) {
                                                           {"Left", key::kLeft},
                                                           {"Delete", key::kDelete},
                                                           {"KP_Enter", key::kEnter},
+                                                          {"KP_Home", key::kHome},
+                                                          {"KP_Left", key::kLeft},
+                                                          {"KP_Delete", key::kDelete},
+                                                          {"KP_4", 0},
                                                           {"F1", 0}};
   for (const auto& [name, code] : kCases) {
     EXPECT_EQ(platform::desktop::VirtualKeyOf(XStringToKeysym(name)), code) << name;

@@ -22,10 +22,11 @@ constexpr platform::Color kFace = platform::kButtonFaceColor;
 // A picture of the screen, by way of its file.
 class Photo {
  public:
-  explicit Photo(Desk& desk) {
+  explicit Photo(Desk& desk) : Photo(desk.windows.MakeScene()) {}
+  explicit Photo(const platform::desktop::Scene& scene) {
     const TemporaryFile file("photo.png", "");
     platform::posix::LazyDrawing drawing;
-    EXPECT_TRUE(drawing.Get()->WritePng(desk.windows.MakeScene(), file.Path()));
+    EXPECT_TRUE(drawing.Get()->WritePng(scene, file.Path()));
     picture_ = gdk_pixbuf_new_from_file(file.Path().c_str(), nullptr);
   }
   ~Photo() { g_object_unref(picture_); }
@@ -225,6 +226,33 @@ TEST(Pixels, ALongLineShowsItsEndInTheField) {
   desk.ClickAt(500, 1005);
   std::string entered;
   ShowTextWindow(u"text", u"title", entered, 5000);
+}
+
+TEST(Pixels, ATextThatIsLaidOutAsInAFieldEndsWithAWholeLine) {
+  platform::desktop::TextOperation text;
+  text.boxed = true;
+  text.text = u"WWW WWW WWW WWW WWW WWW WWW WWW";
+  text.font = {18, 600};
+  const auto blackIn = [&](bool asInAField, int height) {
+    text.area = {0, 0, 100, height};
+    text.layout = {true, asInAField};
+    platform::desktop::SceneWindow window;
+    window.frame = window.client = window.clip = {0, 0, 100, 100};
+    window.operations = {text};
+    platform::desktop::Scene scene;
+    scene.width = scene.height = 100;
+    scene.windows = {window};
+    return Photo(scene).Count(window.frame, 0);
+  };
+  std::set<int> asInAField;  // grows with each whole line
+  std::set<int> otherwise;   // grows with each row of pixels that has letters
+  for (int height = 0; height < 40; ++height) {
+    asInAField.insert(blackIn(true, height));
+    otherwise.insert(blackIn(false, height));
+  }
+  EXPECT_EQ(asInAField.size(), 3U);  // two lines and none
+  EXPECT_GT(otherwise.size(), 15U);
+  EXPECT_EQ(blackIn(true, 100), blackIn(false, 100));
 }
 
 TEST(Pixels, WhatIsSelectedIsSeenWhileTheFieldHasTheKeyboard) {

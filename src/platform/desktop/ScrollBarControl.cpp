@@ -46,6 +46,7 @@ ControlEffects ScrollBarControl::OnDown(const ScrollParts& parts, int x, int y) 
     thumbHeld_ = true;
     x_ -= parts.thumb.left;
     y_ -= parts.thumb.top;
+    effects.changed = true;  // it looks pressed before it is moved
     return effects;
   }
   heldRequest_ = RequestAt(parts);

@@ -328,12 +328,14 @@ void CairoDrawing::Draw(cairo_t* cr, const TextOperation& text, const std::strin
   const Layout layout = MakeLayout(cr, Utf8FromWide(text.text), text.font, language);
   cairo_save(cr);
   if (text.boxed) {
-    cairo_rectangle(cr, text.area.left, text.area.top, text.area.Width(), text.area.Height());
-    cairo_clip(cr);
     if (text.layout.wordBreak) {
       pango_layout_set_width(layout.get(), text.area.Width() * PANGO_SCALE);
       pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
     }
+    const int room = text.area.Height();
+    cairo_rectangle(cr, text.area.left, text.area.top, text.area.Width(),
+                    text.layout.editControl ? HeightOfWholeLines(layout.get(), room) : room);
+    cairo_clip(cr);
   }
   if (text.background) {
     int width = 0;

@@ -40,6 +40,21 @@ Layout MakeLayout(cairo_t* cr, const std::string& text, const Font& font, const 
   return layout;
 }
 
+int HeightOfWholeLines(PangoLayout* layout, int height) {
+  using Lines = std::unique_ptr<PangoLayoutIter, Deleter<pango_layout_iter_free>>;
+  const Lines lines(pango_layout_get_iter(layout));
+  int whole = 0;
+  do {
+    int end = 0;
+    pango_layout_iter_get_line_yrange(lines.get(), nullptr, &end);
+    if (PANGO_PIXELS(end) > height) {
+      break;
+    }
+    whole = PANGO_PIXELS(end);
+  } while (pango_layout_iter_next_line(lines.get()) != 0);
+  return whole;
+}
+
 Caption ReadCaption(std::u16string_view source) {
   Caption caption;
   for (std::size_t i = 0; i < source.size(); ++i) {

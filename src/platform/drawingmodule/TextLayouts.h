@@ -17,6 +17,9 @@ using Layout = std::unique_ptr<PangoLayout, Deleter<g_object_unref>>;
 /// A UTF-8 text in a font, with the character forms of a language as "ja_JP".
 Layout MakeLayout(cairo_t* cr, const std::string& text, const Font& font, const std::string& language);
 
+/// How much of a height the lines take that fit into it as a whole; all in pixels.
+int HeightOfWholeLines(PangoLayout* layout, int height);
+
 /// A caption without its marks.
 struct Caption {
   std::u16string text;

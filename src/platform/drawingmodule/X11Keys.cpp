@@ -17,7 +17,7 @@ struct KeyRow {
 };
 
 // Keys that stand for something else than the character they type.
-constexpr std::array<KeyRow, 14> kKeys{{{XK_BackSpace, key::kBackspace},
+constexpr std::array<KeyRow, 21> kKeys{{{XK_BackSpace, key::kBackspace},
                                         {XK_Tab, key::kTab},
                                         {XK_ISO_Left_Tab, key::kTab},
                                         {XK_Return, key::kEnter},
@@ -30,7 +30,15 @@ constexpr std::array<KeyRow, 14> kKeys{{{XK_BackSpace, key::kBackspace},
                                         {XK_Up, key::kUp},
                                         {XK_Right, key::kRight},
                                         {XK_Down, key::kDown},
-                                        {XK_Delete, key::kDelete}}};
+                                        {XK_Delete, key::kDelete},
+                                        // of the number pad, without Num Lock
+                                        {XK_KP_End, key::kEnd},
+                                        {XK_KP_Home, key::kHome},
+                                        {XK_KP_Left, key::kLeft},
+                                        {XK_KP_Up, key::kUp},
+                                        {XK_KP_Right, key::kRight},
+                                        {XK_KP_Down, key::kDown},
+                                        {XK_KP_Delete, key::kDelete}}};
 
 }  // namespace
 

@@ -77,7 +77,12 @@ TEST_F(DialogTest, APartOfAScrollBarThatIsHeldAsksAgainWhileTheMouseIsOnIt) {
   EXPECT_EQ(requests.back(), scroll::kReleased);
   requests.clear();
   desktop_.Click(210, 30);
+  Pump(2400);
+  const std::uint64_t shown = desktop_.Revision();
   desktop_.MouseButton(210, 100, true);  // the thumb, which follows the mouse
+  Pump(2410);
+  EXPECT_TRUE(desktop_.MakeScene().windows.back().pressed);
+  EXPECT_GT(desktop_.Revision(), shown);  // and so it is drawn
   desktop_.MouseMove(210, 116);
   Pump(2500);
   desktop_.MouseButton(210, 116, false);
